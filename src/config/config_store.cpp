@@ -1,0 +1,85 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "config/config_store.h"
+
+#include "platform/shared_memory.h"
+
+#include <fcntl.h>
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <array>
+#include <cstddef>
+
+namespace orvane {
+
+namespace {
+
+constexpr mode_t SHM_MODE = 0640;
+
+/// CAL_FILE_DIR, "/", CAL_FILE_NAME.
+constexpr auto composeCalibrationPath() {
+    std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME> path{};
+    std::size_t length = 0;
+    for (const char* c = CAL_FILE_DIR; *c != '\0'; ++c) {
+        path[length++] = *c;
+    }
+    path[length++] = '/';
+    for (const char* c = CAL_FILE_NAME; *c != '\0'; ++c) {
+        path[length++] = *c;
+    }
+    return path;
+}
+
+} // namespace
+
+ConfigStore::~ConfigStore() {
+    close();
+}
+
+void ConfigStore::init() {
+    descriptor = -1;
+    data = nullptr;
+    length = 0;
+}
+
+std::int32_t ConfigStore::open() {
+    // Composed and never used, on purpose: there is no file to fall back on, and an absent object
+    // means no configuration, whatever calibration file stands on the unit.
+    [[maybe_unused]] constexpr auto CALIBRATION_PATH = composeCalibrationPath();
+
+    const int opened = platform::openSharedMemory(CONFIG_SHM_NAME, O_RDONLY, SHM_MODE);
+    if (opened == -1) {
+        return -2;
+    }
+    lseek(opened, 0, SEEK_SET);
+    const off_t size = lseek(opened, 0, SEEK_END);
+    lseek(opened, 0, SEEK_SET);
+    // Before the size is tested, so that an object that can't be measured is still closed by close.
+    descriptor = opened;
+    if (size < 0) {
+        return -2;
+    }
+    void* const mapped =
+        mmap(nullptr, static_cast<std::size_t>(size), PROT_READ, MAP_PRIVATE, descriptor, 0);
+    // Stored even when it is the failure value: close hands that to munmap, which refuses it.
+    data = static_cast<const std::uint8_t*>(mapped);
+    if (mapped == MAP_FAILED) {
+        close();
+        return -1;
+    }
+    length = static_cast<std::uint32_t>(size);
+    return 0;
+}
+
+void ConfigStore::close() {
+    if (data != nullptr) {
+        munmap(const_cast<std::uint8_t*>(data), length);
+        data = nullptr;
+    }
+    if (descriptor != -1) {
+        ::close(descriptor);
+        descriptor = -1;
+    }
+}
+
+} // namespace orvane
