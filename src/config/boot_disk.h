@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstdint>
+
+namespace orvane {
+
+/// The raw boot disk, open for one transfer at a place that is counted from its end. Owns the
+/// descriptor.
+class BootDisk {
+public:
+    /// Opens the device with `flags` (O_RDONLY or O_WRONLY).
+    explicit BootDisk(int flags);
+    ~BootDisk();
+    BootDisk(const BootDisk&) = delete;
+    BootDisk& operator=(const BootDisk&) = delete;
+
+    bool isOpen() const { return descriptor_ != -1; }
+
+    /// Goes to `bytesBeforeEnd` bytes before the end of the device. False when the device is
+    /// closed, or has no such place.
+    bool seekFromEnd(std::int64_t bytesBeforeEnd);
+
+    /// One read or write of `length` bytes where the last seek went. False when it fails; a short
+    /// transfer is no failure.
+    bool read(void* buffer, std::uint32_t length);
+    bool write(const void* buffer, std::uint32_t length);
+
+private:
+    int descriptor_;
+};
+
+} // namespace orvane

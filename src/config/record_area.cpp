@@ -1,0 +1,128 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "config/record_area.h"
+
+#include "config/boot_disk.h"
+#include "config/crc32.h"
+#include "config/record_slots.h"
+
+#include <fcntl.h>
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+
+namespace orvane {
+
+namespace {
+
+constexpr std::int32_t SUCCESS = 0;
+constexpr std::int32_t FAILURE = -1;
+
+/// The fixed areas begin so many bytes before the end of the device: 3072 and 4096 past the base.
+constexpr std::int64_t AUX_AREA_START = 0xFF400;
+constexpr std::int64_t TUNING_AREA_START = 0xFF000;
+static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072);
+static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096);
+
+/// The CRC is taken over slot 15, which begins one byte past the base.
+constexpr std::int64_t CRC_RANGE_START = 0xFFFFF;
+
+struct SlotPlace {
+    std::uint32_t size = 0;
+    std::uint64_t offset = NO_SLOT_OFFSET;
+
+    explicit SlotPlace(std::uint32_t slot) { recordSlotLayout(slot, size, offset); }
+    bool isKnown() const { return size != 0 && offset != NO_SLOT_OFFSET; }
+    std::int64_t bytesBeforeEnd() const {
+        return RECORD_AREA_SIZE - static_cast<std::int64_t>(offset);
+    }
+};
+
+std::int32_t readArea(std::int64_t bytesBeforeEnd, std::uint32_t maxLength, void* buffer,
+                      std::uint32_t length) {
+    if (buffer == nullptr || length == 0 || length > maxLength) {
+        return FAILURE;
+    }
+    BootDisk disk(O_RDONLY);
+    return disk.seekFromEnd(bytesBeforeEnd) && disk.read(buffer, length) ? SUCCESS : FAILURE;
+}
+
+std::int32_t writeArea(std::int64_t bytesBeforeEnd, std::uint32_t maxLength, const void* buffer,
+                       std::uint32_t length) {
+    if (buffer == nullptr || length == 0 || length > maxLength) {
+        return FAILURE;
+    }
+    BootDisk disk(O_WRONLY);
+    return disk.seekFromEnd(bytesBeforeEnd) && disk.write(buffer, length) ? SUCCESS : FAILURE;
+}
+
+} // namespace
+
+std::int32_t readRecordSlot(std::uint32_t slot, void* buffer, std::uint32_t length) {
+    if (buffer == nullptr || length == 0) {
+        return FAILURE;
+    }
+    std::memset(buffer, 0, length); // before anything can fail: a failed read leaves zeros
+    BootDisk disk(O_RDONLY);
+    if (!disk.isOpen()) {
+        return FAILURE;
+    }
+    const SlotPlace place(slot);
+    if (!place.isKnown() || !disk.seekFromEnd(place.bytesBeforeEnd())) {
+        return FAILURE;
+    }
+    return disk.read(buffer, std::min(length, place.size)) ? SUCCESS : FAILURE;
+}
+
+std::int32_t writeRecordSlot(std::uint32_t slot, const void* buffer, std::uint32_t length) {
+    if (buffer == nullptr || length == 0) {
+        return FAILURE;
+    }
+    BootDisk disk(O_WRONLY); // before the slot is looked up, as in readRecordSlot
+    if (!disk.isOpen()) {
+        return FAILURE;
+    }
+    const SlotPlace place(slot);
+    if (!place.isKnown()) {
+        return FAILURE;
+    }
+    std::array<std::uint8_t, RECORD_SLOT_MAX_SIZE> padded{};
+    if (length < place.size) {
+        std::memcpy(padded.data(), buffer, length);
+        buffer = padded.data();
+    }
+    return disk.seekFromEnd(place.bytesBeforeEnd()) && disk.write(buffer, place.size) ? SUCCESS
+                                                                                      : FAILURE;
+}
+
+std::int32_t readTuningArea(void* buffer, std::uint32_t length) {
+    return readArea(TUNING_AREA_START, TUNING_AREA_SIZE, buffer, length);
+}
+
+std::int32_t writeTuningArea(const void* buffer, std::uint32_t length) {
+    return writeArea(TUNING_AREA_START, TUNING_AREA_SIZE, buffer, length);
+}
+
+std::int32_t readAuxArea(void* buffer, std::uint32_t length) {
+    return readArea(AUX_AREA_START, AUX_AREA_SIZE, buffer, length);
+}
+
+std::int32_t writeAuxArea(const void* buffer, std::uint32_t length) {
+    return writeArea(AUX_AREA_START, AUX_AREA_SIZE, buffer, length);
+}
+
+std::uint32_t recordAreaCrc() {
+    std::array<std::uint8_t, RECORD_SLOT_MAX_SIZE> block{};
+    if (readArea(CRC_RANGE_START, RECORD_SLOT_MAX_SIZE, block.data(), RECORD_SLOT_MAX_SIZE) !=
+        SUCCESS) {
+        return 0xFFFFFFFFU;
+    }
+    std::uint32_t crc = CRC32_INITIAL;
+    for (const std::uint8_t byte : block) {
+        crc = crc32Step(crc, byte);
+    }
+    // Without the final complement of the usual CRC-32, on purpose: the register is the value.
+    return crc;
+}
+
+} // namespace orvane

@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Byte access to the record area of the raw boot disk. Every operation opens the device, seeks
+// relative to its end, transfers once, and closes: nothing is kept between calls, and a transfer
+// that comes out short counts as success. All return 0 or -1; none tells causes apart.
+#pragma once
+
+#include <cstdint>
+
+namespace orvane {
+
+constexpr char BOOT_DISK[] = "/dev/hd0";
+
+/// Longest transfer of each fixed area, in bytes.
+constexpr std::uint32_t AUX_AREA_SIZE = 1024;
+constexpr std::uint32_t TUNING_AREA_SIZE = 4096;
+
+/// Reads record slot 0 to 17 into `buffer`. All `length` bytes of the buffer are zeroed first, so a
+/// failure leaves zeros; a shorter buffer gets the slot's first bytes, a longer one keeps zeros
+/// behind them. -1 for a null buffer or length 0 (the buffer is then not touched), an unknown slot,
+/// or a device that can't be opened, sought or read.
+std::int32_t readRecordSlot(std::uint32_t slot, void* buffer, std::uint32_t length);
+
+/// Writes record slot 0 to 17 whole: `buffer` is padded with zeros when shorter than the slot, its
+/// excess dropped when longer. -1 as above.
+std::int32_t writeRecordSlot(std::uint32_t slot, const void* buffer, std::uint32_t length);
+
+/// Transfer the first `length` bytes of a fixed area. -1 for a null buffer, length 0 or more than
+/// the area's size (the device is not touched then), or a device failure. A failed or short read
+/// leaves the rest of `buffer` as the caller prepared it.
+std::int32_t readTuningArea(void* buffer, std::uint32_t length);
+std::int32_t writeTuningArea(const void* buffer, std::uint32_t length);
+std::int32_t readAuxArea(void* buffer, std::uint32_t length);
+std::int32_t writeAuxArea(const void* buffer, std::uint32_t length);
+
+/// The CRC register over the 136 bytes of slot 15 (slots 1 to 9), without the final complement: the
+/// bitwise NOT of their usual CRC-32. All ones on failure, which a computed register can be as
+/// well.
+std::uint32_t recordAreaCrc();
+
+} // namespace orvane

@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Where things lie in the record area, the last mebibyte of the boot disk. All positions are
+// relative to the end of the device, so the layout holds on disks of any size.
+#pragma once
+
+#include <cstdint>
+
+namespace orvane {
+
+/// The area's base: bytes before the end of the device.
+constexpr std::int64_t RECORD_AREA_SIZE = 0x100000;
+
+constexpr std::uint32_t RECORD_SLOT_COUNT = 18;
+/// The longest slot, slot 15, in bytes.
+constexpr std::uint32_t RECORD_SLOT_MAX_SIZE = 136;
+/// What stands for "no offset" in the output of recordSlotLayout.
+constexpr std::uint64_t NO_SLOT_OFFSET = ~std::uint64_t{0};
+
+/// Gives the size of slot 0 to 17 in bytes and its offset from the area's base. Leaves both outputs
+/// as they were for an unknown slot.
+void recordSlotLayout(std::uint32_t slot, std::uint32_t& size, std::uint64_t& offset);
+
+} // namespace orvane
