@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Version description files: lines of "key = value", one file for each installed package.
+#pragma once
+
+#include <map>
+#include <string>
+
+namespace orvane {
+
+/// One parsed file: values by key, in the byte-wise order of the keys. Both without blanks around.
+using Inf_Data = std::map<std::string, std::string>;
+
+/// Adds the lines of the file at `path` to `record`; a later line replaces an earlier one of the
+/// same key. A line without "=" or with nothing behind it is skipped. A carriage return before the
+/// line end belongs to the value. A file that can't be opened or read adds nothing.
+void readInfFile(const std::string& path, Inf_Data& record);
+
+/// The value of `key` in `record`, or the empty string.
+std::string infValue(const Inf_Data& record, const std::string& key);
+
+/// `text` without leading and trailing spaces (0x20 only: tabs and carriage returns stay).
+std::string trimSpaces(const std::string& text);
+
+} // namespace orvane

@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "identity/software_version.h"
+
+#include "identity/inf_file.h"
+
+#include <dirent.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <limits>
+#include <vector>
+
+namespace orvane {
+
+namespace {
+
+constexpr char INF_MARKER[] = ".inf";
+constexpr char TYPE_KEY[] = "Type";
+constexpr char APPLICATION_TYPE[] = "Application";
+constexpr char VERSION_KEY[] = "Version Number";
+constexpr char NO_VERSION[] = "N/A";
+constexpr char COMPONENT_SEPARATOR = '.';
+constexpr char AFFIX_SEPARATOR = '_';
+
+/// The records of the last scan, in listing order. They live as long as the process; each scan
+/// empties them first.
+std::vector<Inf_Data> InfRecords;
+
+void scanVersionFiles() {
+    InfRecords.clear();
+    DIR* const folder = opendir(VERSION_DIR);
+    if (folder == nullptr) {
+        return;
+    }
+    while (const dirent* entry = readdir(folder)) {
+        const std::string path = std::string(VERSION_DIR) + entry->d_name;
+        // Anywhere in the name, not only at its end: a.info and b.inf.old are taken too.
+        if (path.find(INF_MARKER) != std::string::npos) {
+            Inf_Data record;
+            readInfFile(path, record);
+            InfRecords.push_back(record);
+        }
+    }
+    closedir(folder);
+}
+
+std::string selectVersion() {
+    for (const Inf_Data& record : InfRecords) {
+        // A substring test: a type of MainApplication is taken too.
+        if (infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos) {
+            return infValue(record, VERSION_KEY);
+        }
+    }
+    return {};
+}
+
+/// The text before the first `separator`, or all of it when there is none.
+std::string before(const std::string& text, char separator) {
+    return text.substr(0, text.find(separator));
+}
+
+/// The text after the first `separator`, or all of it when there is none.
+std::string after(const std::string& text, char separator) {
+    const std::size_t at = text.find(separator);
+    return at == std::string::npos ? text : text.substr(at + 1);
+}
+
+} // namespace
+
+std::string softwareVersion() {
+    return formatVersion(findApplicationVersion());
+}
+
+std::string findApplicationVersion() {
+    scanVersionFiles();
+    return after(selectVersion(), AFFIX_SEPARATOR);
+}
+
+std::string formatVersion(const std::string& text) {
+    if (text.empty() || text == NO_VERSION) {
+        return DEFAULT_SOFTWARE_VERSION;
+    }
+    // `after` gives the whole text again when there is no separator left: so a missing component
+    // repeats the one before it, on purpose.
+    const std::string fromSecond = after(text, COMPONENT_SEPARATOR);
+    const std::string fromThird = after(fromSecond, COMPONENT_SEPARATOR);
+    return formatVersionByte(before(text, COMPONENT_SEPARATOR)) +
+           formatVersionByte(before(fromSecond, COMPONENT_SEPARATOR)) +
+           formatVersionByte(before(fromThird, AFFIX_SEPARATOR));
+}
+
+std::string formatVersionByte(const std::string& component) {
+    using Limits = std::numeric_limits<std::int32_t>;
+    // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
+    const long number =
+        std::clamp<long>(std::strtol(component.c_str(), nullptr, 10), Limits::min(), Limits::max());
+    const auto remainder = static_cast<std::int32_t>(number % 256); // keeps the dividend's sign
+    std::array<char, 2 * sizeof remainder + 1> digits{};
+    std::snprintf(digits.data(), digits.size(), "%02x", static_cast<unsigned int>(remainder));
+    return digits.data();
+}
+
+} // namespace orvane
