@@ -1,0 +1,74 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "writers/airplay_writer.h"
+
+#include "identity/vehicle_identity.h"
+#include "tuning/audio_profile.h"
+#include "writers/template_merge.h"
+
+#include <cstdint>
+#include <ostream>
+#include <string>
+
+namespace orvane {
+
+namespace {
+
+constexpr AccessoryFile AIRPLAY_FILE = {
+    "/tmp/airplay.conf",
+    "/fs/mp/etc/airplay_static.conf",
+    "/fs/mp/etc/airplay.conf",
+};
+
+struct AirplayValues {
+    std::string model;
+    std::string brand;
+    unsigned int rightHandDrive = 0;
+    std::int32_t audioProfile = NO_AUDIO_PROFILE;
+};
+
+void writeHead(std::ostream& file, const AirplayValues& values) {
+    file << "# Default name of the accessory if a name is not specified in the user prefs.\n";
+    file << "name = CarPlay\n\n";
+    file << "# Model of the accessory.\n";
+    file << "model = " << values.model << "\n\n";
+    file << "# Manufacturer of the accessory.\n";
+    file << "manufacturer = Marl Motor Company\n\n";
+    file << "# OEM Icon Label\n";
+    file << "oemIconLabel = VOXA\n\n";
+    file << "# OEM Icon Visibility Setting\n";
+    file << "oemIconVisible = 1\n\n";
+    file << "# 104x104 OEM Icon png path\n";
+    file << "oemIconPath = /fs/mp/etc/" << values.brand << "/oemIcon.png\n\n";
+    // From here on every line end flushes, on purpose: the bytes are the same, the writes are not.
+    if (values.audioProfile != NO_AUDIO_PROFILE) {
+        file << "# audio profile for QWA" << std::endl
+             << "audioProfile = " << values.audioProfile << std::endl
+             << std::endl;
+    }
+    // The comment ends so, in mid-sentence.
+    file << "# rightHandDrive mode setting right" << std::endl
+         << "rightHandDrive = " << values.rightHandDrive << std::endl
+         << std::endl;
+}
+
+} // namespace
+
+int updateAirplayConfigFile() {
+    AirplayValues values;
+    getModelName(values.model);
+    getBrandName(values.brand);
+    values.rightHandDrive = getRightHandDrive();
+    values.audioProfile = getAudioProfile();
+
+    TemplateMerge merge(AIRPLAY_FILE);
+    if (!merge.canGenerate()) {
+        installStockFile(AIRPLAY_FILE);
+        return 0;
+    }
+    writeHead(merge.output, values);
+    merge.copyTemplate();
+    merge.close();
+    return 0;
+}
+
+} // namespace orvane

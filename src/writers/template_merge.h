@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Every accessory file is made in the same way: generated lines, then a template from the read-only
+// partition, byte for byte; or, where that can't start, a complete stock file in place of it.
+#pragma once
+
+#include <fstream>
+
+namespace orvane {
+
+/// The three paths of one accessory file.
+struct AccessoryFile {
+    const char* output;
+    const char* templateFile;
+    const char* stockFile;
+};
+
+/// The streams of one merge. A stream that could not be opened is failed, and what is written to it
+/// is dropped. Opening is all that sets a stream's state before the lines are written.
+struct TemplateMerge {
+    /// Opens the output for writing (created, or truncated at once), then the template for reading.
+    explicit TemplateMerge(const AccessoryFile& file);
+
+    /// Whether both streams are open. The template is tested first.
+    bool canGenerate() const { return !templateFile.fail() && !output.fail(); }
+
+    /// Appends all bytes of the template to the output. A template that yields none, being empty,
+    /// absent or a folder, leaves the output failed: what is written afterwards is dropped.
+    void copyTemplate();
+
+    /// Closes the template, then the output. A close that fails leaves its stream failed.
+    void close();
+
+    std::ofstream output;
+    std::ifstream templateFile;
+};
+
+/// Puts the stock file in place of the output, through streams of its own. Nothing is checked: a
+/// missing stock file leaves an empty output, an output that can't be opened stays as it is.
+void installStockFile(const AccessoryFile& file);
+
+} // namespace orvane
