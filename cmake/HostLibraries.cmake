@@ -1,0 +1,39 @@
+# SPDX-License-Identifier: Apache-2.0
+# What the kit and the tests need besides a compiler. All of it is a Debian package and header-only
+# or built from its sources, so that it serves every compiler, standard library and processor here.
+find_path(ORVANE_CLI11_DIR CLI/CLI.hpp)
+find_path(ORVANE_TOMLPP_DIR toml++/toml.h)
+find_path(ORVANE_GOOGLETEST_DIR googletest/src/gtest-all.cc PATHS /usr/src/googletest NO_CMAKE_FIND_ROOT_PATH)
+mark_as_advanced(ORVANE_CLI11_DIR ORVANE_TOMLPP_DIR ORVANE_GOOGLETEST_DIR)
+
+set(ORVANE_KIT_MISSING "")
+if(NOT ORVANE_CLI11_DIR)
+  list(APPEND ORVANE_KIT_MISSING libcli11-dev)
+endif()
+if(NOT ORVANE_TOMLPP_DIR)
+  list(APPEND ORVANE_KIT_MISSING libtomlplusplus-dev)
+endif()
+
+set(ORVANE_TESTS_MISSING ${ORVANE_KIT_MISSING})
+if(ORVANE_KIT STREQUAL OFF)
+  list(APPEND ORVANE_TESTS_MISSING "the kit (ORVANE_KIT is OFF)")
+endif()
+if(NOT ORVANE_GOOGLETEST_DIR)
+  list(APPEND ORVANE_TESTS_MISSING googletest)
+endif()
+
+# Sets NAME_BUILT from the option NAME (ON, OFF, AUTO) and the list of what is missing for it.
+function(orvane_decide name missing)
+  string(REPLACE ";" ", " missing_text "${missing}")
+  if(${name} STREQUAL AUTO AND missing)
+    message(STATUS "${name}: left out, missing: ${missing_text}")
+    set(built OFF)
+  elseif(${name} AND missing)
+    message(FATAL_ERROR "${name} is ON, missing: ${missing_text}")
+  elseif(${name} STREQUAL AUTO OR ${name})
+    set(built ON)
+  else()
+    set(built OFF)
+  endif()
+  set(${name}_BUILT ${built} PARENT_SCOPE)
+endfunction()

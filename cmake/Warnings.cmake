@@ -1,0 +1,11 @@
+# SPDX-License-Identifier: Apache-2.0
+# The warnings of our own code, as an interface target: third-party sources don't get them.
+add_library(orvane_warnings INTERFACE)
+target_compile_options(orvane_warnings INTERFACE
+  -Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow -Wold-style-cast -Wcast-align
+  -Wcast-qual -Wundef -Wnon-virtual-dtor -Woverloaded-virtual -Wnull-dereference
+  -Wdouble-promotion -Wformat=2 -Wimplicit-fallthrough -Wswitch-enum -Wunused)
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
+  target_compile_options(orvane_warnings INTERFACE
+    -Wduplicated-cond -Wduplicated-branches -Wlogical-op)
+endif()
