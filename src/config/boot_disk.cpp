@@ -16,15 +16,15 @@ BootDisk::~BootDisk() {
     }
 }
 
-bool BootDisk::seekFromEnd(std::int64_t bytesBeforeEnd) {
+bool BootDisk::seekFromEnd(std::int64_t bytesBeforeEnd) const {
     return isOpen() && lseek64(descriptor_, -bytesBeforeEnd, SEEK_END) != -1;
 }
 
-bool BootDisk::read(void* buffer, std::uint32_t length) {
+bool BootDisk::read(void* buffer, std::uint32_t length) const {
     return ::read(descriptor_, buffer, length) != -1;
 }
 
-bool BootDisk::write(const void* buffer, std::uint32_t length) {
+bool BootDisk::write(const void* buffer, std::uint32_t length) const {
     return ::write(descriptor_, buffer, length) != -1;
 }
 

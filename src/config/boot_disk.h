@@ -19,12 +19,12 @@ public:
 
     /// Goes to `bytesBeforeEnd` bytes before the end of the device. False when the device is
     /// closed, or has no such place.
-    bool seekFromEnd(std::int64_t bytesBeforeEnd);
+    bool seekFromEnd(std::int64_t bytesBeforeEnd) const;
 
     /// One read or write of `length` bytes where the last seek went. False when it fails; a short
     /// transfer is no failure.
-    bool read(void* buffer, std::uint32_t length);
-    bool write(const void* buffer, std::uint32_t length);
+    bool read(void* buffer, std::uint32_t length) const;
+    bool write(const void* buffer, std::uint32_t length) const;
 
 private:
     int descriptor_;

@@ -64,9 +64,8 @@ std::int32_t readAllParams(ConfigStore& store, std::uint16_t* values, std::uint3
     ParamStatus status = PARAM_OK;
     // At the latest parameter 172 fails, so the 16-bit number never overflows.
     for (std::uint16_t number = 1; number <= count && status == PARAM_OK; ++number) {
-        std::uint16_t& value = values[number - 1];
-        value = 0; // a one-byte parameter fills the low half only
-        status = getParam(store, number, &value);
+        values[number - 1] = 0; // a one-byte parameter fills the low half only
+        status = getParam(store, number, &values[number - 1]);
     }
     store.close();
     return static_cast<std::int32_t>(status);

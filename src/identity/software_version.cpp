@@ -7,8 +7,8 @@
 
 #include <algorithm>
 #include <array>
+#include <charconv>
 #include <cstdint>
-#include <cstdio>
 #include <cstdlib>
 #include <limits>
 #include <vector>
@@ -98,9 +98,11 @@ std::string formatVersionByte(const std::string& component) {
     const long number =
         std::clamp<long>(std::strtol(component.c_str(), nullptr, 10), Limits::min(), Limits::max());
     const auto remainder = static_cast<std::int32_t>(number % 256); // keeps the dividend's sign
-    std::array<char, 2 * sizeof remainder + 1> digits{};
-    std::snprintf(digits.data(), digits.size(), "%02x", static_cast<unsigned int>(remainder));
-    return digits.data();
+    std::array<char, 2 * sizeof remainder> digits{};
+    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(),
+                                   static_cast<std::uint32_t>(remainder), 16);
+    const std::string hex(digits.data(), end.ptr);
+    return hex.size() < 2 ? "0" + hex : hex;
 }
 
 } // namespace orvane

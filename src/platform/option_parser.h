@@ -5,7 +5,7 @@ namespace orvane::platform {
 
 /// getopt(3) as POSIX defines it: the next option letter, '?' for one that is not among the letters
 /// (after the C library's own diagnostic), -1 at the end. The first operand and "--" are the end.
-/// `letters` takes no arguments and has at most 14 letters.
+/// No letter of `letters` takes an argument.
 int nextOption(int argc, char* const argv[], const char* letters);
 
 } // namespace orvane::platform

@@ -3,16 +3,14 @@
 
 #include <unistd.h>
 
-#include <array>
-#include <cstdio>
+#include <string>
 
 namespace orvane::platform {
 
 int nextOption(int argc, char* const argv[], const char* letters) {
     // Without the "+" glibc moves operands behind the options and goes on after them.
-    std::array<char, 16> posixly{};
-    std::snprintf(posixly.data(), posixly.size(), "+%s", letters);
-    return getopt(argc, argv, posixly.data());
+    const std::string posixly = std::string("+") + letters;
+    return getopt(argc, argv, posixly.c_str());
 }
 
 } // namespace orvane::platform
