@@ -3,7 +3,7 @@
 add_library(orvane_warnings INTERFACE)
 target_compile_options(orvane_warnings INTERFACE
   -Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow -Wold-style-cast -Wcast-align
-  -Wcast-qual -Wundef -Wnon-virtual-dtor -Woverloaded-virtual -Wnull-dereference
+  -Wcast-qual -Wundef -Wnon-virtual-dtor -Woverloaded-virtual
   -Wdouble-promotion -Wformat=2 -Wimplicit-fallthrough -Wswitch-enum -Wunused)
 if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
   target_compile_options(orvane_warnings INTERFACE
