@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description_values.h"
+
+#include "kit/kit_error.h"
+
+#include <charconv>
+
+namespace orvane::kit {
+
+namespace {
+
+constexpr std::string_view HEX_PREFIX = "hex:";
+
+std::string quoted(std::string_view text) {
+    return "\"" + std::string(text) + "\"";
+}
+
+} // namespace
+
+Bytes hexBytes(std::string_view text) {
+    std::string digits;
+    for (const char c : text) {
+        if (std::string_view(" \t\r\n").find(c) == std::string_view::npos) {
+            digits += c;
+        }
+    }
+    if (digits.size() % 2 != 0) {
+        throw KitError("hex takes two digits a byte: " + quoted(text) + " has an odd number");
+    }
+    Bytes bytes;
+    for (std::size_t i = 0; i < digits.size(); i += 2) {
+        const char* const pair = digits.data() + i;
+        unsigned byte = 0;
+        const auto [end, error] = std::from_chars(pair, pair + 2, byte, 16);
+        if (error != std::errc{} || end != pair + 2) {
+            throw KitError("hex takes the digits 0-9 and a-f: " +
+                           quoted(std::string_view(pair, 2)) + " is no byte");
+        }
+        bytes += static_cast<char>(byte);
+    }
+    return bytes;
+}
+
+Bytes textOrHexBytes(std::string_view text) {
+    if (text.substr(0, HEX_PREFIX.size()) == HEX_PREFIX) {
+        return hexBytes(text.substr(HEX_PREFIX.size()));
+    }
+    return Bytes(text);
+}
+
+std::uint64_t keyNumber(std::string_view key, std::uint64_t greatest, const std::string& what) {
+    const bool isHex = key.substr(0, 2) == "0x";
+    const std::string_view digits = isHex ? key.substr(2) : key;
+    const char* const last = digits.data() + digits.size();
+    std::uint64_t number = 0;
+    const auto [end, error] = std::from_chars(digits.data(), last, number, isHex ? 16 : 10);
+    if (error != std::errc{} || end != last || number > greatest) {
+        throw KitError(what + " must be from 0 to " + std::to_string(greatest) + ", not " +
+                       quoted(key));
+    }
+    return number;
+}
+
+} // namespace orvane::kit

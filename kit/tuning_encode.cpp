@@ -1,0 +1,134 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/tuning_encode.h"
+
+#include "kit/kit_error.h"
+
+#include <algorithm>
+
+namespace orvane::kit {
+
+namespace {
+
+struct Range {
+    std::int64_t least;
+    std::int64_t greatest;
+};
+
+Range rangeOf(DpsEncoding encoding) {
+    switch (encoding) {
+    case DpsEncoding::code2:
+        return {0, 3};
+    case DpsEncoding::u8:
+        return {0, 255};
+    case DpsEncoding::i16:
+        break;
+    }
+    return {-32768, 32767};
+}
+
+bool hasWords(const DpsField& field) {
+    return field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord;
+}
+
+std::string rangeText(const DpsField& field) {
+    const Range range = rangeOf(field.encoding);
+    return std::to_string(range.least) + " to " + std::to_string(range.greatest);
+}
+
+/// The code of `word` in the field's own table.
+std::int64_t codeOf(const DpsField& field, const std::string& word) {
+    if (!hasWords(field)) {
+        throw KitError(std::string(field.key) + " takes numbers, not the word \"" + word + "\"");
+    }
+    std::string known;
+    for (const QwaWord& row : field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords) {
+        if (word == row.word) {
+            return row.code;
+        }
+        known += std::string(row.word) + ", ";
+    }
+    throw KitError(std::string(field.key) + " has no word \"" + word + "\": it takes " + known +
+                   "or a code " + rangeText(field));
+}
+
+/// The value as a list of numbers, whatever it was.
+std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& value) {
+    if (const auto* list = std::get_if<std::vector<std::int64_t>>(&value)) {
+        if (field.kind != DpsKind::list) {
+            throw KitError(std::string(field.key) + " takes one value, not a list");
+        }
+        return *list;
+    }
+    if (const auto* word = std::get_if<std::string>(&value)) {
+        return {codeOf(field, *word)};
+    }
+    if (field.kind == DpsKind::list) {
+        throw KitError(std::string(field.key) + " takes a list of " + std::to_string(field.count) +
+                       " numbers");
+    }
+    return {std::get<std::int64_t>(value)};
+}
+
+/// Puts one number, known to be in range.
+void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std::int64_t number) {
+    const auto bits = static_cast<std::uint16_t>(number); // two's complement
+    const std::size_t width = field.encoding == DpsEncoding::i16 ? 2 : 1;
+    const std::size_t at = field.offset + element * width;
+    switch (field.encoding) {
+    case DpsEncoding::code2:
+        block.bytes[at] = static_cast<std::uint8_t>((block.bytes[at] & ~(3U << field.bit)) |
+                                                    (unsigned{bits} << field.bit));
+        break;
+    case DpsEncoding::i16:
+        block.bytes[at + 1] = static_cast<std::uint8_t>(bits >> 8U);
+        [[fallthrough]];
+    case DpsEncoding::u8:
+        block.bytes[at] = static_cast<std::uint8_t>(bits);
+        break;
+    }
+}
+
+} // namespace
+
+const DpsField& tuningField(const std::string& key) {
+    const auto* field = std::find_if(DPS_LAYOUT.begin(), DPS_LAYOUT.end(),
+                                     [&key](const DpsField& row) { return key == row.key; });
+    if (field == DPS_LAYOUT.end()) {
+        throw KitError("there is no tuning field \"" + key + "\"");
+    }
+    return *field;
+}
+
+void encodeTuningField(DpsBlock& block, const std::string& key, const TuningValue& value) {
+    const DpsField& field = tuningField(key);
+    const std::vector<std::int64_t> numbers = numbersOf(field, value);
+    if (numbers.size() != field.count) {
+        throw KitError(key + " takes " + std::to_string(field.count) + " numbers, not " +
+                       std::to_string(numbers.size()));
+    }
+    const Range range = rangeOf(field.encoding);
+    for (const std::int64_t number : numbers) {
+        if (number < range.least || number > range.greatest) {
+            throw KitError(key + " takes " + rangeText(field) + ": " + std::to_string(number) +
+                           " does not fit");
+        }
+    }
+    for (std::size_t i = 0; i < numbers.size(); ++i) {
+        putNumber(block, field, i, numbers[i]);
+    }
+}
+
+DpsBlock encodeTuningBlock(const TuningDescription& description) {
+    if (description.raw.size() > DPS_BLOCK_SIZE) {
+        throw KitError("a tuning block has " + std::to_string(DPS_BLOCK_SIZE) + " bytes, not " +
+                       std::to_string(description.raw.size()));
+    }
+    DpsBlock block{};
+    std::copy(description.raw.begin(), description.raw.end(), block.bytes.begin());
+    for (const auto& [key, value] : description.fields) {
+        encodeTuningField(block, key, value);
+    }
+    return block;
+}
+
+} // namespace orvane::kit
