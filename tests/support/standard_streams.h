@@ -1,0 +1,67 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "kit/kit_error.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <string>
+
+namespace orvane::test {
+
+/// Keeps what the process says on its standard output and standard error, from its making until
+/// `stop`. A pipe and no temporary file, so that it works inside any unit; at most 64 KiB.
+class StandardStreams {
+public:
+    StandardStreams() {
+        int ends[2];
+        if (pipe2(ends, O_CLOEXEC | O_NONBLOCK) != 0) {
+            throw kit::systemError("pipe2");
+        }
+        std::fflush(stdout);
+        std::fflush(stderr);
+        readEnd_ = ends[0];
+        formerOutput_ = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, 0);
+        formerError_ = fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, 0);
+        dup2(ends[1], STDOUT_FILENO);
+        dup2(ends[1], STDERR_FILENO);
+        close(ends[1]);
+    }
+    ~StandardStreams() {
+        stop();
+        close(readEnd_);
+    }
+    StandardStreams(const StandardStreams&) = delete;
+    StandardStreams& operator=(const StandardStreams&) = delete;
+
+    /// Lets the process speak again and returns what it said.
+    std::string stop() {
+        if (formerOutput_ != -1) {
+            std::fflush(stdout);
+            std::fflush(stderr);
+            restore(formerOutput_, STDOUT_FILENO);
+            restore(formerError_, STDERR_FILENO);
+        }
+        std::string said;
+        char byte = 0;
+        while (read(readEnd_, &byte, 1) == 1) {
+            said.push_back(byte);
+        }
+        return said;
+    }
+
+private:
+    static void restore(int& former, int stream) {
+        dup2(former, stream);
+        close(former);
+        former = -1;
+    }
+
+    int readEnd_ = -1;
+    int formerOutput_ = -1;
+    int formerError_ = -1;
+};
+
+} // namespace orvane::test

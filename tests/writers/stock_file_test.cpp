@@ -1,0 +1,142 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tests/support/file_event_log.h"
+#include "tests/support/resource_limit.h"
+#include "tests/support/unit_test.h"
+#include "writers/template_merge.h"
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+constexpr char OUTPUT[] = "/tmp/output";
+constexpr char TEMPLATE[] = "/fs/template";
+constexpr char STOCK[] = "/fs/stock";
+constexpr AccessoryFile ACCESSORY_FILE{OUTPUT, TEMPLATE, STOCK};
+
+class StockFileTest : public UnitTest {
+protected:
+    StockFileTest() {
+        writeFile(TEMPLATE, "template\n");
+        writeFile(STOCK, "stock\n");
+    }
+};
+
+} // namespace
+
+TEST_F(StockFileTest, BecomesTheOutput) {
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "stock\n");
+    EXPECT_EQ(readFile(STOCK), "stock\n");
+}
+
+TEST_F(StockFileTest, ReplacesAnOlderLongerOutput) {
+    writeFile(OUTPUT, std::string(20000, 'o'));
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "stock\n");
+}
+
+TEST_F(StockFileTest, IsCopiedByteForByte) {
+    std::string content("\0\r\n\x1a\xff no line end", 17);
+    for (const std::size_t length : std::vector<std::size_t>{1, 17, 511, 4096, 8192, 100000}) {
+        SCOPED_TRACE(length);
+        while (content.size() < length) {
+            content.push_back(static_cast<char>(content.size() % 251));
+        }
+        const std::string stock = content.substr(0, length);
+        writeFile(STOCK, stock);
+        installStockFile(ACCESSORY_FILE);
+        EXPECT_TRUE(readFile(OUTPUT) == stock);
+    }
+}
+
+TEST_F(StockFileTest, GoesThroughStreamsOfItsOwn) {
+    {
+        const TemplateMerge merge(ACCESSORY_FILE);
+        installStockFile(ACCESSORY_FILE);
+        EXPECT_TRUE(merge.output.is_open());
+        EXPECT_TRUE(merge.templateFile.is_open());
+        EXPECT_TRUE(merge.canGenerate());
+        EXPECT_EQ(readFile(OUTPUT), "stock\n");
+    }
+    EXPECT_EQ(readFile(OUTPUT), "stock\n");
+}
+
+TEST_F(StockFileTest, MissingLeavesAnEmptyOutput) {
+    remove(STOCK);
+    writeFile(OUTPUT, "older");
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(StockFileTest, MissingStillCreatesTheOutput) {
+    remove(STOCK);
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(StockFileTest, EmptyLeavesAnEmptyOutput) {
+    writeFile(STOCK, "");
+    writeFile(OUTPUT, "older");
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(StockFileTest, FolderInItsPlaceLeavesAnEmptyOutput) {
+    putFolder(STOCK);
+    writeFile(std::string(STOCK) + "/inner", "inner");
+    writeFile(OUTPUT, "older");
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(StockFileTest, IsNotPutIntoAnOutputThatIsAFolder) {
+    putFolder(OUTPUT);
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_TRUE(std::filesystem::is_empty(OUTPUT));
+}
+
+TEST_F(StockFileTest, GoesNowhereWithoutTheOutputsFolder) {
+    remove("/tmp");
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_FALSE(exists("/tmp"));
+}
+
+TEST_F(StockFileTest, IsOpenedBeforeTheOutput) {
+    writeFile(OUTPUT, "older");
+    {
+        const rlim_t roomForOne = roomForDescriptors(1);
+        const ResourceLimit limit(RLIMIT_NOFILE, roomForOne);
+        installStockFile(ACCESSORY_FILE);
+    }
+    EXPECT_EQ(readFile(OUTPUT), "older");
+}
+
+TEST_F(StockFileTest, IsClosedBeforeTheOutput) {
+    writeFile(OUTPUT, "older");
+    FileEventLog closes(IN_CLOSE, {OUTPUT, STOCK});
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(closes.take(), (std::vector<std::string>{STOCK, OUTPUT}));
+}
+
+TEST_F(StockFileTest, GoesThroughASymlink) {
+    std::filesystem::create_symlink("/fs/rwdata/target", OUTPUT);
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(readFile("/fs/rwdata/target"), "stock\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(OUTPUT));
+}
+
+TEST_F(StockFileTest, ClosesWhatItOpened) {
+    const int before = openDescriptors();
+    installStockFile(ACCESSORY_FILE);
+    remove(STOCK);
+    installStockFile(ACCESSORY_FILE);
+    putFolder(OUTPUT);
+    installStockFile(ACCESSORY_FILE);
+    EXPECT_EQ(openDescriptors(), before);
+}
+
+} // namespace orvane::test

@@ -1,0 +1,283 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tests/support/file_event_log.h"
+#include "tests/support/resource_limit.h"
+#include "tests/support/unit_test.h"
+#include "writers/template_merge.h"
+
+#include <sys/stat.h>
+
+#include <filesystem>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+constexpr char OUTPUT[] = "/tmp/output";
+constexpr char TEMPLATE[] = "/fs/template";
+constexpr AccessoryFile ACCESSORY_FILE{OUTPUT, TEMPLATE, "/fs/stock"};
+
+class TemplateMergeTest : public UnitTest {
+protected:
+    TemplateMergeTest() { writeFile(TEMPLATE, "template\n"); }
+
+    static mode_t modeOf(const std::string& path) {
+        struct stat status {};
+        EXPECT_EQ(::stat(path.c_str(), &status), 0) << path;
+        return status.st_mode & 07777U;
+    }
+};
+
+/// What a whole merge makes of the template.
+void mergeBetween(const std::string& before, const std::string& after) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output << before;
+    merge.copyTemplate();
+    merge.output << after;
+    merge.close();
+}
+
+} // namespace
+
+TEST_F(TemplateMergeTest, PutsTheTemplateBehindWhatWasWritten) {
+    mergeBetween("before\n", "after\n");
+    EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\nafter\n");
+}
+
+TEST_F(TemplateMergeTest, CanGenerateWhenBothAreOpen) {
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_TRUE(merge.canGenerate());
+    EXPECT_TRUE(merge.output.is_open());
+    EXPECT_TRUE(merge.templateFile.is_open());
+}
+
+TEST_F(TemplateMergeTest, CannotGenerateWithoutATemplate) {
+    remove(TEMPLATE);
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_FALSE(merge.canGenerate());
+    EXPECT_TRUE(merge.templateFile.fail());
+    EXPECT_FALSE(merge.output.fail());
+}
+
+TEST_F(TemplateMergeTest, CannotGenerateWithoutAnOutput) {
+    putFolder(OUTPUT);
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_FALSE(merge.canGenerate());
+    EXPECT_FALSE(merge.templateFile.fail());
+    EXPECT_TRUE(merge.output.fail());
+}
+
+TEST_F(TemplateMergeTest, CannotGenerateWithoutEither) {
+    remove(TEMPLATE);
+    putFolder(OUTPUT);
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_FALSE(merge.canGenerate());
+}
+
+TEST_F(TemplateMergeTest, CanGenerateFromATemplateThatIsAFolder) {
+    putFolder(TEMPLATE);
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_TRUE(merge.canGenerate());
+}
+
+TEST_F(TemplateMergeTest, CannotGenerateOnceAStreamHasFailed) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output.setstate(std::ios::badbit);
+    EXPECT_FALSE(merge.canGenerate());
+    merge.output.clear();
+    merge.templateFile.setstate(std::ios::badbit);
+    EXPECT_FALSE(merge.canGenerate());
+    merge.templateFile.clear();
+    EXPECT_TRUE(merge.canGenerate());
+}
+
+TEST_F(TemplateMergeTest, TemplateReadToItsEndStillCounts) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.templateFile.setstate(std::ios::eofbit);
+    EXPECT_TRUE(merge.canGenerate());
+}
+
+TEST_F(TemplateMergeTest, OutputIsOpenedFirst) {
+    const rlim_t roomForOne = roomForDescriptors(1);
+    const ResourceLimit limit(RLIMIT_NOFILE, roomForOne);
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_TRUE(merge.output.is_open());
+    EXPECT_FALSE(merge.templateFile.is_open());
+}
+
+TEST_F(TemplateMergeTest, TemplateIsOpenedLastAndClosedFirst) {
+    writeFile(OUTPUT, "older");
+    FileEventLog opens(IN_OPEN, {OUTPUT, TEMPLATE});
+    FileEventLog closes(IN_CLOSE, {OUTPUT, TEMPLATE});
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.close();
+    EXPECT_EQ(opens.take(), (std::vector<std::string>{OUTPUT, TEMPLATE}));
+    EXPECT_EQ(closes.take(), (std::vector<std::string>{TEMPLATE, OUTPUT}));
+}
+
+TEST_F(TemplateMergeTest, OutputIsTruncatedAtOnce) {
+    writeFile(OUTPUT, "older");
+    const TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(TemplateMergeTest, OutputIsTruncatedWithoutATemplateToo) {
+    remove(TEMPLATE);
+    writeFile(OUTPUT, "older");
+    { const TemplateMerge merge(ACCESSORY_FILE); }
+    EXPECT_EQ(readFile(OUTPUT), "");
+}
+
+TEST_F(TemplateMergeTest, OlderLongerOutputLeavesNothingBehind) {
+    writeFile(OUTPUT, std::string(20000, 'o'));
+    mergeBetween("before\n", "");
+    EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\n");
+}
+
+TEST_F(TemplateMergeTest, NewOutputIsForEveryoneButTheMask) {
+    for (const auto& [mask, mode] : {std::pair<mode_t, mode_t>{0, 0666}, {027, 0640}}) {
+        remove(OUTPUT);
+        const mode_t former = umask(mask);
+        { const TemplateMerge merge(ACCESSORY_FILE); }
+        umask(former);
+        EXPECT_EQ(modeOf(OUTPUT), mode) << mask;
+    }
+}
+
+TEST_F(TemplateMergeTest, OlderOutputIsTheSameFileAfterwards) {
+    writeFile(OUTPUT, "older");
+    std::filesystem::create_hard_link(OUTPUT, "/tmp/other-name");
+    ASSERT_EQ(chmod(OUTPUT, 0600), 0);
+    mergeBetween("", "");
+    EXPECT_EQ(readFile("/tmp/other-name"), "template\n");
+    EXPECT_EQ(modeOf(OUTPUT), 0600U);
+}
+
+TEST_F(TemplateMergeTest, OutputThroughASymlinkReachesItsTarget) {
+    std::filesystem::create_symlink("/fs/rwdata/target", OUTPUT);
+    mergeBetween("", "");
+    EXPECT_EQ(readFile("/fs/rwdata/target"), "template\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(OUTPUT));
+}
+
+TEST_F(TemplateMergeTest, CopiesEveryByteOfAnyTemplate) {
+    std::string allBytes;
+    for (int byte = 0; byte < 256; ++byte) {
+        allBytes.push_back(static_cast<char>(byte));
+    }
+    for (const std::string& content :
+         {std::string("x"), std::string(1, '\0'), std::string("\n"), std::string("no line end"),
+          std::string("a\r\nb\x1a\r\n"), std::string("\xEF\xBB\xBFtext\n"), allBytes}) {
+        SCOPED_TRACE(content);
+        writeFile(TEMPLATE, content);
+        mergeBetween("<", ">");
+        EXPECT_EQ(readFile(OUTPUT), "<" + content + ">");
+    }
+}
+
+TEST_F(TemplateMergeTest, CopiesTemplatesOfAnyLength) {
+    const std::vector<std::size_t> lengths{511,  512,  1023, 1024, 4095,  4096,  4097,
+                                           8190, 8191, 8192, 8193, 16384, 100000};
+    for (const std::size_t length : lengths) {
+        SCOPED_TRACE(length);
+        std::string content;
+        for (std::size_t i = 0; i < length; ++i) {
+            content.push_back(static_cast<char>('a' + i % 23));
+        }
+        writeFile(TEMPLATE, content);
+        mergeBetween("<", ">");
+        EXPECT_TRUE(readFile(OUTPUT) == "<" + content + ">");
+    }
+}
+
+TEST_F(TemplateMergeTest, CopiesOnlyWhatRemainsOfTheTemplate) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    ASSERT_EQ(merge.templateFile.get(), 't');
+    merge.copyTemplate();
+    merge.close();
+    EXPECT_EQ(readFile(OUTPUT), "emplate\n");
+}
+
+TEST_F(TemplateMergeTest, CopyOfSomethingLeavesTheOutputGood) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.copyTemplate();
+    EXPECT_FALSE(merge.output.fail());
+    merge.close();
+    EXPECT_FALSE(merge.output.fail());
+    EXPECT_FALSE(merge.templateFile.fail());
+}
+
+TEST_F(TemplateMergeTest, EmptyTemplateEndsTheOutput) {
+    writeFile(TEMPLATE, "");
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output << "before\n";
+    merge.copyTemplate();
+    EXPECT_TRUE(merge.output.fail());
+    merge.output << "after\n";
+    merge.close();
+    EXPECT_TRUE(merge.output.fail());
+    EXPECT_EQ(readFile(OUTPUT), "before\n");
+}
+
+TEST_F(TemplateMergeTest, AbsentTemplateEndsTheOutput) {
+    remove(TEMPLATE);
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output << "before\n";
+    merge.copyTemplate();
+    EXPECT_TRUE(merge.output.fail());
+    merge.output << "after\n";
+    merge.close();
+    EXPECT_EQ(readFile(OUTPUT), "before\n");
+}
+
+TEST_F(TemplateMergeTest, FolderAsATemplateEndsTheOutput) {
+    putFolder(TEMPLATE);
+    writeFile(std::string(TEMPLATE) + "/inner", "inner");
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output << "before\n";
+    merge.copyTemplate();
+    EXPECT_TRUE(merge.output.fail());
+    merge.output << "after\n";
+    merge.close();
+    EXPECT_EQ(readFile(OUTPUT), "before\n");
+}
+
+TEST_F(TemplateMergeTest, CopyIntoAnOutputThatIsNotOpenWritesNowhere) {
+    putFolder(OUTPUT);
+    mergeBetween("before\n", "after\n");
+    EXPECT_TRUE(std::filesystem::is_empty(OUTPUT));
+    EXPECT_EQ(readFile(TEMPLATE), "template\n");
+}
+
+TEST_F(TemplateMergeTest, CloseClosesBoth) {
+    const int before = openDescriptors();
+    TemplateMerge merge(ACCESSORY_FILE);
+    EXPECT_EQ(openDescriptors(), before + 2);
+    merge.close();
+    EXPECT_FALSE(merge.output.is_open());
+    EXPECT_FALSE(merge.templateFile.is_open());
+    EXPECT_EQ(openDescriptors(), before);
+}
+
+TEST_F(TemplateMergeTest, CloseFailsTheOutputThatCannotBeWrittenWhole) {
+    TemplateMerge merge(ACCESSORY_FILE);
+    merge.output << std::string(1000, 'x');
+    EXPECT_FALSE(merge.output.fail());
+    {
+        const ResourceLimit limit(RLIMIT_FSIZE, 100);
+        merge.close();
+    }
+    EXPECT_TRUE(merge.output.fail());
+    EXPECT_FALSE(merge.templateFile.fail());
+    EXPECT_EQ(readFile(OUTPUT), std::string(100, 'x'));
+}
+
+TEST_F(TemplateMergeTest, EndOfTheMergeClosesBoth) {
+    const int before = openDescriptors();
+    { const TemplateMerge merge(ACCESSORY_FILE); }
+    EXPECT_EQ(openDescriptors(), before);
+}
+
+} // namespace orvane::test
