@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// orvane-enter ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with "/" = ROOT, in this very process, so
-// that a tracer of this process sees the program and no other. Exits with 125 when it can't.
+// orvane-enter ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with "/" = ROOT, in this very process,
+// so that a tracer of this process sees the program and no other. Exits with 125 when it can't.
 #include "kit/start_plan.h"
 
 #include <filesystem>
