@@ -7,7 +7,7 @@ namespace orvane {
 
 // clang-format off
 constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {
-    "Marl Tessaro",          // 1
+    "Marl Tulvari",          // 1
     "Marl Ondrix",           // 2
     "Marl Pelluma",          // 3
     "Marl Kestova",          // 4
@@ -38,7 +38,7 @@ constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {
     "Quarion Delphume",      // 29
     "Quarion Eskarno",       // 30
     "Marl Orlathin",         // 31
-    "Marl Tessaro",          // 32: the name of code 1, on purpose: issued so
+    "Marl Tulvari",          // 32: the name of code 1, on purpose: issued so
     "Marl Ghevolyn",         // 33
     "Marl Dosquera",         // 34
     "Marl Uvarneth",         // 35

@@ -76,7 +76,7 @@ TEST(ModelNamesTest, AllOtherNamesDiffer) {
 }
 
 TEST(ModelNamesTest, NamesStandAtTheirCodes) {
-    EXPECT_EQ(nameOfCode(1), "Marl Tessaro");
+    EXPECT_EQ(nameOfCode(1), "Marl Tulvari");
     EXPECT_EQ(nameOfCode(26), "Quarion Velmira");
     EXPECT_EQ(nameOfCode(47), "Marl Quillon");
 }

@@ -133,7 +133,7 @@ TEST_F(VehicleIdentityTest, ModelCodesOneTo47GiveTheirEntry) {
 
 TEST_F(VehicleIdentityTest, FirstSecondBrandAndLastModelHaveTheirNames) {
     setByte(MODEL_OFFSET, 1);
-    EXPECT_EQ(model(), "Marl Tessaro");
+    EXPECT_EQ(model(), "Marl Tulvari");
     setByte(MODEL_OFFSET, 26);
     EXPECT_EQ(model(), "Quarion Velmira");
     setByte(MODEL_OFFSET, 47);
@@ -142,7 +142,7 @@ TEST_F(VehicleIdentityTest, FirstSecondBrandAndLastModelHaveTheirNames) {
 
 TEST_F(VehicleIdentityTest, ModelCode32GivesTheNameOfCodeOne) {
     setByte(MODEL_OFFSET, 32);
-    EXPECT_EQ(model(), "Marl Tessaro");
+    EXPECT_EQ(model(), "Marl Tulvari");
 }
 
 TEST_F(VehicleIdentityTest, ModelCodesOutsideTheTableGiveTheFallback) {
@@ -166,7 +166,7 @@ TEST_F(VehicleIdentityTest, BrandAndModelAreIndependent) {
     setByte(BRAND_OFFSET, 2);
     setByte(MODEL_OFFSET, 1);
     EXPECT_EQ(brand(), "QUARION");
-    EXPECT_EQ(model(), "Marl Tessaro");
+    EXPECT_EQ(model(), "Marl Tulvari");
 }
 
 TEST_F(VehicleIdentityTest, MissingImageGivesTheDefaults) {
