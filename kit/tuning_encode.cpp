@@ -72,8 +72,7 @@ std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& va
 /// Puts one number, known to be in range.
 void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std::int64_t number) {
     const auto bits = static_cast<std::uint16_t>(number); // two's complement
-    const std::size_t width = field.encoding == DpsEncoding::i16 ? 2 : 1;
-    const std::size_t at = field.offset + element * width;
+    const std::size_t at = field.offset + element * dpsElementSize(field.encoding);
     switch (field.encoding) {
     case DpsEncoding::code2:
         block.bytes[at] = static_cast<std::uint8_t>((block.bytes[at] & ~(3U << field.bit)) |

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit.h"
 
+#include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "config/param_catalogue.h"
 #include "config/record_area.h"

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/boot_disk.h"
 
-#include "config/record_area.h"
-
 #include <fcntl.h>
 #include <unistd.h>
 

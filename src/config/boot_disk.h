@@ -5,6 +5,8 @@
 
 namespace orvane {
 
+constexpr char BOOT_DISK[] = "/dev/hd0";
+
 /// The raw boot disk, open for one transfer at a place that is counted from its end. Owns the
 /// descriptor.
 class BootDisk {

@@ -36,8 +36,37 @@ constexpr bool idsEndIn00A0() {
     return true;
 }
 
+constexpr bool groupsAscend() {
+    std::uint32_t group = 0;
+    for (const ParamDescriptor& row : ParamCatalogue.rows) {
+        if (row.group != group && row.group != group + 1) {
+            return false;
+        }
+        group = row.group;
+    }
+    return group == NO_GROUP - 1;
+}
+
+constexpr std::size_t countFullMasks() {
+    std::size_t count = 0;
+    for (const ParamDescriptor& row : ParamCatalogue.rows) {
+        count += row.mask == 0xFFFFFFFFU ? 1 : 0;
+    }
+    return count;
+}
+
+constexpr std::size_t countDefaults() {
+    std::size_t count = 0;
+    for (const ParamDescriptor& row : ParamCatalogue.rows) {
+        count += row.defaultValue != 0 ? 1 : 0;
+    }
+    return count;
+}
+
 static_assert(rowsPackTheImage());
+static_assert(groupsAscend());
 static_assert(idsEndIn00A0());
+static_assert(countDefaults() == 4 && countFullMasks() == 117);
 static_assert(sizeof(ParamDescriptor) == 7 * sizeof(std::uint32_t));
 static_assert(sizeof(ParamTable) == 4824, "nothing between the sizes and the rows, nor after");
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The rows of the parameter catalogue as issued with the vehicle line, one a line.
+// The rows of the parameter catalogue as issued, one a line.
 #pragma once
 
 #include "config/param_catalogue.h"
@@ -74,7 +74,7 @@ constexpr std::array<ParamDescriptor, PARAM_COUNT> PARAM_ROWS = {
     ParamDescriptor{ 62, 0, 0,  61, 0x005300A0,  0, 0xFFFFFFFF},
     ParamDescriptor{ 63, 0, 0,  62, 0x005400A0,  0, 0xFFFFFFFF},
     ParamDescriptor{ 64, 0, 0,  63, 0x005500A0,  0, 0xFFFFFFFF},
-    ParamDescriptor{ 65, 0, 0,  64, 0x005600A0,  0, 0xFFFFFFFF}, // id code 86, as parameter 120: issued so
+    ParamDescriptor{ 65, 0, 0,  64, 0x005600A0,  0, 0xFFFFFFFF}, // id code 86, as parameter 120, on purpose
     ParamDescriptor{ 66, 0, 0,  65, 0x005700A0,  0, 0xFFFFFFFF},
     ParamDescriptor{ 67, 0, 0,  66, 0x005800A0,  0, 0xFFFFFFFF},
     ParamDescriptor{ 68, 0, 0,  67, 0x005A00A0,  0, 0xFFFFFFFF},
@@ -129,7 +129,7 @@ constexpr std::array<ParamDescriptor, PARAM_COUNT> PARAM_ROWS = {
     ParamDescriptor{117, 0, 1, 116, 0x00A800A0,  0, 0x7FFFFFE0},
     ParamDescriptor{118, 0, 1, 117, 0x00B400A0,  0, 0x7FFFFFE0},
     ParamDescriptor{119, 0, 1, 118, 0x00A100A0,  0, 0x00000004},
-    ParamDescriptor{120, 0, 1, 119, 0x005600A0,  0, 0x7FFFFFC0}, // id code 86, as parameter 65: issued so
+    ParamDescriptor{120, 0, 1, 119, 0x005600A0,  0, 0x7FFFFFC0}, // id code 86, as parameter 65, on purpose
     ParamDescriptor{121, 0, 1, 120, 0x00B600A0,  0, 0x7FFFFFC0},
     ParamDescriptor{122, 0, 1, 121, 0x00B700A0,  0, 0x7FFFFF80},
     ParamDescriptor{123, 0, 1, 122, 0x00CD00A0,  0, 0x7FFFFF80},
@@ -180,7 +180,8 @@ constexpr std::array<ParamDescriptor, PARAM_COUNT> PARAM_ROWS = {
     ParamDescriptor{168, 0, 7, 175, 0x00C600A0,  0, 0x7FFFFFC0},
     ParamDescriptor{169, 0, 7, 176, 0x00C700A0,  0, 0x7FFFFFC0},
     ParamDescriptor{170, 0, 7, 177, 0x00C800A0,  0, 0x7FFFFF80},
-    ParamDescriptor{171, 0, 7, 178, 0x00C900A0,  0, 0x7FFFFF80},};
+    ParamDescriptor{171, 0, 7, 178, 0x00C900A0,  0, 0x7FFFFF80},
+};
 // clang-format on
 
 } // namespace orvane

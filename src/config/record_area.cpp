@@ -18,15 +18,6 @@ namespace {
 constexpr std::int32_t SUCCESS = 0;
 constexpr std::int32_t FAILURE = -1;
 
-/// The fixed areas begin so many bytes before the end of the device: 3072 and 4096 past the base.
-constexpr std::int64_t AUX_AREA_START = 0xFF400;
-constexpr std::int64_t TUNING_AREA_START = 0xFF000;
-static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072);
-static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096);
-
-/// The CRC is taken over slot 15, which begins one byte past the base.
-constexpr std::int64_t CRC_RANGE_START = 0xFFFFF;
-
 struct SlotPlace {
     std::uint32_t size = 0;
     std::uint64_t offset = NO_SLOT_OFFSET;
@@ -43,7 +34,7 @@ std::int32_t readArea(std::int64_t bytesBeforeEnd, std::uint32_t maxLength, void
     if (buffer == nullptr || length == 0 || length > maxLength) {
         return FAILURE;
     }
-    BootDisk disk(O_RDONLY);
+    const BootDisk disk(O_RDONLY);
     return disk.seekFromEnd(bytesBeforeEnd) && disk.read(buffer, length) ? SUCCESS : FAILURE;
 }
 
@@ -52,7 +43,7 @@ std::int32_t writeArea(std::int64_t bytesBeforeEnd, std::uint32_t maxLength, con
     if (buffer == nullptr || length == 0 || length > maxLength) {
         return FAILURE;
     }
-    BootDisk disk(O_WRONLY);
+    const BootDisk disk(O_WRONLY);
     return disk.seekFromEnd(bytesBeforeEnd) && disk.write(buffer, length) ? SUCCESS : FAILURE;
 }
 
@@ -63,10 +54,7 @@ std::int32_t readRecordSlot(std::uint32_t slot, void* buffer, std::uint32_t leng
         return FAILURE;
     }
     std::memset(buffer, 0, length); // before anything can fail: a failed read leaves zeros
-    BootDisk disk(O_RDONLY);
-    if (!disk.isOpen()) {
-        return FAILURE;
-    }
+    const BootDisk disk(O_RDONLY);  // before the slot is looked up
     const SlotPlace place(slot);
     if (!place.isKnown() || !disk.seekFromEnd(place.bytesBeforeEnd())) {
         return FAILURE;
@@ -78,10 +66,7 @@ std::int32_t writeRecordSlot(std::uint32_t slot, const void* buffer, std::uint32
     if (buffer == nullptr || length == 0) {
         return FAILURE;
     }
-    BootDisk disk(O_WRONLY); // before the slot is looked up, as in readRecordSlot
-    if (!disk.isOpen()) {
-        return FAILURE;
-    }
+    const BootDisk disk(O_WRONLY); // before the slot is looked up
     const SlotPlace place(slot);
     if (!place.isKnown()) {
         return FAILURE;

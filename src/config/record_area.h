@@ -5,15 +5,11 @@
 // that comes out short counts as success. All return 0 or -1; none tells causes apart.
 #pragma once
 
+#include "config/record_slots.h"
+
 #include <cstdint>
 
 namespace orvane {
-
-constexpr char BOOT_DISK[] = "/dev/hd0";
-
-/// Longest transfer of each fixed area, in bytes.
-constexpr std::uint32_t AUX_AREA_SIZE = 1024;
-constexpr std::uint32_t TUNING_AREA_SIZE = 4096;
 
 /// Reads record slot 0 to 17 into `buffer`. All `length` bytes of the buffer are zeroed first, so a
 /// failure leaves zeros; a shorter buffer gets the slot's first bytes, a longer one keeps zeros

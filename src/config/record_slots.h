@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Where things lie in the record area, the last mebibyte of the boot disk. All positions are
-// relative to the end of the device, so the layout holds on disks of any size.
+// Where things lie in the record area (RecordArea), the last mebibyte of the boot disk. All
+// positions are relative to the end of the device, so the layout holds on disks of any size.
 #pragma once
 
 #include <cstdint>
@@ -10,6 +10,18 @@ namespace orvane {
 
 /// The area's base: bytes before the end of the device.
 constexpr std::int64_t RECORD_AREA_SIZE = 0x100000;
+
+/// The fixed areas begin so many bytes before the end of the device, and are at most so long.
+constexpr std::int64_t AUX_AREA_START = 0xFF400;
+constexpr std::int64_t TUNING_AREA_START = 0xFF000;
+constexpr std::uint32_t AUX_AREA_SIZE = 1024;
+constexpr std::uint32_t TUNING_AREA_SIZE = 4096;
+static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072);
+static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096);
+
+/// The CRC is taken over slot 15, which begins one byte past the base.
+constexpr std::int64_t CRC_RANGE_START = 0xFFFFF;
+static_assert(RECORD_AREA_SIZE - CRC_RANGE_START == 1);
 
 constexpr std::uint32_t RECORD_SLOT_COUNT = 18;
 /// The longest slot, slot 15, in bytes.

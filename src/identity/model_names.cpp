@@ -38,7 +38,7 @@ constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {
     "Quarion Delphume",      // 29
     "Quarion Eskarno",       // 30
     "Marl Orlathin",         // 31
-    "Marl Tulvari",          // 32: the name of code 1, on purpose: issued so
+    "Marl Tulvari",          // 32: the name of code 1, on purpose
     "Marl Ghevolyn",         // 33
     "Marl Dosquera",         // 34
     "Marl Uvarneth",         // 35
@@ -77,7 +77,23 @@ constexpr bool namesHaveTheirShape() {
     return true;
 }
 
+/// Every code has a name of its own, but for code 32, which has that of code 1.
+constexpr bool namesDifferButForTheAlias() {
+    constexpr std::size_t ALIAS = 32;
+    for (std::size_t code = 1; code <= MODEL_CODE_COUNT; ++code) {
+        for (std::size_t other = 1; other < code; ++other) {
+            const bool isSame =
+                std::string_view(ModelNameTable[code - 1]) == ModelNameTable[other - 1];
+            if (isSame != (code == ALIAS && other == 1)) {
+                return false;
+            }
+        }
+    }
+    return true;
+}
+
 static_assert(namesHaveTheirShape());
+static_assert(namesDifferButForTheAlias());
 
 } // namespace
 

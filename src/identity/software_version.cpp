@@ -37,7 +37,8 @@ void scanVersionFiles() {
     }
     while (const dirent* entry = readdir(folder)) {
         const std::string path = std::string(VERSION_DIR) + entry->d_name;
-        // Anywhere in the name, not only at its end: a.info and b.inf.old are taken too.
+        // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old are taken
+        // too.
         if (path.find(INF_MARKER) != std::string::npos) {
             Inf_Data record;
             readInfFile(path, record);
@@ -49,7 +50,7 @@ void scanVersionFiles() {
 
 std::string selectVersion() {
     for (const Inf_Data& record : InfRecords) {
-        // A substring test: a type of MainApplication is taken too.
+        // A substring test, on purpose: a type of MainApplication is taken too.
         if (infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos) {
             return infValue(record, VERSION_KEY);
         }

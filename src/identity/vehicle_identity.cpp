@@ -7,6 +7,7 @@
 #include "identity/model_names.h"
 
 #include <array>
+#include <cstddef>
 
 namespace orvane {
 
@@ -60,7 +61,8 @@ void getModelName(std::string& model) {
 
 void getUnitSerial(std::string& serial) {
     // Longer than the slot's 8 bytes, so that the text is always terminated.
-    std::array<char, 12> text{};
+    constexpr std::size_t SERIAL_BUFFER_SIZE = 12;
+    std::array<char, SERIAL_BUFFER_SIZE> text{};
     if (readRecordSlot(SERIAL_RECORD_SLOT, text.data(), text.size()) != 0) {
         serial = DEFAULT_UNIT_SERIAL;
         return;

@@ -16,11 +16,12 @@ constexpr std::uint16_t FUEL_TYPE_PARAM = 50;
 constexpr std::uint16_t MODEL_PARAM = 139;
 constexpr std::uint32_t SERIAL_RECORD_SLOT = 9;
 
-/// Eleven characters, more than a serial slot holds, on purpose: no real unit's serial equals it.
+/// Eleven characters, more than a serial slot holds, on purpose.
 constexpr char DEFAULT_UNIT_SERIAL[] = "ABCD1234abc";
 constexpr char MODEL_NAME_FALLBACK[] = "VOXA";
 
-/// The raw value of RIGHT_HAND_DRIVE_PARAM, 0 to 255, not reduced to 0 or 1. 0 when there is none.
+/// The raw value of RIGHT_HAND_DRIVE_PARAM, 0 to 255, on purpose not reduced to 0 or 1. 0 when
+/// there is none.
 unsigned int getRightHandDrive();
 
 /// Sets `brand` to "QUARION" for brand code 2, else to "MARL".

@@ -67,14 +67,8 @@ constexpr std::array<QwaWord, 3> qwaModeWords = {{
 
 namespace {
 
-constexpr std::size_t I16_SIZE = 2; // bytes
-
-constexpr std::size_t elementSize(DpsEncoding encoding) {
-    return encoding == DpsEncoding::i16 ? I16_SIZE : 1;
-}
-
-/// Each field begins at or behind the end of the one before it, in bits, and the last ends in the
-/// block; only lists have several elements, and those are of 16 bits.
+/// Each field begins at or behind the end of the one before it, in bits, and the last ends
+/// with the bytes that are read; only lists have several elements, and those are of 16 bits.
 constexpr bool fieldsAscendWithoutOverlap() {
     std::size_t end = 0; // bits
     for (const DpsField& field : DPS_LAYOUT) {
@@ -84,13 +78,13 @@ constexpr bool fieldsAscendWithoutOverlap() {
         }
         end = begin + (field.encoding == DpsEncoding::code2
                            ? 2
-                           : 8 * elementSize(field.encoding) * field.count);
+                           : 8 * dpsElementSize(field.encoding) * field.count);
         const bool isList = field.kind == DpsKind::list;
         if (isList != (field.count > 1) || (isList && field.encoding != DpsEncoding::i16)) {
             return false;
         }
     }
-    return end == std::size_t{179} * 8;
+    return end == DPS_BYTES_READ * 8;
 }
 
 constexpr std::size_t countKind(DpsKind kind) {
@@ -102,7 +96,7 @@ constexpr std::size_t countKind(DpsKind kind) {
 }
 
 static_assert(fieldsAscendWithoutOverlap());
-static_assert(countKind(DpsKind::switchWord) == 19 && countKind(DpsKind::modeWord) == 1);
+static_assert(countKind(DpsKind::switchWord) == 16 + 3 && countKind(DpsKind::modeWord) == 1);
 static_assert(countKind(DpsKind::number) == 12 && countKind(DpsKind::list) == 12);
 
 /// Two's complement, low byte first, whatever this processor's own order.
@@ -114,7 +108,7 @@ std::int32_t decodeI16(const std::uint8_t* bytes) {
 
 std::int32_t decodeField(const DpsBlock& block, const DpsField& field, std::size_t element) {
     const std::uint8_t* const bytes =
-        block.bytes.data() + field.offset + element * elementSize(field.encoding);
+        block.bytes.data() + field.offset + element * dpsElementSize(field.encoding);
     switch (field.encoding) {
     case DpsEncoding::code2:
         return *bytes >> field.bit & 3;

@@ -17,6 +17,9 @@ constexpr std::size_t DPS_AREA_SIZE = 1880; ///< bytes
 constexpr std::int32_t DPS_BLOCK_SPEECHREC = 2;
 constexpr std::int32_t DPS_BLOCK_TELEPHONY = 3;
 
+/// Bytes at the start of a block that hold fields; those behind them are not read.
+constexpr std::size_t DPS_BYTES_READ = 179;
+
 /// One packed block; 16-bit fields may begin at odd offsets. Any content is accepted.
 struct DpsBlock {
     std::array<std::uint8_t, DPS_BLOCK_SIZE> bytes;
@@ -52,8 +55,14 @@ struct DpsField {
     std::uint8_t count; ///< elements; 1 but for lists
 };
 
+/// Bytes of one element; a code2 is part of one.
+constexpr std::size_t dpsElementSize(DpsEncoding encoding) {
+    return encoding == DpsEncoding::i16 ? 2 : 1;
+}
+
 constexpr std::size_t DPS_FIELD_COUNT = 44;
 
+/// All fields of a block, in ascending order of their places.
 extern const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT;
 
 /// The value of element `element` (0 to count - 1) of `field` in `block`: -32768 to 32767.
@@ -65,6 +74,7 @@ struct QwaWord {
     const char* word;
 };
 
+/// The words of the switches, whatever their width, and those of the one mode.
 extern const std::array<QwaWord, 3> qwaSwitchWords;
 extern const std::array<QwaWord, 3> qwaModeWords;
 
