@@ -45,7 +45,7 @@ void generateTuningFile(std::int32_t blockId, const std::string& path) {
         return;
     }
     const DpsBlock& block = area[static_cast<std::size_t>(blockId)];
-    // "Genereated" is part of the format. Every line is flushed by itself, on purpose.
+    // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
     file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
     for (const DpsField& field : DPS_LAYOUT) {
         file << field.key << ' ';

@@ -45,7 +45,7 @@ void writeHead(std::ostream& file, const AirplayValues& values) {
              << "audioProfile = " << values.audioProfile << std::endl
              << std::endl;
     }
-    // The comment ends so, in mid-sentence.
+    // The comment ends in mid-sentence, on purpose.
     file << "# rightHandDrive mode setting right" << std::endl
          << "rightHandDrive = " << values.rightHandDrive << std::endl
          << std::endl;

@@ -5,6 +5,7 @@
 #include "identity/vehicle_identity.h"
 #include "writers/template_merge.h"
 
+#include <fstream>
 #include <ostream>
 #include <string>
 
@@ -73,9 +74,9 @@ void writeIap2File(TemplateMerge& merge, const IapValues& values) {
     merge.close();
 }
 
-/// Follows the iAP2 output, not its own template, on purpose: with a failed `iap2Output` (an empty
-/// iAP2 template or a failed close count) it takes the stock file, and its own template may be
-/// missing, which leaves out the template's lines only.
+/// Tests the iAP2 output, then its own, and not its own template, on purpose. So a failed iAP2
+/// output (not opened, not written whole, or its template empty) makes this file its stock file,
+/// and a missing template leaves out the template's lines only.
 void writeIap1File(TemplateMerge& merge, const std::ofstream& iap2Output, const IapValues& values) {
     if (iap2Output.fail() || merge.output.fail()) {
         installStockFile(IAP1_FILE);
@@ -83,7 +84,7 @@ void writeIap1File(TemplateMerge& merge, const std::ofstream& iap2Output, const 
     }
     writeAccessoryBlock(merge.output, values);
     merge.output << "hardware_version=010000\n";
-    merge.output << "rfcert=00000000 \n\n"; // with the blank
+    merge.output << "rfcert=00000000 \n\n"; // the blank is there on purpose
     merge.copyTemplate();
     merge.close();
 }
@@ -106,7 +107,7 @@ int updateIapConfigFiles() {
     TemplateMerge iap2(IAP2_FILE);
     writeIap2File(iap2, values);
 
-    // The oldest of the three files carries the six-digit form.
+    // iap1.cfg alone carries the six-digit form. The switch comes whatever became of iap2.cfg.
     values.firmwareVersion = softwareVersion();
 
     TemplateMerge iap1(IAP1_FILE);

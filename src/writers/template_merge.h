@@ -16,7 +16,7 @@ struct AccessoryFile {
 };
 
 /// The streams of one merge. A stream that could not be opened is failed, and what is written to it
-/// is dropped. Opening is all that sets a stream's state before the lines are written.
+/// is dropped.
 struct TemplateMerge {
     /// Opens the output for writing (created, or truncated at once), then the template for reading.
     explicit TemplateMerge(const AccessoryFile& file);
