@@ -18,9 +18,9 @@ namespace orvane::kit {
 namespace {
 
 constexpr char REMEDY[] =
-    " (run as root, or under `unshare -r`, or allow unprivileged user namespaces: "
-    "`sysctl kernel.unprivileged_userns_clone=1`, with AppArmor "
-    "`sysctl kernel.apparmor_restrict_unprivileged_userns=0`)";
+    " (run as root with CAP_SYS_CHROOT; or under an emulator with `unshare -r`; or allow user "
+    "namespaces: `sysctl user.max_user_namespaces=1000 kernel.unprivileged_userns_clone=1`, with "
+    "AppArmor also `kernel.apparmor_restrict_unprivileged_userns=0`)";
 
 /// A mapping file of /proc takes its whole text in one write.
 bool writeProcFile(const char* path, const std::string& text) {

@@ -11,11 +11,13 @@
 
 #include <cstdint>
 #include <string>
+#include <utility>
 
 namespace orvane::kit {
 
 using Place = toml::source_region;
 
+/// Throws KitError with "name:line:column:" in front.
 [[noreturn]] inline void failAt(const Place& place, const std::string& what) {
     throw KitError(*place.path + ":" + std::to_string(place.begin.line) + ":" +
                    std::to_string(place.begin.column) + ": " + what);
@@ -31,11 +33,14 @@ auto at(const Place& place, const Action& action) {
     }
 }
 
+/// Throws for a key that `where` does not know; `known` lists those that it does.
 [[noreturn]] inline void failUnknown(const toml::key& key, const char* where, const char* known) {
     failAt(key.source(),
            "unknown key \"" + std::string(key.str()) + "\" in " + where + ": it takes " + known);
 }
 
+/// The node as a table, a text, a whole number, and a number from 0 to `greatest`. Each throws with
+/// the node's place when it is anything else; `what` names it there.
 inline const toml::table& tableOf(const toml::key& key, const toml::node& node) {
     const toml::table* table = node.as_table();
     if (table == nullptr) {

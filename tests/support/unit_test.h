@@ -19,7 +19,7 @@ namespace orvane::test {
 
 constexpr char IMAGE_PATH[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM";
 constexpr char DISK_PATH[] = "/dev/hd0";
-constexpr std::uint64_t MEBIBYTE = 1024 * 1024;
+constexpr std::uint64_t MEBIBYTE = std::uint64_t{1024} * 1024;
 
 /// Files of the unit, as bytes. Parents must exist. A failure is a test failure.
 std::string readFile(const std::string& path);

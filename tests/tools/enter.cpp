@@ -9,18 +9,23 @@
 #include <string>
 #include <vector>
 
+namespace {
+
+void enter(const std::vector<std::string>& words) {
+    if (words.size() < 3) {
+        throw orvane::kit::KitError("wants ROOT PROGRAM [ARGUMENT...]");
+    }
+    const std::filesystem::path root = std::filesystem::absolute(words[1]);
+    orvane::kit::executePlan(orvane::kit::planStart({words[2], {words.begin() + 3, words.end()}}),
+                             root);
+}
+
+} // namespace
+
 int main(int argc, char* argv[]) {
     constexpr int CANNOT_ENTER = 125;
-    const std::vector<std::string> words(argv + 1, argv + argc);
-    if (words.size() < 2) {
-        std::cerr << "orvane-enter: wants ROOT PROGRAM [ARGUMENT...]\n";
-        return CANNOT_ENTER;
-    }
     try {
-        const std::filesystem::path root = std::filesystem::absolute(words[0]);
-        const std::filesystem::path program = words[1];
-        orvane::kit::executePlan(
-            orvane::kit::planStart({program, {words.begin() + 2, words.end()}}), root);
+        enter({argv, argv + argc});
     } catch (const std::exception& failure) {
         std::cerr << "orvane-enter: " << failure.what() << '\n';
     }
