@@ -11,6 +11,8 @@
 #include <cstdint>
 #include <cstdlib>
 #include <limits>
+#include <memory>
+#include <utility>
 #include <vector>
 
 namespace orvane {
@@ -29,23 +31,26 @@ constexpr char AFFIX_SEPARATOR = '_';
 /// empties them first.
 std::vector<Inf_Data> InfRecords;
 
+struct CloseFolder {
+    void operator()(DIR* folder) const { closedir(folder); }
+};
+
 void scanVersionFiles() {
     InfRecords.clear();
-    DIR* const folder = opendir(VERSION_DIR);
+    const std::unique_ptr<DIR, CloseFolder> folder(opendir(VERSION_DIR));
     if (folder == nullptr) {
         return;
     }
-    while (const dirent* entry = readdir(folder)) {
+    while (const dirent* entry = readdir(folder.get())) {
         const std::string path = std::string(VERSION_DIR) + entry->d_name;
         // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old are taken
         // too.
         if (path.find(INF_MARKER) != std::string::npos) {
             Inf_Data record;
             readInfFile(path, record);
-            InfRecords.push_back(record);
+            InfRecords.push_back(std::move(record));
         }
     }
-    closedir(folder);
 }
 
 std::string selectVersion() {
@@ -72,12 +77,20 @@ std::string after(const std::string& text, char separator) {
 } // namespace
 
 std::string softwareVersion() {
-    return formatVersion(findApplicationVersion());
+    try {
+        return formatVersion(findApplicationVersion());
+    } catch (...) {
+        return DEFAULT_SOFTWARE_VERSION;
+    }
 }
 
 std::string findApplicationVersion() {
-    scanVersionFiles();
-    return after(selectVersion(), AFFIX_SEPARATOR);
+    try {
+        scanVersionFiles();
+        return after(selectVersion(), AFFIX_SEPARATOR);
+    } catch (...) {
+        return {}; // files that memory can't hold are files that can't be read
+    }
 }
 
 std::string formatVersion(const std::string& text) {

@@ -13,12 +13,13 @@ constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 /// What softwareVersion gives when there is no usable version.
 constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 
-/// formatVersion of findApplicationVersion.
+/// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out.
 std::string softwareVersion();
 
 /// Scans VERSION_DIR afresh and returns the "Version Number" of the first file, in the order of the
 /// directory listing, whose "Type" contains "Application"; of that, what follows its first "_" if
-/// it has one. The empty string when there is no such file, value or folder.
+/// it has one. The empty string when there is no such file, value or folder, or when memory runs
+/// out.
 std::string findApplicationVersion();
 
 /// The first three components of a version text, two hexadecimal digits each; "000000" for an empty

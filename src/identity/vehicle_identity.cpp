@@ -56,7 +56,12 @@ void getFuelType(std::string& fuelType) {
 
 void getModelName(std::string& model) {
     const std::uint8_t code = paramOrZero(MODEL_PARAM);
-    model = code >= 1 && code <= MODEL_CODE_COUNT ? ModelNameTable[code - 1U] : MODEL_NAME_FALLBACK;
+    const bool hasName = code >= 1 && code <= MODEL_CODE_COUNT;
+    try {
+        model = hasName ? ModelNameTable[code - 1U] : MODEL_NAME_FALLBACK;
+    } catch (...) {
+        model = MODEL_NAME_FALLBACK; // short enough to need no memory
+    }
 }
 
 void getUnitSerial(std::string& serial) {

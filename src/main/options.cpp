@@ -7,15 +7,30 @@
 
 namespace orvane {
 
+namespace {
+
+/// Runs one writer. All that can come out of one is that memory ran out where no default stands in:
+/// the writer ends there, as silently as after any other failure, and the next option runs.
+void run(int (*writer)()) {
+    try {
+        writer();
+    } catch (...) { // NOLINT(bugprone-empty-catch) GCOVR_EXCL_LINE
+        // Nothing is reported, on purpose. libstdc++'s streams never lead here; libc++'s, which
+        // need memory before they are opened, do.
+    }
+}
+
+} // namespace
+
 int runOptions(int argc, char* const argv[]) {
     constexpr char OPTION_LETTERS[] = "ia";
     constexpr int END_OF_OPTIONS = -1;
     int letter = END_OF_OPTIONS;
     while ((letter = platform::nextOption(argc, argv, OPTION_LETTERS)) != END_OF_OPTIONS) {
         if (letter == 'a') {
-            updateAirplayConfigFile();
+            run(updateAirplayConfigFile);
         } else if (letter == 'i') {
-            updateIapConfigFiles();
+            run(updateIapConfigFiles);
         }
     }
     return 0;

@@ -109,15 +109,10 @@ std::int32_t decodeI16(const std::uint8_t* bytes) {
 std::int32_t decodeField(const DpsBlock& block, const DpsField& field, std::size_t element) {
     const std::uint8_t* const bytes =
         block.bytes.data() + field.offset + element * dpsElementSize(field.encoding);
-    switch (field.encoding) {
-    case DpsEncoding::code2:
+    if (field.encoding == DpsEncoding::code2) {
         return *bytes >> field.bit & 3;
-    case DpsEncoding::u8:
-        return *bytes;
-    case DpsEncoding::i16:
-        break;
     }
-    return decodeI16(bytes);
+    return field.encoding == DpsEncoding::u8 ? *bytes : decodeI16(bytes);
 }
 
 const char* qwaWord(const std::array<QwaWord, 3>& words, std::int32_t code) {

@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "tuning/dps_block.h"
 
+#include <array>
 #include <fstream>
 #include <ostream>
 
@@ -12,21 +13,17 @@ namespace orvane {
 namespace {
 
 void writeValue(std::ostream& file, const DpsBlock& block, const DpsField& field) {
-    switch (field.kind) {
-    case DpsKind::switchWord:
-        file << qwaWord(qwaSwitchWords, decodeField(block, field, 0));
-        break;
-    case DpsKind::modeWord:
-        file << qwaWord(qwaModeWords, decodeField(block, field, 0));
-        break;
-    case DpsKind::number:
-        file << decodeField(block, field, 0);
-        break;
-    case DpsKind::list:
+    const std::int32_t first = decodeField(block, field, 0);
+    if (field.kind == DpsKind::switchWord) {
+        file << qwaWord(qwaSwitchWords, first);
+    } else if (field.kind == DpsKind::modeWord) {
+        file << qwaWord(qwaModeWords, first);
+    } else if (field.kind == DpsKind::number) {
+        file << first;
+    } else {
         for (std::size_t element = 0; element < field.count; ++element) {
-            file << decodeField(block, field, element) << ' '; // the last one, too
+            file << decodeField(block, field, element) << ' '; // behind the last one, too
         }
-        break;
     }
 }
 
@@ -40,7 +37,12 @@ void generateTuningFile(std::int32_t blockId, const std::string& path) {
     DpsArea area{};
     readTuningArea(area.data(), sizeof area);
 
-    std::ofstream file(path);
+    // Longer than any line. Opening the file needs no memory then.
+    constexpr std::streamsize BUFFER_SIZE = 512; // bytes
+    std::array<char, BUFFER_SIZE> buffer;
+    std::ofstream file;
+    file.rdbuf()->pubsetbuf(buffer.data(), BUFFER_SIZE);
+    file.open(path);
     if (file.fail()) {
         return;
     }

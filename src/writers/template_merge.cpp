@@ -3,8 +3,21 @@
 
 namespace orvane {
 
-TemplateMerge::TemplateMerge(const AccessoryFile& file)
-    : output(file.output), templateFile(file.templateFile) {}
+namespace {
+
+/// The buffer comes first: a file stream takes one only before its first use.
+template <typename FileStream>
+void open(FileStream& stream, StreamBuffer& buffer, const char* path) {
+    stream.rdbuf()->pubsetbuf(buffer.data(), STREAM_BUFFER_SIZE);
+    stream.open(path);
+}
+
+} // namespace
+
+TemplateMerge::TemplateMerge(const AccessoryFile& file) {
+    open(output, outputBuffer, file.output);
+    open(templateFile, templateBuffer, file.templateFile);
+}
 
 void TemplateMerge::copyTemplate() {
     output << templateFile.rdbuf();
@@ -16,8 +29,12 @@ void TemplateMerge::close() {
 }
 
 void installStockFile(const AccessoryFile& file) {
-    std::ifstream stock(file.stockFile);
-    std::ofstream output(file.output);
+    StreamBuffer stockBuffer;
+    StreamBuffer outputBuffer;
+    std::ifstream stock;
+    std::ofstream output;
+    open(stock, stockBuffer, file.stockFile);
+    open(output, outputBuffer, file.output);
     output << stock.rdbuf();
     stock.close();
     output.close();

@@ -4,7 +4,9 @@
 // partition, byte for byte; or, where that can't start, a complete stock file in place of it.
 #pragma once
 
+#include <array>
 #include <fstream>
+#include <ios>
 
 namespace orvane {
 
@@ -14,6 +16,10 @@ struct AccessoryFile {
     const char* templateFile;
     const char* stockFile;
 };
+
+/// Each stream of a writer brings its buffer, so that opening one needs no memory.
+constexpr std::streamsize STREAM_BUFFER_SIZE = 8192; ///< bytes
+using StreamBuffer = std::array<char, STREAM_BUFFER_SIZE>;
 
 /// The streams of one merge. A stream that could not be opened is failed, and what is written to it
 /// is dropped.
@@ -31,6 +37,8 @@ struct TemplateMerge {
     /// Closes the template, then the output. A close that fails leaves its stream failed.
     void close();
 
+    StreamBuffer outputBuffer;
+    StreamBuffer templateBuffer;
     std::ofstream output;
     std::ifstream templateFile;
 };

@@ -54,7 +54,7 @@ std::set<std::string> listTmp(const fs::path& tmp) {
 
 class GoldenTest : public ::testing::TestWithParam<std::string> {
 protected:
-    fs::path caseFolder() const { return fs::path(ORVANE_GOLDEN_DIR) / GetParam(); }
+    static fs::path caseFolder() { return fs::path(ORVANE_GOLDEN_DIR) / GetParam(); }
 };
 
 TEST_P(GoldenTest, LeavesWhatIsExpected) {

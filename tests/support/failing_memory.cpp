@@ -1,0 +1,61 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tests/support/failing_memory.h"
+
+#include <cstdlib>
+#include <new>
+
+namespace orvane::test {
+
+namespace {
+
+int untilFailure = 0; // 0: no shortage
+bool isForGood = false;
+bool wasHit = false;
+
+bool isDue() {
+    if (untilFailure == 0 || --untilFailure != 0) {
+        return false;
+    }
+    untilFailure = isForGood ? 1 : 0;
+    wasHit = true;
+    return true;
+}
+
+} // namespace
+
+FailingMemory::FailingMemory(int first, Shortage shortage) {
+    isForGood = shortage == Shortage::forGood;
+    wasHit = false;
+    untilFailure = first;
+}
+
+FailingMemory::~FailingMemory() {
+    untilFailure = 0;
+}
+
+bool FailingMemory::hasFailed() {
+    return wasHit;
+}
+
+static bool mustAllocationFail() {
+    return isDue();
+}
+
+} // namespace orvane::test
+
+void* operator new(std::size_t size) {
+    const bool mustFail = orvane::test::mustAllocationFail();
+    void* const memory = mustFail ? nullptr : std::malloc(size == 0 ? 1 : size);
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return memory;
+}
+
+void operator delete(void* memory) noexcept {
+    std::free(memory);
+}
+
+void operator delete(void* memory, std::size_t /*size*/) noexcept {
+    std::free(memory);
+}

@@ -1,0 +1,23 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Memory that runs out at a chosen moment: the tests' binary brings its own operator new.
+#pragma once
+
+namespace orvane::test {
+
+/// How many allocations fail once the first has.
+enum class Shortage { once, forGood };
+
+/// While it lives, allocation number `first` (from 1) fails, alone or with all later ones.
+class FailingMemory {
+public:
+    FailingMemory(int first, Shortage shortage);
+    ~FailingMemory();
+    FailingMemory(const FailingMemory&) = delete;
+    FailingMemory& operator=(const FailingMemory&) = delete;
+
+    /// Whether an allocation has failed.
+    static bool hasFailed();
+};
+
+} // namespace orvane::test
