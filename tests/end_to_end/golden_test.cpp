@@ -3,10 +3,13 @@
 // A unit in, its /tmp out: tests/golden/CASE holds the unit, the arguments and what must be left.
 #include "kit/root.h"
 #include "kit/unit.h"
+#include "main/options.h"
+#include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <filesystem>
@@ -54,39 +57,79 @@ std::set<std::string> listTmp(const fs::path& tmp) {
 
 class GoldenTest : public ::testing::TestWithParam<std::string> {
 protected:
+    GoldenTest() : root_(folder_.path() / "unit") {
+        kit::makeUnit(kit::readDescription(caseFolder() / "unit.toml"), root_);
+    }
+
     static fs::path caseFolder() { return fs::path(ORVANE_GOLDEN_DIR) / GetParam(); }
-};
 
-TEST_P(GoldenTest, LeavesWhatIsExpected) {
-    const TemporaryFolder folder;
-    const fs::path root = folder.path() / "unit";
-    kit::makeUnit(kit::readDescription(caseFolder() / "unit.toml"), root);
+    static std::string expectedError() {
+        const fs::path file = caseFolder() / "expected/stderr";
+        return fs::exists(file) ? readFile(file) : "";
+    }
 
-    const kit::RunResult result =
-        kit::runInside(root, {ORVANE_BINARY, readLines(caseFolder() / "arguments")});
+    const fs::path& root() const { return root_; }
 
-    EXPECT_EQ(result.exitStatus, 0);
-    EXPECT_EQ(result.standardOutput, "");
-    const fs::path expectedError = caseFolder() / "expected/stderr";
-    EXPECT_EQ(result.standardError, fs::exists(expectedError) ? readFile(expectedError) : "");
-
-    const std::vector<std::string> list = readLines(caseFolder() / "expected/tmp.list");
-    EXPECT_EQ(listTmp(root / "tmp"), std::set<std::string>(list.begin(), list.end()));
-    for (const std::string& name : list) {
-        if (name != "(absent)" && name.back() != '/') {
-            EXPECT_EQ(readFile(root / "tmp" / name), readFile(caseFolder() / "expected/tmp" / name))
-                << name;
+    void expectOutputs() const {
+        const std::vector<std::string> list = readLines(caseFolder() / "expected/tmp.list");
+        EXPECT_EQ(listTmp(root_ / "tmp"), std::set<std::string>(list.begin(), list.end()));
+        for (const std::string& name : list) {
+            if (name != "(absent)" && name.back() != '/') {
+                EXPECT_EQ(readFile(root_ / "tmp" / name),
+                          readFile(caseFolder() / "expected/tmp" / name))
+                    << name;
+            }
         }
     }
+
+private:
+    TemporaryFolder folder_;
+    fs::path root_;
+};
+
+TEST_P(GoldenTest, BinaryLeavesWhatIsExpected) {
+    const kit::RunResult result =
+        kit::runInside(root(), {ORVANE_BINARY, readLines(caseFolder() / "arguments")});
+    EXPECT_EQ(result.exitStatus, 0);
+    EXPECT_EQ(result.standardOutput, "");
+    EXPECT_EQ(result.standardError, expectedError());
+    expectOutputs();
+}
+
+/// The same without a program of its own, for tools that watch this process.
+TEST_P(GoldenTest, OptionLoopLeavesWhatIsExpected) {
+    std::vector<std::string> words = {"orvane"};
+    for (const std::string& argument : readLines(caseFolder() / "arguments")) {
+        words.push_back(argument);
+    }
+    std::vector<char*> argv;
+    for (std::string& word : words) {
+        argv.push_back(word.data());
+    }
+    argv.push_back(nullptr);
+    std::string said;
+    {
+        const kit::EnteredRoot entered(root());
+        StandardStreams streams;
+        optind = 0; // glibc's getopt begins anew
+        EXPECT_EQ(runOptions(static_cast<int>(words.size()), argv.data()), 0);
+        said = streams.stop();
+    }
+    EXPECT_EQ(said, expectedError());
+    expectOutputs();
 }
 
 /// An expected file that no list names would never be compared.
-TEST_P(GoldenTest, ComparesEveryExpectedFile) {
-    const std::vector<std::string> list = readLines(caseFolder() / "expected/tmp.list");
-    EXPECT_TRUE(std::is_sorted(list.begin(), list.end()));
-    if (fs::exists(caseFolder() / "expected/tmp")) {
-        for (const std::string& name : listTmp(caseFolder() / "expected/tmp")) {
-            EXPECT_EQ(std::count(list.begin(), list.end(), name), 1) << name;
+TEST(GoldenCases, CompareEveryExpectedFile) {
+    for (const std::string& name : goldenCases()) {
+        SCOPED_TRACE(name);
+        const fs::path expected = fs::path(ORVANE_GOLDEN_DIR) / name / "expected";
+        const std::vector<std::string> list = readLines(expected / "tmp.list");
+        EXPECT_TRUE(std::is_sorted(list.begin(), list.end()));
+        if (fs::exists(expected / "tmp")) {
+            for (const std::string& file : listTmp(expected / "tmp")) {
+                EXPECT_EQ(std::count(list.begin(), list.end(), file), 1) << file;
+            }
         }
     }
 }
