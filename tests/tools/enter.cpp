@@ -1,8 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// orvane-enter ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with "/" = ROOT, in this very process,
-// so that a tracer of this process sees the program and no other. Exits with 125 when it can't.
+// orvane-enter [--memory=BYTES] [--files=COUNT] ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with
+// "/" = ROOT, in this very process, so that a tracer of this process sees the program and no other.
+// The limits are those of the program (RLIMIT_AS, RLIMIT_NOFILE). Exits with 125 when it can't.
 #include "kit/start_plan.h"
+
+#include <sys/resource.h>
 
 #include <filesystem>
 #include <iostream>
@@ -11,13 +14,58 @@
 
 namespace {
 
-void enter(const std::vector<std::string>& words) {
-    if (words.size() < 3) {
-        throw orvane::kit::KitError("wants ROOT PROGRAM [ARGUMENT...]");
+using orvane::kit::KitError;
+
+struct Limits {
+    rlim_t memory = RLIM_INFINITY; ///< bytes of address space
+    rlim_t files = RLIM_INFINITY;  ///< descriptors
+};
+
+/// Takes the options from the front of `words`.
+Limits takeLimits(std::vector<std::string>& words) {
+    const std::string memory = "--memory=";
+    const std::string files = "--files=";
+    Limits limits;
+    while (!words.empty() && words.front().rfind("--", 0) == 0) {
+        const std::string word = words.front();
+        if (word.rfind(memory, 0) == 0) {
+            limits.memory = std::stoul(word.substr(memory.size()));
+        } else if (word.rfind(files, 0) == 0) {
+            limits.files = std::stoul(word.substr(files.size()));
+        } else {
+            throw KitError("knows no " + word);
+        }
+        words.erase(words.begin());
     }
-    const std::filesystem::path root = std::filesystem::absolute(words[1]);
-    orvane::kit::executePlan(orvane::kit::planStart({words[2], {words.begin() + 3, words.end()}}),
-                             root);
+    return limits;
+}
+
+/// The soft limit only, and only down: that takes no privilege.
+void limit(__rlimit_resource resource, rlim_t soft) {
+    rlimit limits{};
+    if (soft == RLIM_INFINITY) {
+        return;
+    }
+    if (getrlimit(resource, &limits) != 0) {
+        throw orvane::kit::systemError("getrlimit");
+    }
+    limits.rlim_cur = soft;
+    if (setrlimit(resource, &limits) != 0) {
+        throw orvane::kit::systemError("setrlimit");
+    }
+}
+
+void enter(std::vector<std::string> words) {
+    const Limits limits = takeLimits(words);
+    if (words.size() < 2) {
+        throw KitError("wants ROOT PROGRAM [ARGUMENT...]");
+    }
+    const std::filesystem::path root = std::filesystem::absolute(words[0]);
+    const orvane::kit::StartPlan plan =
+        orvane::kit::planStart({words[1], {words.begin() + 2, words.end()}});
+    limit(RLIMIT_AS, limits.memory);
+    limit(RLIMIT_NOFILE, limits.files);
+    orvane::kit::executePlan(plan, root);
 }
 
 } // namespace
@@ -25,7 +73,7 @@ void enter(const std::vector<std::string>& words) {
 int main(int argc, char* argv[]) {
     constexpr int CANNOT_ENTER = 125;
     try {
-        enter({argv, argv + argc});
+        enter({argv + 1, argv + argc});
     } catch (const std::exception& failure) {
         std::cerr << "orvane-enter: " << failure.what() << '\n';
     }

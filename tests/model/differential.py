@@ -1,0 +1,170 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Runs orvane in random units and compares each with what the model predicts.
+
+Exit status: 0 all agree, 1 a difference or an outcome that never came up, 2 the
+tool could not be run.
+"""
+
+from __future__ import annotations
+
+import argparse
+import multiprocessing
+import os
+import random
+import shlex
+import sys
+import tempfile
+from collections import Counter
+from dataclasses import dataclass, field
+from pathlib import Path
+
+import parts
+import runner
+import snapshot
+from identity import load_names
+from model import predict
+from units import make_unit
+
+# From this many units on, an outcome that never came up is an error.
+ENOUGH_UNITS = 200
+
+# So many units go to a worker at a time.
+CHUNK = 20
+
+# Neither of these may make a difference, beyond the modes of files.
+ENVIRONMENTS = ({}, {}, {"POSIXLY_CORRECT": "1"}, {"LC_ALL": "de_DE.UTF-8", "TMPDIR": "/fs"})
+MASKS = (0o022, 0o022, 0o000, 0o027, 0o077, 0o002)
+
+
+@dataclass
+class Report:
+    """`reached` counts units by output and by how that output came about."""
+
+    index: int
+    lines: list[str]
+    arguments: list[str]
+    broken: bool = False
+    reached: Counter[tuple[str, str]] = field(default_factory=Counter)
+
+
+@dataclass(frozen=True)
+class Task:
+    index: int
+    seed: str
+    orvane: str
+    enter: tuple[str, ...]
+    names: tuple[str, ...]
+
+
+def generator(seed: str, index: int) -> random.Random:
+    return random.Random(f"{seed}:{index}")
+
+
+def check_unit(task: Task, root: Path) -> Report:
+    """Makes the unit in `root`, which is left as the run leaves it."""
+    rng = generator(task.seed, task.index)
+    arguments = make_unit(root, rng)
+    mask = rng.choice(MASKS)
+    environment = rng.choice(ENVIRONMENTS)
+    prediction = predict(root, arguments, task.names)
+    before = snapshot.take(root)
+    os.umask(mask)
+    try:
+        result = runner.run([*task.enter, str(root), task.orvane, *arguments], root, environment)
+    except runner.BrokenRun as error:
+        return Report(task.index, [str(error)], arguments, broken=True)
+    finally:
+        os.umask(0o022)
+    lines = runner.differences(before, prediction, result, mask)
+    reached = Counter(prediction.alternatives[0].ways.items())
+    return Report(task.index, lines, arguments, reached=reached)
+
+
+def check(task: Task) -> Report:
+    with tempfile.TemporaryDirectory(prefix="orvane-unit-") as folder:
+        return check_unit(task, Path(folder))
+
+
+def keep_unit(keep: Path, seed: str, index: int) -> Path:
+    """A fresh copy of the unit, not run in."""
+    root = keep / f"unit-{seed}-{index}"
+    if root.exists():
+        raise SystemExit(f"{root} is already there")
+    root.mkdir(parents=True)
+    make_unit(root, generator(seed, index))
+    return root
+
+
+def print_coverage(reached: Counter[tuple[str, str]]) -> list[str]:
+    """Prints how often each output came about in each way; returns what is missing.
+
+    The fallback of a tuning file is that of a disk that can't be read.
+    """
+    missing = []
+    for output in parts.OUTPUTS:
+        counts = {way: reached[output, way] for way in ("generated", "fallback")}
+        print(f"  {output:26}" + "".join(f"  {way} {n:6}" for way, n in counts.items()))
+        missing += [f"{output}: never {way}" for way, n in counts.items() if n == 0]
+    return missing
+
+
+def print_difference(report: Report, options: argparse.Namespace) -> None:
+    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane-kept-"))
+    print(f"differential: unit {report.index} of seed {options.seed}, "
+          f"arguments {report.arguments!r}")
+    for line in report.lines:
+        print(f"  {line}")
+    print(f"  kept, and not run: {keep_unit(keep, options.seed, report.index)}")
+    print(f"  again: {sys.argv[0]} --orvane {options.orvane} --enter '{options.enter}' "
+          f"--names {options.names} --seed {options.seed} --only {report.index} --keep DIR")
+
+
+def parse_arguments() -> argparse.Namespace:
+    parser = argparse.ArgumentParser(description=__doc__)
+    parser.add_argument("--orvane", required=True, help="the tool")
+    parser.add_argument("--enter", required=True,
+                        help="launcher, with its emulator if it needs one: "
+                             "ENTER... ROOT ORVANE ARGUMENTS...")
+    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
+    parser.add_argument("--units", type=int, default=500)
+    parser.add_argument("--seed", default="1", help='"random" draws one')
+    parser.add_argument("--only", type=int, help="the number of one single unit")
+    parser.add_argument("--keep", type=Path, help="where a unit that differs is kept")
+    parser.add_argument("--jobs", type=int, default=2)
+    options = parser.parse_args()
+    if options.seed == "random":
+        options.seed = str(random.SystemRandom().randrange(10**9))
+        print(f"differential: seed {options.seed}")
+    return options
+
+
+def main() -> int:
+    options = parse_arguments()
+    names = tuple(load_names(options.names))
+    enter = tuple(shlex.split(options.enter))
+    indices = range(options.units) if options.only is None else [options.only]
+    tasks = [Task(index, options.seed, options.orvane, enter, names)
+             for index in indices]
+    reached: Counter[tuple[str, str]] = Counter()
+    with multiprocessing.Pool(options.jobs) as pool:
+        for report in pool.imap(check, tasks, CHUNK):
+            if report.broken:
+                print(f"differential: unit {report.index} was not run: {report.lines[0]}")
+                return 2
+            if report.lines:
+                print_difference(report, options)
+                return 1
+            reached += report.reached
+    missing = print_coverage(reached) if options.only is None else []
+    print(f"differential: {len(tasks)} units, 0 differences (seed {options.seed})")
+    if options.only is not None and options.keep is not None:
+        print(f"  kept, and not run: {keep_unit(options.keep, options.seed, options.only)}")
+    if missing and len(tasks) >= ENOUGH_UNITS:
+        print("\n".join(f"differential: {line}" for line in missing))
+        return 1
+    return 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

@@ -1,0 +1,202 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Lets each system call of orvane on its own files fail once, in every scenario.
+
+A run without faults, followed by strace, tells the calls. Each of them is then
+disturbed in runs of their own: strace injects errors, and short_transfer makes
+reads and writes short. What such a run leaves behind must be an outcome that the
+model allows.
+
+Exit status: 0 all agree, 1 a difference, 2 the tool could not be run.
+"""
+
+from __future__ import annotations
+
+import argparse
+import multiprocessing
+import os
+import shlex
+import shutil
+import subprocess
+import sys
+import tempfile
+from collections import Counter
+from collections.abc import Iterator
+from dataclasses import dataclass
+from pathlib import Path
+
+import runner
+import snapshot
+from identity import load_names
+from model import predict
+from scenarios import SCENARIOS, Scenario
+from system import Fault
+from calls import Call, own_calls
+
+ERRORS = {
+    "open": ("ENOENT", "EACCES", "EMFILE", "EINTR"),
+    "seek": ("EINVAL", "EIO", "ESPIPE"),
+    "map": ("ENOMEM", "ENODEV"),
+    "unmap": ("EINVAL",),
+    "read": ("EIO", "EINTR"),
+    "write": ("ENOSPC", "EIO", "EINTR"),
+    "close": ("EIO", "EINTR"),
+    "list": ("EIO", "ENOENT"),
+}
+
+# Whether the image's mapping can be released has no part in what the tool writes:
+# the model doesn't follow it.
+WITHOUT_EFFECT = ("unmap",)
+
+MASK = 0o022
+
+
+@dataclass(frozen=True)
+class Tools:
+    orvane: str
+    enter: tuple[str, ...]
+    short_transfer: str
+    names: tuple[str, ...]
+
+    def command(self, root: Path, scenario: Scenario) -> list[str]:
+        return [*self.enter, str(root), self.orvane, *scenario.arguments]
+
+
+@dataclass(frozen=True)
+class Injection:
+    scenario: int
+    call: Call
+    fault: Fault
+    tools: Tools
+
+    def __str__(self) -> str:
+        fault, call = self.fault, self.call
+        what = f"{fault.length} of {call.moved} bytes" if fault.kind == "short" else fault.error
+        return (f"{SCENARIOS[self.scenario].name}: {call.name} {call.number} "
+                f"({call.operation} {call.path}, {fault.occurrence}, at {fault.offset}): {what}")
+
+
+def faults_of(call: Call) -> Iterator[Fault]:
+    for error in ERRORS[call.operation]:
+        yield Fault(call.operation, call.path, call.occurrence, "error", error,
+                    call.offset, call.moved, call.pieces)
+    if call.operation in ("read", "write") and call.moved > 1:
+        yield Fault(call.operation, call.path, call.occurrence, "short", "",
+                    call.offset, call.moved // 2, call.pieces)
+
+
+def inject(injection: Injection, root: Path, report: Path) -> tuple[runner.Run, int]:
+    """The run, and how many times the call was disturbed."""
+    fault, call, tools = injection.fault, injection.call, injection.tools
+    command = tools.command(root, SCENARIOS[injection.scenario])
+    if fault.kind == "short":
+        result = runner.run([tools.short_transfer, str(report), call.name, str(call.number),
+                             str(fault.length), *command], root)
+        return result, report.read_text().split().count(str(fault.length))
+    strace = ["strace", "-o", str(report), "-s", "0", "-e", f"trace={call.name}",
+              "-e", f"inject={call.name}:error={fault.error}:when={call.number}"]
+    result = runner.run([*strace, *command], root)
+    return result, report.read_text(errors="replace").count("(INJECTED)")
+
+
+def check(injection: Injection) -> tuple[Injection, list[str]]:
+    """Nothing to say when the run agrees with the model."""
+    scenario = SCENARIOS[injection.scenario]
+    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+        root = Path(folder) / "unit"
+        root.mkdir()
+        scenario.make(root)
+        faults = () if injection.fault.operation in WITHOUT_EFFECT else (injection.fault,)
+        prediction = predict(root, scenario.arguments, injection.tools.names, faults)
+        before = snapshot.take(root)
+        result, count = inject(injection, root, Path(folder) / "report")
+    lines = runner.differences(before, prediction, result, MASK)
+    if count != 1:
+        lines.append(f"disturbed {count} times instead of once")
+    lines += [f"the model knows no such operation: {fault}" for fault in prediction.unmet]
+    return injection, lines
+
+
+def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
+    """The tool's calls in an undisturbed run, which must be as predicted itself."""
+    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+        root, report = Path(folder) / "unit", Path(folder) / "report"
+        root.mkdir()
+        scenario.make(root)
+        prediction = predict(root, scenario.arguments, tools.names)
+        before = snapshot.take(root)
+        result = runner.run(["strace", "-o", str(report), "-s", "32", "-e", "trace=all",
+                             *tools.command(root, scenario)], root)
+        lines = runner.differences(before, prediction, result, MASK)
+        if lines:
+            raise SystemExit(f"faults: {scenario.name}, undisturbed:\n  " + "\n  ".join(lines))
+        return own_calls(report.read_text(errors="replace").splitlines())
+
+
+def build_short_transfer(folder: str) -> str:
+    """Needs a compiler for x86-64, the one processor that the helper knows."""
+    program = os.path.join(folder, "short_transfer")
+    source = Path(__file__).with_name("short_transfer.cpp")
+    subprocess.run([os.environ.get("CXX", "c++"), "-std=c++17", "-O1", "-o", program, source],
+                   check=True)
+    return program
+
+
+def print_table(injected: Counter[tuple[int, str]], agreed: Counter[tuple[int, str]]) -> None:
+    names = sorted({name for _, name in injected})
+    print(f"{'injected/agreed':24}" + "".join(f"{name:>12}" for name in names))
+    for index, scenario in enumerate(SCENARIOS):
+        cells = (f"{injected[index, name]}/{agreed[index, name]}" for name in names)
+        print(f"{scenario.name:24}" + "".join(f"{cell:>12}" for cell in cells))
+
+
+def parse_arguments() -> argparse.Namespace:
+    parser = argparse.ArgumentParser(description=__doc__)
+    parser.add_argument("--orvane", required=True, help="the tool")
+    parser.add_argument("--enter", required=True, help="launcher: ENTER ROOT ORVANE ARGUMENTS...")
+    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
+    parser.add_argument("--short-transfer", help="short_transfer, built anew when not given")
+    parser.add_argument("--jobs", type=int, default=2)
+    return parser.parse_args()
+
+
+def run_all(tools: Tools, jobs: int) -> int:
+    injections = [
+        Injection(index, call, fault, tools)
+        for index, scenario in enumerate(SCENARIOS)
+        for call in calls_of(scenario, tools)
+        for fault in faults_of(call)
+    ]
+    injected: Counter[tuple[int, str]] = Counter()
+    agreed: Counter[tuple[int, str]] = Counter()
+    with multiprocessing.Pool(jobs) as pool:
+        for injection, lines in pool.imap(check, injections, 8):
+            key = (injection.scenario, injection.call.name)
+            injected[key] += 1
+            agreed[key] += not lines
+            if lines:
+                print(f"faults: {injection}")
+                print("\n".join(f"  {line}" for line in lines))
+    print_table(injected, agreed)
+    print(f"faults: {injected.total()} injected, {agreed.total()} agreed")
+    return 0 if injected.total() == agreed.total() > 0 else 1
+
+
+def main() -> int:
+    options = parse_arguments()
+    if shutil.which("strace") is None:
+        print("faults: strace is not installed")
+        return 2
+    os.umask(MASK)
+    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+        helper = options.short_transfer or build_short_transfer(folder)
+        tools = Tools(options.orvane, tuple(shlex.split(options.enter)), helper, tuple(load_names(options.names)))
+        try:
+            return run_all(tools, options.jobs)
+        except runner.BrokenRun as error:
+            print(f"faults: the tool was not run: {error}")
+            return 2
+
+
+if __name__ == "__main__":
+    sys.exit(main())

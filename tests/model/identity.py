@@ -1,0 +1,56 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Display values of the vehicle and of the unit. Every lookup has a default."""
+
+from __future__ import annotations
+
+from collections.abc import Sequence
+from pathlib import Path
+
+import configuration
+import records
+from system import System
+
+MODEL_COUNT = 47
+ALIAS = 32
+UNKNOWN_MODEL = b"VOXA"
+DEFAULT_SERIAL = b"ABCD1234abc"
+
+
+def load_names(path: Path) -> list[str]:
+    """The model display names, that of code 1 on the first line.
+
+    Code 32 has no name of its own but that of code 1; all others differ.
+    """
+    names = path.read_text(encoding="ascii").splitlines()
+    if len(names) != MODEL_COUNT:
+        raise ValueError(f"{path}: {len(names)} names instead of {MODEL_COUNT}")
+    if names[ALIAS - 1] != names[0] or len(set(names)) != MODEL_COUNT - 1:
+        raise ValueError(f"{path}: only the names of codes 1 and {ALIAS} may and must be the same")
+    return names
+
+
+def model_name(system: System, names: Sequence[str]) -> bytes:
+    code = configuration.parameter(system, configuration.MODEL) or 0
+    return names[code - 1].encode("ascii") if 1 <= code <= MODEL_COUNT else UNKNOWN_MODEL
+
+
+def brand_name(system: System) -> bytes:
+    code = configuration.parameter(system, configuration.BRAND)
+    return b"QUARION" if code == 2 else b"MARL"
+
+
+def right_hand_drive(system: System) -> int:
+    return configuration.parameter(system, configuration.RIGHT_HAND_DRIVE) or 0
+
+
+def fuel_type(system: System) -> None:
+    """Nothing is made of it, but its source is read on every run."""
+    configuration.parameter(system, configuration.FUEL_TYPE)
+
+
+def unit_serial(system: System) -> bytes:
+    record = records.serial_record(system)
+    if record is None:
+        return DEFAULT_SERIAL
+    return record.split(b"\0", 1)[0]

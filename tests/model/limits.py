@@ -1,0 +1,183 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Runs orvane with less and less memory and fewer and fewer descriptors.
+
+Whatever it is short of, it says nothing, exits with 0, and each output is a whole
+file made of true values and defaults, or what a fallback leaves.
+
+Exit status: 0 so it is, 1 a run that was otherwise, 2 the tool could not be run.
+"""
+
+from __future__ import annotations
+
+import argparse
+import shlex
+import shutil
+import sys
+import tempfile
+from dataclasses import dataclass
+from pathlib import Path
+
+import parts
+import runner
+from identity import load_names
+from model import predict
+
+OUTPUTS = ("airplay.conf", "iap2_device.cfg", "iap2.cfg", "iap1.cfg",
+           "telephony_FFFF.txt", "speechrec_FFFF.txt")
+STOCK = {"airplay.conf": "fs/mp/etc/airplay.conf",
+         "iap2_device.cfg": "fs/mp/etc/iap2_device.cfg",
+         "iap2.cfg": "fs/mp/etc/mm/iap2.cfg",
+         "iap1.cfg": "fs/mp/etc/mm/iap1.cfg"}
+ARGUMENTS = ["-ai"]
+
+PAGE = 4096
+MEBIBYTE = 1 << 20
+
+# One line of a version file that no shortage of memory lets through.
+LONG_LINE = 64 * MEBIBYTE
+
+# Characters of a file that is not as it must be.
+SHOWN = 1000
+
+
+@dataclass(frozen=True)
+class Tools:
+    orvane: str
+    enter: tuple[str, ...]
+    names: tuple[str, ...]
+
+
+def make_unit(root: Path) -> None:
+    """Values that are too long for a string's own buffer, and nothing missing."""
+    parts.put_base(root)
+    parts.put_product_files(root)
+    parts.put_image(root, {22: 1, 36: 2, 50: 1, 134: 0xFFFF, 139: 41})
+    parts.put_disk(root, serial=b"SER12345", area=bytes(range(1, 189)) * 10)
+    parts.put_version(root, b"ABC_3.10.2.a-rather-long-version-text", b"Application",
+                      "application.inf")
+
+
+def texts_after(root: Path, names: tuple[str, ...], command: list[str]) -> dict[str, bytes | None]:
+    tmp = predict(root, command, names).alternatives[0].tmp
+    assert tmp is not None
+    return {name: tmp[name].content if name in tmp else None for name in OUTPUTS}
+
+
+def accepted(tools: Tools) -> dict[str, set[bytes | None]]:
+    """Every text that a run may leave: with each of its values true, or its default."""
+    result: dict[str, set[bytes | None]] = {name: set() for name in OUTPUTS}
+    for names in (tools.names, tuple("VOXA" for _ in tools.names)):
+        for gone in ((), ("fs/rwdata/.Version",), ("dev/hd0",), ("fs/mp/etc/mm/iap1_static.cfg",),
+                     ("fs/rwdata/.Version", "dev/hd0"),
+                     ("fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM",)):
+            with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+                root = Path(folder)
+                make_unit(root)
+                for path in gone:
+                    shutil.rmtree(root / path) if (root / path).is_dir() else (root / path).unlink()
+                for name, text in texts_after(root, names, ARGUMENTS).items():
+                    result[name].add(text)
+    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+        root = Path(folder)
+        make_unit(root)
+        for name, path in STOCK.items():
+            result[name] |= {(root / path).read_bytes(), b"", None}
+    for name in set(OUTPUTS) - set(STOCK):
+        result[name].add(None)
+    return result
+
+
+def run(tools: Tools, root: Path, limit: str, arguments: list[str]) -> runner.Run:
+    return runner.run([*tools.enter, limit, str(root), tools.orvane, *arguments], root)
+
+
+def least_memory(tools: Tools) -> int:
+    """The least address space, to the page, in which the tool starts at all: below it the kernel
+    or the C library end the process before its first line."""
+    low, high = 0, 64 * MEBIBYTE
+    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+        root = Path(folder)
+        make_unit(root)
+        while high - low > PAGE:
+            middle = (low + high) // 2 // PAGE * PAGE
+            if run(tools, root, f"--memory={middle}", []).status == 0:
+                high = middle
+            else:
+                low = middle
+    return high
+
+
+def check_run(tools: Tools, limit: str, texts: dict[str, set[bytes | None]]) -> tuple[bool, bool]:
+    """Whether the run was as it must be, and whether nothing was missing in it."""
+    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+        root = Path(folder)
+        make_unit(root)
+        whole = texts_after(root, tools.names, ARGUMENTS)
+        result = run(tools, root, limit, ARGUMENTS)
+        left = {name: (root / "tmp" / name).read_bytes() if (root / "tmp" / name).exists() else None
+                for name in OUTPUTS}
+    faults = [f"{name}: {text!r}" for name, text in left.items() if text not in texts[name]]
+    if (result.status, result.stdout, result.stderr) != (0, b"", b""):
+        faults.append(f"status {result.status}, said {result.stdout!r} {result.stderr!r}")
+    if faults:
+        print(f"limits: with {limit}:\n  " + "\n  ".join(fault[:SHOWN] for fault in faults))
+    return not faults, left == whole
+
+
+def sweep(tools: Tools, what: str, limits: list[str],
+          texts: dict[str, set[bytes | None]]) -> bool:
+    """The last limit is generous, so the last run must be whole, and the first must not."""
+    outcomes = [check_run(tools, limit, texts) for limit in limits]
+    whole = [is_whole for _, is_whole in outcomes]
+    print(f"limits: {what}: {len(limits)} runs, {whole.count(False)} short of something")
+    if whole[-1] and False in whole:
+        return all(good for good, _ in outcomes)
+    print(f"limits: {what}: the limits did not tell a short run from a whole one")
+    return False
+
+
+def check_long_line(tools: Tools) -> bool:
+    """A line of 64 MiB is read when there is memory for it, and else the file is as good as none."""
+    good = True
+    for limit, is_read in (("--memory=1073741824", True), ("--memory=33554432", False)):
+        with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+            root = Path(folder)
+            make_unit(root)
+            file = root / "fs/rwdata/.Version/application.inf"
+            file.write_bytes(b"x" * LONG_LINE + b"=1\n" + file.read_bytes())
+            result = run(tools, root, limit, ["-i"])
+            text = (root / "tmp/iap1.cfg").read_bytes()
+        if (result.status, result.stdout, result.stderr) != (0, b"", b"") or \
+                (b"=030a02\n" in text) != is_read or (b"=000000\n" in text) == is_read:
+            print(f"limits: a long line with {limit}: {result} {text!r}")
+            good = False
+    print("limits: a line of 64 MiB, with memory and without")
+    return good
+
+
+def main() -> int:
+    parser = argparse.ArgumentParser(description=__doc__)
+    parser.add_argument("--orvane", required=True, help="the tool")
+    parser.add_argument("--enter", required=True, help="launcher that can set limits")
+    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
+    options = parser.parse_args()
+    tools = Tools(options.orvane, tuple(shlex.split(options.enter)),
+                  tuple(load_names(options.names)))
+    texts = accepted(tools)
+    try:
+        least = least_memory(tools)
+        memory = [f"--memory={least + step * PAGE}" for step in range(0, 64)]
+        results = [
+            sweep(tools, "memory", [*memory, f"--memory={64 * MEBIBYTE}"], texts),
+            sweep(tools, "descriptors", [f"--files={count}" for count in range(3, 17)], texts),
+            check_long_line(tools),
+        ]
+    except runner.BrokenRun as error:
+        print(f"limits: the tool was not run: {error}")
+        return 2
+    return 0 if all(results) else 1
+
+
+if __name__ == "__main__":
+    sys.exit(main())

@@ -1,0 +1,99 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Says what a run of orvane leaves behind, worked out apart from its program.
+
+The prediction is made from the unit's files as they stand before the run, and
+nothing is changed by making it.
+"""
+
+from __future__ import annotations
+
+import itertools
+import os
+from collections.abc import Mapping, Sequence
+from dataclasses import dataclass
+from pathlib import Path
+
+import snapshot
+import writers
+from snapshot import Entry
+from system import Fault, Library, System
+from tree import Tree
+
+OPTION_LETTERS = b"ia"
+
+
+@dataclass(frozen=True)
+class Outcome:
+    """`written` maps absolute paths, free of links, to content.
+
+    `tmp` is all of /tmp by paths relative to it, old entries included, or None
+    when there is no such folder. `ways` tells how each output came about.
+    """
+
+    written: Mapping[str, bytes]
+    tmp: Mapping[str, Entry] | None
+    ways: Mapping[str, str]
+
+
+@dataclass(frozen=True)
+class Prediction:
+    """Any one of `alternatives` is right; without faults there is exactly one.
+
+    `unmet` are the faults whose operation the run never comes to.
+    """
+
+    alternatives: tuple[Outcome, ...]
+    stderr: bytes
+    unmet: tuple[Fault, ...]
+    stdout: bytes = b""
+    status: int = 0
+
+
+def parse_options(arguments: Sequence[str]) -> tuple[list[str], bytes]:
+    """The letters of writers to run, and what the C library says of the others.
+
+    Options end at the first operand, for which a lone "-" counts, and at "--".
+    """
+    letters: list[str] = []
+    complaints = b""
+    for argument in map(os.fsencode, arguments):
+        if not argument.startswith(b"-") or argument in (b"-", b"--"):
+            break
+        for letter in argument[1:]:
+            if letter in OPTION_LETTERS:
+                letters.append(chr(letter))
+            else:
+                complaints += b"orvane: invalid option -- '%c'\n" % letter
+    return letters, complaints
+
+
+def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcome:
+    ways: dict[str, str] = {}
+    for letter in letters:
+        if letter == "a":
+            writers.write_airplay(system, names, ways)
+        else:
+            writers.write_iap(system, names, ways)
+    written = system.tree.written
+    after = snapshot.changed(snapshot.take(system.tree.root, "/tmp"), written)
+    tmp = {path[len("/tmp/"):]: entry for path, entry in after.items()
+           if path.startswith("/tmp/")}
+    return Outcome(written, tmp if "/tmp" in after else None, ways)
+
+
+def predict(root: Path, arguments: Sequence[str], names: Sequence[str],
+            faults: Sequence[Fault] = (), retries_interrupted: bool = True) -> Prediction:
+    """`names` are the model display names, that of code 1 first."""
+    letters, complaints = parse_options(arguments)
+    outcomes: list[Outcome] = []
+    met: set[Fault] = set()
+    for choices in itertools.product((False, True), repeat=4 if faults else 0):
+        library = Library(*choices, retries_interrupted=retries_interrupted)
+        system = System(Tree(root), faults, library)
+        outcome = _run(system, letters, names)
+        met |= system.met
+        if all(outcome.written != other.written for other in outcomes):
+            outcomes.append(outcome)
+    unmet = tuple(fault for fault in faults if fault not in met)
+    return Prediction(tuple(outcomes), complaints, unmet)

@@ -1,0 +1,74 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""Runs the tool inside a unit and holds what it left behind against a prediction."""
+
+from __future__ import annotations
+
+import os
+import subprocess
+from collections.abc import Mapping, Sequence
+from dataclasses import dataclass
+from pathlib import Path
+
+import snapshot
+from model import Prediction
+from snapshot import Entry
+
+# The launcher's status when it couldn't get as far as running the tool, which
+# itself has no status but 0.
+LAUNCHER_FAILED = 125
+
+# Far longer than any run takes, so that only a tool that hangs gets there.
+TIME_LIMIT = 60
+
+
+class BrokenRun(Exception):
+    """The tool was not run at all: nothing can be said of it."""
+
+
+@dataclass(frozen=True)
+class Run:
+    """`after` is the whole unit as the run left it."""
+
+    status: int
+    stdout: bytes
+    stderr: bytes
+    after: Mapping[str, Entry]
+
+
+def run(command: Sequence[str], root: Path, environment: Mapping[str, str] | None = None) -> Run:
+    """`command` starts the tool in `root`, by way of the launcher.
+
+    `environment` is what the tool's holds beside that of this process.
+    """
+    try:
+        done = subprocess.run(command, stdin=subprocess.DEVNULL, capture_output=True,
+                              timeout=TIME_LIMIT, close_fds=False, check=False,
+                              env={**os.environ, **(environment or {})})
+    except subprocess.TimeoutExpired as error:
+        return Run(-1, error.stdout or b"", b"(ran out of time)", snapshot.take(root))
+    except OSError as error:
+        raise BrokenRun(f"{command[0]}: {error.strerror}") from error
+    if done.returncode == LAUNCHER_FAILED:
+        raise BrokenRun(os.fsdecode(done.stderr).strip())
+    return Run(done.returncode, done.stdout, done.stderr, snapshot.take(root))
+
+
+def differences(before: Mapping[str, Entry], prediction: Prediction, result: Run,
+                mask: int) -> list[str]:
+    """Nothing when the run is as predicted, else what is wrong with its nearest reading.
+
+    `mask` is the file creation mask of the run.
+    """
+    found = []
+    for what, want, have in (("exit status", prediction.status, result.status),
+                             ("standard output", prediction.stdout, result.stdout),
+                             ("standard error", prediction.stderr, result.stderr)):
+        if want != have:
+            found.append(f"{what}: {have!r} instead of {want!r}")
+    readings = [
+        snapshot.difference(
+            snapshot.changed(before, outcome.written, 0o666 & ~mask), result.after)
+        for outcome in prediction.alternatives
+    ]
+    return found + min(readings, key=len)

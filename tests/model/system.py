@@ -1,0 +1,156 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""The unit's system calls: files, their counting, and the faults that hit them."""
+
+from __future__ import annotations
+
+from collections import Counter
+from collections.abc import Sequence
+from dataclasses import dataclass
+
+from tree import FILE, FOLDER_PLACE, FREE, Place, Tree
+
+DISK = "/dev/hd0"
+
+
+@dataclass(frozen=True)
+class Fault:
+    """One disturbed system call.
+
+    `occurrence` counts from 1. For open, seek and map it is the number of that
+    operation on `path` in the run. For read, write, close and list it is the
+    number of the opening whose descriptor the call used: how many transfers a
+    stream makes of one opening is the library's own business, so such a call is
+    told by the bytes it covered in an undisturbed run, `offset` and `length`.
+    `pieces` are the lengths of a gathered write. A list fault's offset is 0 when
+    no entry had been delivered and positive when all of them had. A short
+    transfer moves only `length` bytes.
+    """
+
+    operation: str
+    path: str
+    occurrence: int
+    kind: str = "error"
+    error: str = "EIO"
+    offset: int = 0
+    length: int = 0
+    pieces: tuple[int, ...] = ()
+
+
+@dataclass(frozen=True)
+class Library:
+    """What a C++ library is free to do when a call under a stream fails.
+
+    Each of these is consulted only where the fault makes it matter, so a run
+    without faults has one outcome whatever is chosen here.
+    """
+
+    # Reading breaks off behind the first byte of a copy: one library throws
+    # inside (which marks the destination failed), another sees a plain end.
+    broken_copy_fails: bool = False
+    # The same within a line: the thrown error drops the unfinished line, the
+    # plain end yields it.
+    unfinished_line_kept: bool = False
+    # Bytes that a failed write left pending are tried once more by close, or
+    # they are lost when it was close itself that wrote them.
+    pending_kept: bool = False
+    # The last write of a file may come from the copy (which had got bytes
+    # across before, so doesn't mark the stream) or from close (which does).
+    last_write_fails_stream: bool = False
+    # A stream whose read or write is interrupted by a signal calls again.
+    retries_interrupted: bool = True
+
+
+@dataclass(frozen=True)
+class Handle:
+    path: str
+    opening: int
+    place: Place
+
+
+class System:
+    """The tree as the tool's calls see it, in the order in which it makes them."""
+
+    def __init__(self, tree: Tree, faults: Sequence[Fault], library: Library) -> None:
+        self.tree = tree
+        self.library = library
+        self.met: set[Fault] = set()
+        self._faults = tuple(faults)
+        self._counts: Counter[tuple[str, str]] = Counter()
+
+    def _fault(self, operation: str, path: str, occurrence: int) -> Fault | None:
+        path = path.rstrip("/")
+        for fault in self._faults:
+            if (fault.operation, fault.path.rstrip("/"), fault.occurrence) == (
+                    operation, path, occurrence):
+                self.met.add(fault)
+                return fault
+        return None
+
+    def _count(self, operation: str, path: str) -> int:
+        key = (operation, path.rstrip("/"))
+        self._counts[key] += 1
+        return self._counts[key]
+
+    def _succeeds(self, operation: str, path: str) -> bool:
+        return self._fault(operation, path, self._count(operation, path)) is None
+
+    def open_reading(self, path: str) -> Handle | None:
+        """Folders open for reading too; it is their reading that fails."""
+        opening = self._count("open", path)
+        if self._fault("open", path, opening):
+            return None
+        place = self.tree.resolve(path)
+        if place is None or place.kind == FREE:
+            return None
+        return Handle(path, opening, place)
+
+    def open_writing(self, path: str) -> Handle | None:
+        """Creates or truncates; a failed opening changes nothing."""
+        opening = self._count("open", path)
+        if self._fault("open", path, opening):
+            return None
+        place = self.tree.resolve(path)
+        if place is None or place.kind not in (FILE, FREE):
+            return None
+        self.tree.write(place, b"")
+        return Handle(path, opening, place)
+
+    def seek(self, path: str) -> bool:
+        return self._succeeds("seek", path)
+
+    def map(self, path: str) -> bool:
+        return self._succeeds("map", path)
+
+    def close(self, handle: Handle) -> bool:
+        return self._fault("close", handle.path, handle.opening) is None
+
+    def transfer_fault(self, operation: str, handle: Handle) -> Fault | None:
+        """The fault that disturbs a transfer of this opening for good, if any."""
+        fault = self._fault(operation, handle.path, handle.opening)
+        if fault is None or handle.path == DISK:
+            return fault
+        if fault.kind == "short":
+            return None  # a stream goes on with the rest
+        if fault.error == "EINTR" and self.library.retries_interrupted:
+            return None
+        return fault
+
+    def read_stream(self, handle: Handle) -> tuple[bytes, bool]:
+        """All that a stream gets out of a file, and whether an error ended it."""
+        content = b"" if handle.place.kind == FOLDER_PLACE else self.tree.read(handle.place)
+        fault = self.transfer_fault("read", handle)
+        if fault is not None:
+            return content[:fault.offset], True
+        return content, handle.place.kind == FOLDER_PLACE
+
+    def list_folder(self, path: str) -> list[str]:
+        """Entry names in the order of the listing; nothing if it can't be opened."""
+        handle = self.open_reading(path)
+        if handle is None or handle.place.kind != FOLDER_PLACE:
+            return []
+        self.close(handle)
+        fault = self._fault("list", path, handle.opening)
+        if fault is not None and fault.offset == 0:
+            return []
+        return self.tree.names(handle.place)
