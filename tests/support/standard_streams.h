@@ -20,8 +20,8 @@ public:
         if (pipe2(ends, O_CLOEXEC | O_NONBLOCK) != 0) {
             throw kit::systemError("pipe2");
         }
-        std::fflush(stdout);
-        std::fflush(stderr);
+        static_cast<void>(std::fflush(stdout));
+        static_cast<void>(std::fflush(stderr));
         readEnd_ = ends[0];
         formerOutput_ = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, 0);
         formerError_ = fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, 0);
@@ -39,8 +39,8 @@ public:
     /// Lets the process speak again and returns what it said.
     std::string stop() {
         if (formerOutput_ != -1) {
-            std::fflush(stdout);
-            std::fflush(stderr);
+            static_cast<void>(std::fflush(stdout));
+            static_cast<void>(std::fflush(stderr));
             restore(formerOutput_, STDOUT_FILENO);
             restore(formerError_, STDERR_FILENO);
         }
