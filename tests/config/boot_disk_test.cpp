@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/boot_disk.h"
 #include "tests/config/freed_standard_input.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"
 
@@ -90,9 +91,12 @@ TEST_F(BootDiskTest, FlagsDecideOnTheDirection) {
 }
 
 TEST_F(BootDiskTest, DiskNeedsNoOtherRightThanItsFlags) {
+    const PermissionsHold hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     EXPECT_TRUE(BootDisk(O_RDONLY).isOpen());
+    EXPECT_FALSE(BootDisk(O_WRONLY).isOpen());
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
+    EXPECT_FALSE(BootDisk(O_RDONLY).isOpen());
     EXPECT_TRUE(BootDisk(O_WRONLY).isOpen());
 }
 

@@ -15,6 +15,7 @@
 #include <unistd.h>
 
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 #include <string>
 
@@ -134,6 +135,25 @@ TEST_F(ConfigStoreLifecycleTest, DescriptorZeroIsHeldAndReleasedLikeAnyOther) {
     EXPECT_FALSE(isOpenDescriptor(0));
 }
 
+TEST_F(ConfigStoreLifecycleTest, DescriptorOneIsHeldAndReleasedLikeAnyOther) {
+    ASSERT_TRUE(isOpenDescriptor(STDIN_FILENO));
+    static_cast<void>(std::fflush(stdout));
+    const int formerOutput = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, 3);
+    close(STDOUT_FILENO);
+    // Nothing may be said, nor expected, until the standard output is back.
+    ConfigStore store;
+    const std::int32_t opened = store.open();
+    const std::int32_t descriptor = store.descriptor;
+    store.close();
+    const bool isReleased = !isOpenDescriptor(STDOUT_FILENO);
+    dup2(formerOutput, STDOUT_FILENO);
+    close(formerOutput);
+    EXPECT_EQ(0, opened);
+    EXPECT_EQ(STDOUT_FILENO, descriptor);
+    EXPECT_TRUE(isReleased);
+    expectClosed(store);
+}
+
 TEST_F(ConfigStoreLifecycleTest, CloseLeavesMinusOneWhateverTheDescriptorWas) {
     ConfigStore store;
     store.descriptor = -2;
@@ -149,6 +169,19 @@ TEST_F(ConfigStoreLifecycleTest, ClosedHandleOpensAgain) {
     ASSERT_EQ(0, store.open());
     EXPECT_EQ(2U, store.length);
     EXPECT_EQ(0x5B, store.data[1]);
+}
+
+TEST_F(ConfigStoreLifecycleTest, SecondOpenOfAnAbsentObjectTouchesNothing) {
+    ConfigStore store;
+    ASSERT_EQ(0, store.open());
+    const std::int32_t descriptor = store.descriptor;
+    const std::uint8_t* data = store.data;
+    remove(IMAGE_PATH);
+    EXPECT_EQ(-2, store.open());
+    EXPECT_EQ(descriptor, store.descriptor);
+    EXPECT_EQ(data, store.data);
+    EXPECT_EQ(179U, store.length);
+    EXPECT_TRUE(isOpenDescriptor(descriptor));
 }
 
 TEST_F(ConfigStoreLifecycleTest, SecondOpenForgetsWhatTheFirstHeld) {

@@ -3,6 +3,7 @@
 #include "config/param_access.h"
 #include "kit/descriptor.h"
 #include "tests/config/memory_map.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"
 
@@ -115,9 +116,18 @@ TEST_F(ConfigStoreTest, ObjectIsOpenedForReadingOnlyAndRewound) {
 }
 
 TEST_F(ConfigStoreTest, ObjectNeedsNoRightToWrite) {
+    const PermissionsHold hold;
     ASSERT_EQ(0, chmod(IMAGE_PATH, 0444));
     ConfigStore store;
     EXPECT_EQ(0, store.open());
+}
+
+TEST_F(ConfigStoreTest, UnreadableObjectIsMinus2) {
+    const PermissionsHold hold;
+    ASSERT_EQ(0, chmod(IMAGE_PATH, 0222));
+    ConfigStore store;
+    EXPECT_EQ(-2, store.open());
+    expectClosed(store);
 }
 
 TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndTheHandleUntouched) {

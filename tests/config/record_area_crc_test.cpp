@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/descriptor.h"
 #include "tests/config/area_disk.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
 #include <fcntl.h>
@@ -123,8 +124,11 @@ TEST_F(RecordAreaCrcTest, DiskLongerThan4GiBIsReadFromItsEnd) {
 }
 
 TEST_F(RecordAreaCrcTest, DiskNeedsNoRightToWrite) {
+    const PermissionsHold hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    ASSERT_EQ(0, chmod(DISK_PATH, 0222));
+    expectFailure();
 }
 
 TEST_F(RecordAreaCrcTest, HoldsNoDescriptorAfterwards) {

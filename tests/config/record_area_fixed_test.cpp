@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/descriptor.h"
 #include "tests/config/area_disk.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
 #include <fcntl.h>
@@ -227,11 +228,14 @@ TEST_P(FixedAreaTest, ReadThatComesOutShortIsSuccess) {
 }
 
 TEST_P(FixedAreaTest, DiskNeedsNoOtherRightThanTheDirections) {
+    const PermissionsHold hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     std::string buffer = "....";
     EXPECT_EQ(0, fixed.read(buffer.data(), 4));
+    EXPECT_EQ(-1, write("ABCD"));
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
     EXPECT_EQ(0, write("ABCD"));
+    EXPECT_EQ(-1, fixed.read(buffer.data(), 4));
 }
 
 TEST_P(FixedAreaTest, HoldsNoDescriptorAfterwards) {

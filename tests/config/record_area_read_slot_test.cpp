@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/descriptor.h"
 #include "tests/config/area_disk.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
 #include <fcntl.h>
@@ -183,10 +184,13 @@ TEST_F(ReadRecordSlotTest, DiskLongerThan4GiBIsReadFromItsEnd) {
 }
 
 TEST_F(ReadRecordSlotTest, DiskNeedsNoRightToWrite) {
+    const PermissionsHold hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     std::string buffer(8, '#');
     EXPECT_EQ(0, read(9, buffer, 8));
     EXPECT_EQ(area().substr(129, 8), buffer);
+    ASSERT_EQ(0, chmod(DISK_PATH, 0222));
+    expectFailure(9, 8);
 }
 
 TEST_F(ReadRecordSlotTest, HoldsNoDescriptorAfterwards) {

@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/descriptor.h"
 #include "tests/config/area_disk.h"
+#include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
 #include <fcntl.h>
@@ -217,6 +218,9 @@ TEST_F(WriteRecordSlotTest, RefusedWriteFails) {
 }
 
 TEST_F(WriteRecordSlotTest, DiskNeedsNoRightToRead) {
+    const PermissionsHold hold;
+    ASSERT_EQ(0, chmod(DISK_PATH, 0444));
+    expectFailure(9, "hgfedcba");
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
     EXPECT_EQ(0, write(9, "ABCDEFGH"));
     ASSERT_EQ(0, chmod(DISK_PATH, 0644));
