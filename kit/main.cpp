@@ -5,14 +5,18 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <iostream>
+#include <string>
 
 namespace {
 
 constexpr int RAN = 0;
 constexpr int WRONG_USE = 2;
 
-int complain(const char* what) {
+/// One line, whatever words of the user stand in it.
+int complain(std::string what) {
+    std::replace(what.begin(), what.end(), '\n', ' ');
     std::cerr << "orvane-unit: " << what << '\n';
     return WRONG_USE;
 }

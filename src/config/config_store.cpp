@@ -9,6 +9,7 @@
 
 #include <array>
 #include <cstddef>
+#include <string_view>
 
 namespace orvane {
 
@@ -45,7 +46,8 @@ void ConfigStore::init() {
 std::int32_t ConfigStore::open() {
     // Composed and never used, on purpose: there is no file to fall back on, and an absent object
     // means no configuration, whatever calibration file stands on the unit.
-    [[maybe_unused]] constexpr auto CALIBRATION_PATH = composeCalibrationPath();
+    constexpr auto CALIBRATION_PATH = composeCalibrationPath();
+    static_assert(std::string_view(CALIBRATION_PATH.data()) == "/fs/rwdata/CALS/cal_active.bin");
 
     const int opened = platform::openSharedMemory(CONFIG_SHM_NAME, O_RDONLY, SHM_MODE);
     if (opened == -1) {
