@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <set>
 #include <string>
 
@@ -79,6 +80,18 @@ TEST(ModelNamesTest, NamesStandAtTheirCodes) {
     EXPECT_EQ(nameOfCode(1), "Marl Tulvari");
     EXPECT_EQ(nameOfCode(26), "Quarion Velmira");
     EXPECT_EQ(nameOfCode(47), "Marl Quillon");
+}
+
+/// The product data as a list of its own, which the model reads as well.
+TEST(ModelNamesTest, AreThoseOfTheProductData) {
+    std::ifstream list(ORVANE_MODEL_NAMES);
+    std::size_t code = 0;
+    for (std::string name; std::getline(list, name);) {
+        ASSERT_LT(code, ModelNameTable.size());
+        EXPECT_EQ(name, ModelNameTable.at(code)) << "model code " << code + 1;
+        ++code;
+    }
+    EXPECT_EQ(code, 47U);
 }
 
 } // namespace
