@@ -71,6 +71,12 @@ TEST(DpsBlockTest, BlocksLieBackToBackFromTheAreasFirstByte) {
     }
 }
 
+TEST(DpsBlockTest, ElementsTakeOneByteOrTwo) {
+    EXPECT_EQ(dpsElementSize(DpsEncoding::code2), 1U);
+    EXPECT_EQ(dpsElementSize(DpsEncoding::u8), 1U);
+    EXPECT_EQ(dpsElementSize(DpsEncoding::i16), 2U);
+}
+
 TEST(DpsLayoutTest, RowsAreTheExpectedOnes) {
     ASSERT_EQ(DPS_FIELD_COUNT, 44U);
     ASSERT_EQ(DPS_LAYOUT.size(), EXPECTED_FIELD_COUNT);

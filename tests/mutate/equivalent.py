@@ -1,0 +1,62 @@
+#!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
+"""The list of mutants that nobody can tell from the original, each with its reason."""
+
+from __future__ import annotations
+
+import re
+from dataclasses import dataclass
+from pathlib import Path
+
+from mutants import Key
+
+# An entry, and the marks that its lines begin with.
+MARKS = ("@ ", "- ", "+ ", "= ")
+PLACE = re.compile(r"(?P<path>\S+)(?: \((?P<occurrence>\d+)\))?")
+
+
+class EntryError(Exception):
+    """The list can't be read."""
+
+
+@dataclass(frozen=True)
+class Entry:
+    """`line` is its own line in the list; the rest as in a mutant."""
+
+    line: int
+    path: str
+    occurrence: int
+    before: str
+    after: str
+    reason: str
+
+    def key(self) -> Key:
+        return self.path, self.occurrence, self.before, self.after
+
+
+def parse_entries(text: str) -> list[Entry]:
+    entries = []
+    numbered = [(number, line.rstrip()) for number, line in enumerate(text.splitlines(), 1)
+                if line.strip() and not line.startswith("#")]
+    for at in range(0, len(numbered), len(MARKS)):
+        group = numbered[at:at + len(MARKS)]
+        number = group[0][0]
+        if [line[:2] for _, line in group] != list(MARKS):
+            raise EntryError(f"equivalent.txt:{number}: not the four lines @ - + = of an entry")
+        place, before, after, reason = (line[2:].strip() for _, line in group)
+        match = PLACE.fullmatch(place)
+        if not match:
+            raise EntryError(f"equivalent.txt:{number}: not a path: {place}")
+        entries.append(Entry(number, match["path"], int(match["occurrence"] or 1), before, after,
+                             reason))
+    keys = [entry.key() for entry in entries]
+    for index, entry in enumerate(entries):
+        if entry.key() in keys[:index]:
+            raise EntryError(f"equivalent.txt:{entry.line}: stands there twice")
+        if not entry.reason:
+            raise EntryError(f"equivalent.txt:{entry.line}: no reason")
+    return entries
+
+
+def read_entries(path: Path) -> list[Entry]:
+    return parse_entries(path.read_text(encoding="utf-8"))
