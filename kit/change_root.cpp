@@ -80,8 +80,12 @@ void changeRoot(const std::filesystem::path& root) {
 
 bool showProc(const std::filesystem::path& root) {
     const std::filesystem::path target = root / "proc";
-    return isFolder(target) && succeeds([] { return ::unshare(CLONE_NEWNS); }) &&
-           ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
+    if (!isFolder(target) || !succeeds([] { return ::unshare(CLONE_NEWNS); })) {
+        return false;
+    }
+    // Where "/" is itself a changed root it is no mount, and what it lies on can't be made private.
+    const bool isPrivate = ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0;
+    return (isPrivate || errno == EINVAL) &&
            ::mount("/proc", target.c_str(), nullptr, MS_BIND | MS_REC, nullptr) == 0;
 }
 

@@ -13,7 +13,8 @@ namespace orvane::kit {
 void changeRoot(const std::filesystem::path& root);
 
 /// Lets this process, and no other but its children, see the host's /proc at `root`/proc. False
-/// when that is no folder or the system does not allow mounts.
+/// when that is no folder or the system does not allow mounts. Only where this process lives in a
+/// changed root itself may the mount show outside, too: who made the folder then takes it away.
 bool showProc(const std::filesystem::path& root);
 
 } // namespace orvane::kit

@@ -3,6 +3,8 @@
 #include "kit/root.h"
 #include "kit/start_plan.h"
 
+#include <sys/mount.h>
+
 #include <optional>
 
 namespace orvane::kit {
@@ -18,6 +20,7 @@ public:
     }
     ~ProcFolder() {
         if (isOurs_) {
+            ::umount2(folder_.c_str(), MNT_DETACH); // nothing, but in a changed root (showProc)
             std::error_code ignored;
             std::filesystem::remove(folder_, ignored);
         }
