@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/software_version.h"
 
-#include "identity/inf_file.h"
-
 #include <dirent.h>
 
 #include <algorithm>
@@ -43,24 +41,12 @@ void scanVersionFiles() {
     }
     while (const dirent* entry = readdir(folder.get())) {
         const std::string path = std::string(VERSION_DIR) + entry->d_name;
-        // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old are taken
-        // too.
-        if (path.find(INF_MARKER) != std::string::npos) {
+        if (isVersionFile(path)) {
             Inf_Data record;
             readInfFile(path, record);
             InfRecords.push_back(std::move(record));
         }
     }
-}
-
-std::string selectVersion() {
-    for (const Inf_Data& record : InfRecords) {
-        // A substring test, on purpose: a type of MainApplication is taken too.
-        if (infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos) {
-            return infValue(record, VERSION_KEY);
-        }
-    }
-    return {};
 }
 
 /// The text before the first `separator`, or all of it when there is none.
@@ -76,6 +62,20 @@ std::string after(const std::string& text, char separator) {
 
 } // namespace
 
+bool isVersionFile(const std::string& path) {
+    // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old are taken, too.
+    return path.find(INF_MARKER) != std::string::npos;
+}
+
+bool isApplication(const Inf_Data& record) {
+    // A substring test, on purpose: a type of MainApplication is taken, too.
+    return infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos;
+}
+
+std::string versionText(const Inf_Data& record) {
+    return after(infValue(record, VERSION_KEY), AFFIX_SEPARATOR);
+}
+
 std::string softwareVersion() {
     try {
         return formatVersion(findApplicationVersion());
@@ -87,7 +87,8 @@ std::string softwareVersion() {
 std::string findApplicationVersion() {
     try {
         scanVersionFiles();
-        return after(selectVersion(), AFFIX_SEPARATOR);
+        const auto application = std::find_if(InfRecords.begin(), InfRecords.end(), isApplication);
+        return application == InfRecords.end() ? std::string() : versionText(*application);
     } catch (...) {
         return {}; // files that memory can't hold are files that can't be read
     }

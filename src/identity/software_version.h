@@ -3,6 +3,8 @@
 // The version of the unit's application software, out of the version description files.
 #pragma once
 
+#include "identity/inf_file.h"
+
 #include <string>
 
 namespace orvane {
@@ -13,13 +15,22 @@ constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 /// What softwareVersion gives when there is no usable version.
 constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 
+/// Whether the file at `path` is a version description file: ".inf" may stand anywhere in it.
+bool isVersionFile(const std::string& path);
+
+/// Whether `record` describes the application: its "Type" contains "Application".
+bool isApplication(const Inf_Data& record);
+
+/// The "Version Number" of `record` behind its first "_", or all of it when it has none; the empty
+/// string when there is none.
+std::string versionText(const Inf_Data& record);
+
 /// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out.
 std::string softwareVersion();
 
-/// Scans VERSION_DIR afresh and returns the "Version Number" of the first file, in the order of the
-/// directory listing, whose "Type" contains "Application"; of that, what follows its first "_" if
-/// it has one. The empty string when there is no such file, value or folder, or when memory runs
-/// out.
+/// Scans VERSION_DIR afresh and returns the versionText of the application: the first in the order
+/// of the directory listing. The empty string when there is no such file, value or folder, or when
+/// memory runs out.
 std::string findApplicationVersion();
 
 /// The first three components of a version text, two hexadecimal digits each; "000000" for an empty

@@ -10,8 +10,17 @@ namespace orvane {
 
 namespace {
 
-/// Reads the parameter through its own handle, which is closed again on every path. False when it
-/// can't be read, for whatever cause.
+/// Writes one tuning file, or nothing when there is no memory even for its path.
+void generate(std::int32_t blockId, const char* path) {
+    try {
+        generateTuningFile(blockId, path);
+    } catch (...) { // NOLINT(bugprone-empty-catch)
+        // The profile stands whether or not its files could be written, on purpose.
+    }
+}
+
+} // namespace
+
 bool readAudioProfile(std::uint16_t& profile) {
     ConfigStore store;
     store.init();
@@ -23,17 +32,6 @@ bool readAudioProfile(std::uint16_t& profile) {
     store.close();
     return isRead;
 }
-
-/// Writes one tuning file, or nothing when there is no memory even for its path.
-void generate(std::int32_t blockId, const char* path) {
-    try {
-        generateTuningFile(blockId, path);
-    } catch (...) { // NOLINT(bugprone-empty-catch)
-        // The profile stands whether or not its files could be written, on purpose.
-    }
-}
-
-} // namespace
 
 std::int32_t getAudioProfile() {
     std::uint16_t profile = 0;

@@ -29,6 +29,16 @@ void writeValue(std::ostream& file, const DpsBlock& block, const DpsField& field
 
 } // namespace
 
+void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block) {
+    // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
+    file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
+    for (const DpsField& field : DPS_LAYOUT) {
+        file << field.key << ' ';
+        writeValue(file, block, field);
+        file << std::endl;
+    }
+}
+
 void generateTuningFile(std::int32_t blockId, const std::string& path) {
     if (blockId < 0 || blockId >= DPS_BLOCK_COUNT) {
         return;
@@ -46,14 +56,7 @@ void generateTuningFile(std::int32_t blockId, const std::string& path) {
     if (file.fail()) {
         return;
     }
-    const DpsBlock& block = area[static_cast<std::size_t>(blockId)];
-    // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
-    file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
-    for (const DpsField& field : DPS_LAYOUT) {
-        file << field.key << ' ';
-        writeValue(file, block, field);
-        file << std::endl;
-    }
+    writeTuningText(file, blockId, area[static_cast<std::size_t>(blockId)]);
 }
 
 } // namespace orvane

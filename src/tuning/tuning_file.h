@@ -4,10 +4,17 @@
 // component.
 #pragma once
 
+#include "tuning/dps_block.h"
+
 #include <cstdint>
+#include <iosfwd>
 #include <string>
 
 namespace orvane {
+
+/// Writes the text of one block to `file`: the header with the block's id, then a line for each
+/// field. Every line is flushed.
+void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block);
 
 /// Writes tuning block `blockId` (0 to 9) of the disk to the file at `path`, created with mode 0666
 /// less the umask, or truncated. Reads the disk first; what can't be read is rendered as zeros.

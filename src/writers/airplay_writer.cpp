@@ -2,31 +2,12 @@
 #include "writers/airplay_writer.h"
 
 #include "identity/vehicle_identity.h"
-#include "tuning/audio_profile.h"
-#include "writers/template_merge.h"
 
-#include <cstdint>
 #include <ostream>
-#include <string>
 
 namespace orvane {
 
-namespace {
-
-constexpr AccessoryFile AIRPLAY_FILE = {
-    "/tmp/airplay.conf",
-    "/fs/mp/etc/airplay_static.conf",
-    "/fs/mp/etc/airplay.conf",
-};
-
-struct AirplayValues {
-    std::string model;
-    std::string brand;
-    unsigned int rightHandDrive = 0;
-    std::int32_t audioProfile = NO_AUDIO_PROFILE;
-};
-
-void writeHead(std::ostream& file, const AirplayValues& values) {
+void writeAirplayHead(std::ostream& file, const AirplayValues& values) {
     file << "# Default name of the accessory if a name is not specified in the user prefs.\n";
     file << "name = CarPlay\n\n";
     file << "# Model of the accessory.\n";
@@ -51,8 +32,6 @@ void writeHead(std::ostream& file, const AirplayValues& values) {
          << std::endl;
 }
 
-} // namespace
-
 int updateAirplayConfigFile() {
     AirplayValues values;
     getModelName(values.model);
@@ -65,7 +44,7 @@ int updateAirplayConfigFile() {
         installStockFile(AIRPLAY_FILE);
         return 0;
     }
-    writeHead(merge.output, values);
+    writeAirplayHead(merge.output, values);
     merge.copyTemplate();
     merge.close();
     return 0;

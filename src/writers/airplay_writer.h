@@ -1,11 +1,34 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "tuning/audio_profile.h"
+#include "writers/template_merge.h"
+
+#include <cstdint>
+#include <iosfwd>
+#include <string>
+
 namespace orvane {
 
-/// Writes /tmp/airplay.conf: a generated head, then the template; or the stock file. With a
-/// generated audio profile the two tuning files come first (tuning/audio_profile.h). Always returns
-/// 0.
+constexpr AccessoryFile AIRPLAY_FILE = {
+    "/tmp/airplay.conf",
+    "/fs/mp/etc/airplay_static.conf",
+    "/fs/mp/etc/airplay.conf",
+};
+
+/// What the generated head says of the vehicle.
+struct AirplayValues {
+    std::string model;
+    std::string brand;
+    unsigned int rightHandDrive = 0;
+    std::int32_t audioProfile = NO_AUDIO_PROFILE; ///< NO_AUDIO_PROFILE leaves its lines out
+};
+
+/// Writes the generated head, which comes before the template.
+void writeAirplayHead(std::ostream& file, const AirplayValues& values);
+
+/// Writes AIRPLAY_FILE: a generated head, then the template; or the stock file. With a generated
+/// audio profile the two tuning files come first (tuning/audio_profile.h). Always returns 0.
 int updateAirplayConfigFile();
 
 } // namespace orvane

@@ -3,41 +3,13 @@
 
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
-#include "writers/template_merge.h"
 
 #include <fstream>
 #include <ostream>
-#include <string>
 
 namespace orvane {
 
 namespace {
-
-constexpr AccessoryFile IAP2_DEVICE_FILE = {
-    "/tmp/iap2_device.cfg",
-    "/fs/mp/etc/iap2_device_static.cfg",
-    "/fs/mp/etc/iap2_device.cfg",
-};
-
-constexpr AccessoryFile IAP2_FILE = {
-    "/tmp/iap2.cfg",
-    "/fs/mp/etc/mm/iap2_static.cfg",
-    "/fs/mp/etc/mm/iap2.cfg",
-};
-
-constexpr AccessoryFile IAP1_FILE = {
-    "/tmp/iap1.cfg",
-    "/fs/mp/etc/mm/iap1_static.cfg",
-    "/fs/mp/etc/mm/iap1.cfg",
-};
-
-constexpr char IAP2_HARDWARE[] = "hardware_version=1.0.0\n\n";
-
-struct IapValues {
-    std::string serial;
-    std::string model;
-    std::string firmwareVersion;
-};
 
 /// The identity lines that open all three files. Values go out as C strings, on purpose: each ends
 /// at its first NUL byte.
@@ -56,10 +28,9 @@ void writeDeviceFile(TemplateMerge& merge, const IapValues& values) {
         installStockFile(IAP2_DEVICE_FILE);
         return;
     }
-    writeAccessoryBlock(merge.output, values);
-    merge.output << IAP2_HARDWARE;
+    writeIap2Head(merge.output, values);
     merge.copyTemplate();
-    merge.output << "\n[vehicle]\nenable=no\n\n";
+    merge.output << IAP2_DEVICE_END;
     merge.close();
 }
 
@@ -68,8 +39,7 @@ void writeIap2File(TemplateMerge& merge, const IapValues& values) {
         installStockFile(IAP2_FILE);
         return;
     }
-    writeAccessoryBlock(merge.output, values);
-    merge.output << IAP2_HARDWARE;
+    writeIap2Head(merge.output, values);
     merge.copyTemplate();
     merge.close();
 }
@@ -82,14 +52,23 @@ void writeIap1File(TemplateMerge& merge, const std::ofstream& iap2Output, const 
         installStockFile(IAP1_FILE);
         return;
     }
-    writeAccessoryBlock(merge.output, values);
-    merge.output << "hardware_version=010000\n";
-    merge.output << "rfcert=00000000 \n\n"; // the blank is there on purpose
+    writeIap1Head(merge.output, values);
     merge.copyTemplate();
     merge.close();
 }
 
 } // namespace
+
+void writeIap2Head(std::ostream& file, const IapValues& values) {
+    writeAccessoryBlock(file, values);
+    file << "hardware_version=1.0.0\n\n";
+}
+
+void writeIap1Head(std::ostream& file, const IapValues& values) {
+    writeAccessoryBlock(file, values);
+    file << "hardware_version=010000\n";
+    file << "rfcert=00000000 \n\n"; // the blank is there on purpose
+}
 
 int updateIapConfigFiles() {
     IapValues values;
