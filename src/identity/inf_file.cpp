@@ -5,16 +5,26 @@
 
 namespace orvane {
 
-void readInfFile(const std::string& path, Inf_Data& record) {
+bool parseInfLine(const std::string& line, std::string& key, std::string& value) {
     constexpr char SEPARATOR = '=';
+    const std::size_t separator = line.find(SEPARATOR);
+    if (separator == std::string::npos || separator + 1 == line.size()) {
+        return false;
+    }
+    key = trimSpaces(line.substr(0, separator));
+    value = trimSpaces(line.substr(separator + 1));
+    return true;
+}
+
+void readInfFile(const std::string& path, Inf_Data& record) {
     std::ifstream file(path);
     std::string line;
+    std::string key;
+    std::string value;
     while (std::getline(file, line)) {
-        const std::size_t separator = line.find(SEPARATOR);
-        if (separator == std::string::npos || separator + 1 == line.size()) {
-            continue;
+        if (parseInfLine(line, key, value)) {
+            record[key] = value;
         }
-        record[trimSpaces(line.substr(0, separator))] = trimSpaces(line.substr(separator + 1));
     }
 }
 
