@@ -18,9 +18,7 @@ namespace orvane {
 namespace {
 
 constexpr char INF_MARKER[] = ".inf";
-constexpr char TYPE_KEY[] = "Type";
 constexpr char APPLICATION_TYPE[] = "Application";
-constexpr char VERSION_KEY[] = "Version Number";
 constexpr char NO_VERSION[] = "N/A";
 constexpr char COMPONENT_SEPARATOR = '.';
 constexpr char AFFIX_SEPARATOR = '_';

@@ -12,6 +12,10 @@ namespace orvane {
 /// Folder of the version description files, with its trailing slash.
 constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 
+/// The keys of a version description file that count here.
+constexpr char TYPE_KEY[] = "Type";
+constexpr char VERSION_KEY[] = "Version Number";
+
 /// What softwareVersion gives when there is no usable version.
 constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 
