@@ -3,16 +3,23 @@
 # or built from its sources, so that it serves every compiler, standard library and processor here.
 find_path(ORVANE_CLI11_DIR CLI/CLI.hpp)
 find_path(ORVANE_TOMLPP_DIR toml++/toml.h)
+find_path(ORVANE_JSON_DIR nlohmann/json.hpp)
+find_path(ORVANE_DTL_DIR dtl/dtl.hpp)
+find_path(ORVANE_UTFCPP_DIR utf8.h PATH_SUFFIXES utf8cpp)
 find_path(ORVANE_GOOGLETEST_DIR googletest/src/gtest-all.cc PATHS /usr/src/googletest NO_CMAKE_FIND_ROOT_PATH)
-mark_as_advanced(ORVANE_CLI11_DIR ORVANE_TOMLPP_DIR ORVANE_GOOGLETEST_DIR)
+mark_as_advanced(ORVANE_CLI11_DIR ORVANE_TOMLPP_DIR ORVANE_JSON_DIR ORVANE_DTL_DIR ORVANE_UTFCPP_DIR
+  ORVANE_GOOGLETEST_DIR)
 
 set(ORVANE_KIT_MISSING "")
-if(NOT ORVANE_CLI11_DIR)
-  list(APPEND ORVANE_KIT_MISSING libcli11-dev)
-endif()
-if(NOT ORVANE_TOMLPP_DIR)
-  list(APPEND ORVANE_KIT_MISSING libtomlplusplus-dev)
-endif()
+foreach(library CLI11:libcli11-dev TOMLPP:libtomlplusplus-dev JSON:nlohmann-json3-dev DTL:libdtl-dev
+    UTFCPP:libutfcpp-dev)
+  string(REPLACE ":" ";" library ${library})
+  list(GET library 0 name)
+  list(GET library 1 package)
+  if(NOT ORVANE_${name}_DIR)
+    list(APPEND ORVANE_KIT_MISSING ${package})
+  endif()
+endforeach()
 
 set(ORVANE_TESTS_MISSING ${ORVANE_KIT_MISSING})
 if(NOT ORVANE_KIT)

@@ -8,7 +8,7 @@
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
-TARGETS=(inf_text image tuning options)
+TARGETS=(inf_text image tuning options description tuning_text)
 LEAST_EXECUTIONS=1000
 
 if [ $# -lt 1 ] || [ $# -gt 2 ] || ! [[ $1 =~ ^[1-9][0-9]*$ ]]; then
@@ -31,6 +31,8 @@ options_of() {
     image) echo "-max_len=5004" ;;
     tuning) echo "-max_len=1881" ;;
     options) echo "-max_len=160" ;;
+    description) echo "-max_len=2048 -dict=fuzz/description.dict" ;;
+    tuning_text) echo "-max_len=2048 -dict=fuzz/tuning_text.dict" ;;
     esac
 }
 
@@ -44,7 +46,7 @@ what_happened() {
 }
 
 mkdir -p "$build/artifacts" "$build/corpus" "$build/log"
-format='%-10s %12s %12s %12s %9s\n'
+format='%-11s %12s %12s %12s %9s\n'
 # shellcheck disable=SC2059 # the format is a constant
 row() { printf "$format" "$@"; }
 

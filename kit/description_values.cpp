@@ -9,13 +9,14 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr std::string_view HEX_PREFIX = "hex:";
-
-std::string quoted(std::string_view text) {
-    return "\"" + std::string(text) + "\"";
-}
+/// So much of a text stands in an error.
+constexpr std::size_t SHOWN = 40;
 
 } // namespace
+
+std::string inQuotes(std::string_view text) {
+    return "\"" + std::string(text) + "\"";
+}
 
 Bytes hexBytes(std::string_view text) {
     std::string digits;
@@ -25,7 +26,8 @@ Bytes hexBytes(std::string_view text) {
         }
     }
     if (digits.size() % 2 != 0) {
-        throw KitError("hex takes two digits a byte: " + quoted(text) + " has an odd number");
+        throw KitError("hex takes two digits a byte: " + inQuotes(digits.substr(0, SHOWN)) +
+                       (digits.size() > SHOWN ? "..." : "") + " has an odd number");
     }
     Bytes bytes;
     for (std::size_t i = 0; i < digits.size(); i += 2) {
@@ -34,7 +36,7 @@ Bytes hexBytes(std::string_view text) {
         const auto [end, error] = std::from_chars(pair, pair + 2, byte, 16);
         if (error != std::errc{} || end != pair + 2) {
             throw KitError("hex takes the digits 0-9 and a-f: " +
-                           quoted(std::string_view(pair, 2)) + " is no byte");
+                           inQuotes(std::string_view(pair, 2)) + " is no byte");
         }
         bytes += static_cast<char>(byte);
     }
@@ -48,15 +50,15 @@ Bytes textOrHexBytes(std::string_view text) {
     return Bytes(text);
 }
 
-std::uint64_t keyNumber(std::string_view key, std::uint64_t greatest, const std::string& what) {
+std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what) {
     const bool isHex = key.substr(0, 2) == "0x";
     const std::string_view digits = isHex ? key.substr(2) : key;
     const char* const last = digits.data() + digits.size();
     std::uint64_t number = 0;
     const auto [end, error] = std::from_chars(digits.data(), last, number, isHex ? 16 : 10);
-    if (error != std::errc{} || end != last || number > greatest) {
-        throw KitError(what + " must be from 0 to " + std::to_string(greatest) + ", not " +
-                       quoted(key));
+    if (error != std::errc{} || end != last || number < range.least || number > range.greatest) {
+        throw KitError(what + " must be from " + std::to_string(range.least) + " to " +
+                       std::to_string(range.greatest) + ", not " + inQuotes(key));
     }
     return number;
 }

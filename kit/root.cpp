@@ -2,6 +2,7 @@
 #include "kit/root.h"
 
 #include "kit/change_root.h"
+#include "kit/host_file.h"
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -15,8 +16,9 @@ namespace {
 
 /// Must not fail: to go on after that would mean to work on the unit as if it were the host.
 void leaveRoot(const Descriptor& outerRoot, const Descriptor& outerCwd) {
-    if (::fchdir(outerRoot.number()) != 0 || ::chroot(".") != 0 ||
-        ::fchdir(outerCwd.number()) != 0) {
+    const bool isRootBack =
+        !outerRoot.isOpen() || (::fchdir(outerRoot.number()) == 0 && ::chroot(".") == 0);
+    if (!isRootBack || ::fchdir(outerCwd.number()) != 0) {
         std::perror("cannot leave the unit");
         std::abort();
     }
@@ -30,7 +32,11 @@ EnteredRoot::EnteredRoot(const std::filesystem::path& root)
     if (!outerRoot_.isOpen() || !outerCwd_.isOpen()) {
         throw systemError("cannot keep the present root and working directory");
     }
-    changeRoot(root);
+    if (isRootDirectory(root)) {
+        outerRoot_.close();
+    } else {
+        changeRoot(root);
+    }
     if (::chdir("/") != 0) {
         const std::string failure = systemError("cannot enter " + root.string()).what();
         leaveRoot(outerRoot_, outerCwd_);

@@ -18,6 +18,7 @@ namespace orvane::kit {
 /// restores both. Works in a single-threaded process only (a user namespace needs that); nests not.
 /// Throws KitError when `root` is not a folder or the system allows neither way, the remedy in its
 /// text; the root is then unchanged. A user namespace, once entered, stays for the process's life.
+/// Where `root` is "/" already, only the working directory changes, which takes no privilege.
 class EnteredRoot {
 public:
     explicit EnteredRoot(const std::filesystem::path& root);
@@ -26,7 +27,7 @@ public:
     EnteredRoot& operator=(const EnteredRoot&) = delete;
 
 private:
-    Descriptor outerRoot_; ///< the former "/"
+    Descriptor outerRoot_; ///< the former "/"; closed when it is the present one, too
     Descriptor outerCwd_;  ///< the former working directory
 };
 

@@ -1,15 +1,25 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Typed values out of a TOML tree, each refusal with its place in the text. For description.cpp
-// alone: compiling the parser takes a while.
+// Typed values out of a TOML tree, each refusal with its place in the text, what was there, and
+// what would be right. For the readers of descriptions alone: compiling the parser takes a while.
 #pragma once
 
+#include "kit/description_values.h"
 #include "kit/kit_error.h"
 
+// The library asserts that a text is what it then reports as an error when it is not: the key of
+// "[{" is one. An assertion would end the program, and without assertions Clang would rely on it.
+// So neither shall happen, and the report shall come.
+#pragma push_macro("NDEBUG")
+#undef NDEBUG
+#define TOML_ASSERT(condition) static_cast<void>(0)
 #define TOML_HEADER_ONLY 1
 #include <toml++/toml.h>
+#pragma pop_macro("NDEBUG")
 
+#include <algorithm>
 #include <cstdint>
+#include <sstream>
 #include <string>
 #include <utility>
 
@@ -17,9 +27,11 @@ namespace orvane::kit {
 
 using Place = toml::source_region;
 
-/// Throws KitError with "name:line:column:" in front.
-[[noreturn]] inline void failAt(const Place& place, const std::string& what) {
-    throw KitError(*place.path + ":" + std::to_string(place.begin.line) + ":" +
+/// Throws KitError with "name:line:column:" in front, on one line whatever texts stand in `what`.
+[[noreturn]] inline void failAt(const Place& place, std::string what) {
+    std::replace_if(
+        what.begin(), what.end(), [](char c) { return static_cast<unsigned char>(c) < 0x20; }, ' ');
+    throw KitError((place.path ? *place.path : "") + ":" + std::to_string(place.begin.line) + ":" +
                    std::to_string(place.begin.column) + ": " + what);
 }
 
@@ -33,10 +45,45 @@ auto at(const Place& place, const Action& action) {
     }
 }
 
+/// Does `action` and adds the place and what it is about to what it throws.
+template <class Action>
+auto at(const Place& place, const std::string& what, const Action& action) {
+    try {
+        return action();
+    } catch (const KitError& error) {
+        failAt(place, what + ": " + error.what());
+    }
+}
+
+/// The node as it may stand in an error: a single value as in TOML, the beginning of a long one.
+inline std::string shown(const toml::node& node) {
+    constexpr std::size_t LONGEST = 40;
+    if (node.is_table()) {
+        return "a table";
+    }
+    if (node.is_array()) {
+        return "a list";
+    }
+    std::string text;
+    if (node.is_string()) {
+        text = inQuotes(node.as_string()->get());
+    } else {
+        std::ostringstream out;
+        node.visit([&out](const auto& value) {
+            if constexpr (toml::is_value<decltype(value)>) {
+                out << value;
+            }
+        });
+        text = out.str();
+    }
+    return text.size() <= LONGEST ? text : text.substr(0, LONGEST) + "...";
+}
+
 /// Throws for a key that `where` does not know; `known` lists those that it does.
-[[noreturn]] inline void failUnknown(const toml::key& key, const char* where, const char* known) {
+[[noreturn]] inline void failUnknown(const toml::key& key, const std::string& where,
+                                     const char* known) {
     failAt(key.source(),
-           "unknown key \"" + std::string(key.str()) + "\" in " + where + ": it takes " + known);
+           "unknown key " + inQuotes(key.str()) + " in " + where + ": it takes " + known);
 }
 
 /// The node as a table, a text, a whole number, and a number from 0 to `greatest`. Each throws with
@@ -44,15 +91,15 @@ auto at(const Place& place, const Action& action) {
 inline const toml::table& tableOf(const toml::key& key, const toml::node& node) {
     const toml::table* table = node.as_table();
     if (table == nullptr) {
-        failAt(node.source(), "\"" + std::string(key.str()) + "\" must be a table");
+        failAt(node.source(), inQuotes(key.str()) + " must be a table, not " + shown(node));
     }
     return *table;
 }
 
-inline const std::string& textOf(const toml::node& node, const char* what) {
+inline const std::string& textOf(const toml::node& node, const std::string& what) {
     const auto* text = node.as_string();
     if (text == nullptr) {
-        failAt(node.source(), std::string(what) + " must be a text in quotes");
+        failAt(node.source(), what + " must be a text in quotes, not " + shown(node));
     }
     return text->get();
 }
@@ -60,7 +107,7 @@ inline const std::string& textOf(const toml::node& node, const char* what) {
 inline std::int64_t numberOf(const toml::node& node, const std::string& what) {
     const auto* number = node.as_integer();
     if (number == nullptr) {
-        failAt(node.source(), what + " must be a whole number");
+        failAt(node.source(), what + " must be a whole number, not " + shown(node));
     }
     return number->get();
 }
@@ -75,11 +122,23 @@ inline std::uint64_t numberUpTo(const toml::node& node, std::uint64_t greatest,
     return static_cast<std::uint64_t>(number);
 }
 
-/// Enters a value under a number that may be written in two ways.
-template <class Map, class Value>
-void putOnce(Map& map, const toml::key& key, std::uint64_t number, Value value) {
-    if (!map.emplace(static_cast<typename Map::key_type>(number), std::move(value)).second) {
-        failAt(key.source(), "number " + std::to_string(number) + " is given twice");
+/// The bytes of a text in hex.
+inline Bytes hexOf(const toml::node& node, const std::string& what) {
+    const std::string& text = textOf(node, what);
+    return at(node.source(), what, [&text] { return hexBytes(text); });
+}
+
+/// A number that stands as a key, as of keyNumber.
+inline std::uint64_t numberOf(const toml::key& key, KeyRange range, const std::string& what) {
+    return at(key.source(), [&] { return keyNumber(key.str(), range, what); });
+}
+
+/// Enters a value under a key that may be written in two ways; `what` names it.
+template <class Map, class Key, class Value>
+void putOnce(Map& map, const toml::key& key, const Key& mapKey, Value value,
+             const std::string& what) {
+    if (!map.emplace(static_cast<typename Map::key_type>(mapKey), std::move(value)).second) {
+        failAt(key.source(), what + " is given twice");
     }
 }
 

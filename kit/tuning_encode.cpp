@@ -9,30 +9,12 @@ namespace orvane::kit {
 
 namespace {
 
-struct Range {
-    std::int64_t least;
-    std::int64_t greatest;
-};
-
-Range rangeOf(DpsEncoding encoding) {
-    switch (encoding) {
-    case DpsEncoding::code2:
-        return {0, 3};
-    case DpsEncoding::u8:
-        return {0, 255};
-    case DpsEncoding::i16:
-        break;
-    }
-    return {-32768, 32767};
-}
-
 bool hasWords(const DpsField& field) {
     return field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord;
 }
 
 std::string rangeText(const DpsField& field) {
-    const Range range = rangeOf(field.encoding);
-    return std::to_string(range.least) + " to " + std::to_string(range.greatest);
+    return std::to_string(leastOf(field)) + " to " + std::to_string(greatestOf(field));
 }
 
 /// The code of `word` in the field's own table.
@@ -41,7 +23,7 @@ std::int64_t codeOf(const DpsField& field, const std::string& word) {
         throw KitError(std::string(field.key) + " takes numbers, not the word \"" + word + "\"");
     }
     std::string known;
-    for (const QwaWord& row : field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords) {
+    for (const QwaWord& row : wordsOf(field)) {
         if (word == row.word) {
             return row.code;
         }
@@ -64,7 +46,7 @@ std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& va
     }
     if (field.kind == DpsKind::list) {
         throw KitError(std::string(field.key) + " takes a list of " + std::to_string(field.count) +
-                       " numbers");
+                       " numbers, not " + std::to_string(std::get<std::int64_t>(value)));
     }
     return {std::get<std::int64_t>(value)};
 }
@@ -89,6 +71,11 @@ void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std:
 
 } // namespace
 
+bool isTuningField(const std::string& key) {
+    return std::any_of(DPS_LAYOUT.begin(), DPS_LAYOUT.end(),
+                       [&key](const DpsField& row) { return key == row.key; });
+}
+
 const DpsField& tuningField(const std::string& key) {
     const auto* field = std::find_if(DPS_LAYOUT.begin(), DPS_LAYOUT.end(),
                                      [&key](const DpsField& row) { return key == row.key; });
@@ -105,9 +92,8 @@ void encodeTuningField(DpsBlock& block, const std::string& key, const TuningValu
         throw KitError(key + " takes " + std::to_string(field.count) + " numbers, not " +
                        std::to_string(numbers.size()));
     }
-    const Range range = rangeOf(field.encoding);
     for (const std::int64_t number : numbers) {
-        if (number < range.least || number > range.greatest) {
+        if (number < leastOf(field) || number > greatestOf(field)) {
             throw KitError(key + " takes " + rangeText(field) + ": " + std::to_string(number) +
                            " does not fit");
         }
@@ -126,6 +112,39 @@ DpsBlock encodeTuningBlock(const TuningDescription& description) {
     std::copy(description.raw.begin(), description.raw.end(), block.bytes.begin());
     for (const auto& [key, value] : description.fields) {
         encodeTuningField(block, key, value);
+    }
+    return block;
+}
+
+std::int64_t leastOf(const DpsField& field) {
+    return field.encoding == DpsEncoding::i16 ? -32768 : 0;
+}
+
+std::int64_t greatestOf(const DpsField& field) {
+    switch (field.encoding) {
+    case DpsEncoding::code2:
+        return 3;
+    case DpsEncoding::u8:
+        return 255;
+    case DpsEncoding::i16:
+        break;
+    }
+    return 32767;
+}
+
+const std::array<QwaWord, 3>& wordsOf(const DpsField& field) {
+    return field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords;
+}
+
+std::string tuningWord(const DpsField& field, std::int64_t code) {
+    return hasWords(field) ? qwaWord(wordsOf(field), static_cast<std::int32_t>(code)) : "";
+}
+
+DpsBlock withoutFields(DpsBlock block) {
+    for (const DpsField& field : DPS_LAYOUT) {
+        for (std::size_t element = 0; element < field.count; ++element) {
+            putNumber(block, field, element, 0);
+        }
     }
     return block;
 }

@@ -8,6 +8,9 @@
 
 namespace orvane::kit {
 
+/// Whether a tuning block has a field `key`.
+bool isTuningField(const std::string& key);
+
 /// The row of the field `key`. Throws KitError for an unknown key.
 const DpsField& tuningField(const std::string& key);
 
@@ -20,5 +23,18 @@ void encodeTuningField(DpsBlock& block, const std::string& key, const TuningValu
 /// The whole block: the raw bytes, zeros behind them, then the fields. Throws as above, and for
 /// more raw bytes than a block has.
 DpsBlock encodeTuningBlock(const TuningDescription& description);
+
+/// The numbers that an element of `field` can hold.
+std::int64_t leastOf(const DpsField& field);
+std::int64_t greatestOf(const DpsField& field);
+
+/// The words of `field`, which is a switch or a mode.
+const std::array<QwaWord, 3>& wordsOf(const DpsField& field);
+
+/// The word of `field` for `code`; empty where it has none, and for a field without words.
+std::string tuningWord(const DpsField& field, std::int64_t code);
+
+/// The block with all bits that a field has set to zero: what no field reads.
+DpsBlock withoutFields(DpsBlock block);
 
 } // namespace orvane::kit

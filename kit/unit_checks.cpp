@@ -5,6 +5,8 @@
 #include "config/record_area.h"
 #include "config/record_slots.h"
 #include "kit/kit_error.h"
+#include "kit/marker.h"
+#include "kit/tuning_encode.h"
 
 #include <filesystem>
 
@@ -49,6 +51,14 @@ void checkAux(const Bytes& bytes) {
     checkLength("the auxiliary area", bytes, AUX_AREA_SIZE);
 }
 
+void checkTuning(std::uint32_t id, const TuningDescription& block) {
+    if (id >= DPS_BLOCK_COUNT) {
+        throw KitError("there is no tuning block " + std::to_string(id) + ": they are 0 to " +
+                       std::to_string(DPS_BLOCK_COUNT - 1));
+    }
+    encodeTuningBlock(block); // only for its refusals
+}
+
 void checkUnitPath(const std::string& path) {
     const std::filesystem::path asPath(path);
     const bool isPlain = asPath.is_absolute() && asPath.has_filename() &&
@@ -58,6 +68,48 @@ void checkUnitPath(const std::string& path) {
         throw KitError(
             "a path must be absolute and have no \".\", \"..\" or needless \"/\", unlike \"" +
             path + "\"");
+    }
+    const std::string mark = std::string("/") + MARKER_NAME;
+    if (path == mark || path.compare(0, mark.size() + 1, mark + "/") == 0) {
+        throw KitError("a path must not be " + mark + ", which is the kit's own mark: \"" + path +
+                       "\"");
+    }
+}
+
+void checkLinkTarget(const std::string& target) {
+    if (target.empty() || target.find('\0') != std::string::npos) {
+        throw KitError("a link's target must have at least one byte, and none that is zero");
+    }
+}
+
+void checkUnit(const UnitDescription& unit) {
+    for (const auto& [number, value] : unit.image.params) {
+        checkParam(number, value);
+    }
+    for (const auto& [slot, bytes] : unit.disk.slots) {
+        checkSlot(slot, bytes);
+    }
+    if (unit.disk.aux) {
+        checkAux(*unit.disk.aux);
+    }
+    for (const auto& [id, block] : unit.disk.tuning) {
+        checkTuning(id, block);
+    }
+    for (const auto& [path, content] : unit.files) {
+        checkUnitPath(path);
+    }
+    for (const auto& [path, content] : unit.sparseFiles) {
+        checkUnitPath(path);
+    }
+    for (const auto& [path, target] : unit.links) {
+        checkUnitPath(path);
+        checkLinkTarget(target);
+    }
+    for (const std::string& path : unit.folders) {
+        checkUnitPath(path);
+    }
+    for (const std::string& path : unit.absent) {
+        checkUnitPath(path);
     }
 }
 

@@ -21,7 +21,17 @@ void checkSlot(std::uint32_t slot, const Bytes& bytes);
 /// The auxiliary area takes `bytes`.
 void checkAux(const Bytes& bytes);
 
-/// `path` is absolute, names something, and has no ".", ".." or needless slash.
+/// There is such a tuning block, and it takes `block`.
+void checkTuning(std::uint32_t id, const TuningDescription& block);
+
+/// `path` is absolute, names something, has no ".", ".." or needless slash, and is not the kit's
+/// own mark (marker.h) nor anything below it.
 void checkUnitPath(const std::string& path);
+
+/// `target` is a text that a symbolic link can hold.
+void checkLinkTarget(const std::string& target);
+
+/// All of the above for everything in `unit`.
+void checkUnit(const UnitDescription& unit);
 
 } // namespace orvane::kit

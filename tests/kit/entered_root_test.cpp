@@ -89,6 +89,13 @@ protected:
         EXPECT_FALSE(fs::exists("/marker"));
     }
 
+    /// For a child process, in which no expectation would be seen.
+    void expectHostRootAt(const char* workingDirectory) const {
+        if (!(identityOf("/") == hostRoot_) || fs::current_path() != workingDirectory) {
+            throw std::runtime_error("elsewhere");
+        }
+    }
+
     static void expectInside() {
         EXPECT_EQ(fs::current_path(), "/");
         EXPECT_EQ(readFile("/marker"), "of the unit");
@@ -202,6 +209,27 @@ TEST_F(EnteredRootTest, SystemThatAllowsNeitherWayIsNamedWithTheRemedy) {
         EXPECT_NE(said.find("user.max_user_namespaces"), std::string::npos) << said;
         EXPECT_EQ(said.find('\n'), std::string::npos) << said;
     }
+}
+
+TEST_F(EnteredRootTest, PresentRootTakesNoPrivilegeAndChangesTheWorkingDirectory) {
+    fs::create_directory_symlink("/", root() / "up");
+    const kit::RunResult result = kit::runCaptured([this] {
+        forbidChangeOfRoot();
+        fs::current_path(root());
+        for (const fs::path& path : {fs::path("/"), fs::path("up"), root() / "inner/../up"}) {
+            const std::size_t before = openDescriptors();
+            {
+                const kit::EnteredRoot entered(path);
+                expectHostRootAt("/");
+            }
+            if (fs::current_path() != root() || openDescriptors() != before) {
+                throw std::runtime_error("not as before");
+            }
+        }
+        ::_exit(0);
+    });
+    EXPECT_EQ(result.exitStatus, 0);
+    expectHost();
 }
 
 TEST_F(EnteredRootTest, ManyUnitsInARowLeaveNoDescriptor) {

@@ -51,7 +51,7 @@ const Refusal REFUSALS[] = {
     {[](kit::UnitDescription& unit) { unit.disk.aux = ""; },
      "the auxiliary area takes 1 to 1024 bytes, not 0"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[10].raw = "x"; },
-     "there is no tuning block 10"},
+     "there is no tuning block 10: they are 0 to 9"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[0].raw = std::string(189, 'x'); },
      "a tuning block has 188 bytes, not 189"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[2].fields["qwaNone"] = "x"; },
@@ -60,21 +60,52 @@ const Refusal REFUSALS[] = {
          unit.disk.size = 1048575; // a byte less than the record area
          unit.disk.slots[0] = "x";
      },
-     "slot 0 does not fit on a disk of 1048575 bytes"},
+     "slot 0 does not fit on a disk of 1048575 bytes: it takes 1048576"},
     {[](kit::UnitDescription& unit) {
          unit.disk = {};
          unit.disk.size = 0;
          unit.disk.aux = "x";
      },
-     "the auxiliary area does not fit on a disk of 0 bytes"},
+     "the auxiliary area does not fit on a disk of 0 bytes: it takes 1045504"},
     {[](kit::UnitDescription& unit) {
          unit.disk = {};
          unit.disk.size = 0xFF000 - 1;
          unit.disk.tuning[0].raw = "x";
      },
-     "the tuning area does not fit on a disk of 1044479 bytes"},
+     "the tuning area does not fit on a disk of 1044479 bytes: it takes 1044480"},
     {[](kit::UnitDescription& unit) { unit.disk.bytes[0x1FFFFF] = "ab"; },
      "what stands at 2097151 ends at byte 2097153 of a disk of 2097152 bytes"},
+    {[](kit::UnitDescription& unit) {
+         unit.disk.bytes[~std::uint64_t{0}] = "ab"; // past the end, however it is counted
+     },
+     "what stands at 18446744073709551615 ends at byte 1 of a disk of 2097152 bytes"},
+    {[](kit::UnitDescription& unit) {
+         unit.sparseFiles["/tmp/x"] = {3, {{2, "ab"}}};
+     },
+     "what stands at 2 ends at byte 4 of a file of 3 bytes"},
+    {[](kit::UnitDescription& unit) { unit.files["/tmp/file/below"] = "x"; },
+     "/tmp/file/below lies below /tmp/file, which is a file, not a folder"},
+    {[](kit::UnitDescription& unit) { unit.folders.emplace_back("/tmp/file/b/c"); },
+     "/tmp/file/b/c lies below /tmp/file, which is a file, not a folder"},
+    {[](kit::UnitDescription& unit) {
+         unit.links = {{"/fs", "/"}};
+         unit.files["/fs/mp/x"] = "x";
+     },
+     "/fs/mp/x lies below /fs, which is a link, not a folder"},
+    {[](kit::UnitDescription& unit) { unit.folders.emplace_back("/tmp/file"); },
+     "/tmp/file is both a file and a folder"},
+    {[](kit::UnitDescription& unit) { unit.links["/tmp/file"] = "x"; },
+     "/tmp/file is both a file and a link"},
+    {[](kit::UnitDescription& unit) { unit.sparseFiles["/tmp/file"] = {}; },
+     "/tmp/file is given twice"},
+    {[](kit::UnitDescription& unit) { unit.links["/extra/folder"] = "x"; },
+     "/extra/folder is both a link and a folder"},
+    {[](kit::UnitDescription& unit) { unit.links["/x"] = ""; },
+     "a link's target must have at least one byte, and none that is zero"},
+    {[](kit::UnitDescription& unit) { unit.links["/x"] = std::string("a\0b", 3); },
+     "a link's target must have at least one byte, and none that is zero"},
+    {[](kit::UnitDescription& unit) { unit.files["/.orvane-unit"] = "x"; },
+     "a path must not be /.orvane-unit, which is the kit's own mark: \"/.orvane-unit\""},
 };
 
 class MakeUnitRefusalTest : public ::testing::Test {
@@ -148,19 +179,6 @@ TEST_F(MakeUnitRefusalTest, PathThatIsNotPlainIsNamedAndLeavesNothing) {
         EXPECT_NE(refusalOf(unit, root()), "");
         EXPECT_TRUE(fs::is_empty(folder()));
     }
-}
-
-TEST_F(MakeUnitRefusalTest, FileInThePlaceOfAFolderIsRefused) {
-    kit::UnitDescription unit = wholeUnit();
-    unit.files["/fs/mp"] = "x";
-    expectNothingLeft(unit, "cannot make " + (root() / "fs/mp").string() + ": Is a directory");
-}
-
-TEST_F(MakeUnitRefusalTest, FileBelowAFileIsRefused) {
-    kit::UnitDescription unit = wholeUnit();
-    unit.files["/tmp/file/below"] = "x";
-    EXPECT_NE(refusalOf(unit, root()), "");
-    EXPECT_TRUE(fs::is_empty(folder()));
 }
 
 TEST_F(MakeUnitRefusalTest, SystemThatDoesNotTakeTheDiskIsRefusedAndLeavesNothing) {

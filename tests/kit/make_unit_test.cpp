@@ -44,7 +44,8 @@ std::set<std::string> entriesOf(const fs::path& root) {
     return entries;
 }
 
-const std::set<std::string> EMPTY_UNIT = {"dev",
+const std::set<std::string> EMPTY_UNIT = {".orvane-unit=30",
+                                          "dev",
                                           "dev/hd0=2097152",
                                           "fs",
                                           "fs/mp",
@@ -251,8 +252,8 @@ TEST_F(MakeUnitTest, WhatIsAbsentIsGoneWithAllBelowIt) {
     unit.absent = {"/dev", "/fs/mp/etc", "/tmp/gone", "/never/there", IMAGE_PATH};
     make(unit);
     EXPECT_EQ(entriesOf(root()),
-              (std::set<std::string>{"fs", "fs/mp", "fs/rwdata", "fs/rwdata/.Version", "fs/tmpfs",
-                                     "tmp", "tmp/kept=1"}));
+              (std::set<std::string>{".orvane-unit=30", "fs", "fs/mp", "fs/rwdata",
+                                     "fs/rwdata/.Version", "fs/tmpfs", "tmp", "tmp/kept=1"}));
 }
 
 TEST_F(MakeUnitTest, AbsentNameIsNoPrefixOfAnother) {

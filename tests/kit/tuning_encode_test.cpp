@@ -151,7 +151,7 @@ const Refusal REFUSALS[] = {
      "qwaNRAtten takes -32768 to 32767: 4294967296 does not fit"},
     {"qwaNRAtten", Numbers{1}, "qwaNRAtten takes one value, not a list"},
     {"qwaAECSwitch", Numbers{1}, "qwaAECSwitch takes one value, not a list"},
-    {"qwaNCParams", std::int64_t{1}, "qwaNCParams takes a list of 5 numbers"},
+    {"qwaNCParams", std::int64_t{1}, "qwaNCParams takes a list of 5 numbers, not 1"},
     {"qwaNCParams", Numbers{1, 2, 3, 4}, "qwaNCParams takes 5 numbers, not 4"},
     {"qwaNCParams", Numbers{1, 2, 3, 4, 5, 6}, "qwaNCParams takes 5 numbers, not 6"},
     {"qwaNCParams", Numbers{}, "qwaNCParams takes 5 numbers, not 0"},

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/support/trace.h"
 
+#include "kit/marker.h"
 #include "tests/support/host_command.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
@@ -173,6 +174,7 @@ Trace traceRun(const fs::path& root, const std::vector<std::string>& arguments) 
         command.push_back(word);
     }
     command.insert(command.end(), arguments.begin(), arguments.end());
+    kit::markUnit(root);
     const kit::RunResult result = runOnHost(command);
     EXPECT_EQ(result.exitStatus, 0) << result.standardError;
 

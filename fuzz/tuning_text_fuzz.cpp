@@ -1,0 +1,95 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The text of a tuning file, read back into a block. The tool writes the same text of that block
+// again; what it would not write is refused, each fault with its place. The first byte of the input
+// chooses how the text begins: 0 for what the input says, any other for a whole tuning file in
+// which a line, by the remainder, is replaced by the rest of the input.
+#include "fuzz/support.h"
+#include "kit/kit_error.h"
+#include "kit/tuning_text.h"
+#include "tuning/tuning_file.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <optional>
+#include <sstream>
+#include <string>
+#include <string_view>
+
+namespace orvane::fuzz {
+
+namespace {
+
+constexpr char NAME[] = "a.txt";
+constexpr std::string_view HEADER = "; Genereated config from DPS (blockId ";
+constexpr std::size_t LINES = 1 + DPS_FIELD_COUNT;
+
+std::string textOf(const DpsBlock& block, std::int32_t id) {
+    std::ostringstream text;
+    writeTuningText(text, id, block);
+    return text.str();
+}
+
+/// A whole file of zeros with `line` in the place of one of its lines, the line's end included.
+std::string withLine(std::size_t number, std::string_view line) {
+    std::string text = textOf({}, 3);
+    std::size_t begin = 0;
+    for (; number > 0; --number) {
+        begin = text.find('\n', begin) + 1;
+    }
+    return text.replace(begin, text.find('\n', begin) + 1 - begin, line);
+}
+
+/// "a.txt:LINE:COLUMN: " in a text of so many lines.
+void requirePlace(std::string_view line, std::size_t lines) {
+    std::string_view rest = line;
+    bool isPlace = take(rest, sizeof NAME) == std::string(NAME) + ":";
+    const std::string lineNumber(take(rest, rest.find(':')));
+    isPlace = isPlace && take(rest, 1) == ":";
+    const std::string column(take(rest, rest.find(':')));
+    for (const std::string& number : {lineNumber, column}) {
+        isPlace = isPlace && !number.empty() && number.size() < 9 && number.front() != '0' &&
+                  number.find_first_not_of("0123456789") == std::string::npos;
+    }
+    if (!isPlace || take(rest, 2) != ": " || rest.empty() || std::stoul(lineNumber) > lines + 1) {
+        fail("a refusal", "a.txt:LINE:COLUMN: ...", line);
+    }
+}
+
+void requirePlaces(std::string_view message, std::size_t lines) {
+    if (message.empty()) {
+        fail("a refusal", "a.txt:LINE:COLUMN: ...", message);
+    }
+    while (!message.empty()) {
+        requirePlace(take(message, message.find('\n')), lines);
+        take(message, 1);
+    }
+}
+
+std::optional<DpsBlock> parse(const std::string& text) {
+    try {
+        return kit::parseTuningText(text, NAME, 3);
+    } catch (const kit::KitError& error) {
+        const auto ends = std::count(text.begin(), text.end(), '\n');
+        requirePlaces(error.what(), static_cast<std::size_t>(ends) + 1);
+        return {};
+    }
+}
+
+} // namespace
+
+} // namespace orvane::fuzz
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+    using namespace orvane::fuzz;
+    std::string_view input = inputText(data, size);
+    const std::size_t kind = size == 0 ? 0 : *data % (LINES + 1);
+    take(input, 1);
+    const std::string text = kind == 0 ? std::string(input) : withLine(kind - 1, input);
+    const auto block = parse(text);
+    if (block) {
+        const std::int32_t id = text.at(HEADER.size()) - '0';
+        requireEqual("the text of the block that was read", text, textOf(*block, id));
+    }
+    return 0;
+}

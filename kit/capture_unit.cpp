@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/capture_unit.h"
+
+#include "kit/redact_serial.h"
+#include "kit/unit.h"
+#include "kit/unit_inputs.h"
+
+namespace orvane::kit {
+
+void captureUnit(const std::filesystem::path& source, const std::filesystem::path& root,
+                 bool redactsSerial) {
+    UnitInputs inputs = readInputs(source);
+    if (redactsSerial) {
+        redactSerial(inputs);
+    }
+    makeUnit(describeInputs(std::move(inputs)), root);
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// A folder that is there as a whole or not at all.
+#pragma once
+
+#include <filesystem>
+#include <functional>
+
+namespace orvane::kit {
+
+/// Has `fill` fill an empty folder beside `folder`, then renames it to `folder`, which must be
+/// absent or an empty folder. The folder beside is named "." + the folder's name + ".unfinished-"
+/// and a number, and has the access rights that an empty `folder` had. What `fill` throws, this
+/// throws on as KitError, with the paths that will never be replaced by the final ones; the folder
+/// beside is then removed and `folder` is as it was. Also throws KitError when `folder` is anything
+/// but absent or empty, or the system refuses.
+void makeFinishedFolder(const std::filesystem::path& folder,
+                        const std::function<void(const std::filesystem::path&)>& fill);
+
+} // namespace orvane::kit

@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Texts and bytes as they stand in a TOML document.
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace orvane::kit {
+
+/// Whether `text` can stand in a document as a text that a reader can read: UTF-8, and no more than
+/// one control character in eight, line ends and tabs aside.
+bool isReadable(std::string_view text);
+
+/// The UTF-8 text `text` in quotes, on one line.
+std::string tomlText(std::string_view text);
+
+/// The same over as many lines as it has, in three quotes, where it has more than one.
+std::string tomlLines(std::string_view text);
+
+/// `bytes` in hex, in quotes; over several lines of 32 bytes each where there are more.
+std::string tomlHex(std::string_view bytes);
+
+/// `bytes` as a readable text that does not begin with "hex:", else in hex after it.
+std::string tomlTextOrHex(std::string_view bytes);
+
+/// The same for a path or a name in it, which is a text whenever it is UTF-8.
+std::string tomlPath(std::string_view path);
+
+} // namespace orvane::kit

@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "kit/kit_error.h"
+#include "kit/unit.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace orvane::test {
+
+/// A text that is no description, and the whole of what is said of it.
+struct DescriptionRefusal {
+    const char* text;
+    const char* message;
+};
+
+inline void expectRefused(const DescriptionRefusal& refusal) {
+    SCOPED_TRACE(refusal.text);
+    try {
+        kit::parseDescription(refusal.text, "unit.toml");
+        ADD_FAILURE() << "accepted";
+    } catch (const kit::KitError& error) {
+        EXPECT_STREQ(error.what(), refusal.message);
+    }
+}
+
+} // namespace orvane::test

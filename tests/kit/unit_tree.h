@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <map>
+#include <string>
+
+namespace orvane::test {
+
+/// As readFile, but in one go: quick on a whole disk.
+inline std::string wholeFile(const std::filesystem::path& path) {
+    std::string content(std::filesystem::file_size(path), '\0');
+    std::ifstream file(path, std::ios::binary);
+    file.read(content.data(), static_cast<std::streamsize>(content.size()));
+    EXPECT_TRUE(file.good()) << path;
+    return content;
+}
+
+/// Every entry below a unit's root but the kit's mark: "folder", "link " and its target, or "file "
+/// and its content.
+inline std::map<std::string, std::string> treeOf(const std::filesystem::path& root) {
+    std::map<std::string, std::string> tree;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(root)) {
+        const std::string path = "/" + entry.path().lexically_relative(root).string();
+        if (path == "/.orvane-unit") {
+            continue;
+        }
+        if (entry.is_symlink()) {
+            tree[path] = "link " + std::filesystem::read_symlink(entry.path()).string();
+        } else if (entry.is_directory()) {
+            tree[path] = "folder";
+        } else {
+            tree[path] = "file " + wholeFile(entry.path());
+        }
+    }
+    return tree;
+}
+
+/// The paths at which two trees differ, so that no whole disk is printed.
+inline std::string differenceOf(const std::map<std::string, std::string>& one,
+                                const std::map<std::string, std::string>& other) {
+    std::string difference;
+    for (const auto& [path, content] : one) {
+        const auto found = other.find(path);
+        if (found == other.end() || found->second != content) {
+            difference += path + " ";
+        }
+    }
+    for (const auto& [path, content] : other) {
+        difference += one.count(path) == 0 ? path + " " : "";
+    }
+    return difference;
+}
+
+} // namespace orvane::test
