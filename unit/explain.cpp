@@ -1,0 +1,32 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "unit/explain.h"
+
+#include "kit/root.h"
+#include "unit/explain_files.h"
+#include "unit/planned_files.h"
+
+namespace orvane::unit {
+
+Explanation explain(const std::string& letters) {
+    Explanation outputs;
+    PlannedFiles files;
+    for (const char letter : letters) {
+        if (letter == 'a') {
+            explainAirplay(files, outputs);
+        } else if (letter == 'i') {
+            explainIap(files, outputs);
+        }
+    }
+    // Last, since a later output may be the same file by way of a link.
+    for (Output& output : outputs) {
+        output.left = files.look(output.path, output.content);
+    }
+    return outputs;
+}
+
+Explanation explainUnit(const std::filesystem::path& root, const std::string& letters) {
+    const kit::EnteredRoot entered(root);
+    return explain(letters);
+}
+
+} // namespace orvane::unit

@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The difference of two texts, line by line.
+#pragma once
+
+#include <cstddef>
+#include <iosfwd>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace orvane::unit {
+
+struct DiffLine {
+    enum class Kind { common, removed, added };
+    Kind kind = Kind::common;
+    std::string text;       ///< with its line end, if it has one
+    std::size_t before = 0; ///< its number in the first text, from 1; 0 for an added line
+    std::size_t after = 0;  ///< its number in the second text, from 1; 0 for a removed line
+};
+
+/// Changed lines and some common ones around them.
+struct Hunk {
+    std::size_t before = 0; ///< number of its first line in either text; 0 for an empty text
+    std::size_t beforeCount = 0;
+    std::size_t after = 0;
+    std::size_t afterCount = 0;
+    std::vector<DiffLine> lines;
+};
+
+std::vector<Hunk> differingHunks(const std::string& before, const std::string& after);
+
+/// Prints a unified diff of the file `name`; nothing on a side where there is no file. Prints
+/// nothing when both sides are the same. Bytes that are no text are escaped.
+void printUnifiedDiff(std::ostream& out, const std::string& name,
+                      const std::optional<std::string>& before,
+                      const std::optional<std::string>& after);
+
+/// A line without its line end, bytes that are no text escaped.
+std::string lineForEyes(const std::string& line);
+
+} // namespace orvane::unit

@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The values of a unit by their keys: those that `orvane-unit set` takes, and "file.", "folder."
+// and such with a path for all else that a run can meet.
+#pragma once
+
+#include "kit/unit.h"
+
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace orvane::unit {
+
+/// Key and value, in the order of a description. A value that is not there has no entry.
+using UnitValues = std::vector<std::pair<std::string, std::string>>;
+
+UnitValues unitValues(const kit::UnitDescription& unit);
+
+/// A value that differs between two units. "(missing)" stands for one that is not there.
+struct ValueChange {
+    std::string key;
+    std::string before;
+    std::string after;
+};
+
+std::vector<ValueChange> differingValues(const UnitValues& before, const UnitValues& after);
+
+} // namespace orvane::unit
