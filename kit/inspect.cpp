@@ -44,7 +44,7 @@ public:
 
 private:
     /// `path` is a folder of the unit, empty for the top. Returns whether it holds anything.
-    bool inspectFolder(const std::string& path) {
+    bool inspectFolder(const std::string& path) { // NOLINT(misc-no-recursion): a tree of folders
         bool isEmpty = true;
         for (const fs::directory_entry& entry :
              listFolder(root_ / fs::path(path).relative_path())) {
@@ -53,11 +53,12 @@ private:
                 continue;
             }
             isEmpty = false;
-            inspectEntry(path + "/" + name, entry);
+            inspectEntry(std::string(path).append("/").append(name), entry);
         }
         return !isEmpty;
     }
 
+    // NOLINTNEXTLINE(misc-no-recursion): as above
     void inspectEntry(const std::string& path, const fs::directory_entry& entry) {
         there_.push_back(path);
         const fs::file_type kind = kindOf(entry.path());

@@ -24,7 +24,7 @@ ImageDescription describeImage(const Bytes& image);
 /// take no time to speak of. `file` stands in the text of the KitError of a failed read.
 DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem::path& file,
                              std::uint64_t size);
-DiskDescription describeDisk(const Bytes& disk);
+DiskDescription describeDisk(const Bytes& content);
 
 /// The block: all 44 fields, a word where the code has one, and as raw bytes the bits that no field
 /// reads, without the zeros at their end.

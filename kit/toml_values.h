@@ -6,16 +6,7 @@
 
 #include "kit/description_values.h"
 #include "kit/kit_error.h"
-
-// The library asserts that a text is what it then reports as an error when it is not: the key of
-// "[{" is one. An assertion would end the program, and without assertions Clang would rely on it.
-// So neither shall happen, and the report shall come.
-#pragma push_macro("NDEBUG")
-#undef NDEBUG
-#define TOML_ASSERT(condition) static_cast<void>(0)
-#define TOML_HEADER_ONLY 1
-#include <toml++/toml.h>
-#pragma pop_macro("NDEBUG")
+#include "kit/toml_library.h"
 
 #include <algorithm>
 #include <cstdint>

@@ -49,7 +49,7 @@ fs::file_type kindOf(const fs::path& entry) {
 
 std::string targetOf(const fs::path& link) {
     std::error_code error;
-    const std::string target = fs::read_symlink(link, error).string();
+    std::string target = fs::read_symlink(link, error).string();
     check(error, link);
     return target;
 }

@@ -75,8 +75,9 @@ bool isAtOrBelow(const std::string& path, const std::string& ancestor) {
 }
 
 bool isStandardFolder(const std::string& path) {
-    return std::any_of(std::begin(UNIT_FOLDERS), std::end(UNIT_FOLDERS),
-                       [&path](const std::string& folder) { return isAtOrBelow(folder, path); });
+    return std::any_of(
+        std::begin(UNIT_FOLDERS), std::end(UNIT_FOLDERS),
+        [&ancestor = path](const std::string& folder) { return isAtOrBelow(folder, ancestor); });
 }
 
 } // namespace orvane::kit

@@ -30,8 +30,9 @@ public:
             for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
                 const auto taken = entries_.find(above);
                 if (!misfit && taken != entries_.end() && taken->second != EntryKind::folder) {
-                    misfit = {path, path + " lies below " + above + ", which is " +
-                                        name(taken->second) + ", not a folder"};
+                    std::string what = path + " lies below " + above;
+                    what.append(", which is ").append(name(taken->second)).append(", not a folder");
+                    misfit = {path, what};
                 }
             }
         }

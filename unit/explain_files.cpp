@@ -68,7 +68,7 @@ Output generatedTuning(PlannedFiles& files, const TuningFile& file) {
 
 /// A value as the iAP files carry it: up to its first NUL byte.
 std::string upToNul(const std::string& text) {
-    return text.c_str();
+    return text.substr(0, text.find('\0'));
 }
 
 std::vector<Line> iapLines(const std::string& head, const IapValues& values, const Origin& model,

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <ostream>
+#include <set>
 
 namespace orvane::unit {
 
@@ -32,13 +33,15 @@ std::string lineText(const Line& line) {
     return printable(line.text.substr(0, line.text.size() - 1)); // without its line end
 }
 
-/// A line's origin: the value's place, and a code where it is not as intended.
-std::string originText(const Line& line) {
+/// A line's origin: the value's place, and a code where it is not as intended. What the code means
+/// is said once, and kept in `said`.
+std::string originText(const Line& line, std::set<Reason>& said) {
     std::string text = line.detail;
     for (const Reason reason : line.reasons) {
         const ReasonInfo& info = reasonInfo(reason);
         if (!info.isIntended) {
-            text += (text.empty() ? "" : "; ") + std::string(info.code) + ": " + info.sentence;
+            text += (text.empty() ? "" : "; ") + std::string(info.code);
+            text += said.insert(reason).second ? std::string(": ") + info.sentence : "";
         }
     }
     return printable(text);
@@ -90,10 +93,11 @@ void printLines(std::ostream& out, const std::vector<Line>& lines) {
     }
     width = std::min(width, WIDEST_LINE);
     const Line* before = nullptr;
+    std::set<Reason> said;
     for (const Line& line : lines) {
         const std::string text = lineText(line);
         const std::string origin =
-            before != nullptr && repeats(line, *before) ? "\"" : originText(line);
+            before != nullptr && repeats(line, *before) ? "\"" : originText(line, said);
         out << "  " << text;
         if (!origin.empty()) {
             out << std::string(width > text.size() ? width - text.size() : 0, ' ') << "  "

@@ -24,6 +24,10 @@ void printMoved(std::ostream& out, const MovedOutput& output) {
     }
 }
 
+std::string valueForEyes(const std::string& value) {
+    return value.empty() ? "(empty)" : value;
+}
+
 /// A key with a number at its end, taken apart.
 struct NumberedKey {
     std::string stem;
@@ -93,8 +97,9 @@ void printConsequences(std::ostream& out, const std::vector<Consequence>& conseq
         if (change.key.empty()) {
             out << "of no value that differs:\n";
         } else {
-            out << printable(change.key) << ": " << painted(Colour::removed, change.before)
-                << " -> " << painted(Colour::added, change.after) << '\n';
+            out << printable(change.key) << ": "
+                << painted(Colour::removed, valueForEyes(change.before)) << " -> "
+                << painted(Colour::added, valueForEyes(change.after)) << '\n';
         }
         if (consequence.moved.empty()) {
             out << "  " << painted(Colour::faint, "moves no output") << '\n';

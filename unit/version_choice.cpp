@@ -119,8 +119,7 @@ Origin versionDigitsOrigin(const VersionFiles& versions) {
     }
     if (is([](const std::string& part) {
             char* end = nullptr;
-            std::strtol(part.c_str(), &end, 10);
-            return end == part.c_str();
+            return std::strtol(part.c_str(), &end, 10) == 0 && end == part.c_str();
         })) {
         reasons.push_back(Reason::versionNotNumeric);
     }
