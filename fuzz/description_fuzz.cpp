@@ -29,7 +29,7 @@ bool repeatsMuch(std::string_view text) {
     if (text.find("repeat") == std::string_view::npos) {
         return false;
     }
-    for (auto begin = text.begin(); begin != text.end();) {
+    for (const auto* begin = text.begin(); begin != text.end();) {
         begin = std::find_if(begin, text.end(), isNumberCharacter);
         const auto* const end = std::find_if_not(begin, text.end(), isNumberCharacter);
         if (end - begin >= LONG_NUMBER) {

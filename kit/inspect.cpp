@@ -35,7 +35,11 @@ public:
     explicit Inspector(fs::path root) : root_(std::move(root)) {}
 
     UnitDescription inspect() {
-        inspectFolder("");
+        for (pending_ = {""}; !pending_.empty();) {
+            const std::string path = std::move(pending_.back());
+            pending_.pop_back();
+            inspectFolder(path);
+        }
         std::sort(there_.begin(), there_.end());
         std::sort(unit_.folders.begin(), unit_.folders.end());
         findAbsent(there_, unit_);
@@ -43,29 +47,25 @@ public:
     }
 
 private:
-    /// `path` is a folder of the unit, empty for the top. Returns whether it holds anything.
-    bool inspectFolder(const std::string& path) { // NOLINT(misc-no-recursion): a tree of folders
-        bool isEmpty = true;
-        for (const fs::directory_entry& entry :
-             listFolder(root_ / fs::path(path).relative_path())) {
+    /// `path` is a folder of the unit, empty for the top.
+    void inspectFolder(const std::string& path) {
+        const auto entries = listFolder(root_ / fs::path(path).relative_path());
+        for (const fs::directory_entry& entry : entries) {
             const std::string name = entry.path().filename().string();
-            if (path.empty() && name == MARKER_NAME) {
-                continue;
+            if (!path.empty() || name != MARKER_NAME) {
+                inspectEntry(std::string(path).append("/").append(name), entry);
             }
-            isEmpty = false;
-            inspectEntry(std::string(path).append("/").append(name), entry);
         }
-        return !isEmpty;
+        if (entries.empty() && !isStandardFolder(path)) {
+            unit_.folders.push_back(path);
+        }
     }
 
-    // NOLINTNEXTLINE(misc-no-recursion): as above
     void inspectEntry(const std::string& path, const fs::directory_entry& entry) {
         there_.push_back(path);
         const fs::file_type kind = kindOf(entry.path());
         if (kind == fs::file_type::directory) {
-            if (!inspectFolder(path) && !isStandardFolder(path)) {
-                unit_.folders.push_back(path);
-            }
+            pending_.push_back(path);
         } else if (kind == fs::file_type::symlink) {
             unit_.links.emplace(path, targetOf(entry.path()));
         } else if (kind == fs::file_type::regular) {
@@ -89,7 +89,8 @@ private:
 
     fs::path root_;
     UnitDescription unit_;
-    std::vector<std::string> there_; ///< all paths
+    std::vector<std::string> there_;   ///< all paths
+    std::vector<std::string> pending_; ///< folders that are still to be looked into
 };
 
 } // namespace

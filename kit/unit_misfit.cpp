@@ -20,8 +20,10 @@ public:
         const bool isFolderAgain = entry->second == kind && kind == EntryKind::folder;
         if (!isNew && !isFolderAgain && !misfit) {
             const std::string one = name(entry->second);
-            misfit = {path, path + (one == name(kind) ? " is given twice"
-                                                      : " is both " + one + " and " + name(kind))};
+            const std::string other = name(kind);
+            std::string what = path;
+            what += one == other ? " is given twice" : " is both " + one + " and " + other;
+            misfit = {path, what};
         }
     }
 
@@ -30,7 +32,8 @@ public:
             for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
                 const auto taken = entries_.find(above);
                 if (!misfit && taken != entries_.end() && taken->second != EntryKind::folder) {
-                    std::string what = path + " lies below " + above;
+                    std::string what = path;
+                    what += " lies below " + above;
                     what.append(", which is ").append(name(taken->second)).append(", not a folder");
                     misfit = {path, what};
                 }

@@ -35,8 +35,11 @@ std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd) {
     if (!disk.isOpen()) {
         return Reason::diskMissing;
     }
+    struct stat state {};
+    const bool isFolder = ::stat(BOOT_DISK, &state) == 0 && S_ISDIR(state.st_mode);
     if (!disk.seekFromEnd(bytesBeforeEnd)) {
-        return Reason::diskTooShort;
+        // Whether a folder can be sought at all is the file system's business.
+        return isFolder ? Reason::diskUnreadable : Reason::diskTooShort;
     }
     char byte = 0;
     return disk.read(&byte, 1) ? std::nullopt : std::optional<Reason>(Reason::diskUnreadable);
@@ -75,7 +78,9 @@ Image readImage() {
     if (opened == 0) {
         image.bytes.assign(reinterpret_cast<const char*>(store.data), store.length);
     } else {
-        image.reason = opened == -1 ? Reason::imageNotMappable : Reason::imageMissing;
+        // What opens and can't be measured, such as a folder, is no memory object either.
+        const bool isThere = opened == -1 || store.descriptor != -1;
+        image.reason = isThere ? Reason::imageNotMappable : Reason::imageMissing;
     }
     return image;
 }

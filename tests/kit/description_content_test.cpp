@@ -31,6 +31,7 @@ std::string contentOf(const std::string& toml) {
 }
 
 TEST(DescriptionContent, FileIsATextHexOrARepeatedPart) {
+    EXPECT_EQ(contentOf("\"\"\"a\\\n  \xC3\xA9\"\"\""), "a\xC3\xA9"); // a line goes on
     EXPECT_EQ(contentOf("\"a\\u0000\\n\""), std::string("a\0\n", 3));
     EXPECT_EQ(contentOf("\"hex:41\""), "hex:41"); // the content of a file has no prefix
     EXPECT_EQ(contentOf("{ hex = \"00 fF\\n0A\" }"), std::string("\0\xFF\n", 3));

@@ -169,17 +169,17 @@ TEST(DescriptionText, EveryCharacterComesBackInEveryPlace) {
     for (int c = 0; c < 0x80; ++c) {
         all += static_cast<char>(c);
     }
-    all += "\xC2\x80\xC2\x85\xC3\xBF\xE2\x80\xA8\xE2\x80\xAE\xEF\xBB\xBF\xEF\xBF\xBE\xEF\xBF\xBF"
+    all += "\xC2\x80\xC2\x85\xC3\xBF\xE2\x80\xA8\xEF\xBB\xBF\xEF\xBF\xBE\xEF\xBF\xBF"
            "\xF4\x8F\xBF\xBF";
     kit::UnitDescription unit;
     for (std::size_t at = 0; at < all.size(); ++at) {
         const std::string number = std::to_string(at);
         const std::string part = all.substr(at, 1);
-        unit.files["/text" + number] = "readable\nenough" + all.substr(at) + "\"" + part;
+        unit.files["/text" + number] = std::string("readable\nenough").append(all.substr(at)) + '"';
         unit.files["/one" + number] = part;
         if (part != "/" && part[0] != '\0') {
-            unit.files["/name" + number + part] = "";
-            unit.links["/link" + number] = part + all.substr(128) + part;
+            unit.files["/name" + part] = "";
+            unit.links["/link" + number] = all.substr(at).append(all.substr(128));
         }
         unit.disk.aux = all.substr(at);
         ASSERT_TRUE(parse(kit::descriptionText(unit)) == unit) << at;

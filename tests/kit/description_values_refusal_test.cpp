@@ -10,6 +10,14 @@ namespace orvane::test {
 namespace {
 
 const DescriptionRefusal REFUSALS[] = {
+    {"[{\n", "unit.toml:1:2: Error while parsing key: expected bare key starting character or "
+             "string delimiter, saw '{'"},
+    {"\xC3\xA9 = 1\n", "unit.toml:1:1: Error while parsing root table: expected keys, tables, "
+                       "whitespace or comments, saw '\xC3\xA9'"},
+    {"aux = \xC3\xA9\n",
+     "unit.toml:1:7: Error while parsing value: could not determine value type"},
+    {"aux = 1\xC3\xA9\n",
+     "unit.toml:1:8: Error while parsing decimal integer: expected digit, saw '\xC3\xA9'"},
     {"[imago]\n", "unit.toml:1:2: unknown key \"imago\" in a unit: it takes folders, absent, "
                   "image, disk, files, links"},
     {"[image]\nsize = -1\n",

@@ -70,7 +70,9 @@ TEST_F(EditTest, WrongAssignmentIsNamedWithWhatWouldBeRight) {
 TEST_F(EditTest, UnknownKeyIsNamedWithThoseThatAreKnown) {
     for (const std::string key :
          {"", "x", "Serial", "serial ", "params.22", "slot", "param", "disk"}) {
-        EXPECT_EQ(refusalOf({key + "=1"}), key + "=1: unknown key \"" + key + "\"" + KNOWN);
+        const std::string assignment = key + "=1";
+        EXPECT_EQ(refusalOf({assignment}),
+                  std::string(assignment).append(": unknown key \"").append(key) + "\"" + KNOWN);
     }
     EXPECT_EQ(refusalOf({"serial"}), "\"serial\" is no assignment: it takes KEY=VALUE");
 }

@@ -143,7 +143,7 @@ TEST_F(InspectUnitTest, WhatCannotBeReadIsRefusedByName) {
 
 /// Once more over the text, and made again: the same tree, and the same description of it.
 TEST_F(InspectUnitTest, RandomUnitsAreMadeAgainAsTheyWere) {
-    for (std::uint32_t seed = 0; seed < 250; ++seed) {
+    for (std::uint32_t seed = 0; seed < 200; ++seed) {
         SCOPED_TRACE(seed);
         const kit::UnitDescription found = inspected(RandomUnit(seed).unit());
         const std::string text = kit::descriptionText(found);

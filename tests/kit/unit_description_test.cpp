@@ -26,6 +26,12 @@ TEST(UnitDescription, ExampleOfTheDocumentIsAUnit) {
     kit::makeUnit(kit::parseDescription(documentedExample(), "example"), root);
     EXPECT_EQ(readFile(root / "fs/mp/etc/airplay_static.conf"), "airplay = yes\n");
     EXPECT_EQ(readFile(root / "fs/mp/etc/iap2_device_static.cfg"), std::string(8192, 'x'));
+    EXPECT_EQ(readFile(root / "fs/rwdata/.Version/app.inf"), "Type");
+    EXPECT_EQ(readFile(root / "fs/rwdata/blank"), std::string(4096, '\xFF'));
+    EXPECT_EQ(readFile(root / "tmp/iap1.cfg"), "old\n");
+    EXPECT_EQ(readFile(root / "fs/rwdata/disk1"),
+              std::string(512, '\0') + "\x55\xAA" + std::string(65022, '\0'));
+    EXPECT_EQ(std::filesystem::read_symlink(root / "tmp/iap2.cfg"), "/fs/rwdata/iap2.cfg");
     EXPECT_TRUE(std::filesystem::is_directory(root / "tmp/airplay.conf"));
     EXPECT_FALSE(std::filesystem::exists(root / "fs/mp/etc/mm"));
     EXPECT_EQ(readFile(root / "fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM").substr(133, 7),
