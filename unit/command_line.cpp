@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/command_line.h"
 
+#include "kit/kit_error.h"
 #include "unit/commands.h"
 #include "unit/contents_text.h"
 #include "unit/terminal.h"
@@ -101,8 +102,9 @@ Action addExplain(CLI::App& app) {
         ->required();
     addLetters(*command);
     command->add_flag("--all", options->showsAll, "Print orvane's own text as well");
-    command->add_flag("--json", options->isJson, "Print JSON");
-    command->add_flag("--content", options->hasContent, "With --json: what each file would hold");
+    CLI::Option* const json = command->add_flag("--json", options->isJson, "Print JSON");
+    command->add_flag("--content", options->hasContent, "With --json: what each file would hold")
+        ->needs(json);
     return [options, command] {
         options->letters = givenLetters(*command);
         return runExplain(*options);
@@ -175,6 +177,23 @@ Action addCheck(CLI::App& app) {
     return [options] { return runCheck(*options); };
 }
 
+/// The first word must be a command or an option; the parser would only say that one is missing.
+void checkCommand(const CLI::App& app, int argc, const char* const* argv) {
+    const std::string word = argc > 1 ? argv[1] : "";
+    if (word.empty() || word[0] == '-') {
+        return;
+    }
+    std::string names;
+    for (const CLI::App* const command :
+         app.get_subcommands([](const CLI::App*) { return true; })) {
+        if (command->get_name() == word) {
+            return;
+        }
+        names += (names.empty() ? "" : ", ") + command->get_name();
+    }
+    throw kit::KitError("there is no command \"" + word + "\": it takes " + names);
+}
+
 int chooseAndRun(int argc, const char* const* argv) {
     CLI::App app("Makes simulated units - folders that stand for a unit's \"/\" -, explains what "
                  "orvane does in them and on real ones, and runs the unmodified orvane.",
@@ -190,10 +209,15 @@ int chooseAndRun(int argc, const char* const* argv) {
     for (const Add add : COMMANDS) {
         actions.push_back(add(app));
     }
+    checkCommand(app, argc, argv);
     try {
         app.parse(argc, argv);
     } catch (const CLI::Success& help) {
         return app.exit(help);
+    } catch (const CLI::ExtrasError& error) {
+        const bool isRun = app.get_subcommand("run")->parsed();
+        throw kit::KitError(std::string(error.what()) +
+                            (isRun ? "; orvane's own options follow --" : ""));
     }
     const std::vector<const CLI::App*> commands =
         static_cast<const CLI::App&>(app).get_subcommands([](const CLI::App*) { return true; });

@@ -62,7 +62,9 @@ void printRecords(std::ostream& out, const Contents& contents) {
     for (const Slot& slot : contents.slots) {
         out << std::setw(4) << slot.number << std::setw(7) << slot.offset << std::setw(5)
             << slot.size << "  ";
-        if (slot.bytes) {
+        if (slot.number == CRC_SLOT) {
+            out << "slots 1 to 9 once more";
+        } else if (slot.bytes) {
             printBytes(out, *slot.bytes);
         } else {
             out << '-';

@@ -22,14 +22,51 @@ std::vector<std::string> linesOf(const std::string& text) {
     return lines;
 }
 
-DiffLine::Kind kindOf(dtl::edit_t edit) {
-    return edit == dtl::SES_ADD      ? DiffLine::Kind::added
-           : edit == dtl::SES_DELETE ? DiffLine::Kind::removed
-                                     : DiffLine::Kind::common;
+/// All lines of both texts, common ones once, with their numbers.
+std::vector<DiffLine> editScript(const std::string& before, const std::string& after) {
+    dtl::Diff<std::string> diff(linesOf(before), linesOf(after));
+    diff.onHuge();
+    diff.compose();
+    std::vector<DiffLine> lines;
+    std::size_t oldNumber = 0;
+    std::size_t newNumber = 0;
+    for (const auto& [text, info] : diff.getSes().getSequence()) {
+        if (info.type == dtl::SES_DELETE) {
+            lines.push_back({DiffLine::Kind::removed, text, ++oldNumber, 0});
+        } else if (info.type == dtl::SES_ADD) {
+            lines.push_back({DiffLine::Kind::added, text, 0, ++newNumber});
+        } else {
+            lines.push_back({DiffLine::Kind::common, text, ++oldNumber, ++newNumber});
+        }
+    }
+    // Of lines that take each other's place, the old ones come first.
+    for (auto begin = lines.begin(); begin != lines.end();) {
+        const auto isCommon = [](const DiffLine& line) {
+            return line.kind == DiffLine::Kind::common;
+        };
+        const auto end = std::find_if(begin, lines.end(), isCommon);
+        std::stable_partition(
+            begin, end, [](const DiffLine& line) { return line.kind == DiffLine::Kind::removed; });
+        begin = std::find_if_not(end, lines.end(), isCommon);
+    }
+    return lines;
 }
 
-std::size_t number(long long value) {
-    return static_cast<std::size_t>(value);
+/// A hunk of the lines from `begin` to `end`.
+Hunk hunkOf(const std::vector<DiffLine>& script, std::size_t begin, std::size_t end) {
+    Hunk hunk;
+    for (std::size_t i = 0; i < begin; ++i) {
+        hunk.before += script[i].before != 0 ? 1U : 0U;
+        hunk.after += script[i].after != 0 ? 1U : 0U;
+    }
+    for (std::size_t i = begin; i < end; ++i) {
+        hunk.beforeCount += script[i].before != 0 ? 1U : 0U;
+        hunk.afterCount += script[i].after != 0 ? 1U : 0U;
+        hunk.lines.push_back(script[i]);
+    }
+    hunk.before += hunk.beforeCount != 0 ? 1U : 0U;
+    hunk.after += hunk.afterCount != 0 ? 1U : 0U;
+    return hunk;
 }
 
 void printLine(std::ostream& out, const DiffLine& line) {
@@ -57,23 +94,24 @@ std::vector<Hunk> differingHunks(const std::string& before, const std::string& a
     if (before == after) {
         return {};
     }
-    dtl::Diff<std::string> diff(linesOf(before), linesOf(after));
-    diff.onHuge();
-    diff.compose();
-    diff.composeUnifiedHunks();
+    constexpr std::size_t CONTEXT = 3; // common lines around a change
+    const std::vector<DiffLine> script = editScript(before, after);
     std::vector<Hunk> hunks;
-    for (const auto& found : diff.getUniHunks()) {
-        Hunk hunk{number(found.a), number(found.b), number(found.c), number(found.d), {}};
-        for (const auto* part : {&found.common[0], &found.change, &found.common[1]}) {
-            for (const auto& [text, info] : *part) {
-                const DiffLine::Kind kind = kindOf(info.type);
-                hunk.lines.push_back({kind, text,
-                                      kind == DiffLine::Kind::added ? 0 : number(info.beforeIdx),
-                                      kind == DiffLine::Kind::removed ? 0 : number(info.afterIdx)});
-            }
+    std::size_t begin = 0;
+    std::size_t end = 0; // of the hunk that is being gathered
+    for (std::size_t i = 0; i < script.size(); ++i) {
+        if (script[i].kind == DiffLine::Kind::common) {
+            continue;
         }
-        hunks.push_back(std::move(hunk));
+        const std::size_t first = i < CONTEXT ? 0 : i - CONTEXT;
+        if (end != 0 && first > end) {
+            hunks.push_back(hunkOf(script, begin, end));
+            end = 0;
+        }
+        begin = end == 0 ? first : begin;
+        end = std::min(i + 1 + CONTEXT, script.size());
     }
+    hunks.push_back(hunkOf(script, begin, end));
     return hunks;
 }
 

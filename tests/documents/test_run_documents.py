@@ -3,6 +3,8 @@
 
 from __future__ import annotations
 
+import subprocess
+import sys
 import tempfile
 import unittest
 from pathlib import Path
@@ -51,6 +53,18 @@ class RunDocumentsTest(unittest.TestCase):
 
     def test_document_without_a_command_is_told(self) -> None:
         self.assertIn("shows no command", outcome_of("text\n").complaints[0])
+
+    def test_exit_status_and_environment(self) -> None:
+        with tempfile.TemporaryDirectory() as name:
+            folder = Path(name)
+            (folder / "tool").write_text("#!/bin/sh\necho \"$NO_COLOR\"\n", encoding="utf-8")
+            (folder / "tool").chmod(0o755)
+            for shown, status in (("1", 0), ("2", 1)):
+                document = folder / "document.md"
+                document.write_text(console(f"$ tool\n{shown}\n"), encoding="utf-8")
+                result = subprocess.run([sys.executable, run_documents.__file__, "--path", folder,
+                                         document], capture_output=True, check=False)
+                self.assertEqual(result.returncode, status, result.stdout)
 
     def test_block_without_an_end_and_output_without_a_command_are_refused(self) -> None:
         for text in ("```console\n$ true\n", console("output\n")):

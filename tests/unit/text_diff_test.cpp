@@ -1,0 +1,142 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "unit/terminal.h"
+#include "unit/text_diff.h"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+
+namespace orvane::test {
+
+namespace {
+
+using Text = std::optional<std::string>;
+
+/// Without colours: the tests' standard output is no terminal, or NO_COLOR is set for them.
+std::string diffOf(const Text& before, const Text& after) {
+    std::ostringstream out;
+    unit::printUnifiedDiff(out, "/tmp/x", before, after);
+    return out.str();
+}
+
+TEST(TextDiffTest, SameTextsHaveNoDiff) {
+    EXPECT_EQ(diffOf("a\n", "a\n"), "");
+    EXPECT_EQ(diffOf("", ""), "");
+    EXPECT_EQ(diffOf(std::nullopt, std::nullopt), "");
+}
+
+TEST(TextDiffTest, ChangedLineStandsBetweenThreeCommonOnes) {
+    EXPECT_EQ(diffOf("1\n2\n3\n4\n5\n6\n7\n8\n9\n", "1\n2\n3\n4\nfive\n6\n7\n8\n9\n"),
+              "--- /tmp/x\n+++ /tmp/x\n@@ -2,7 +2,7 @@\n"
+              " 2\n 3\n 4\n-5\n+five\n 6\n 7\n 8\n");
+}
+
+TEST(TextDiffTest, ChangesFarApartAreHunksOfTheirOwn) {
+    std::string before;
+    for (int i = 1; i <= 20; ++i) {
+        before += std::to_string(i) + "\n";
+    }
+    std::string after = before;
+    after.replace(after.find("2\n"), 2, "");
+    after += "21\n";
+    EXPECT_EQ(diffOf(before, after), "--- /tmp/x\n+++ /tmp/x\n"
+                                     "@@ -1,5 +1,4 @@\n 1\n-2\n 3\n 4\n 5\n"
+                                     "@@ -18,3 +17,4 @@\n 18\n 19\n 20\n+21\n");
+}
+
+TEST(TextDiffTest, NewAndRemovedFilesCountFromNothing) {
+    EXPECT_EQ(diffOf(std::nullopt, "a\nb\n"),
+              "--- /dev/null\n+++ /tmp/x\n@@ -0,0 +1,2 @@\n+a\n+b\n");
+    EXPECT_EQ(diffOf("a\n", std::nullopt), "--- /tmp/x\n+++ /dev/null\n@@ -1,1 +0,0 @@\n-a\n");
+    EXPECT_EQ(diffOf(std::nullopt, ""), "--- /dev/null\n+++ /tmp/x\n");
+}
+
+TEST(TextDiffTest, MissingLineEndIsTold) {
+    EXPECT_EQ(
+        diffOf("a\nb", "a\nb\n"),
+        "--- /tmp/x\n+++ /tmp/x\n@@ -1,2 +1,2 @@\n a\n-b\n\\ No newline at end of file\n+b\n");
+}
+
+TEST(TextDiffTest, BytesThatAreNoTextAreEscaped) {
+    EXPECT_EQ(diffOf("", "\x1b[2J\xff\n"),
+              "--- /tmp/x\n+++ /tmp/x\n@@ -0,0 +1,1 @@\n+\\x1b[2J\\xff\n");
+}
+
+TEST(TextDiffTest, LinesKnowTheirNumbers) {
+    const std::vector<unit::Hunk> hunks = unit::differingHunks("a\nb\nc\n", "a\nc\nd\n");
+    ASSERT_EQ(hunks.size(), 1U);
+    std::vector<std::tuple<unit::DiffLine::Kind, std::size_t, std::size_t>> found;
+    for (const unit::DiffLine& line : hunks[0].lines) {
+        found.emplace_back(line.kind, line.before, line.after);
+    }
+    using Kind = unit::DiffLine::Kind;
+    EXPECT_EQ(found, (decltype(found){{Kind::common, 1, 1},
+                                      {Kind::removed, 2, 0},
+                                      {Kind::common, 3, 2},
+                                      {Kind::added, 0, 3}}));
+}
+
+TEST(TextDiffTest, LinesKnowTheirNumbersWhenTheSecondTextIsShorter) {
+    const std::vector<unit::Hunk> hunks = unit::differingHunks("a\nb\nc\nd\n", "x\nd\n");
+    ASSERT_EQ(hunks.size(), 1U);
+    for (const unit::DiffLine& line : hunks[0].lines) {
+        const std::string texts[] = {"", "a\n", "b\n", "c\n", "d\n"};
+        const std::string later[] = {"", "x\n", "d\n"};
+        EXPECT_TRUE(line.before == 0 || line.text == texts[line.before]);
+        EXPECT_TRUE(line.after == 0 || line.text == later[line.after]);
+    }
+}
+
+TEST(TextDiffTest, LargeTextsWithNothingInCommonTakeNoTime) {
+    std::string before;
+    std::string after;
+    for (int i = 0; i < 3000; ++i) {
+        before += "before " + std::to_string(i) + "\n";
+        after += "after " + std::to_string(i) + "\n";
+    }
+    std::size_t removed = 0;
+    std::size_t added = 0;
+    for (const unit::Hunk& hunk : unit::differingHunks(before, after)) {
+        removed += hunk.beforeCount;
+        added += hunk.afterCount;
+    }
+    EXPECT_EQ(removed, 3000U);
+    EXPECT_EQ(added, 3000U);
+}
+
+TEST(TerminalTest, PrintableEscapesWhatIsNoText) {
+    struct Row {
+        std::string bytes;
+        std::string text;
+    };
+    const Row rows[] = {
+        {"", ""},
+        {"plain = text", "plain = text"},
+        {"a\nb\tc\r", "a\\nb\\x09c\\x0d"},
+        {"back\\slash", "back\\\\slash"},
+        {std::string("\0", 1), "\\x00"},
+        {"\x7f", "\\x7f"},
+        {"M\xc3\xbcller", "M\xc3\xbcller"},
+        {"\xc3", "\\xc3"},                   // cut short
+        {"\xc0\xaf", "\\xc0\\xaf"},          // longer than needed
+        {"\xed\xa0\x80", "\\xed\\xa0\\x80"}, // a surrogate
+        {"\xc2\x85", "\\xc2\\x85"},          // a control character
+        {"\xf0\x9f\x9a\x97", "\xf0\x9f\x9a\x97"},
+        {"ok\xff"
+         "ok",
+         "ok\\xffok"},
+    };
+    for (const Row& row : rows) {
+        EXPECT_EQ(unit::printable(row.bytes), row.text);
+    }
+}
+
+TEST(TerminalTest, CountedTakesTheRightNumber) {
+    EXPECT_EQ(unit::counted(0, "line"), "0 lines");
+    EXPECT_EQ(unit::counted(1, "line"), "1 line");
+    EXPECT_EQ(unit::counted(2, "byte"), "2 bytes");
+}
+
+} // namespace
+
+} // namespace orvane::test
