@@ -7,6 +7,7 @@
 #include "unit/explain.h"
 #include "unit/scratch_folder.h"
 #include "unit/tmp_tree.h"
+#include "unit/whole_file.h"
 
 #include <algorithm>
 #include <fstream>
@@ -35,16 +36,6 @@ std::vector<fs::path> caseFolders(const fs::path& folder) {
     return folders;
 }
 
-std::optional<std::string> readWhole(const fs::path& file) {
-    std::ifstream in(file, std::ios::binary);
-    if (!in) {
-        return std::nullopt;
-    }
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
-
 void writeWhole(const fs::path& file, const std::string& text) {
     std::error_code error;
     fs::create_directories(file.parent_path(), error);
@@ -57,7 +48,7 @@ void writeWhole(const fs::path& file, const std::string& text) {
 }
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
-    const std::optional<std::string> text = readWhole(folder / "arguments");
+    const std::optional<std::string> text = readWholeFile(folder / "arguments");
     if (!text) {
         return {"-a", "-i"};
     }
@@ -112,10 +103,10 @@ void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult
     if (!run.standardOutput.empty()) {
         differences.push_back("standard output is not empty");
     }
-    if (run.standardError != readWhole(expected / "stderr").value_or("")) {
+    if (run.standardError != readWholeFile(expected / "stderr").value_or("")) {
         differences.push_back("standard error differs");
     }
-    const std::optional<std::string> list = readWhole(expected / "tmp.list");
+    const std::optional<std::string> list = readWholeFile(expected / "tmp.list");
     if (!list) {
         differences.push_back("there is no expectation: no expected/tmp.list");
         return;
@@ -123,7 +114,7 @@ void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult
     compareLists(listOf(tree), *list, differences);
     for (const auto& [path, content] : tree.entries) {
         if (content && list->find(path) != std::string::npos &&
-            *content != readWhole(expected / "tmp" / path)) {
+            *content != readWholeFile(expected / "tmp" / path)) {
             differences.push_back("/tmp/" + path + " differs");
         }
     }

@@ -144,9 +144,11 @@ Action addImpact(CLI::App& app) {
     auto options = std::make_shared<ImpactCommand>();
     CLI::App* const command = addCommand(
         app, "impact", "Change every input in a copy of a unit, and say which output lines move",
-        "orvane-unit impact bench");
+        "orvane-unit impact bench param. slot.9");
     command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
         ->required();
+    command->add_option("KEY", options->beginnings,
+                        "Only the inputs whose key begins so; all without any");
     command->add_flag("--json", options->isJson, "Print JSON");
     return [options] { return runImpact(*options); };
 }

@@ -90,8 +90,8 @@ int runDiff(const DiffCommand& command) {
 
 int runImpact(const ImpactCommand& command) {
     const bool showsProgress = ::isatty(STDERR_FILENO) == 1;
-    const std::vector<Impact> impacts =
-        findImpacts(command.root, [showsProgress](std::size_t done, std::size_t all) {
+    const std::vector<Impact> impacts = findImpacts(
+        command.root, command.beginnings, [showsProgress](std::size_t done, std::size_t all) {
             if (showsProgress) {
                 printProgress(std::cerr, done, all);
             }

@@ -22,6 +22,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <functional>
 
 namespace orvane::unit {
 
@@ -173,6 +174,21 @@ void addTuning(std::vector<Input>& inputs, const ChangedFile& disk) {
     }
 }
 
+void keepThoseThatBegin(std::vector<Input>& inputs, const std::vector<std::string>& beginnings) {
+    const auto isWanted = [&beginnings](const Input& input) {
+        return std::any_of(beginnings.begin(), beginnings.end(), [&input](const std::string& word) {
+            return input.key.compare(0, word.size(), word) == 0;
+        });
+    };
+    if (beginnings.empty()) {
+        return;
+    }
+    inputs.erase(std::remove_if(inputs.begin(), inputs.end(), std::not_fn(isWanted)), inputs.end());
+    if (inputs.empty()) {
+        throw kit::KitError("no input of this unit begins with " + beginnings.front());
+    }
+}
+
 void addMoves(Impact& impact, const std::vector<MovedOutput>& moved) {
     for (const MovedOutput& output : moved) {
         if (output.before != output.after) {
@@ -188,7 +204,8 @@ void addMoves(Impact& impact, const std::vector<MovedOutput>& moved) {
 
 } // namespace
 
-std::vector<Impact> findImpacts(const fs::path& root, const Progress& progress) {
+std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::string>& beginnings,
+                                const Progress& progress) {
     const ScratchFolder scratch;
     const fs::path copy = scratch.path() / "unit";
     kit::makeUnit(kit::inspectInputs(root), copy);
@@ -198,6 +215,7 @@ std::vector<Impact> findImpacts(const fs::path& root, const Progress& progress) 
     addParams(inputs, image);
     addSlots(inputs, disk);
     addTuning(inputs, disk);
+    keepThoseThatBegin(inputs, beginnings);
 
     const kit::EnteredRoot entered(copy);
     const std::string LETTERS = "ai";

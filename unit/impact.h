@@ -22,8 +22,11 @@ struct Impact {
 /// Calls for how many of how many inputs are done.
 using Progress = std::function<void(std::size_t done, std::size_t all)>;
 
-/// Tries every parameter, slot byte and tuning field of the unit at `root`, which is only read.
-/// Throws kit::KitError when it can't be read, or no copy can be made.
-std::vector<Impact> findImpacts(const std::filesystem::path& root, const Progress& progress);
+/// Tries every parameter, slot byte and tuning field of the unit at `root`, which is only read; of
+/// these, where `beginnings` is not empty, only those whose key begins with one of them. Throws
+/// kit::KitError when the unit can't be read, no copy can be made, or no input begins so.
+std::vector<Impact> findImpacts(const std::filesystem::path& root,
+                                const std::vector<std::string>& beginnings,
+                                const Progress& progress);
 
 } // namespace orvane::unit

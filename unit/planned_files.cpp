@@ -2,28 +2,12 @@
 #include "unit/planned_files.h"
 
 #include "kit/output_place.h"
+#include "unit/whole_file.h"
 
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <fstream>
-#include <sstream>
-
 namespace orvane::unit {
-
-namespace {
-
-std::optional<std::string> readFile(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    if (!file) {
-        return std::nullopt;
-    }
-    std::ostringstream content;
-    content << file.rdbuf();
-    return content.str();
-}
-
-} // namespace
 
 bool PlannedFiles::openForWriting(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
@@ -49,7 +33,7 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
                                                         : std::nullopt;
     }
     // Anything but a file is left alone: looking into a pipe would take from it, or wait for ever.
-    return place->kind == S_IFREG ? readFile(place->path) : std::nullopt;
+    return place->kind == S_IFREG ? readWholeFile(place->path) : std::nullopt;
 }
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {

@@ -2,9 +2,7 @@
 #include "unit/tmp_tree.h"
 
 #include "kit/root.h"
-
-#include <fstream>
-#include <sstream>
+#include "unit/whole_file.h"
 
 namespace orvane::unit {
 
@@ -13,17 +11,6 @@ namespace fs = std::filesystem;
 namespace {
 
 constexpr char TMP[] = "/tmp";
-
-std::optional<std::string> readContent(const fs::path& path) {
-    std::error_code error;
-    if (!fs::is_regular_file(path, error)) {
-        return std::nullopt;
-    }
-    std::ifstream file(path, std::ios::binary);
-    std::ostringstream content;
-    content << file.rdbuf();
-    return content.str();
-}
 
 } // namespace
 
@@ -41,7 +28,8 @@ TmpTree readTmp(const fs::path& root) {
         if (entry->is_directory(error)) {
             tree.entries[path + "/"];
         } else {
-            tree.entries[path] = readContent(entry->path());
+            tree.entries[path] =
+                entry->is_regular_file(error) ? readWholeFile(entry->path()) : std::nullopt;
         }
     }
     return tree;

@@ -43,9 +43,13 @@ static bool mustAllocationFail() {
 
 } // namespace orvane::test
 
-void* operator new(std::size_t size) {
+void* operator new(std::size_t size, const std::nothrow_t& /*tag*/) noexcept {
     const bool mustFail = orvane::test::mustAllocationFail();
-    void* const memory = mustFail ? nullptr : std::malloc(size == 0 ? 1 : size);
+    return mustFail ? nullptr : std::malloc(size == 0 ? 1 : size);
+}
+
+void* operator new(std::size_t size) {
+    void* const memory = operator new(size, std::nothrow);
     if (memory == nullptr) {
         throw std::bad_alloc();
     }
