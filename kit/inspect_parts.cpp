@@ -20,7 +20,7 @@ constexpr std::uint32_t FIRST_SLOT_BEHIND_GAP = 10;
 Bytes takePart(Bytes& area, std::int64_t begin, std::size_t length) {
     const auto at = static_cast<std::size_t>(begin);
     Bytes part = area.substr(at, length);
-    std::fill_n(area.begin() + begin, length, '\0');
+    area.replace(at, part.size(), part.size(), '\0');
     return part;
 }
 

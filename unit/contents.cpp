@@ -7,6 +7,7 @@
 #include "config/record_area.h"
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
+#include "kit/non_zero_runs.h"
 #include "kit/root.h"
 #include "tuning/audio_profile.h"
 #include "writers/airplay_writer.h"
@@ -79,7 +80,7 @@ void readRecords(Contents& contents) {
         std::string bytes(slot.size, '\0');
         if (readRecordSlot(number, bytes.data(), slot.size) == 0) {
             slot.bytes = bytes;
-            isBlank = number == CRC_SLOT ? withoutEnd(bytes).empty() : isBlank;
+            isBlank = number == CRC_SLOT ? kit::withoutEndZeros(bytes).empty() : isBlank;
         }
         contents.slots.push_back(std::move(slot));
     }
@@ -142,10 +143,6 @@ const char* crcVerdictName(CrcVerdict verdict) {
         return "unreadable";
     }
     return "";
-}
-
-std::string withoutEnd(const std::string& bytes) {
-    return bytes.substr(0, bytes.find_last_not_of('\0') + 1);
 }
 
 Contents readContents(const std::filesystem::path& root) {

@@ -72,7 +72,4 @@ struct Contents {
 /// entered.
 Contents readContents(const std::filesystem::path& root);
 
-/// `bytes` without the zero bytes at its end.
-std::string withoutEnd(const std::string& bytes);
-
 } // namespace orvane::unit

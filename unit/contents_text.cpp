@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/contents_text.h"
 
+#include "kit/non_zero_runs.h"
 #include "unit/terminal.h"
 
 #include <iomanip>
@@ -42,7 +43,7 @@ void printParams(std::ostream& out, const Contents& contents) {
 }
 
 void printBytes(std::ostream& out, const std::string& bytes) {
-    const std::string text = withoutEnd(bytes);
+    const std::string text = kit::withoutEndZeros(bytes);
     if (text.empty()) {
         out << painted(Colour::faint, "zeros");
     } else {
@@ -94,7 +95,7 @@ void printTuning(std::ostream& out, const Contents& contents) {
                 : id == DPS_BLOCK_SPEECHREC ? ", speech recognition"
                                             : "");
         const std::string bytes(block.bytes.begin(), block.bytes.end());
-        if (withoutEnd(bytes).empty()) {
+        if (kit::withoutEndZeros(bytes).empty()) {
             out << ": " << painted(Colour::faint, "zeros") << '\n';
             continue;
         }

@@ -75,7 +75,7 @@ std::string printable(const std::string& bytes) {
     return text;
 }
 
-std::string counted(std::size_t count, const std::string& thing) {
+std::string counted(std::uint64_t count, const std::string& thing) {
     return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
 }
 

@@ -3,6 +3,7 @@
 // Colours and bytes for people's eyes.
 #pragma once
 
+#include <cstdint>
 #include <string>
 
 namespace orvane::unit {
@@ -19,6 +20,6 @@ std::string painted(Colour colour, const std::string& text);
 std::string printable(const std::string& bytes);
 
 /// "1 line", "2 lines".
-std::string counted(std::size_t count, const std::string& thing);
+std::string counted(std::uint64_t count, const std::string& thing);
 
 } // namespace orvane::unit
