@@ -31,6 +31,14 @@ Json bytesOrNull(const std::optional<std::string>& bytes) {
     return bytes ? bytesJson(*bytes) : Json();
 }
 
+Json textsJson(const std::vector<std::string>& texts) {
+    Json json = Json::array();
+    for (const std::string& text : texts) {
+        json.push_back(bytesJson(text));
+    }
+    return json;
+}
+
 Json codesJson(const std::vector<Reason>& reasons) {
     Json codes = Json::array();
     for (const Reason reason : reasons) {
@@ -267,8 +275,8 @@ std::string checkJson(const std::string& folder, const CheckReport& report) {
     for (const CaseResult& result : report.cases) {
         json["cases"].push_back(
             {{"name", bytesJson(result.name)},
-             {"differences", result.differences},
-             {"surprises", result.surprises},
+             {"differences", textsJson(result.differences)},
+             {"surprises", textsJson(result.surprises)},
              {"reasons", codesJson({result.reasons.begin(), result.reasons.end()})}});
     }
     json["unreached"] = report.unreached;

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/kit_error.h"
+#include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
+#include "tests/unit/described_unit.h"
 #include "unit/case_check.h"
 
 #include <gtest/gtest.h>
@@ -95,6 +97,40 @@ TEST_F(CaseCheckTest, UpdateWritesWhatThenPasses) {
     EXPECT_EQ(differences(), Lines{});
 }
 
+TEST_F(CaseCheckTest, UpdateLeavesAllElseAsItIs) {
+    writeFile(folder() / "one/notes", "of a person\n");
+    fs::create_directory(folder() / "no_case");
+    const std::string unit = readFile(folder() / "one/unit.toml");
+    check(true);
+    EXPECT_EQ(folderNames(folder()), (std::set<std::string>{"no_case", "one"}));
+    EXPECT_EQ(folderNames(folder() / "one"),
+              (std::set<std::string>{"arguments", "expected", "notes", "unit.toml"}));
+    EXPECT_EQ(folderNames(expected()), (std::set<std::string>{"tmp", "tmp.list"}));
+    EXPECT_EQ(readFile(folder() / "one/unit.toml"), unit);
+    EXPECT_EQ(readFile(folder() / "one/arguments"), "-a\n");
+    EXPECT_EQ(readFile(folder() / "one/notes"), "of a person\n");
+}
+
+TEST_F(CaseCheckTest, FoldersInTmpAreExpectedByTheirNames) {
+    writeFile(folder() / "one/unit.toml", "folders = [\"/tmp/airplay.conf\"]\n");
+    EXPECT_EQ(differences(),
+              (Lines{"/tmp/airplay.conf is missing", "/tmp/airplay.conf/ is not expected"}));
+    check(true);
+    EXPECT_EQ(readFile(expected() / "tmp.list"), "airplay.conf/\n");
+    EXPECT_EQ(differences(), Lines{});
+}
+
+/// A binary that is not the tool: it leaves nothing, and ends with 1.
+TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
+    for (const bool updates : {false, true}) {
+        const CaseResult result = unit::checkCases(folder(), "/bin/false", updates).cases.at(0);
+        EXPECT_EQ(result.surprises, Lines{"/tmp/airplay.conf is not what the explanation says"});
+        ASSERT_FALSE(result.differences.empty());
+        EXPECT_EQ(result.differences[0], "exit status 1");
+        EXPECT_EQ(result.differences.size(), updates ? 1U : 2U);
+    }
+}
+
 TEST_F(CaseCheckTest, NothingIsWrittenUnasked) {
     fs::remove_all(expected());
     check();
@@ -135,6 +171,25 @@ TEST(OptionLettersTest, AreThoseThatGetoptFinds) {
     EXPECT_EQ(unit::optionLetters({"word", "-a"}), "");
     EXPECT_EQ(unit::optionLetters({"-i", "-", "-a"}), "i");
     EXPECT_EQ(unit::optionLetters({"", "-a"}), "");
+    EXPECT_EQ(unit::optionLetters({"--a", "-i"}), "ai");
+    EXPECT_EQ(unit::optionLetters({"-a-i"}), "ai");
+}
+
+/// Each writer is seen by the output that it leaves.
+TEST(OptionLettersTest, AreThoseThatTheRealBinaryFinds) {
+    const Lines rows[] = {
+        {},      {"-xia"}, {"-a", "--", "-i"}, {"word", "-a"}, {"-i", "-"},  {"", "-a"},
+        {"--a"}, {"-a-i"}, {"-", "-ia"},       {"--", "-ia"},  {"-x", "-i"}, {"-a", "word", "-i"}};
+    for (const Lines& arguments : rows) {
+        const DescribedUnit described;
+        ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
+        const std::string letters = unit::optionLetters(arguments);
+        const auto isThere = [&described](const char* name) {
+            return fs::exists(described.root() / "tmp" / name);
+        };
+        EXPECT_EQ(isThere("airplay.conf"), letters.find('a') != std::string::npos) << letters;
+        EXPECT_EQ(isThere("iap1.cfg"), letters.find('i') != std::string::npos) << letters;
+    }
 }
 
 } // namespace

@@ -2,12 +2,12 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "kit/non_zero_runs.h"
+#include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
 #include "unit/contents.h"
 #include "unit/contents_text.h"
 
-#include <gtest/gtest.h>
-
+#include <iterator>
 #include <sstream>
 
 namespace orvane::test {
@@ -102,6 +102,86 @@ TEST(ContentsTest, BlankRecordsHaveABlankCrc) {
     EXPECT_EQ(contents.crcVerdict, CrcVerdict::blank);
     // The complement of the usual CRC-32 of 136 zero bytes; that value by zlib.
     EXPECT_EQ(~contents.crc, 0x773333E6U);
+}
+
+TEST(ContentsTest, CrcIsThatOfSlots1To9) {
+    // The complement of zlib's CRC-32 of 128 zero bytes and the serial.
+    EXPECT_EQ(unit::readContents(DescribedUnit().root()).crc, 0xC44C7586U);
+}
+
+TEST(ContentsTest, CrcOfAllOnesIsAmbiguous) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        // Of 128 zero bytes and these, zlib's CRC-32 is 0.
+        unit.disk.slots[9] = "SN00\x5a\x89\x73\xf2";
+    });
+    const Contents contents = unit::readContents(described.root());
+    EXPECT_EQ(contents.crc, 0xFFFFFFFFU);
+    EXPECT_EQ(contents.crcVerdict, CrcVerdict::ambiguous);
+    EXPECT_NE(printed(contents, "records").find("CRC over slots 1 to 9: 0xffffffff, ambiguous\n"),
+              std::string::npos);
+}
+
+TEST(ContentsTest, DiskThatIsTooShortIsTold) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        unit.disk = {};
+        unit.disk.size = MEBIBYTE - 1;
+    });
+    const Contents contents = unit::readContents(described.root());
+    EXPECT_EQ(contents.diskSize, 1'048'575U);
+    EXPECT_EQ(contents.diskTrouble, unit::Reason::diskTooShort);
+    EXPECT_EQ(contents.slots[0].bytes, std::nullopt);
+    // Slot 1 begins one byte behind the base, so it and all others are there.
+    EXPECT_EQ(contents.slots[1].bytes, std::string(16, '\0'));
+    EXPECT_EQ(contents.crcVerdict, CrcVerdict::blank);
+    EXPECT_EQ(contents.tuning.reason, unit::Reason::fromTuningBlock);
+}
+
+TEST(ContentsTest, EachPartCanBePrintedAlone) {
+    const Contents contents = unit::readContents(DescribedUnit().root());
+    const std::string beginnings[] = {
+        "image: 179 bytes\n", "disk: 2097152 bytes\n", "tuning block 0",
+        "/fs/rwdata/.Version/app.inf: ", "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM "};
+    std::string all;
+    std::size_t part = 0;
+    for (const char* name : unit::CONTENT_PARTS) {
+        const std::string text = printed(contents, name);
+        EXPECT_EQ(text.compare(0, beginnings[part].size(), beginnings[part]), 0) << text;
+        all += text;
+        ++part;
+    }
+    EXPECT_EQ(part, std::size(beginnings));
+    EXPECT_EQ(printed(contents, ""), all);
+}
+
+TEST(ContentsTest, OfTwoApplicationsOnlyOneIsChosen) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        unit.files["/fs/rwdata/.Version/other.inf"] = "Type=xApplicationx\nVersion Number=7.8.9\n";
+    });
+    const Contents contents = unit::readContents(described.root());
+    ASSERT_EQ(contents.versions.files.size(), 2U);
+    // Which one is the first is the file system's business.
+    EXPECT_EQ(contents.versions.chosen, 0U);
+    const bool isOther = contents.versions.files[0].path == "/fs/rwdata/.Version/other.inf";
+    EXPECT_EQ(contents.version, isOther ? "7.8.9" : "3.10.2_rc");
+    EXPECT_EQ(contents.versionDigits, isOther ? "070809" : "030a02");
+    EXPECT_NE(printed(contents, "versions")
+                  .find(std::string(isOther ? "app" : "other") +
+                        ".inf: not chosen: an application, but not the first one\n"),
+              std::string::npos);
+}
+
+TEST(ContentsTest, MissingVersionFolderIsTold) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        unit.files.erase("/fs/rwdata/.Version/app.inf");
+        unit.absent = {"/fs/rwdata/.Version"};
+    });
+    const Contents contents = unit::readContents(described.root());
+    EXPECT_FALSE(contents.versions.hasFolder);
+    EXPECT_FALSE(contents.versions.chosen);
+    EXPECT_EQ(printed(contents, "versions"),
+              "the folder of the version description files can't be read\n"
+              "version: \"" +
+                  contents.version + "\", as digits " + contents.versionDigits + "\n");
 }
 
 TEST(ContentsTest, VersionFilesAreChosenOrNot) {

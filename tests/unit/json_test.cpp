@@ -2,6 +2,7 @@
 //
 // The one place that parses the reports again.
 #include "kit/inspect_inputs.h"
+#include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
 #include "unit/contents_text.h"
@@ -126,6 +127,58 @@ TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
                                               {"surprises", json::array()},
                                               {"reasons", {"generated"}}}));
     EXPECT_EQ(report.at("unreached"), json::array({"disk-missing"}));
+}
+
+TEST(JsonTest, TextsThatAreNoUtf8AreHexWhereverTheyStand) {
+    unit::CheckReport check;
+    check.cases = {{"\xff", {"/tmp/\xfe is missing"}, {"\x80"}, {}}};
+    const json report = parsed(unit::checkJson("\xc0", check), "check");
+    EXPECT_EQ(report.at("folder"), (json{{"hex", "c0"}}));
+    EXPECT_EQ(report.at("cases").at(0).at("name"), (json{{"hex", "ff"}}));
+    EXPECT_EQ(report.at("cases").at(0).at("differences"),
+              (json::array({{{"hex", "2f746d702ffe206973206d697373696e67"}}})));
+    EXPECT_EQ(report.at("cases").at(0).at("surprises"), (json::array({{{"hex", "80"}}})));
+    EXPECT_EQ(parsed(unit::impactsJson("\xff", {}), "impact").at("root"), (json{{"hex", "ff"}}));
+    EXPECT_EQ(parsed(unit::consequencesJson("A", "\xff", {}), "diff").at("second"),
+              (json{{"hex", "ff"}}));
+    const DescribedUnit described([](kit::UnitDescription& unit) {
+        unit.files["/fs/rwdata/.Version/\xff.inf"] = "Type=\xfe\n\xfd=1\n";
+    });
+    const json shown =
+        parsed(unit::contentsJson("R", unit::readContents(described.root()), "versions"), "show");
+    EXPECT_NE(shown.dump().find(R"({"key":"Type","value":{"hex":"fe"}})"), std::string::npos);
+    EXPECT_NE(shown.dump().find(R"({"key":{"hex":"fd"},"value":"1"})"), std::string::npos);
+}
+
+/// The report of the program itself: one line on standard output, nothing beside it.
+json started(const std::vector<std::string>& words, int exitStatus) {
+    std::vector<std::string> command = buildCommand(ORVANE_UNIT_BINARY);
+    command.insert(command.end(), words.begin(), words.end());
+    const kit::RunResult result = runOnHost(command);
+    EXPECT_EQ(result.exitStatus, exitStatus);
+    EXPECT_EQ(result.standardError, "");
+    EXPECT_EQ(result.standardOutput.empty() ? ' ' : result.standardOutput.back(), '\n');
+    return parsed(result.standardOutput.substr(0, result.standardOutput.size() - 1),
+                  words.front().c_str());
+}
+
+TEST(JsonTest, EveryReportOfTheProgramIsOneLine) {
+    const DescribedUnit described;
+    const DescribedUnit other([](kit::UnitDescription& unit) { unit.image.params[139] = 0; });
+    const std::string root = described.root();
+    EXPECT_EQ(started({"show", root, "--json", "--only", "files"}, 0).at("root"), root);
+    EXPECT_EQ(started({"explain", root, "--json"}, 0).at("letters"), "ai");
+    EXPECT_EQ(started({"explain", root, "--json", "-i", "-a", "-ii"}, 0).at("letters"), "iaii");
+    EXPECT_EQ(started({"explain", other.root(), "--json"}, 1).at("isIntended"), false);
+    EXPECT_EQ(started({"diff", root, root, "--json"}, 0).at("values"), json::array());
+    EXPECT_EQ(started({"diff", root, other.root(), "--json", "-a"}, 1).at("values").size(), 1U);
+    EXPECT_EQ(started({"impact", root, "param.22", "--json"}, 0).at("inputs").size(), 1U);
+    EXPECT_EQ(started({"run", root, "--json", "--", "-a"}, 0).at("files").size(), 1U);
+    std::filesystem::create_directory(described.folder() / "one");
+    writeFile(described.folder() / "one/unit.toml", "");
+    const json check = started({"check", described.folder(), "--json"}, 1);
+    EXPECT_EQ(check.at("cases").at(0).at("name"), "one");
+    EXPECT_EQ(check.at("isUpdate"), false);
 }
 
 } // namespace

@@ -184,7 +184,7 @@ TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramElseOnPath) {
     fs::create_symlink(ORVANE_BINARY, tools / "orvane");
     const auto startAlone = [&](const std::string& path) {
         Words command = buildCommand(alone);
-        command.insert(command.begin(), {"env", "PATH=" + path});
+        command.insert(command.begin(), {"env", "-C", alone.parent_path(), "PATH=" + path});
         command.insert(command.end(), {"run", described.root(), "--brief", "--", "-i"});
         return runOnHost(command);
     };

@@ -4,6 +4,8 @@
 
 #include <gtest/gtest.h>
 
+#include <numeric>
+#include <random>
 #include <sstream>
 
 namespace orvane::test {
@@ -42,6 +44,63 @@ TEST(TextDiffTest, ChangesFarApartAreHunksOfTheirOwn) {
     EXPECT_EQ(diffOf(before, after), "--- /tmp/x\n+++ /tmp/x\n"
                                      "@@ -1,5 +1,4 @@\n 1\n-2\n 3\n 4\n 5\n"
                                      "@@ -18,3 +17,4 @@\n 18\n 19\n 20\n+21\n");
+}
+
+TEST(TextDiffTest, SixCommonLinesJoinTwoChangesAndSevenPartThem) {
+    EXPECT_EQ(diffOf("x\n1\n2\n3\n4\n5\n6\ny\n", "X\n1\n2\n3\n4\n5\n6\nY\n"),
+              "--- /tmp/x\n+++ /tmp/x\n@@ -1,8 +1,8 @@\n"
+              "-x\n+X\n 1\n 2\n 3\n 4\n 5\n 6\n-y\n+Y\n");
+    EXPECT_EQ(diffOf("x\n1\n2\n3\n4\n5\n6\n7\ny\n", "X\n1\n2\n3\n4\n5\n6\n7\nY\n"),
+              "--- /tmp/x\n+++ /tmp/x\n@@ -1,4 +1,4 @@\n-x\n+X\n 1\n 2\n 3\n"
+              "@@ -6,4 +6,4 @@\n 5\n 6\n 7\n-y\n+Y\n");
+}
+
+/// The text that the hunks make of `before`, by their numbers alone, as a patch does.
+std::string patched(const std::vector<std::string>& before, const std::vector<unit::Hunk>& hunks) {
+    std::string text;
+    std::size_t next = 1; // the line of `before` that comes next
+    for (const unit::Hunk& hunk : hunks) {
+        const std::size_t first = hunk.beforeCount == 0 ? hunk.before + 1 : hunk.before;
+        while (next < first) {
+            text += before.at(next++ - 1);
+        }
+        for (const unit::DiffLine& line : hunk.lines) {
+            if (line.kind != unit::DiffLine::Kind::added) {
+                EXPECT_EQ(line.before, next);
+                EXPECT_EQ(line.text, before.at(next++ - 1));
+            }
+            text += line.kind == unit::DiffLine::Kind::removed ? "" : line.text;
+        }
+        EXPECT_EQ(next, first + hunk.beforeCount);
+    }
+    while (next <= before.size()) {
+        text += before[next++ - 1];
+    }
+    return text;
+}
+
+/// The same numbers each time.
+std::mt19937 numbersFrom(std::mt19937::result_type seed) {
+    return std::mt19937(seed);
+}
+
+TEST(TextDiffTest, HunksMakeTheSecondTextOfTheFirst) {
+    std::mt19937 random = numbersFrom(20090213);
+    const auto textOf = [&random] {
+        std::vector<std::string> lines(random() % 40);
+        for (std::string& line : lines) {
+            line = std::string(1, static_cast<char>('a' + random() % 5)) + "\n";
+        }
+        return lines;
+    };
+    const auto joined = [](const std::vector<std::string>& lines) {
+        return std::accumulate(lines.begin(), lines.end(), std::string());
+    };
+    for (int i = 0; i < 300; ++i) {
+        const std::vector<std::string> before = textOf();
+        const std::string after = joined(textOf());
+        EXPECT_EQ(patched(before, unit::differingHunks(joined(before), after)), after);
+    }
 }
 
 TEST(TextDiffTest, NewAndRemovedFilesCountFromNothing) {

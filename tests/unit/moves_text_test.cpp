@@ -1,0 +1,87 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "unit/moves_text.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <sstream>
+
+namespace orvane::test {
+
+namespace {
+
+using unit::Consequence;
+using unit::DiffLine;
+using unit::Impact;
+using unit::Outcome;
+
+std::string printed(const std::vector<Consequence>& consequences) {
+    std::ostringstream out;
+    unit::printConsequences(out, consequences);
+    return out.str();
+}
+
+std::string printed(const std::vector<Impact>& impacts) {
+    std::ostringstream out;
+    unit::printImpacts(out, impacts);
+    return out.str();
+}
+
+TEST(MovesTextTest, ConsequencesStandBelowTheirValues) {
+    const unit::MovedLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, "slot.9"};
+    const unit::MovedLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, "slot.9"};
+    EXPECT_EQ(printed(std::vector<Consequence>{
+                  {{"slot.9", "", "B"},
+                   {{"/tmp/x", Outcome::generated, Outcome::generated, {}, {removed, added}},
+                    {"/tmp/y", Outcome::generated, Outcome::stock, {}, {}}}},
+                  {{"param.1", "0", "1"}, {}},
+                  {{"", "", ""}, {{"/tmp/z", Outcome::kept, Outcome::empty, {}, {}}}}}),
+              "slot.9: (empty) -> B\n"
+              "  /tmp/x\n    -a\n    +\\xff\n"
+              "  /tmp/y: generated -> stock\n"
+              "param.1: 0 -> 1\n  moves no output\n"
+              "of no value that differs:\n  /tmp/z: kept -> empty\n");
+}
+
+TEST(MovesTextTest, ImpactsThatMoveNothingAreGatheredInRanges) {
+    EXPECT_EQ(printed(std::vector<Impact>{{"param.1", 3, 0, {}},
+                                          {"param.2", 3, 0, {}},
+                                          {"param.3", 13, 12, {"/tmp/x:1", "/tmp/y"}},
+                                          {"param.4", 1, 1, {"/tmp/x:2"}},
+                                          {"param.5", 3, 0, {}},
+                                          {"slot.0.0", 3, 0, {}},
+                                          {"slot.1.0", 3, 0, {}},
+                                          {"slot.1.1", 3, 0, {}},
+                                          {"tuning.1.qwaA", 3, 0, {}}}),
+              "param.3: 12 of 13 values moved\n  /tmp/x:1\n  /tmp/y\n"
+              "param.4: 1 of 1 value moved\n  /tmp/x:2\n"
+              "7 inputs moved nothing:\n"
+              "  param.1-2\n  param.5\n  slot.0.0\n  slot.1.0-1\n  tuning.1.qwaA\n");
+}
+
+TEST(MovesTextTest, WholeTuningBlocksAreOneWord) {
+    std::vector<Impact> impacts;
+    for (const char* block : {"tuning.4", "tuning.5", "tuning.7"}) {
+        for (int field = 0; field < 44; ++field) {
+            impacts.push_back({std::string(block) + ".qwa" + std::to_string(field), 3, 0, {}});
+        }
+    }
+    impacts.push_back({"tuning.8.qwa0", 3, 0, {}});
+    EXPECT_EQ(printed(impacts), "133 inputs moved nothing:\n"
+                                "  tuning.4-5\n  tuning.7\n  tuning.8.qwa0\n");
+}
+
+TEST(MovesTextTest, ProgressIsDrawnWhereItGrowsAndWipedOutAtItsEnd) {
+    std::ostringstream terminal;
+    for (std::size_t done = 1; done <= 80; ++done) {
+        unit::printProgress(terminal, done, 80);
+    }
+    const std::string text = terminal.str();
+    EXPECT_EQ(text.substr(0, 53), "\r[#" + std::string(39, ' ') + "] 2 of 80" + "\r[");
+    EXPECT_EQ(std::count(text.begin(), text.end(), '['), 39 + 1); // the last one wipes
+    EXPECT_EQ(text.substr(text.size() - 4), "\r\033[K");
+}
+
+} // namespace
+
+} // namespace orvane::test
