@@ -63,7 +63,7 @@ std::function<void(UnitDescription&)> both(const std::function<void(UnitDescript
     };
 }
 
-void plain(UnitDescription&) {}
+void plain(UnitDescription& /*unit*/) {}
 
 void generatedProfile(UnitDescription& unit) {
     unit.image.params[134] = 0xFFFF;
@@ -146,7 +146,7 @@ bool has(const unit::Output& output, Reason reason) {
 
 class ExplainReasonsTest : public ::testing::TestWithParam<std::size_t> {
 protected:
-    const Row& row() const { return rows().at(GetParam()); }
+    static const Row& row() { return rows().at(GetParam()); }
 };
 
 TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
@@ -154,7 +154,7 @@ TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
     const unit::Explanation explanation = unit::explainUnit(described.root(), "ai");
     const auto output =
         std::find_if(explanation.begin(), explanation.end(),
-                     [this](const unit::Output& other) { return other.path == row().output; });
+                     [](const unit::Output& other) { return other.path == row().output; });
     ASSERT_NE(output, explanation.end());
     EXPECT_TRUE(has(*output, row().reason)) << reasonInfo(row().reason).code;
     EXPECT_EQ(output->outcome, row().outcome);

@@ -272,6 +272,8 @@ TEST(OrvaneUnitTest, NothingIsColouredButOnATerminal) {
               std::string::npos);
     EXPECT_EQ(runOnHost({"env", "NO_COLOR=1", "sh", "-c", command}).standardOutput.find('\033'),
               std::string::npos);
+    EXPECT_NE(runOnHost({"env", "NO_COLOR=", "sh", "-c", command}).standardOutput.find('\033'),
+              std::string::npos);
 }
 
 } // namespace
