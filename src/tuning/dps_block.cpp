@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tuning/dps_block.h"
 
+#include <algorithm>
+#include <string_view>
+
 namespace orvane {
 
 // clang-format off
@@ -95,7 +98,18 @@ constexpr std::size_t countKind(DpsKind kind) {
     return count;
 }
 
+constexpr bool maximaAreReached() {
+    std::size_t longestKey = 0;
+    std::size_t longestList = 0;
+    for (const DpsField& field : DPS_LAYOUT) {
+        longestKey = std::max(longestKey, std::string_view(field.key).size());
+        longestList = std::max<std::size_t>(longestList, field.count);
+    }
+    return longestKey == DPS_KEY_MAX && longestList == DPS_COUNT_MAX;
+}
+
 static_assert(fieldsAscendWithoutOverlap());
+static_assert(maximaAreReached());
 static_assert(countKind(DpsKind::switchWord) == 16 + 3 && countKind(DpsKind::modeWord) == 1);
 static_assert(countKind(DpsKind::number) == 12 && countKind(DpsKind::list) == 12);
 

@@ -5,10 +5,15 @@ namespace orvane {
 
 namespace {
 
+/// The buffer of every file that is copied: one serves them all, since it holds bytes only while
+/// one copy runs. Its size is what a large template's speed comes from.
+constexpr std::size_t INPUT_BUFFER_SIZE = 65536; // bytes
+std::array<char, INPUT_BUFFER_SIZE> InputBuffer;
+
 /// The buffer comes first: a file stream takes one only before its first use.
-template <typename FileStream>
-void open(FileStream& stream, StreamBuffer& buffer, const char* path) {
-    stream.rdbuf()->pubsetbuf(buffer.data(), STREAM_BUFFER_SIZE);
+template <typename FileStream, std::size_t SIZE>
+void open(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
+    stream.rdbuf()->pubsetbuf(buffer.data(), SIZE);
     stream.open(path);
 }
 
@@ -16,7 +21,7 @@ void open(FileStream& stream, StreamBuffer& buffer, const char* path) {
 
 TemplateMerge::TemplateMerge(const AccessoryFile& file) {
     open(output, outputBuffer, file.output);
-    open(templateFile, templateBuffer, file.templateFile);
+    open(templateFile, InputBuffer, file.templateFile);
 }
 
 void TemplateMerge::copyTemplate() {
@@ -29,11 +34,10 @@ void TemplateMerge::close() {
 }
 
 void installStockFile(const AccessoryFile& file) {
-    StreamBuffer stockBuffer;
-    StreamBuffer outputBuffer;
+    OutputBuffer outputBuffer;
     std::ifstream stock;
     std::ofstream output;
-    open(stock, stockBuffer, file.stockFile);
+    open(stock, InputBuffer, file.stockFile);
     open(output, outputBuffer, file.output);
     output << stock.rdbuf();
     stock.close();

@@ -5,8 +5,8 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <fstream>
-#include <ios>
 
 namespace orvane {
 
@@ -17,9 +17,10 @@ struct AccessoryFile {
     const char* stockFile;
 };
 
-/// Each stream of a writer brings its buffer, so that opening one needs no memory.
-constexpr std::streamsize STREAM_BUFFER_SIZE = 8192; ///< bytes
-using StreamBuffer = std::array<char, STREAM_BUFFER_SIZE>;
+/// Every output brings its buffer, so that opening one needs no memory. It is small, so that a run
+/// touches few pages: a head fits in, and a template passes it by.
+constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
+using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 
 /// The streams of one merge. A stream that could not be opened is failed, and what is written to it
 /// is dropped.
@@ -37,8 +38,7 @@ struct TemplateMerge {
     /// Closes the template, then the output. A close that fails leaves its stream failed.
     void close();
 
-    StreamBuffer outputBuffer;
-    StreamBuffer templateBuffer;
+    OutputBuffer outputBuffer;
     std::ofstream output;
     std::ifstream templateFile;
 };
