@@ -7,7 +7,7 @@ namespace {
 
 /// The buffer of every file that is copied: one serves them all, since it holds bytes only while
 /// one copy runs. Its size is what a large template's speed comes from.
-constexpr std::size_t INPUT_BUFFER_SIZE = 65536; // bytes
+constexpr std::size_t INPUT_BUFFER_SIZE = 131072; // bytes
 std::array<char, INPUT_BUFFER_SIZE> InputBuffer;
 
 /// The buffer comes first: a file stream takes one only before its first use.

@@ -30,9 +30,9 @@ TEST(TrimSpacesTest, OnlySpacesAtTheEndsGo) {
 TEST(TrimSpacesTest, OtherWhiteSpaceStays) {
     for (const char c : {'\t', '\r', '\n', '\v', '\f', '\0', '\xA0'}) {
         SCOPED_TRACE(static_cast<int>(c));
-        EXPECT_EQ(trimSpaces({c}), std::string({c}));
-        EXPECT_EQ(trimSpaces({' ', ' ', c, ' '}), std::string({c}));
-        EXPECT_EQ(trimSpaces({c, ' ', 'a', ' ', c}), std::string({c, ' ', 'a', ' ', c}));
+        EXPECT_EQ(trimSpaces(std::string{c}), std::string({c}));
+        EXPECT_EQ(trimSpaces(std::string{' ', ' ', c, ' '}), std::string({c}));
+        EXPECT_EQ(trimSpaces(std::string{c, ' ', 'a', ' ', c}), std::string({c, ' ', 'a', ' ', c}));
     }
 }
 
