@@ -1,0 +1,38 @@
+# SPDX-License-Identifier: Apache-2.0
+"""The same sources give the same program, wherever they lie and wherever they are built."""
+
+from __future__ import annotations
+
+import os
+import shutil
+import subprocess
+import tempfile
+import unittest
+from pathlib import Path
+
+PROJECT = Path(__file__).resolve().parents[2]
+
+
+@unittest.skipIf(os.environ.get("ORVANE_PROCESSOR") == "arm", "the compiler is the same, but slower")
+class ReproducibleTest(unittest.TestCase):
+    def test_two_folders_give_the_same_bytes(self) -> None:
+        with tempfile.TemporaryDirectory(prefix="orvane-reproducible-") as name:
+            programs = [self.build(Path(name) / place) for place in
+                        ("here", "a folder/of another name, and deeper")]
+        self.assertEqual(programs[0], programs[1])
+
+    def build(self, folder: Path) -> bytes:
+        """As a user builds it, not stripped: names of sources would show."""
+        sources = folder / "sources"
+        shutil.copytree(PROJECT, sources,
+                        ignore=shutil.ignore_patterns("build", ".git", "__pycache__"))
+        build = folder / "build"
+        quietly = {"check": True, "stdout": subprocess.DEVNULL}
+        subprocess.run(["cmake", "-G", "Ninja", "-S", sources, "-B", build, "-DORVANE_KIT=OFF",
+                        f"-DCMAKE_CXX_COMPILER={os.environ['ORVANE_COMPILER']}"], **quietly)
+        subprocess.run(["cmake", "--build", build, "--target", "orvane"], **quietly)
+        return (build / "orvane").read_bytes()
+
+
+if __name__ == "__main__":
+    unittest.main()
