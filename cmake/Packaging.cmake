@@ -1,0 +1,55 @@
+# SPDX-License-Identifier: Apache-2.0
+# What `cmake --install` lays down and `cpack` packs. Two components: `programs` runs on a unit or on
+# a host, `host` is what a host adds for the people who type. The Debian package holds both, the
+# tarball for a target the programs alone.
+include(GNUInstallDirs)
+
+install(TARGETS orvane RUNTIME COMPONENT programs)
+install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR} RENAME copyright COMPONENT programs)
+if(ORVANE_KIT_BUILT)
+  install(TARGETS orvane-unit RUNTIME COMPONENT programs)
+  install(FILES completion/orvane-unit.bash COMPONENT host
+    DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions RENAME orvane-unit)
+endif()
+
+find_program(ORVANE_GZIP gzip)
+mark_as_advanced(ORVANE_GZIP)
+# install_compressed FILE FOLDER NAME: Debian wants pages and changelogs so; -n keeps the date out.
+function(install_compressed file folder name)
+  if(NOT ORVANE_GZIP)
+    return()
+  endif()
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${file})
+  set(compressed ${CMAKE_CURRENT_BINARY_DIR}/compressed/${name}.gz)
+  file(MAKE_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/compressed)
+  execute_process(COMMAND ${ORVANE_GZIP} -9n COMMAND_ERROR_IS_FATAL ANY
+    INPUT_FILE ${CMAKE_CURRENT_SOURCE_DIR}/${file} OUTPUT_FILE ${compressed})
+  install(FILES ${compressed} DESTINATION ${folder} COMPONENT host)
+endfunction()
+install_compressed(man/orvane.1 ${CMAKE_INSTALL_MANDIR}/man1 orvane.1)
+install_compressed(man/orvane-unit.1 ${CMAKE_INSTALL_MANDIR}/man1 orvane-unit.1)
+install_compressed(CHANGELOG.md ${CMAKE_INSTALL_DOCDIR} changelog)
+install(FILES README.md DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT host)
+install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT host)
+
+set(CPACK_PACKAGE_NAME orvane)
+set(CPACK_PACKAGE_VENDOR "the orvane developers")
+set(CPACK_PACKAGE_CONTACT "orvane developers <orvane@example.org>")
+set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "accessory configuration files for a vehicle head unit")
+set(CPACK_PACKAGE_DESCRIPTION
+  "orvane runs once at the boot of a head unit and writes the configuration files of its phone
+projection stacks. orvane-unit makes simulated units, and says on a desk exactly what orvane will
+write on a unit and why.")
+set(CPACK_STRIP_FILES ON)
+set(CPACK_PACKAGE_DIRECTORY ${PROJECT_SOURCE_DIR}/build/packages)
+set(CPACK_GENERATOR DEB TGZ)
+set(CPACK_COMPONENTS_ALL programs host)
+set(CPACK_PROJECT_CONFIG_FILE ${CMAKE_CURRENT_LIST_DIR}/PackagingByGenerator.cmake)
+
+set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_DEBIAN_PACKAGE_SECTION devel)
+set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
+
+string(TOLOWER "${CMAKE_SYSTEM_NAME}-${CMAKE_SYSTEM_PROCESSOR}" ORVANE_TARGET)
+set(CPACK_ARCHIVE_FILE_NAME orvane-${PROJECT_VERSION}-${ORVANE_TARGET})
+include(CPack)
