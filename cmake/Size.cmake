@@ -5,11 +5,14 @@ add_library(orvane_size INTERFACE)
 if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   target_compile_options(orvane_size INTERFACE -Os -ffunction-sections -fdata-sections)
   target_link_options(orvane_size INTERFACE LINKER:--gc-sections)
-  # A tenth of the code: what is inlined into its one caller goes from where it was defined.
+endif()
+
+# Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC,
+# whose objects keep their machine code beside what the link reads, for other programs and for tests.
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   include(CheckIPOSupported)
   check_ipo_supported(RESULT ORVANE_LINK_TIME_OPTIMISATION OUTPUT ignored LANGUAGES CXX)
-  # Objects keep their machine code beside what the link reads: tests look into it.
-  target_compile_options(orvane_size INTERFACE $<$<CXX_COMPILER_ID:GNU>:-ffat-lto-objects>)
+  target_compile_options(orvane_size INTERFACE -ffat-lto-objects)
 endif()
 
 function(orvane_optimise_at_link)

@@ -5,6 +5,7 @@
 #include "config/config_store.h"
 #include "config/param_access.h"
 #include "fuzz/support.h"
+#include "kit/descriptor.h"
 
 #include <sys/mman.h>
 #include <unistd.h>
@@ -12,6 +13,7 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <cstdint>
 #include <cstring>
 #include <string>
 #include <string_view>

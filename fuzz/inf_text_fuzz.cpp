@@ -6,11 +6,17 @@
 #include "fuzz/support.h"
 #include "identity/inf_file.h"
 #include "identity/software_version.h"
-#include "kit/kit_error.h"
+#include "kit/descriptor.h"
 
 #include <array>
+#include <cstddef>
+#include <cstdint>
+#include <filesystem>
+#include <map>
+#include <memory>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace orvane::fuzz {

@@ -4,6 +4,7 @@
 // /proc/self/cmdline; at most 32, of at most 64 bytes each, and none from the one on that would
 // make it more than 16 letters that run a writer: those take nearly all of the time.
 #include "fuzz/support.h"
+#include "kit/descriptor.h"
 #include "kit/kit_error.h"
 #include "main/options.h"
 
@@ -12,7 +13,11 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdint>
 #include <cstring>
+#include <filesystem>
+#include <iosfwd>
+#include <iterator>
 #include <string>
 #include <string_view>
 #include <vector>

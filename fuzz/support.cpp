@@ -14,9 +14,8 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <optional>
+#include <system_error>
 
 namespace orvane::fuzz {
 

@@ -5,8 +5,6 @@
 
 #include "kit/descriptor.h"
 
-#include <sys/types.h>
-
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>

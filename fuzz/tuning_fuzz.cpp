@@ -6,12 +6,15 @@
 #include "config/boot_disk.h"
 #include "fuzz/support.h"
 #include "fuzz/tuning_reading.h"
+#include "kit/descriptor.h"
 #include "kit/kit_error.h"
 #include "tuning/tuning_file.h"
 
 #include <unistd.h>
 
 #include <algorithm>
+#include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 

@@ -7,9 +7,11 @@
 #include "fuzz/support.h"
 #include "kit/kit_error.h"
 #include "kit/tuning_text.h"
+#include "tuning/dps_block.h"
 #include "tuning/tuning_file.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <sstream>

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/capture.h"
 
+#include "kit/descriptor.h"
 #include "kit/kit_error.h"
 
 #include <fcntl.h>
@@ -10,6 +11,10 @@
 
 #include <array>
 #include <cerrno>
+#include <cstdlib>
+#include <exception>
+#include <string>
+#include <utility>
 
 namespace orvane::kit {
 
@@ -42,7 +47,7 @@ void putDescriptor(const Descriptor& from, int to) {
 
 /// Takes what `pipe` has to give, and closes its read end at the end of the stream.
 void readSome(Pipe& pipe) {
-    std::array<char, 4096> buffer;
+    std::array<char, 4096> buffer{};
     const ssize_t count = ::read(pipe.readEnd.number(), buffer.data(), buffer.size());
     if (count > 0) {
         pipe.text.append(buffer.data(), static_cast<std::size_t>(count));

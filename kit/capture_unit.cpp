@@ -5,6 +5,8 @@
 #include "kit/unit.h"
 #include "kit/unit_inputs.h"
 
+#include <utility>
+
 namespace orvane::kit {
 
 void captureUnit(const std::filesystem::path& source, const std::filesystem::path& root,

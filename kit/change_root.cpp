@@ -11,6 +11,7 @@
 
 #include <cerrno>
 #include <string>
+#include <system_error>
 #include <utility>
 
 namespace orvane::kit {

@@ -1,8 +1,20 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description_reading.h"
 #include "kit/host_file.h"
+#include "kit/kit_error.h"
+#include "kit/toml_library.h"
+#include "kit/toml_values.h"
 #include "kit/unit.h"
+#include "kit/unit_layout.h"
 #include "kit/unit_misfit.h"
+
+#include <filesystem>
+#include <map>
+#include <optional>
+#include <string>
+#include <system_error>
+#include <utility>
+#include <vector>
 
 namespace orvane::kit {
 

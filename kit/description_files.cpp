@@ -1,11 +1,24 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description_reading.h"
+#include "kit/description_values.h"
 #include "kit/host_file.h"
+#include "kit/kit_error.h"
+#include "kit/toml_library.h"
+#include "kit/toml_values.h"
+#include "kit/unit.h"
 #include "kit/unit_checks.h"
 #include "kit/unit_misfit.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <filesystem>
 #include <limits>
+#include <map>
+#include <string>
+#include <string_view>
+#include <type_traits>
+#include <vector>
 
 namespace orvane::kit {
 

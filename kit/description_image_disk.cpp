@@ -1,11 +1,25 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "kit/description_reading.h"
+#include "kit/description_values.h"
+#include "kit/kit_error.h"
+#include "kit/toml_library.h"
+#include "kit/toml_values.h"
 #include "kit/tuning_encode.h"
+#include "kit/unit.h"
 #include "kit/unit_checks.h"
 #include "kit/unit_misfit.h"
+#include "tuning/dps_block.h"
 
+#include <cstdint>
 #include <limits>
+#include <map>
+#include <optional>
+#include <string>
+#include <type_traits>
+#include <variant>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -4,6 +4,15 @@
 #include "kit/toml_text.h"
 #include "tuning/dps_block.h"
 
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <utility>
+#include <variant>
+#include <vector>
+
 namespace orvane::kit {
 
 namespace {

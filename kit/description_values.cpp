@@ -4,6 +4,8 @@
 #include "kit/kit_error.h"
 
 #include <charconv>
+#include <cstddef>
+#include <system_error>
 
 namespace orvane::kit {
 

@@ -15,6 +15,8 @@ public:
     Descriptor() = default;
     explicit Descriptor(int number) : number_(number) {}
     ~Descriptor() { close(); }
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
     Descriptor(Descriptor&& other) noexcept : number_(std::exchange(other.number_, -1)) {}
     Descriptor& operator=(Descriptor&& other) noexcept {
         std::swap(number_, other.number_);

@@ -4,18 +4,25 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "config/record_area.h"
+#include "config/record_slots.h"
+#include "kit/descriptor.h"
 #include "kit/edit_assignment.h"
 #include "kit/host_file.h"
 #include "kit/kit_error.h"
 #include "kit/marker.h"
 #include "kit/root.h"
 #include "kit/tuning_encode.h"
+#include "kit/unit.h"
 #include "kit/unit_misfit.h"
+#include "tuning/dps_block.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
 
-#include <map>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <variant>
 
 namespace orvane::kit {
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/edit_assignment.h"
 
+#include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "kit/description_values.h"
 #include "kit/host_file.h"
@@ -10,11 +11,15 @@
 #include "kit/unit_checks.h"
 
 #include <algorithm>
+#include <array>
 #include <charconv>
+#include <cstddef>
 #include <limits>
 #include <map>
 #include <optional>
 #include <string_view>
+#include <system_error>
+#include <utility>
 
 namespace orvane::kit {
 

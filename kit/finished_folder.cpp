@@ -8,6 +8,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <string>
+#include <system_error>
 #include <utility>
 
 namespace orvane::kit {

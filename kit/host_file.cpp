@@ -8,6 +8,7 @@
 #include <unistd.h>
 
 #include <array>
+#include <cstddef>
 #include <string>
 
 namespace orvane::kit {
@@ -74,7 +75,7 @@ Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file)
 Bytes readStream(const std::filesystem::path& file) {
     const Descriptor descriptor(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
     Bytes bytes;
-    std::array<char, 65536> buffer;
+    std::array<char, 65536> buffer{};
     ssize_t count = 0;
     while ((count = ::read(descriptor.number(), buffer.data(), buffer.size())) > 0) {
         bytes.append(buffer.data(), static_cast<std::size_t>(count));

@@ -10,6 +10,10 @@
 #include "kit/unit_layout.h"
 
 #include <algorithm>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace orvane::kit {
 

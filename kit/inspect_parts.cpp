@@ -1,13 +1,28 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "config/param_catalogue.h"
 #include "config/record_slots.h"
+#include "kit/descriptor.h"
 #include "kit/host_file.h"
 #include "kit/inspect.h"
 #include "kit/non_zero_runs.h"
 #include "kit/tuning_encode.h"
+#include "kit/unit.h"
 #include "kit/unit_misfit.h"
+#include "tuning/dps_block.h"
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
+#include <cstdint>
+#include <filesystem>
+#include <functional>
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <variant>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -3,9 +3,12 @@
 
 #include "kit/host_file.h"
 #include "kit/kit_error.h"
+#include "kit/unit.h"
 
-#include <fcntl.h>
 #include <sys/stat.h>
+
+#include <string>
+#include <system_error>
 
 namespace orvane::kit {
 

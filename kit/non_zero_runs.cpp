@@ -3,11 +3,15 @@
 
 #include "kit/kit_error.h"
 
+#include <stdio.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <iterator>
+#include <string>
+#include <utility>
 
 namespace orvane::kit {
 

@@ -2,9 +2,13 @@
 #include "kit/redact_serial.h"
 
 #include "config/record_slots.h"
+#include "kit/unit.h"
 
-#include <algorithm>
+#include <cstddef>
 #include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
 
 namespace orvane::kit {
 

@@ -3,6 +3,7 @@
 
 #include "kit/change_root.h"
 #include "kit/host_file.h"
+#include "kit/kit_error.h"
 
 #include <fcntl.h>
 #include <unistd.h>

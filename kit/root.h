@@ -6,7 +6,6 @@
 #pragma once
 
 #include "kit/descriptor.h"
-#include "kit/kit_error.h"
 
 #include <filesystem>
 #include <string>

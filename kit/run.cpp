@@ -5,7 +5,9 @@
 
 #include <sys/mount.h>
 
+#include <filesystem>
 #include <optional>
+#include <system_error>
 
 namespace orvane::kit {
 

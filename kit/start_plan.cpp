@@ -10,8 +10,10 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <memory>
 #include <set>
 #include <sstream>
+#include <system_error>
 
 namespace orvane::kit {
 
@@ -38,7 +40,7 @@ std::vector<char*> pointers(const std::vector<std::string>& words) {
     std::vector<char*> result;
     result.reserve(words.size() + 1);
     for (const std::string& word : words) {
-        result.push_back(const_cast<char*>(word.c_str()));
+        result.push_back(const_cast<char*>(word.c_str())); // NOLINT(*-const-cast): it changes none
     }
     result.push_back(nullptr);
     return result;

@@ -5,8 +5,10 @@
 // "/".
 #pragma once
 
+#include "kit/descriptor.h"
 #include "kit/root.h"
 
+#include <filesystem>
 #include <string>
 #include <vector>
 

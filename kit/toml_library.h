@@ -11,8 +11,10 @@
 
 #pragma push_macro("NDEBUG")
 #undef NDEBUG
+// NOLINTBEGIN(cppcoreguidelines-macro-usage): so the library wants it
 #define TOML_ASSERT(condition) static_cast<void>(0)
 #define TOML_HEADER_ONLY 1
+// NOLINTEND(cppcoreguidelines-macro-usage)
 #include <toml++/impl/preprocessor.h>
 
 #pragma push_macro("TOML_UNREACHABLE")

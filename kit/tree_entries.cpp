@@ -6,6 +6,10 @@
 #include "kit/non_zero_runs.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <map>
+#include <system_error>
+#include <utility>
 
 namespace orvane::kit {
 

@@ -4,6 +4,10 @@
 #include "kit/kit_error.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <map>
+#include <variant>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -6,6 +6,10 @@
 #include "kit/unit.h"
 #include "tuning/dps_block.h"
 
+#include <array>
+#include <cstdint>
+#include <string>
+
 namespace orvane::kit {
 
 /// Whether a tuning block has a field `key`.

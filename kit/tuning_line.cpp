@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/tuning_line.h"
 
-#include "kit/kit_error.h"
 #include "kit/toml_text.h"
 #include "kit/tuning_encode.h"
+#include "kit/unit.h"
 
+#include <array>
 #include <charconv>
+#include <cstdint>
+#include <system_error>
 #include <vector>
 
 namespace orvane::kit {

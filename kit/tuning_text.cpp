@@ -10,6 +10,7 @@
 #include <array>
 #include <cstddef>
 #include <string_view>
+#include <utility>
 
 namespace orvane::kit {
 

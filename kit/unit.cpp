@@ -2,6 +2,7 @@
 #include "kit/unit.h"
 
 #include "config/record_area.h"
+#include "kit/descriptor.h"
 #include "kit/finished_folder.h"
 #include "kit/host_file.h"
 #include "kit/kit_error.h"
@@ -9,7 +10,12 @@
 #include "kit/root.h"
 #include "kit/tuning_encode.h"
 #include "kit/unit_checks.h"
+#include "kit/unit_layout.h"
 #include "kit/unit_misfit.h"
+#include "tuning/dps_block.h"
+
+#include <array>
+#include <type_traits>
 
 namespace orvane::kit {
 

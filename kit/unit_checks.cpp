@@ -2,13 +2,16 @@
 #include "kit/unit_checks.h"
 
 #include "config/param_catalogue.h"
-#include "config/record_area.h"
 #include "config/record_slots.h"
 #include "kit/kit_error.h"
 #include "kit/marker.h"
 #include "kit/tuning_encode.h"
+#include "tuning/dps_block.h"
 
 #include <filesystem>
+#include <map>
+#include <optional>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -5,6 +5,7 @@
 #include "config/config_store.h"
 #include "config/record_slots.h"
 #include "identity/software_version.h"
+#include "kit/descriptor.h"
 #include "kit/host_file.h"
 #include "kit/inspect.h"
 #include "kit/kit_error.h"
@@ -15,12 +16,17 @@
 #include "tuning/audio_profile.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
+#include "writers/template_merge.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
 
 #include <algorithm>
 #include <cerrno>
+#include <cstdint>
+#include <system_error>
+#include <utility>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -5,6 +5,9 @@
 #include "config/config_store.h"
 
 #include <algorithm>
+#include <iterator>
+#include <utility>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -6,6 +6,10 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 
+#include <map>
+#include <utility>
+#include <vector>
+
 namespace orvane::kit {
 
 namespace {

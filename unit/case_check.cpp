@@ -5,13 +5,21 @@
 #include "kit/root.h"
 #include "kit/unit.h"
 #include "unit/explain.h"
+#include "unit/explanation.h"
 #include "unit/scratch_folder.h"
 #include "unit/tmp_tree.h"
 #include "unit/whole_file.h"
 
 #include <algorithm>
+#include <array>
 #include <fstream>
+#include <iterator>
+#include <map>
+#include <memory>
+#include <optional>
 #include <sstream>
+#include <system_error>
+#include <utility>
 
 namespace orvane::unit {
 

@@ -8,11 +8,15 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
+#include <cstddef>
+#include <exception>
 #include <functional>
 #include <iostream>
 #include <iterator>
 #include <memory>
 #include <sstream>
+#include <stdexcept>
 #include <string>
 #include <vector>
 

@@ -7,14 +7,20 @@
 #include "kit/inspect.h"
 #include "kit/inspect_inputs.h"
 #include "kit/unit.h"
+#include "unit/contents.h"
 #include "unit/contents_text.h"
 #include "unit/explain.h"
+#include "unit/explanation.h"
 #include "unit/explanation_text.h"
+#include "unit/impact.h"
 #include "unit/json.h"
+#include "unit/moves.h"
 #include "unit/moves_text.h"
+#include "unit/unit_values.h"
 
 #include <unistd.h>
 
+#include <cstddef>
 #include <iostream>
 
 namespace orvane::unit {

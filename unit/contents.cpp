@@ -5,15 +5,20 @@
 #include "config/config_store.h"
 #include "config/param_access.h"
 #include "config/record_area.h"
+#include "config/record_slots.h"
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
 #include "kit/non_zero_runs.h"
 #include "kit/root.h"
+#include "kit/unit.h"
 #include "tuning/audio_profile.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
+#include "writers/template_merge.h"
 
 #include <sys/stat.h>
+
+#include <utility>
 
 namespace orvane::unit {
 

@@ -4,8 +4,8 @@
 #pragma once
 
 #include "config/param_catalogue.h"
-#include "config/record_slots.h"
 #include "unit/explanation.h"
+#include "unit/reasons.h"
 #include "unit/value_origins.h"
 #include "unit/version_choice.h"
 

@@ -1,12 +1,25 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/contents_text.h"
 
+#include "config/param_catalogue.h"
+#include "identity/inf_file.h"
 #include "kit/non_zero_runs.h"
+#include "kit/unit.h"
+#include "tuning/dps_block.h"
+#include "unit/explanation.h"
+#include "unit/reasons.h"
 #include "unit/terminal.h"
+#include "unit/value_origins.h"
+#include "unit/version_choice.h"
 
+#include <array>
+#include <cstddef>
+#include <cstdint>
 #include <iomanip>
-#include <ostream>
+#include <map>
+#include <optional>
 #include <sstream>
+#include <vector>
 
 namespace orvane::unit {
 

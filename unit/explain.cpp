@@ -5,6 +5,8 @@
 #include "unit/explain_files.h"
 #include "unit/planned_files.h"
 
+#include <vector>
+
 namespace orvane::unit {
 
 Explanation explain(const std::string& letters) {

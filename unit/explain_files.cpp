@@ -4,14 +4,23 @@
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
 #include "tuning/audio_profile.h"
+#include "tuning/dps_block.h"
 #include "tuning/tuning_file.h"
 #include "unit/planned_merge.h"
+#include "unit/reasons.h"
 #include "unit/value_origins.h"
 #include "unit/version_choice.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
+#include "writers/template_merge.h"
 
+#include <array>
+#include <cstddef>
+#include <cstdint>
 #include <sstream>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace orvane::unit {
 

@@ -5,7 +5,6 @@
 
 #include "unit/reasons.h"
 
-#include <optional>
 #include <string>
 #include <vector>
 

@@ -1,11 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/explanation_text.h"
 
+#include "unit/reasons.h"
 #include "unit/terminal.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <iterator>
 #include <ostream>
 #include <set>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace orvane::unit {
 

@@ -4,7 +4,6 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "config/param_catalogue.h"
-#include "config/record_area.h"
 #include "config/record_slots.h"
 #include "kit/descriptor.h"
 #include "kit/inspect_inputs.h"
@@ -14,15 +13,20 @@
 #include "tuning/dps_block.h"
 #include "unit/contents.h"
 #include "unit/explain.h"
+#include "unit/explanation.h"
 #include "unit/moves.h"
 #include "unit/scratch_folder.h"
+#include "unit/text_diff.h"
 
 #include <fcntl.h>
-#include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <functional>
+#include <system_error>
+#include <utility>
 
 namespace orvane::unit {
 

@@ -1,12 +1,27 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/json.h"
 
+#include "config/param_catalogue.h"
+#include "identity/inf_file.h"
 #include "kit/utf8.h"
+#include "tuning/dps_block.h"
 #include "unit/contents_text.h"
+#include "unit/reasons.h"
+#include "unit/text_diff.h"
+#include "unit/unit_values.h"
+#include "unit/value_origins.h"
+#include "unit/version_choice.h"
 
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <set>
+#include <utility>
 
 namespace orvane::unit {
 

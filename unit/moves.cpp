@@ -2,6 +2,10 @@
 #include "unit/moves.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <memory>
+#include <optional>
+#include <utility>
 
 namespace orvane::unit {
 

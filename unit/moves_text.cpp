@@ -1,11 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/moves_text.h"
 
+#include "unit/explanation.h"
 #include "unit/terminal.h"
+#include "unit/text_diff.h"
+#include "unit/unit_values.h"
 
-#include <algorithm>
 #include <map>
 #include <ostream>
+#include <set>
+#include <string>
+#include <utility>
 
 namespace orvane::unit {
 

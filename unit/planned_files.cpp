@@ -7,6 +7,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <utility>
+
 namespace orvane::unit {
 
 bool PlannedFiles::openForWriting(const std::string& path) {

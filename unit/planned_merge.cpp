@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/planned_merge.h"
 
+#include <algorithm>
+#include <cstddef>
 #include <utility>
 
 namespace orvane::unit {

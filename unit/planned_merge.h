@@ -5,6 +5,7 @@
 
 #include "unit/explanation.h"
 #include "unit/planned_files.h"
+#include "unit/reasons.h"
 #include "unit/value_origins.h"
 #include "writers/template_merge.h"
 

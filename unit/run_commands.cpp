@@ -7,15 +7,23 @@
 #include "unit/case_check.h"
 #include "unit/commands.h"
 #include "unit/json.h"
+#include "unit/reasons.h"
 #include "unit/terminal.h"
 #include "unit/text_diff.h"
 #include "unit/tmp_tree.h"
 
 #include <algorithm>
 #include <cstdlib>
+#include <filesystem>
 #include <iomanip>
 #include <iostream>
+#include <map>
+#include <optional>
 #include <sstream>
+#include <string>
+#include <system_error>
+#include <utility>
+#include <vector>
 
 namespace orvane::unit {
 

@@ -4,6 +4,8 @@
 #include "kit/kit_error.h"
 
 #include <cstdlib>
+#include <string>
+#include <system_error>
 
 namespace orvane::unit {
 

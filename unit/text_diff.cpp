@@ -6,7 +6,9 @@
 #include <dtl/dtl.hpp>
 
 #include <algorithm>
+#include <memory>
 #include <ostream>
+#include <type_traits>
 
 namespace orvane::unit {
 

@@ -4,6 +4,8 @@
 #include "kit/root.h"
 #include "unit/whole_file.h"
 
+#include <system_error>
+
 namespace orvane::unit {
 
 namespace fs = std::filesystem;

@@ -5,14 +5,22 @@
 #include "config/config_store.h"
 #include "config/crc32.h"
 #include "config/param_catalogue.h"
+#include "config/record_slots.h"
 #include "kit/inspect.h"
+#include "tuning/dps_block.h"
 #include "unit/contents.h"
 #include "unit/terminal.h"
 #include "unit/value_origins.h"
 
 #include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <optional>
 #include <sstream>
 #include <unordered_map>
+#include <variant>
 
 namespace orvane::unit {
 

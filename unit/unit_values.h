@@ -6,6 +6,7 @@
 
 #include "kit/unit.h"
 
+#include <algorithm>
 #include <string>
 #include <utility>
 #include <vector>

@@ -14,6 +14,7 @@
 #include <unistd.h>
 
 #include <array>
+#include <cstddef>
 
 namespace orvane::unit {
 

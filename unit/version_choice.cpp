@@ -2,15 +2,15 @@
 #include "unit/version_choice.h"
 
 #include "identity/software_version.h"
+#include "unit/reasons.h"
 
 #include <dirent.h>
 
 #include <algorithm>
-#include <array>
-#include <cctype>
 #include <cstdlib>
 #include <fstream>
 #include <memory>
+#include <utility>
 
 namespace orvane::unit {
 

@@ -75,7 +75,7 @@ std::int32_t ConfigStore::open() {
 
 void ConfigStore::close() {
     if (data != nullptr) {
-        munmap(const_cast<std::uint8_t*>(data), length);
+        munmap(const_cast<std::uint8_t*>(data), length); // NOLINT(*-const-cast): it writes nothing
         data = nullptr;
     }
     if (descriptor != -1) {

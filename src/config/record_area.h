@@ -5,8 +5,6 @@
 // that comes out short counts as success. All return 0 or -1; none tells causes apart.
 #pragma once
 
-#include "config/record_slots.h"
-
 #include <cstdint>
 
 namespace orvane {

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/inf_file.h"
 
+#include <cstddef>
 #include <fstream>
+#include <utility>
 
 namespace orvane {
 

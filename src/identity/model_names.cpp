@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/model_names.h"
 
+#include <string>
 #include <string_view>
 
 namespace orvane {

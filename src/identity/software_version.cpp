@@ -25,7 +25,7 @@ constexpr char AFFIX_SEPARATOR = '_';
 
 /// The records of the last scan, in listing order. They live as long as the process; each scan
 /// empties them first.
-std::vector<Inf_Data> InfRecords;
+std::vector<Inf_Data> InfRecords; // NOLINT(*-non-const-global-variables)
 
 struct CloseFolder {
     void operator()(DIR* folder) const { closedir(folder); }

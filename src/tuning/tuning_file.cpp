@@ -7,8 +7,8 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <cstddef>
 #include <fstream>
-#include <ostream>
 #include <string_view>
 
 namespace orvane {
@@ -75,7 +75,7 @@ void generateTuningFile(std::int32_t blockId, const std::string& path) {
 
     // Longer than any line. Opening the file needs no memory then.
     constexpr std::streamsize BUFFER_SIZE = 512; // bytes
-    std::array<char, BUFFER_SIZE> buffer;
+    std::array<char, BUFFER_SIZE> buffer;        // NOLINT(*-member-init): a stream writes it first
     std::ofstream file;
     file.rdbuf()->pubsetbuf(buffer.data(), BUFFER_SIZE);
     file.open(path);

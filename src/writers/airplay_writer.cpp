@@ -3,7 +3,7 @@
 
 #include "identity/vehicle_identity.h"
 
-#include <ostream>
+#include <fstream>
 
 namespace orvane {
 

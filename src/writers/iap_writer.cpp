@@ -5,7 +5,6 @@
 #include "identity/vehicle_identity.h"
 
 #include <fstream>
-#include <ostream>
 
 namespace orvane {
 

@@ -64,13 +64,11 @@ std::uint32_t lengthOf(const Bytes& bytes) {
 /// comes out short.
 class EdgeOfMemory {
 public:
-    explicit EdgeOfMemory(std::size_t usable) : usable_(usable) {
-        pageSize_ = static_cast<std::size_t>(sysconf(_SC_PAGESIZE));
-        pages_ = mmap(nullptr, 2 * pageSize_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS,
-                      -1, 0);
-        isMade_ = pages_ != MAP_FAILED && usable <= pageSize_ &&
-                  mprotect(begin() + usable, pageSize_, PROT_NONE) == 0;
-    }
+    explicit EdgeOfMemory(std::size_t usable)
+        : usable_(usable), pages_(mmap(nullptr, 2 * pageSize_, PROT_READ | PROT_WRITE,
+                                       MAP_PRIVATE | MAP_ANONYMOUS, -1, 0)),
+          isMade_(pages_ != MAP_FAILED && usable <= pageSize_ &&
+                  mprotect(begin() + usable, pageSize_, PROT_NONE) == 0) {}
     ~EdgeOfMemory() { munmap(pages_, 2 * pageSize_); }
     EdgeOfMemory(const EdgeOfMemory&) = delete;
     EdgeOfMemory& operator=(const EdgeOfMemory&) = delete;
@@ -80,7 +78,7 @@ public:
 
 private:
     std::size_t usable_;
-    std::size_t pageSize_ = 0;
+    std::size_t pageSize_ = static_cast<std::size_t>(sysconf(_SC_PAGESIZE));
     void* pages_ = nullptr;
     bool isMade_ = false;
 };

@@ -120,8 +120,8 @@ protected:
         writeFile("/fs/mp/etc/iap2_device_static.cfg", "device template\n");
         writeFile("/fs/mp/etc/mm/iap2_static.cfg", "iap2 template\n");
         writeFile("/fs/mp/etc/mm/iap1_static.cfg", "iap1 template\n");
-        for (const char* stock : {"iap2_device.cfg", "mm/iap2.cfg", "mm/iap1.cfg"}) {
-            writeFile(std::string("/fs/mp/etc/") + stock, "stock\n");
+        for (const char* name : {"iap2_device.cfg", "mm/iap2.cfg", "mm/iap1.cfg"}) {
+            writeFile(std::string("/fs/mp/etc/") + name, "stock\n");
         }
         writeFile("/fs/rwdata/.Version/app.inf", "Type=Application\nVersion Number=1.2.3\n");
     }

@@ -11,8 +11,10 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <chrono>
 #include <filesystem>
 #include <string>
+#include <thread>
 #include <vector>
 
 namespace orvane::test {
@@ -165,7 +167,7 @@ TEST_F(HostContentTest, DescriptionItselfMayComeThroughAPipeAndLate) {
     ASSERT_EQ(::pipe(ends), 0);
     const pid_t writer = ::fork();
     if (writer == 0) {
-        ::usleep(50'000);
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
         ::_exit(::write(ends[1], text.data(), text.size()) == -1 ? 1 : 0);
     }
     ::close(ends[1]);

@@ -148,7 +148,7 @@ TEST(DescriptionText, EveryDifferenceMakesUnitsUnequal) {
         [](kit::UnitDescription& unit) { unit.folders.pop_back(); },
         [](kit::UnitDescription& unit) { unit.absent.pop_back(); },
     };
-    for (const Change change : changes) {
+    for (const Change& change : changes) {
         kit::UnitDescription changed = wholeUnit();
         change(changed);
         EXPECT_FALSE(changed == wholeUnit()) << &change - changes;

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/capture.h"
+#include "kit/kit_error.h"
 #include "kit/root.h"
 #include "tests/kit/open_descriptors.h"
 #include "tests/support/permissions.h"

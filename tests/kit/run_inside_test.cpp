@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/kit_error.h"
 #include "kit/root.h"
 #include "tests/kit/open_descriptors.h"
 #include "tests/support/temporary_folder.h"

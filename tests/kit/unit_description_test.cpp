@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/kit_error.h"
 #include "kit/unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

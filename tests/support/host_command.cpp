@@ -2,6 +2,7 @@
 #include "tests/support/host_command.h"
 
 #include "kit/capture.h"
+#include "kit/kit_error.h"
 
 #include <unistd.h>
 

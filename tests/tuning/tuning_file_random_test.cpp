@@ -78,11 +78,11 @@ private:
         return value < 32768 ? value : value - 65536;
     }
     std::string wides(std::size_t first, std::size_t end) const {
-        std::string text;
+        std::string list;
         for (std::size_t offset = first; offset < end; offset += 2) {
-            text += std::to_string(wide(offset)) + " ";
+            list += std::to_string(wide(offset)) + " ";
         }
-        return text;
+        return list;
     }
 
     void line(const char* key, const std::string& value) { out_ += key + (" " + value) + "\n"; }

@@ -12,11 +12,13 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <chrono>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <set>
 #include <string>
+#include <thread>
 
 namespace orvane::test {
 
@@ -133,7 +135,7 @@ TEST_F(AirplayWriterTest, HeadIsFlushedBeforeTheTemplateIsRead) {
         const int fifo = open(AIRPLAY_TEMPLATE, O_RDWR);
         std::string seen;
         for (int tries = 0; tries < 500 && seen.size() < head.size(); ++tries) {
-            usleep(10000);
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
             std::ifstream output(AIRPLAY_OUTPUT, std::ios::binary);
             seen.assign(std::istreambuf_iterator<char>(output), {});
         }
