@@ -1,0 +1,110 @@
+# SPDX-License-Identifier: Apache-2.0
+"""One figure of one command in a unit: run in turn with others, or watched by a tool."""
+
+from __future__ import annotations
+
+import os
+import re
+import shutil
+import statistics
+import subprocess
+import tempfile
+from collections.abc import Sequence
+from dataclasses import dataclass
+from pathlib import Path
+
+from place import TOOLS, call
+
+ENVIRONMENT = {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin"}
+# Where Debian keeps valgrind's programs, and where other systems do.
+VALGRIND_FOLDERS = ("/usr/libexec/valgrind", "/usr/lib/x86_64-linux-gnu/valgrind")
+
+
+@dataclass(frozen=True)
+class Timing:
+    """Of all counted runs of one command."""
+
+    wall: tuple[int, ...]  # nanoseconds
+    faults: int  # median
+
+    @property
+    def median(self) -> float:
+        return statistics.median(self.wall)
+
+    def ratio(self, other: Timing) -> float:
+        """Median of the ratios run by run: what slows the machine down slows both runs."""
+        return statistics.median(a / b for a, b in zip(self.wall, other.wall))
+
+
+def as_root() -> list[str]:
+    """The change of the root directory takes the privilege for it, or a user namespace."""
+    return [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
+
+
+def interleave(root: Path, commands: Sequence[str], runs: int, warm_up: int = 5) -> list[Timing]:
+    """Times the commands in turn. A command that fails ends the benchmark."""
+    lines = call(*as_root(), TOOLS / "interleave", root, str(runs), str(warm_up), *commands,
+                 env=ENVIRONMENT).splitlines()
+    wall: list[list[int]] = [[] for _ in commands]
+    faults: list[list[int]] = [[] for _ in commands]
+    for line in lines:
+        index, time, fault, status = map(int, line.split())
+        if status != 0:
+            raise SystemExit(f"bench: {commands[index]}: exit status {status}")
+        wall[index].append(time)
+        faults[index].append(fault)
+    return [Timing(tuple(times), int(statistics.median(counts)))
+            for times, counts in zip(wall, faults)]
+
+
+def peak(root: Path, command: str) -> int:
+    """The most memory that a process of the command had resident, in KiB."""
+    return int(call(*as_root(), TOOLS / "peak", root, *command.split()))
+
+
+def system_calls(root: Path, command: str) -> int:
+    """All calls of all processes of the command, from its start on."""
+    with tempfile.NamedTemporaryFile("r") as log:
+        call("strace", "-f", "-o", log.name, *as_root(), "chroot", root, *command.split(),
+             env=ENVIRONMENT)
+        lines = log.read().splitlines()
+    program = command.split()[0]
+    start = next(number for number, line in enumerate(lines) if f'execve("{program}"' in line)
+    return sum(1 for line in lines[start:]
+               if re.match(r"\d+ +\w+\(", line) is not None)
+
+
+def instructions(root: Path, command: str) -> int:
+    """What callgrind counts. It runs inside the unit, so its program has to lie there."""
+    folder = next(Path(name) for name in VALGRIND_FOLDERS if Path(name).is_dir())
+    inside = root / "valgrind"
+    inside.mkdir(exist_ok=True)
+    for name in ("callgrind-amd64-linux", "default.supp"):
+        shutil.copy(folder / name, inside / name)
+    (root / "proc").mkdir(exist_ok=True)
+    script = ('mount --rbind /proc "$0/proc" && chroot=$(command -v chroot) && '
+              'exec env -i PATH=/bin VALGRIND_LIB=/valgrind '
+              'VALGRIND_LAUNCHER=/valgrind/callgrind-amd64-linux "$chroot" "$0" '
+              '/valgrind/callgrind-amd64-linux --tool=callgrind --callgrind-out-file=/valgrind/out "$@"')
+    log = subprocess.run([*(as_root() or ["unshare"]), "--mount", "sh", "-c", script, root,
+                          *command.split()], check=True, text=True, stderr=subprocess.PIPE,
+                         env=ENVIRONMENT).stderr
+    found = re.search(r"Collected : (\d+)", log)
+    if found is None:
+        raise SystemExit(f"bench: callgrind counted nothing:\n{log}")
+    return int(found[1])
+
+
+def emulated(root: Path, command: str) -> tuple[int, int]:
+    """Instructions and system calls of an ARM program: the emulator runs one at a time, and logs
+    each."""
+    log = root / "log"
+    chroot = [*as_root(), "env", "-i", "PATH=/bin", shutil.which("chroot") or "chroot", root,
+              "/bin/emulator"]
+    call(*chroot, "-singlestep", "-d", "nochain,exec", "-D", "/log", *command.split())
+    with log.open(encoding="ascii", errors="replace") as lines:
+        counted = sum(1 for line in lines if line.startswith("Trace"))
+    log.unlink()
+    calls = subprocess.run([*chroot, "-strace", *command.split()], check=True, text=True,
+                           stderr=subprocess.PIPE).stderr
+    return counted, len(calls.splitlines())
