@@ -25,7 +25,7 @@ void readInfFile(const std::string& path, Inf_Data& record);
 std::string infValue(const Inf_Data& record, const std::string& key);
 
 /// The part of `text` without leading and trailing spaces (0x20 only: tabs and carriage returns
-/// stay).
+/// stay). It looks at the caller's bytes and lives as long as they do.
 std::string_view trimSpaces(std::string_view text);
 
 } // namespace orvane

@@ -29,10 +29,10 @@ constexpr std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
     {"qwaWNDBSwitch",           5, 0, DpsEncoding::u8,    DpsKind::switchWord, 1}, // the whole byte is the code
     {"qwaAECFiltLen",           6, 0, DpsEncoding::i16,   DpsKind::number,     1},
     {"qwaLFRSwitch",            8, 0, DpsEncoding::i16,   DpsKind::switchWord, 1}, // a signed 16-bit code
-    {"qwaHFEExtent",           10, 0, DpsEncoding::u8,    DpsKind::number,     1}, // bytes 11-12 unread
+    {"qwaHFEExtent",           10, 0, DpsEncoding::u8,    DpsKind::number,     1}, // one unsigned byte among the 16-bit numbers; bytes 11-12 unread
     {"qwaNCParams",            13, 0, DpsEncoding::i16,   DpsKind::list,       5},
     {"qwaNRAtten",             23, 0, DpsEncoding::i16,   DpsKind::number,     1},
-    {"qwaRECSuppress",         25, 0, DpsEncoding::u8,    DpsKind::number,     1},
+    {"qwaRECSuppress",         25, 0, DpsEncoding::u8,    DpsKind::number,     1}, // one unsigned byte, too
     {"qwaRecvAGCAmpTgts",      26, 0, DpsEncoding::i16,   DpsKind::list,       2}, // receive: AmpTgts, GainVals, MaxRates
     {"qwaRecvAGCGainVals",     30, 0, DpsEncoding::i16,   DpsKind::list,       3},
     {"qwaRecvAGCMaxRates",     36, 0, DpsEncoding::i16,   DpsKind::list,       2},
@@ -49,7 +49,7 @@ constexpr std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
     {"qwaSendLimitThresh",    104, 0, DpsEncoding::i16,   DpsKind::number,     1},
     {"qwaSendParamEQ2Nodes",  106, 0, DpsEncoding::i16,   DpsKind::list,      15}, // the second equaliser comes first
     {"qwaSendParamEQNodes",   136, 0, DpsEncoding::i16,   DpsKind::list,      15},
-    {"qwaWNDBSuppress",       166, 0, DpsEncoding::u8,    DpsKind::number,     1},
+    {"qwaWNDBSuppress",       166, 0, DpsEncoding::u8,    DpsKind::number,     1}, // one unsigned byte, too
     {"qwaDNSEnable",          167, 0, DpsEncoding::i16,   DpsKind::number,     1}, // a number, despite its name
     {"qwaIVOSwitch",          169, 0, DpsEncoding::i16,   DpsKind::switchWord, 1}, // a signed 16-bit code
     {"qwaMEQEnable",          171, 0, DpsEncoding::i16,   DpsKind::list,       4}, // a list, despite its name; bytes 179-187 unread
@@ -98,18 +98,41 @@ constexpr std::size_t countKind(DpsKind kind) {
     return count;
 }
 
-constexpr bool maximaAreReached() {
-    std::size_t longestKey = 0;
-    std::size_t longestList = 0;
-    for (const DpsField& field : DPS_LAYOUT) {
-        longestKey = std::max(longestKey, std::string_view(field.key).size());
-        longestList = std::max<std::size_t>(longestList, field.count);
+constexpr std::size_t longestWord(const std::array<QwaWord, 3>& words) {
+    std::size_t longest = 0;
+    for (const QwaWord& entry : words) {
+        longest = std::max(longest, std::string_view(entry.word).size());
     }
-    return longestKey == DPS_KEY_MAX && longestList == DPS_COUNT_MAX;
+    return longest;
+}
+
+constexpr std::size_t longestValue(const DpsField& field) {
+    constexpr std::size_t NUMBER = std::string_view("-32768").size();
+    switch (field.kind) {
+    case DpsKind::switchWord:
+        return longestWord(qwaSwitchWords);
+    case DpsKind::modeWord:
+        return longestWord(qwaModeWords);
+    case DpsKind::list:
+        return field.count * (NUMBER + 1);
+    case DpsKind::number:
+        break;
+    }
+    return NUMBER;
+}
+
+/// Key, blank, value, line end.
+constexpr std::size_t longestLine() {
+    std::size_t longest = 0;
+    for (const DpsField& field : DPS_LAYOUT) {
+        longest =
+            std::max(longest, std::string_view(field.key).size() + 1 + longestValue(field) + 1);
+    }
+    return longest;
 }
 
 static_assert(fieldsAscendWithoutOverlap());
-static_assert(maximaAreReached());
+static_assert(longestLine() == DPS_LINE_MAX);
 static_assert(countKind(DpsKind::switchWord) == 16 + 3 && countKind(DpsKind::modeWord) == 1);
 static_assert(countKind(DpsKind::number) == 12 && countKind(DpsKind::list) == 12);
 

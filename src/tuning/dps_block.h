@@ -61,9 +61,8 @@ constexpr std::size_t dpsElementSize(DpsEncoding encoding) {
 }
 
 constexpr std::size_t DPS_FIELD_COUNT = 44;
-/// Characters of the longest key, elements of the longest list.
-constexpr std::size_t DPS_KEY_MAX = 21;
-constexpr std::size_t DPS_COUNT_MAX = 15;
+/// Characters of the longest line that a field can become in a tuning file, with its line end.
+constexpr std::size_t DPS_LINE_MAX = 127;
 
 /// All fields of a block, in ascending order of their places.
 extern const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT;

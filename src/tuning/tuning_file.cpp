@@ -15,39 +15,38 @@ namespace orvane {
 
 namespace {
 
-/// Characters of the longest value, which has 16 bits and a sign.
-constexpr std::size_t NUMBER_SIZE = 6;
-/// Characters of the longest line: key, blank, every value with a blank behind it, line end.
-constexpr std::size_t LINE_SIZE = DPS_KEY_MAX + 1 + DPS_COUNT_MAX * (NUMBER_SIZE + 1) + 1;
-using Line = std::array<char, LINE_SIZE>;
+/// A line is built before it is written: the stream would look up its locale's digits for every
+/// number. What is behind its room would be cut off; no line is longer.
+struct Line {
+    std::array<char, DPS_LINE_MAX> text;
+    std::size_t length;
+};
 
-// A line is built before it is written: the stream would look up its locale's digits for every
-// number. Each function returns the new end of the line.
-
-char* appendText(char* end, std::string_view text) {
-    return std::copy(text.begin(), text.end(), end);
+void append(Line& line, std::string_view text) {
+    line.length += text.copy(line.text.data() + line.length, line.text.size() - line.length);
 }
 
-char* appendNumber(char* end, std::int32_t number) {
-    return std::to_chars(end, end + NUMBER_SIZE, number).ptr;
+void append(Line& line, std::int32_t number) {
+    char* const begin = line.text.data();
+    const auto written = std::to_chars(begin + line.length, begin + line.text.size(), number);
+    line.length = static_cast<std::size_t>(written.ptr - begin);
 }
 
-char* appendValue(char* end, const DpsBlock& block, const DpsField& field) {
-    const std::int32_t first = decodeField(block, field, 0);
-    if (field.kind == DpsKind::switchWord) {
-        return appendText(end, qwaWord(qwaSwitchWords, first));
+void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {
+    if (field.kind == DpsKind::list) {
+        for (std::size_t element = 0; element < field.count; ++element) {
+            append(line, decodeField(block, field, element));
+            append(line, " "); // behind the last one, too
+        }
+        return;
     }
-    if (field.kind == DpsKind::modeWord) {
-        return appendText(end, qwaWord(qwaModeWords, first));
-    }
+    const std::int32_t value = decodeField(block, field, 0);
     if (field.kind == DpsKind::number) {
-        return appendNumber(end, first);
+        append(line, value);
+    } else {
+        const bool isMode = field.kind == DpsKind::modeWord;
+        append(line, qwaWord(isMode ? qwaModeWords : qwaSwitchWords, value));
     }
-    for (std::size_t element = 0; element < field.count; ++element) {
-        end = appendNumber(end, decodeField(block, field, element));
-        *end++ = ' '; // behind the last one, too
-    }
-    return end;
 }
 
 } // namespace
@@ -55,13 +54,13 @@ char* appendValue(char* end, const DpsBlock& block, const DpsField& field) {
 void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block) {
     // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
     file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
-    Line line{};
     for (const DpsField& field : DPS_LAYOUT) {
-        char* end = appendText(line.data(), field.key);
-        *end++ = ' ';
-        end = appendValue(end, block, field);
-        *end++ = '\n';
-        file.write(line.data(), end - line.data()).flush();
+        Line line{};
+        append(line, field.key);
+        append(line, " ");
+        appendValue(line, block, field);
+        append(line, "\n");
+        file.write(line.text.data(), static_cast<std::streamsize>(line.length)).flush();
     }
 }
 

@@ -18,7 +18,7 @@ struct AccessoryFile {
 };
 
 /// Every output brings its buffer, so that opening one needs no memory. It is small, so that a run
-/// touches few pages: a head fits in, and a template passes it by.
+/// touches few pages: a head fits in, and a large template passes it by.
 constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
 using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 
