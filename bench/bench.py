@@ -27,10 +27,11 @@ DOCUMENT = PROJECT / "docs/performance.md"
 SCRIPT = "/bin/sh /bin/accessory.sh -a -i"
 STATIC = "/bin/static -a -i"
 DYNAMIC = "/bin/dynamic -a -i"
-FLOOR = "/bin/floor"
+FLOOR = "/bin/floor -a -i"
 NAMES = {FLOOR: "floor, static C", STATIC: "orvane, static", DYNAMIC: "orvane, dynamic",
          SCRIPT: "shell script"}
 NONE = "–"
+PARTS = {"run", "growth", "variants"}
 
 
 @contextlib.contextmanager
@@ -91,25 +92,27 @@ def whole_process(root: Path, runs: int) -> Table:
     return table
 
 
-def machine() -> str:
+def machine(runs: int) -> str:
     model = next((line.split(":")[1].strip() for line in
                   Path("/proc/cpuinfo").read_text().splitlines() if line.startswith("model name")),
                  platform.machine())
     compiler = call("g++", "--version").splitlines()[0]
     return (f"{model}, {os.cpu_count()} processors, Linux {platform.release().split('-')[0]}, "
-            f"{compiler}, files in memory.")
+            f"{compiler}, files in memory; {runs} counted runs of each whole run.")
 
 
 def main() -> int:
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("parts", nargs="*", default=["run", "growth", "variants"],
+    parser.add_argument("parts", nargs="*", default=sorted(PARTS),
                         help="run, growth, variants; all when none is named")
     parser.add_argument("--runs", type=int, default=500, help="counted runs of each command")
     parser.add_argument("--write", action="store_true", help="put the tables into the document")
     arguments = parser.parse_args()
-    unknown = set(arguments.parts) - {"run", "growth", "variants"}
+    unknown = set(arguments.parts) - PARTS
     if unknown:
         parser.error(f"no such part: {', '.join(sorted(unknown))}")
+    if arguments.write and set(arguments.parts) != PARTS:
+        parser.error("the document's tables are all of one run: --write takes no parts")
 
     programs = build()
     with memory_folder() as folder:
@@ -128,9 +131,9 @@ def main() -> int:
         print(f"\n{table.text()}", flush=True)
         if arguments.write:
             put_into(DOCUMENT, name, table.text())
-    print(f"\n{machine()}")
+    print(f"\n{machine(arguments.runs)}")
     if arguments.write:
-        put_into(DOCUMENT, "machine", machine())
+        put_into(DOCUMENT, "machine", machine(arguments.runs))
     return 0
 
 

@@ -66,7 +66,7 @@ def version_files(root: Path) -> Table:
                 f"Name = package {number}\nType = Maps\nVersion Number = P_{number}.2.3\n")
         (folder / "application.inf").write_text(
             "Name = head unit application\nType = Application\nVersion Number = A_3.10.2\n")
-        tool, floor = interleave(root, ("/bin/static -i", "/bin/floor"), 31)
+        tool, floor = interleave(root, ("/bin/static -i", "/bin/floor -i"), 31)
         time = tool.median
         further = "" if before is None else time_text((time - before[1]) / (count - before[0]))
         table.add(f"{count:,}", time_text(time), time_text(floor.median),

@@ -5,6 +5,7 @@
 // status. Each round has an order of its own: what a run leaves in the caches serves or harms all.
 // A COMMAND is words with single blanks between them; "> FILE" at its end takes its output. Small
 // and static, so that to start a child costs the same little for every command.
+#include <errno.h>
 #include <fcntl.h>
 #include <spawn.h>
 #include <stdio.h>
@@ -63,7 +64,8 @@ static pid_t start(const struct command* command) {
                                          O_WRONLY | O_CREAT | O_TRUNC, 0666);
     }
     pid_t child = -1;
-    if (posix_spawn(&child, command->words[0], &actions, NULL, command->words, ENVIRONMENT) != 0) {
+    errno = posix_spawn(&child, command->words[0], &actions, NULL, command->words, ENVIRONMENT);
+    if (errno != 0) {
         fail(command->words[0]);
     }
     posix_spawn_file_actions_destroy(&actions);

@@ -63,14 +63,14 @@ def peak(root: Path, command: str) -> int:
 
 
 def system_calls(root: Path, command: str) -> int:
-    """All calls of all processes of the command, from its start on."""
+    """All calls of all processes of the command, from its start on, which is not counted."""
     with tempfile.NamedTemporaryFile("r") as log:
         call("strace", "-f", "-o", log.name, *as_root(), "chroot", root, *command.split(),
              env=ENVIRONMENT)
         lines = log.read().splitlines()
     program = command.split()[0]
     start = next(number for number, line in enumerate(lines) if f'execve("{program}"' in line)
-    return sum(1 for line in lines[start:]
+    return sum(1 for line in lines[start + 1:]
                if re.match(r"\d+ +\w+\(", line) is not None)
 
 
