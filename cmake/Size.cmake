@@ -7,12 +7,15 @@ if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   target_link_options(orvane_size INTERFACE LINKER:--gc-sections)
 endif()
 
-# Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC,
-# whose objects keep their machine code beside what the link reads, for other programs and for tests.
-if(CMAKE_CXX_COMPILER_ID STREQUAL GNU AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
+# Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC
+# (as the unit's SDK has it, also when CMake calls it QCC), whose objects keep their machine code
+# beside what the link reads, for other programs and for tests.
+if(CMAKE_CXX_COMPILER_ID MATCHES "GNU|QCC" AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   include(CheckIPOSupported)
   check_ipo_supported(RESULT ORVANE_LINK_TIME_OPTIMISATION OUTPUT ignored LANGUAGES CXX)
-  target_compile_options(orvane_size INTERFACE -ffat-lto-objects)
+  if(ORVANE_LINK_TIME_OPTIMISATION)
+    target_compile_options(orvane_size INTERFACE -ffat-lto-objects)
+  endif()
 endif()
 
 function(orvane_optimise_at_link)

@@ -1,8 +1,9 @@
 # SPDX-License-Identifier: Apache-2.0
 """Reads out of ELF files whether they were hardened.
 
-A static program has the C library's own canaries and checked copies in it, so those of our code are
-looked for in its objects; headers speak for the rest.
+Headers speak for most. Canaries show in what a dynamic program asks the C library for. A static one has
+the C library's own in it, and a checked call is left only where the compiler can't prove a size, so
+what the code was compiled with is read out of the objects.
 """
 
 from __future__ import annotations
@@ -50,6 +51,11 @@ def _undefined_names(file: Path) -> set[str]:
         return {symbol.name for section in ELFFile(stream).iter_sections()
                 if isinstance(section, SymbolTableSection)
                 for symbol in section.iter_symbols() if symbol.entry.st_shndx == "SHN_UNDEF"}
+
+
+def missing_in_dynamic(program: Path) -> set[str]:
+    """Of a program that is linked with the C library as it runs."""
+    return set() if "__stack_chk_fail" in _undefined_names(program) else {STACK_PROTECTOR}
 
 
 def missing_in_objects(objects: Iterable[Path]) -> set[str]:

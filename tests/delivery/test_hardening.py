@@ -26,7 +26,7 @@ LINKED = ("-Wl,-z,relro", "-Wl,-z,now", "-Wl,-z,noexecstack")
 
 def paths(name: str) -> list[Path]:
     found = [Path(word) for word in os.environ[name].split(":")]
-    assert found, name
+    assert all(path.is_file() for path in found), (name, found)
     return found
 
 
@@ -35,6 +35,10 @@ class ShippedTest(unittest.TestCase):
         for program in paths("ORVANE_PROGRAMS"):
             with self.subTest(program=program.name):
                 self.assertEqual(hardening.missing_in_program(program), set())
+
+    def test_the_product_guards_its_stack(self) -> None:
+        for program in paths("ORVANE_DYNAMIC"):
+            self.assertEqual(hardening.missing_in_dynamic(program), set())
 
     def test_the_objects_of_the_product_are(self) -> None:
         self.assertEqual(hardening.missing_in_objects(paths("ORVANE_OBJECTS")), set())
@@ -75,6 +79,13 @@ class ReaderTest(unittest.TestCase):
     def test_a_static_program_binds_nothing_late(self) -> None:
         self.assertEqual(hardening.missing_in_program(self.build(COMPILED, (*LINKED, "-static"))[1]),
                          set())
+
+    def test_a_program_without_canaries(self) -> None:
+        for option, missing in (("-fstack-protector-strong", set()),
+                                ("-fno-stack-protector", {hardening.STACK_PROTECTOR})):
+            with self.subTest(option=option):
+                compiled = (option, *COMPILED[:1])
+                self.assertEqual(hardening.missing_in_dynamic(self.build(compiled, LINKED)[1]), missing)
 
     def test_each_protection_of_an_object(self) -> None:
         for option, instead, missing in (

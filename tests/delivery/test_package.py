@@ -15,7 +15,9 @@ from pathlib import Path
 PROJECT = Path(__file__).resolve().parents[2]
 VERSION = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())[1]
 DOCUMENTS = {f"docs/{path.name}" for path in (PROJECT / "docs").iterdir()}
-MAGIC_GZIP_MTIME = slice(4, 8)
+GZIP_TIME = slice(4, 8)  # of the bytes of a gzip header
+# Changing the root and the owner of files takes the privilege for it, or a user namespace.
+AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
 IN_TARBALL = {"bin/orvane", "bin/orvane-unit", "share/doc/orvane/copyright"}
 IN_PACKAGE = {f"usr/{name}" for name in IN_TARBALL | {
@@ -34,8 +36,7 @@ def call(*words: str | Path) -> str:
 
 def inside(root: Path, *words: str) -> str:
     """Runs an installed program in the root where it was installed."""
-    enter = ["chroot"] if os.geteuid() == 0 else ["unshare", "--map-root-user", "chroot"]
-    return call(*enter, root, *words)
+    return call(*AS_ROOT, "chroot", root, *words)
 
 
 def files(root: Path) -> set[str]:
@@ -44,11 +45,11 @@ def files(root: Path) -> set[str]:
     return names - {"dev/null"}
 
 
-def pack(folder: Path, generator: str) -> Path:
+def pack(folder: Path, generator: str, mask: int = 0o022) -> Path:
     environment = {**os.environ, "SOURCE_DATE_EPOCH": "1000000000"}
     folder.mkdir()
     subprocess.run(["cpack", "-G", generator, "-B", folder], cwd=os.environ["ORVANE_BUILD"],
-                   env=environment, check=True, stdout=subprocess.DEVNULL)
+                   env=environment, check=True, stdout=subprocess.DEVNULL, umask=mask)
     found = [path for path in folder.iterdir() if path.is_file()]
     assert len(found) == 1, found
     return found[0]
@@ -97,7 +98,7 @@ class PackageTest(unittest.TestCase):
         (database / "updates").mkdir(parents=True)
         (database / "info").mkdir()
         (database / "status").touch()
-        dpkg = ["dpkg", f"--root={root}", "--force-not-root", "--force-script-chrootless",
+        dpkg = [*AS_ROOT, "dpkg", f"--root={root}", "--force-not-root", "--force-script-chrootless",
                 "--log=/dev/null"]
         call(*dpkg, "--install", self.package)
         installed = {name for name in files(root) if not name.startswith("var/lib/dpkg")}
@@ -129,11 +130,19 @@ class PackageTest(unittest.TestCase):
                              ("share/doc/orvane/changelog.gz", "CHANGELOG.md")):
             packed = (root / "usr" / name).read_bytes()
             self.assertEqual(gzip.decompress(packed), (PROJECT / source).read_bytes())
-            self.assertEqual(packed[MAGIC_GZIP_MTIME], bytes(4), name)
+            self.assertEqual(packed[GZIP_TIME], bytes(4), name)
 
     def test_packed_again_it_has_the_same_bytes(self) -> None:
         self.assertEqual(pack(self.folder / "deb2", "DEB").read_bytes(), self.package.read_bytes())
         self.assertEqual(pack(self.folder / "tgz2", "TGZ").read_bytes(), self.tarball.read_bytes())
+
+    def test_the_mask_of_the_packer_does_not_matter(self) -> None:
+        tarball = pack(self.folder / "tgz77", "TGZ", 0o077)
+        self.assertEqual(tarball.read_bytes(), self.tarball.read_bytes())
+        # cpack gives a Debian package's two inner archives the mask, which nobody sees but a sum.
+        package = pack(self.folder / "deb77", "DEB", 0o077)
+        self.assertEqual(call("dpkg-deb", "--contents", package),
+                         call("dpkg-deb", "--contents", self.package))
 
     def test_cmake_installs_the_same_files(self) -> None:
         root = self.bare_root()
