@@ -51,8 +51,8 @@ def put_into(document: Path, name: str, text: str) -> None:
     """Puts the text between the two marks of this name."""
     mark = re.escape(MARK.format(name))
     old = document.read_text(encoding="utf-8")
-    new, count = re.subn(f"({mark}\n).*?(\n{mark})", lambda found: found[1] + text + found[2], old,
-                         flags=re.DOTALL)
+    new, count = re.subn(f"({mark}\n)(?:.*?\n)?({mark})",
+                         lambda found: f"{found[1]}{text}\n{found[2]}", old, flags=re.DOTALL)
     if count != 1:
         raise SystemExit(f"bench: {document.name} has no place for {name!r}")
     document.write_text(new, encoding="utf-8")

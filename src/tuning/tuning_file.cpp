@@ -16,14 +16,19 @@ namespace orvane {
 namespace {
 
 /// A line is built before it is written: the stream would look up its locale's digits for every
-/// number. What is behind its room would be cut off; no line is longer.
+/// number. No line is longer than its room, which the compiler has checked with the layout.
 struct Line {
     std::array<char, DPS_LINE_MAX> text;
     std::size_t length;
 };
 
 void append(Line& line, std::string_view text) {
-    line.length += text.copy(line.text.data() + line.length, line.text.size() - line.length);
+    std::copy(text.begin(), text.end(), line.text.data() + line.length);
+    line.length += text.size();
+}
+
+void append(Line& line, char character) {
+    line.text[line.length++] = character;
 }
 
 void append(Line& line, std::int32_t number) {
@@ -36,7 +41,7 @@ void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {
     if (field.kind == DpsKind::list) {
         for (std::size_t element = 0; element < field.count; ++element) {
             append(line, decodeField(block, field, element));
-            append(line, " "); // behind the last one, too
+            append(line, ' '); // behind the last one, too
         }
         return;
     }
@@ -54,12 +59,13 @@ void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {
 void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block) {
     // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
     file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
+    Line line{};
     for (const DpsField& field : DPS_LAYOUT) {
-        Line line{};
+        line.length = 0;
         append(line, field.key);
-        append(line, " ");
+        append(line, ' ');
         appendValue(line, block, field);
-        append(line, "\n");
+        append(line, '\n');
         file.write(line.text.data(), static_cast<std::streamsize>(line.length)).flush();
     }
 }
