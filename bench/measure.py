@@ -27,6 +27,9 @@ class Timing:
     wall: tuple[int, ...]  # nanoseconds
     faults: int  # median
 
+    def followed_by(self, other: Timing) -> Timing:
+        return Timing(self.wall + other.wall, max(self.faults, other.faults))
+
     @property
     def median(self) -> float:
         return statistics.median(self.wall)
@@ -41,9 +44,17 @@ def as_root() -> list[str]:
     return [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
 
-def interleave(root: Path, commands: Sequence[str], runs: int, warm_up: int = 5) -> list[Timing]:
+def with_own_tmp(root: Path) -> list[str | Path]:
+    """What is run behind these words sees a /tmp of its own, empty and in memory, in `root`."""
+    return [*(as_root() or ["unshare"]), "--mount", "sh", "-c",
+            'mount -t tmpfs tmpfs "$0/tmp" && exec "$@"', root]
+
+
+def interleave(root: Path, commands: Sequence[str], runs: int, warm_up: int = 5,
+               own_tmp: bool = False) -> list[Timing]:
     """Times the commands in turn. A command that fails ends the benchmark."""
-    lines = call(*as_root(), TOOLS / "interleave", root, str(runs), str(warm_up), *commands,
+    enter = with_own_tmp(root) if own_tmp else as_root()
+    lines = call(*enter, TOOLS / "interleave", root, str(runs), str(warm_up), *commands,
                  env=ENVIRONMENT).splitlines()
     wall: list[list[int]] = [[] for _ in commands]
     faults: list[list[int]] = [[] for _ in commands]

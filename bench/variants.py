@@ -30,10 +30,11 @@ class Variant:
 
 
 def buffers(output: int, template: int) -> Callable[[Path], None]:
-    """Other sizes of the two buffers; both must be found where they are changed."""
+    """Other sizes of the two buffers; both must be found where they are changed. A stream reads one
+    byte less than the template's holds."""
     def change(tree: Path) -> None:
         for path, name, size in (("writers/template_merge.h", "OUTPUT_BUFFER_SIZE", output),
-                                 ("writers/template_merge.cpp", "INPUT_BUFFER_SIZE", template)):
+                                 ("writers/template_merge.cpp", "INPUT_BUFFER_SIZE", template + 1)):
             text = (tree / path).read_text()
             text, count = re.subn(rf"({name} = )\d+", rf"\g<1>{size}", text)
             if count != 1:
