@@ -19,7 +19,7 @@ from pathlib import Path
 
 import growth
 import variants
-from measure import emulated, instructions, interleave, peak, system_calls
+from measure import emulated, instructions, interleave, peak, size, system_calls
 from place import PROJECT, build, call, furnish
 from report import Table, grouped, put_into
 
@@ -66,10 +66,6 @@ def compare(root: Path) -> None:
         raise SystemExit("bench: the floor writes other lengths than the tool")
 
 
-def size(path: Path) -> str:
-    return grouped(path.stat().st_size)
-
-
 def whole_process(root: Path, runs: int) -> Table:
     compare(root)
     table = Table("", "wall, median", "to the floor", "instructions", "system calls", "page faults",
@@ -77,16 +73,15 @@ def whole_process(root: Path, runs: int) -> Table:
     timings = dict(zip(NAMES, interleave(root, tuple(NAMES), runs, warm_up=20)))
     for command, name in NAMES.items():
         timing = timings[command]
-        program = root / command.split()[0].lstrip("/")
         is_script = command == SCRIPT
         table.add(name, f"{timing.median / 1000:.0f} µs", f"{timing.ratio(timings[FLOOR]):.2f}",
                   NONE if is_script else grouped(instructions(root, command)),
                   grouped(system_calls(root, command)), grouped(timing.faults),
-                  grouped(peak(root, command)), NONE if is_script else size(program))
+                  grouped(peak(root, command)), NONE if is_script else grouped(size(root, command)))
     for name in ("static", "dynamic"):
         counted, calls = emulated(root, f"/bin/arm-{name} -a -i")
         table.add(f"orvane, {name}, ARM", NONE, NONE, grouped(counted), grouped(calls), NONE, NONE,
-                  size(root / f"bin/arm-{name}"))
+                  grouped(size(root, f"/bin/arm-{name}")))
     against = timings[SCRIPT].ratio(timings[STATIC])
     table.note = f"The script takes {against:.0f} times as long as the static tool."
     return table

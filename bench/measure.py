@@ -106,6 +106,11 @@ def instructions(root: Path, command: str) -> int:
     return int(found[1])
 
 
+def size(root: Path, command: str) -> int:
+    """Bytes of the command's program."""
+    return (root / command.split()[0].lstrip("/")).stat().st_size
+
+
 def emulated(root: Path, command: str) -> tuple[int, int]:
     """Instructions and system calls of an ARM program: the emulator runs one at a time, and logs
     each."""

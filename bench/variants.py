@@ -10,7 +10,7 @@ from collections.abc import Callable
 from dataclasses import dataclass
 from pathlib import Path
 
-from measure import instructions, interleave
+from measure import instructions, interleave, size
 from place import PROJECT, call
 from growth import TEMPLATE, with_template
 from report import Table, grouped
@@ -79,6 +79,8 @@ def compare(root: Path, folder: Path, runs: int) -> Table:
     for number, variant in enumerate(VARIANTS):
         shutil.copy(build(variant, folder, number), root / f"bin/variant{number}")
         commands.append(f"/bin/variant{number} -a -i")
+    if size(root, commands[0]) != size(root, "/bin/static"):
+        raise SystemExit("bench: the first variant is not built as the product is")
     timings = interleave(root, commands, runs, warm_up=20)
     with with_template(root, 1 << 26):
         cat, *copies = interleave(root, (f"/bin/cat /{TEMPLATE} > /tmp/copy",
@@ -86,6 +88,6 @@ def compare(root: Path, folder: Path, runs: int) -> Table:
     for variant, command, timing, copy in zip(VARIANTS, commands, timings, copies):
         table.add(variant.name, f"{timing.ratio(timings[0]):.3f}",
                   grouped(instructions(root, command)), grouped(timing.faults),
-                  grouped((root / command.split()[0].lstrip("/")).stat().st_size),
+                  grouped(size(root, command)),
                   f"{cat.ratio(copy):.2f}")
     return table

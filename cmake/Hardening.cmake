@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 # What makes a fault of ours harder to exploit and costs no measurable start, as an interface target:
-# canaries on the stack, checked library calls where the compiler can't prove a size, no executable stack, and tables of the
-# loader that are read-only once the program runs. Not in Debug builds: _FORTIFY_SOURCE needs
-# optimisation, and the sanitizers see more.
+# canaries on the stack, checked library calls where the compiler can't prove a size, no executable
+# stack, and tables of the loader that are read-only once the program runs. Not in Debug builds:
+# _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
 add_library(orvane_hardening INTERFACE)
 if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   target_compile_options(orvane_hardening INTERFACE

@@ -5,7 +5,6 @@ its programs start. Exit status: 0 yes, 1 no, with the reason."""
 
 from __future__ import annotations
 
-import re
 import subprocess
 import sys
 import tarfile
@@ -13,25 +12,22 @@ import tempfile
 from pathlib import Path
 
 import hardening
-
-PROJECT = Path(__file__).resolve().parents[2]
-EXPECTED = {"bin/orvane", "bin/orvane-unit", "share/doc/orvane/copyright"}
+from shipped import IN_TARBALL, PROGRAMS, VERSION
 
 
 def complaints(tarball: Path, emulator: str) -> list[str]:
-    version = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())[1]
     with tempfile.TemporaryDirectory(prefix="orvane-tarball-") as name:
         folder = Path(name)
         with tarfile.open(tarball) as archive:
             archive.extractall(folder)
         found = {str(path.relative_to(folder)) for path in folder.rglob("*") if path.is_file()}
-        if found != EXPECTED:
+        if found != IN_TARBALL:
             return [f"it holds {sorted(found)}"]
-        missing = [f"{program}: {reason}" for program in ("bin/orvane", "bin/orvane-unit")
+        missing = [f"{program}: {reason}" for program in sorted(PROGRAMS)
                    for reason in hardening.missing_in_program(folder / program)]
         said = subprocess.run([emulator, folder / "bin/orvane-unit", "--version"], text=True,
                               stdout=subprocess.PIPE, check=False).stdout
-        if said != f"{version}\n":
+        if said != f"{VERSION}\n":
             missing.append(f"orvane-unit says {said!r} for its version")
         silent = subprocess.run([emulator, folder / "bin/orvane"], capture_output=True, check=False)
         if (silent.returncode, silent.stdout, silent.stderr) != (0, b"", b""):

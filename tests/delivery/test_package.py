@@ -5,21 +5,19 @@ from __future__ import annotations
 
 import gzip
 import os
-import re
 import subprocess
 import tarfile
 import tempfile
 import unittest
 from pathlib import Path
 
-PROJECT = Path(__file__).resolve().parents[2]
-VERSION = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())[1]
+from shipped import IN_TARBALL, PROJECT, VERSION
+
 DOCUMENTS = {f"docs/{path.name}" for path in (PROJECT / "docs").iterdir()}
 GZIP_TIME = slice(4, 8)  # of the bytes of a gzip header
 # Changing the root and the owner of files takes the privilege for it, or a user namespace.
 AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
-IN_TARBALL = {"bin/orvane", "bin/orvane-unit", "share/doc/orvane/copyright"}
 IN_PACKAGE = {f"usr/{name}" for name in IN_TARBALL | {
     "share/man/man1/orvane.1.gz", "share/man/man1/orvane-unit.1.gz",
     "share/bash-completion/completions/orvane-unit", "share/doc/orvane/changelog.gz",
