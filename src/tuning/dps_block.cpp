@@ -1,13 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tuning/dps_block.h"
 
-#include <algorithm>
-#include <string_view>
-
 namespace orvane {
 
 // clang-format off
-constexpr std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
+const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
     // key, offset, bit, encoding, kind, count
     {"qwaAECSwitch",            0, 0, DpsEncoding::code2, DpsKind::switchWord, 1},
     {"qwaAGCSwitch",            0, 2, DpsEncoding::code2, DpsKind::switchWord, 1},
@@ -56,85 +53,19 @@ constexpr std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
 }};
 // clang-format on
 
-constexpr std::array<QwaWord, 3> qwaSwitchWords = {{
+const std::array<QwaWord, 3> qwaSwitchWords = {{
     {1, "qwaOff"},
     {2, "qwaOn"},
     {3, "qwaIdle"},
 }};
 
-constexpr std::array<QwaWord, 3> qwaModeWords = {{
+const std::array<QwaWord, 3> qwaModeWords = {{
     {1, "qwaSingleChannel"},
     {2, "qwaMultiChannel"},
     {3, "qwaCombined"},
 }};
 
 namespace {
-
-/// Each field begins at or behind the end of the one before it, in bits, and the last ends
-/// with the bytes that are read; only lists have several elements, and those are of 16 bits.
-constexpr bool fieldsAscendWithoutOverlap() {
-    std::size_t end = 0; // bits
-    for (const DpsField& field : DPS_LAYOUT) {
-        const std::size_t begin = field.offset * std::size_t{8} + field.bit;
-        if (begin < end) {
-            return false;
-        }
-        end = begin + (field.encoding == DpsEncoding::code2
-                           ? 2
-                           : 8 * dpsElementSize(field.encoding) * field.count);
-        const bool isList = field.kind == DpsKind::list;
-        if (isList != (field.count > 1) || (isList && field.encoding != DpsEncoding::i16)) {
-            return false;
-        }
-    }
-    return end == DPS_BYTES_READ * 8;
-}
-
-constexpr std::size_t countKind(DpsKind kind) {
-    std::size_t count = 0;
-    for (const DpsField& field : DPS_LAYOUT) {
-        count += field.kind == kind ? 1 : 0;
-    }
-    return count;
-}
-
-constexpr std::size_t longestWord(const std::array<QwaWord, 3>& words) {
-    std::size_t longest = 0;
-    for (const QwaWord& entry : words) {
-        longest = std::max(longest, std::string_view(entry.word).size());
-    }
-    return longest;
-}
-
-constexpr std::size_t longestValue(const DpsField& field) {
-    constexpr std::size_t NUMBER = std::string_view("-32768").size();
-    switch (field.kind) {
-    case DpsKind::switchWord:
-        return longestWord(qwaSwitchWords);
-    case DpsKind::modeWord:
-        return longestWord(qwaModeWords);
-    case DpsKind::list:
-        return field.count * (NUMBER + 1);
-    case DpsKind::number:
-        break;
-    }
-    return NUMBER;
-}
-
-/// Key, blank, value, line end.
-constexpr std::size_t longestLine() {
-    std::size_t longest = 0;
-    for (const DpsField& field : DPS_LAYOUT) {
-        longest =
-            std::max(longest, std::string_view(field.key).size() + 1 + longestValue(field) + 1);
-    }
-    return longest;
-}
-
-static_assert(fieldsAscendWithoutOverlap());
-static_assert(longestLine() == DPS_LINE_MAX);
-static_assert(countKind(DpsKind::switchWord) == 16 + 3 && countKind(DpsKind::modeWord) == 1);
-static_assert(countKind(DpsKind::number) == 12 && countKind(DpsKind::list) == 12);
 
 /// Two's complement, low byte first, whatever this processor's own order.
 std::int32_t decodeI16(const std::uint8_t* bytes) {

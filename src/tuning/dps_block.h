@@ -27,7 +27,7 @@ struct DpsBlock {
 
 /// All blocks, by id.
 using DpsArea = std::array<DpsBlock, DPS_BLOCK_COUNT>;
-static_assert(sizeof(DpsArea) == DPS_AREA_SIZE);
+static_assert(sizeof(DpsArea) == DPS_AREA_SIZE, "blocks lie back to back");
 
 /// How a value is kept. Multi-byte values are little-endian.
 enum class DpsEncoding : std::uint8_t {

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdint>
 
 namespace orvane::test {
@@ -24,6 +25,17 @@ TEST(RecordSlotsTest, EverySlotHasItsSizeAndOffset) {
         EXPECT_EQ(place.size, size);
         EXPECT_EQ(place.offset, offset);
     }
+}
+
+TEST(RecordSlotsTest, LongestSlotIsAsLongAsNamed) {
+    std::uint32_t longest = 0;
+    for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
+        std::uint32_t size = 0;
+        std::uint64_t offset = 0;
+        recordSlotLayout(slot, size, offset);
+        longest = std::max(longest, size);
+    }
+    EXPECT_EQ(RECORD_SLOT_MAX_SIZE, longest);
 }
 
 TEST(RecordSlotsTest, UnknownSlotLeavesBothOutputs) {

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <climits>
 #include <cstring>
 #include <initializer_list>
@@ -127,6 +128,23 @@ TEST(DpsLayoutTest, FieldsAndUnreadBitsCoverTheBlockOnce) {
     for (std::size_t byte = 0; byte < seen.size(); ++byte) {
         EXPECT_EQ(seen.at(byte), 0xFFU) << "byte " << byte;
     }
+}
+
+/// Key, blank, value, line end.
+TEST(DpsLayoutTest, NoLineIsLongerThanItsRoom) {
+    std::size_t longest = 0;
+    for (const DpsField& field : EXPECTED_LAYOUT) {
+        std::size_t value = std::strlen("-32768");
+        if (field.kind == DpsKind::switchWord) {
+            value = std::strlen("qwaIdle");
+        } else if (field.kind == DpsKind::modeWord) {
+            value = std::strlen("qwaSingleChannel");
+        } else if (field.kind == DpsKind::list) {
+            value = field.count * std::strlen("-32768 ");
+        }
+        longest = std::max(longest, std::strlen(field.key) + 1 + value + 1);
+    }
+    EXPECT_EQ(longest, DPS_LINE_MAX);
 }
 
 TEST(DecodeFieldTest, ZerosDecodeToZero) {
