@@ -3,14 +3,13 @@
 
 #include <cstddef>
 #include <fstream>
-#include <utility>
 
 namespace orvane {
 
-bool parseInfLine(std::string_view line, std::string& key, std::string& value) {
+bool parseInfLine(const std::string& line, std::string& key, std::string& value) {
     constexpr char SEPARATOR = '=';
     const std::size_t separator = line.find(SEPARATOR);
-    if (separator == std::string_view::npos || separator + 1 == line.size()) {
+    if (separator == std::string::npos || separator + 1 == line.size()) {
         return false;
     }
     key = trimSpaces(line.substr(0, separator));
@@ -35,9 +34,9 @@ std::string infValue(const Inf_Data& record, const std::string& key) {
     return found == record.end() ? std::string() : found->second;
 }
 
-std::string_view trimSpaces(std::string_view text) {
+std::string trimSpaces(const std::string& text) {
     const std::size_t first = text.find_first_not_of(' ');
-    if (first == std::string_view::npos) {
+    if (first == std::string::npos) {
         return {};
     }
     return text.substr(first, text.find_last_not_of(' ') - first + 1);

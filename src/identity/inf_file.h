@@ -5,7 +5,6 @@
 
 #include <map>
 #include <string>
-#include <string_view>
 
 namespace orvane {
 
@@ -14,7 +13,7 @@ using Inf_Data = std::map<std::string, std::string>;
 
 /// Takes one line, without its line end, apart. False, with both outputs as they were, for a line
 /// without "=" or with nothing behind it. A carriage return at its end belongs to the value.
-bool parseInfLine(std::string_view line, std::string& key, std::string& value);
+bool parseInfLine(const std::string& line, std::string& key, std::string& value);
 
 /// Adds the lines of the file at `path` to `record`; a later line replaces an earlier one of the
 /// same key. A line that is none (parseInfLine) is skipped. A file that can't be opened or read
@@ -24,8 +23,7 @@ void readInfFile(const std::string& path, Inf_Data& record);
 /// The value of `key` in `record`, or the empty string.
 std::string infValue(const Inf_Data& record, const std::string& key);
 
-/// The part of `text` without leading and trailing spaces (0x20 only: tabs and carriage returns
-/// stay). It looks at the caller's bytes and lives as long as they do.
-std::string_view trimSpaces(std::string_view text);
+/// `text` without leading and trailing spaces (0x20 only: tabs and carriage returns stay).
+std::string trimSpaces(const std::string& text);
 
 } // namespace orvane

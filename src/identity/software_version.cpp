@@ -4,8 +4,6 @@
 #include <dirent.h>
 
 #include <algorithm>
-#include <array>
-#include <charconv>
 #include <cstdint>
 #include <cstdlib>
 #include <limits>
@@ -22,6 +20,7 @@ constexpr char APPLICATION_TYPE[] = "Application";
 constexpr char NO_VERSION[] = "N/A";
 constexpr char COMPONENT_SEPARATOR = '.';
 constexpr char AFFIX_SEPARATOR = '_';
+constexpr char HEX_DIGITS[] = "0123456789abcdef";
 
 /// The records of the last scan, in listing order. They live as long as the process; each scan
 /// empties them first.
@@ -108,14 +107,14 @@ std::string formatVersion(const std::string& text) {
 std::string formatVersionByte(const std::string& component) {
     using Limits = std::numeric_limits<std::int32_t>;
     // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
-    const long number =
-        std::clamp<long>(std::strtol(component.c_str(), nullptr, 10), Limits::min(), Limits::max());
-    const auto remainder = static_cast<std::int32_t>(number % 256); // keeps the dividend's sign
-    std::array<char, 2 * sizeof remainder> digits{};
-    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(),
-                                   static_cast<std::uint32_t>(remainder), 16);
-    const std::string hex(digits.data(), end.ptr);
-    return hex.size() < 2 ? "0" + hex : hex;
+    const long nearest = std::strtol(component.c_str(), nullptr, 10);
+    const long number = std::min<long>(std::max<long>(nearest, Limits::min()), Limits::max());
+    const auto value = static_cast<std::uint32_t>(number % 256); // keeps the dividend's sign
+    std::string hex;
+    for (std::uint32_t rest = value; rest != 0 || hex.size() < 2; rest /= 16) {
+        hex.insert(hex.begin(), HEX_DIGITS[rest % 16]);
+    }
+    return hex;
 }
 
 } // namespace orvane

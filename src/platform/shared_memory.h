@@ -3,10 +3,12 @@
 
 #include <sys/types.h>
 
-namespace orvane::platform {
+namespace orvane {
+namespace platform {
 
 /// shm_open(3) as the unit's system has it: a `name` that is a full path, inner slashes included,
 /// is opened as that path. Returns the descriptor, or -1 with errno set.
 int openSharedMemory(const char* name, int flags, mode_t mode);
 
-} // namespace orvane::platform
+} // namespace platform
+} // namespace orvane

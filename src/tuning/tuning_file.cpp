@@ -6,35 +6,42 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <cstddef>
+#include <cstdlib>
+#include <cstring>
 #include <fstream>
-#include <string_view>
 
 namespace orvane {
 
 namespace {
 
 /// A line is built before it is written: the stream would look up its locale's digits for every
-/// number. No line is longer than its room, which the compiler has checked with the layout.
+/// number. No line is longer than its room; a test takes the longest from the layout.
 struct Line {
     std::array<char, DPS_LINE_MAX> text;
     std::size_t length;
 };
 
-void append(Line& line, std::string_view text) {
-    std::copy(text.begin(), text.end(), line.text.data() + line.length);
-    line.length += text.size();
+void append(Line& line, const char* text) {
+    const std::size_t length = std::strlen(text);
+    std::memcpy(line.text.data() + line.length, text, length);
+    line.length += length;
 }
 
 void append(Line& line, char character) {
     line.text[line.length++] = character;
 }
 
-void append(Line& line, std::int32_t number) {
-    char* const begin = line.text.data();
-    const auto written = std::to_chars(begin + line.length, begin + line.text.size(), number);
-    line.length = static_cast<std::size_t>(written.ptr - begin);
+/// A field's value, -32768 to 32767, in decimal.
+void append(Line& line, std::int32_t value) {
+    if (value < 0) {
+        append(line, '-');
+    }
+    const std::size_t first = line.length;
+    for (std::int32_t rest = std::abs(value); rest != 0 || line.length == first; rest /= 10) {
+        append(line, static_cast<char>('0' + rest % 10)); // the lowest digit first
+    }
+    std::reverse(line.text.data() + first, line.text.data() + line.length);
 }
 
 void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {

@@ -36,12 +36,6 @@ TEST(TrimSpacesTest, OtherWhiteSpaceStays) {
     }
 }
 
-TEST(TrimSpacesTest, LeavesItsArgumentAlone) {
-    const std::string text = " a ";
-    EXPECT_EQ(trimSpaces(text), "a");
-    EXPECT_EQ(text, " a ");
-}
-
 TEST(InfValueTest, GivesTheValueOrTheEmptyText) {
     const Inf_Data record = {{"Type", "Application"}, {"Empty", ""}};
     EXPECT_EQ(infValue(record, "Type"), "Application");

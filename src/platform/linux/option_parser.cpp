@@ -5,7 +5,8 @@
 
 #include <string>
 
-namespace orvane::platform {
+namespace orvane {
+namespace platform {
 
 int nextOption(int argc, char* const argv[], const char* letters) {
     // Without the "+" glibc moves operands behind the options and goes on after them.
@@ -13,4 +14,5 @@ int nextOption(int argc, char* const argv[], const char* letters) {
     return getopt(argc, argv, posixly.c_str());
 }
 
-} // namespace orvane::platform
+} // namespace platform
+} // namespace orvane

@@ -6,7 +6,8 @@
 
 #include <cerrno>
 
-namespace orvane::platform {
+namespace orvane {
+namespace platform {
 
 int openSharedMemory(const char* name, int flags, mode_t mode) {
     const int descriptor = shm_open(name, flags, mode);
@@ -17,4 +18,5 @@ int openSharedMemory(const char* name, int flags, mode_t mode) {
     return descriptor;
 }
 
-} // namespace orvane::platform
+} // namespace platform
+} // namespace orvane

@@ -3,10 +3,12 @@
 
 #include <unistd.h>
 
-namespace orvane::platform {
+namespace orvane {
+namespace platform {
 
 int nextOption(int argc, char* const argv[], const char* letters) {
     return getopt(argc, argv, letters);
 }
 
-} // namespace orvane::platform
+} // namespace platform
+} // namespace orvane

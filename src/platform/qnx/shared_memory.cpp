@@ -3,10 +3,12 @@
 
 #include <sys/mman.h>
 
-namespace orvane::platform {
+namespace orvane {
+namespace platform {
 
 int openSharedMemory(const char* name, int flags, mode_t mode) {
     return shm_open(name, flags, mode);
 }
 
-} // namespace orvane::platform
+} // namespace platform
+} // namespace orvane
