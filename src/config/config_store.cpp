@@ -7,9 +7,9 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include <array>
+#include <algorithm>
 #include <cstddef>
-#include <string_view>
+#include <iterator>
 
 namespace orvane {
 
@@ -17,21 +17,16 @@ namespace {
 
 constexpr mode_t SHM_MODE = 0640;
 
-/// CAL_FILE_DIR, "/", CAL_FILE_NAME.
-constexpr auto composeCalibrationPath() {
-    std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME> path{};
-    std::size_t length = 0;
-    for (const char* c = CAL_FILE_DIR; *c != '\0'; ++c) {
-        path[length++] = *c;
-    }
-    path[length++] = '/';
-    for (const char* c = CAL_FILE_NAME; *c != '\0'; ++c) {
-        path[length++] = *c;
-    }
+} // namespace
+
+CalibrationPath composeCalibrationPath() {
+    CalibrationPath path;
+    char* const slash =
+        std::copy(std::begin(CAL_FILE_DIR), std::end(CAL_FILE_DIR), path.data()) - 1;
+    *slash = '/';
+    std::copy(std::begin(CAL_FILE_NAME), std::end(CAL_FILE_NAME), slash + 1);
     return path;
 }
-
-} // namespace
 
 ConfigStore::~ConfigStore() {
     close();
@@ -46,8 +41,7 @@ void ConfigStore::init() {
 std::int32_t ConfigStore::open() {
     // Composed and never used, on purpose: there is no file to fall back on, and an absent object
     // means no configuration, whatever calibration file stands on the unit.
-    constexpr auto CALIBRATION_PATH = composeCalibrationPath();
-    static_assert(std::string_view(CALIBRATION_PATH.data()) == "/fs/rwdata/CALS/cal_active.bin");
+    static_cast<void>(composeCalibrationPath());
 
     const int opened = platform::openSharedMemory(CONFIG_SHM_NAME, O_RDONLY, SHM_MODE);
     if (opened == -1) {

@@ -5,6 +5,7 @@
 // catalogue's (param_catalogue.h).
 #pragma once
 
+#include <array>
 #include <cstdint>
 
 namespace orvane {
@@ -15,6 +16,10 @@ constexpr char CONFIG_SHM_NAME[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"
 /// Directory and name of the calibration file, which nothing here opens (see ConfigStore::open).
 constexpr char CAL_FILE_DIR[] = "/fs/rwdata/CALS";
 constexpr char CAL_FILE_NAME[] = "cal_active.bin";
+
+/// CAL_FILE_DIR, "/", CAL_FILE_NAME and a NUL.
+using CalibrationPath = std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME>;
+CalibrationPath composeCalibrationPath();
 
 /// The handle on the mapped image: init, open, one getter, close. It owns descriptor and mapping.
 struct ConfigStore {

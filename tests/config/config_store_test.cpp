@@ -50,6 +50,12 @@ TEST_F(ConfigStoreTest, NamesAreFixed) {
     EXPECT_STREQ("cal_active.bin", CAL_FILE_NAME);
 }
 
+TEST_F(ConfigStoreTest, CalibrationPathIsFolderSlashName) {
+    const CalibrationPath path = composeCalibrationPath();
+    ASSERT_EQ(sizeof "/fs/rwdata/CALS/cal_active.bin", path.size());
+    EXPECT_STREQ("/fs/rwdata/CALS/cal_active.bin", path.data());
+}
+
 TEST_F(ConfigStoreTest, NewHandleIsClosed) {
     const ConfigStore store;
     expectClosed(store);
