@@ -59,7 +59,9 @@ std::int32_t ConfigStore::open() {
         mmap(nullptr, static_cast<std::size_t>(size), PROT_READ, MAP_PRIVATE, descriptor, 0);
     // Stored even when it is the failure value: close hands that to munmap, which refuses it.
     data = static_cast<const std::uint8_t*>(mapped);
-    if (mapped == MAP_FAILED) {
+    // Linux refuses to map nothing. A system that does not would leave the getters without a byte
+    // to read, so an object of size 0 counts as one that can't be mapped, whatever mmap says.
+    if (size == 0 || mapped == MAP_FAILED) {
         close();
         return -1;
     }

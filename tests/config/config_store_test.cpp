@@ -215,6 +215,23 @@ TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndTheHandleClosed) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndTheHandleClosed) {
+    // More than a 32-bit process has, and than the limit leaves a 64-bit one. It takes no space.
+    std::filesystem::resize_file(IMAGE_PATH, 0xFFFFF000U);
+    const int before = openDescriptors();
+    ConfigStore store;
+    store.init();
+    std::int32_t result = 0;
+    {
+        const ResourceLimit limit(RLIMIT_AS, 1024 * MEBIBYTE);
+        result = store.open();
+    }
+    EXPECT_EQ(-1, result);
+    expectClosed(store);
+    EXPECT_EQ(0U, store.length);
+    EXPECT_EQ(before, openDescriptors());
+}
+
 TEST_F(ConfigStoreTest, ObjectOfOneByteIsMapped) {
     writeImage("\x5A");
     ConfigStore store;

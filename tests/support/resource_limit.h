@@ -13,7 +13,7 @@
 
 namespace orvane::test {
 
-/// While it lives, the soft limit of `resource` (RLIMIT_NOFILE, RLIMIT_FSIZE) is `soft`. A write
+/// While it lives, the soft limit of `resource` (RLIMIT_NOFILE, RLIMIT_FSIZE, RLIMIT_AS) is `soft`. A write
 /// past RLIMIT_FSIZE fails and raises no signal.
 class ResourceLimit {
 public:

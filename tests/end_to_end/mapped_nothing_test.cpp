@@ -1,0 +1,59 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// A system that lets a process map nothing: Linux does not, so strace answers for it.
+#include "tests/support/host_command.h"
+#include "tests/support/temporary_folder.h"
+#include "tests/support/unit_test.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+constexpr char NOTHING_THERE[] = "0x1000"; // the first page is nobody's
+
+class MappedNothingTest : public UnitTest {
+protected:
+    /// Runs `orvane -a`, whose attempts to map the image are told that they succeeded.
+    std::string run() {
+        leave();
+        const TemporaryFolder folder;
+        const std::string report = (folder.path() / "report").string();
+        const std::string image = hostRoot().string() + IMAGE_PATH;
+        std::filesystem::create_directory(hostRoot() / "proc"); // a sanitized product wants it
+        const kit::RunResult result = runOnHost(
+            {"strace", "-E", "ASAN_OPTIONS=detect_leaks=0", "-f", "-qq", "-o", report, "-P", image,
+             "-e", "trace=mmap", "-e", std::string("inject=mmap:retval=") + NOTHING_THERE,
+             ORVANE_ENTER_BINARY, hostRoot().string(), ORVANE_BINARY, "-a"});
+        EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+        return readFile(report);
+    }
+};
+
+TEST_F(MappedNothingTest, EmptyImageCountsAsNone) {
+    if (sizeof ORVANE_EMULATOR != 1) {
+        GTEST_SKIP() << "an emulator maps whole pages of its own accord";
+    }
+    writeImage("");
+    writeFile("/fs/mp/etc/airplay_static.conf", "template\n");
+    const std::string report = run();
+    std::size_t injected = 0;
+    for (std::size_t at = 0; (at = report.find("(INJECTED)", at)) != std::string::npos; ++at) {
+        ++injected;
+    }
+    EXPECT_EQ(injected, 4U) << report; // model, brand, drive side, audio profile
+
+    const std::string text = readFile((hostRoot() / "tmp/airplay.conf").string());
+    EXPECT_NE(text.find("model = VOXA\n"), std::string::npos) << text;
+    EXPECT_NE(text.find("/MARL/"), std::string::npos) << text;
+    EXPECT_NE(text.find("rightHandDrive = 0\n\ntemplate\n"), std::string::npos) << text;
+    EXPECT_EQ(text.find("audioProfile"), std::string::npos) << text;
+}
+
+} // namespace
+
+} // namespace orvane::test
