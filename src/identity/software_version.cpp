@@ -22,6 +22,9 @@ constexpr char COMPONENT_SEPARATOR = '.';
 constexpr char AFFIX_SEPARATOR = '_';
 constexpr char HEX_DIGITS[] = "0123456789abcdef";
 
+/// Of a number in a version.
+using Limits = std::numeric_limits<std::int32_t>;
+
 /// The records of the last scan, in listing order. They live as long as the process; each scan
 /// empties them first.
 std::vector<Inf_Data> InfRecords; // NOLINT(*-non-const-global-variables)
@@ -105,7 +108,6 @@ std::string formatVersion(const std::string& text) {
 }
 
 std::string formatVersionByte(const std::string& component) {
-    using Limits = std::numeric_limits<std::int32_t>;
     // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
     const long nearest = std::strtol(component.c_str(), nullptr, 10);
     const long number = std::min<long>(std::max<long>(nearest, Limits::min()), Limits::max());

@@ -35,7 +35,8 @@ NAMES = {
 }
 CONSTANT_NAME = re.compile(r"[A-Z][A-Z0-9]*_[A-Z0-9_]*|[A-Z]{3,}")
 
-ROW = re.compile(r'[ \t]*(?:(?:\w+ *)?\{[^{}\n]*\}|"(?:\\.|[^"\\\n])*"),[ \t]*(?://[^\n]*)?\n')
+ROW = re.compile(r'[ \t]*(?:\{[^{}\n]*\}|"(?:\\.|[^"\\\n])*"|0x[0-9A-F]+(?:, 0x[0-9A-F]+)*),'
+                 r'[ \t]*(?://[^\n]*)?\n')
 # A file with so many rows is a catalogue: its rows are sampled.
 CATALOGUE_ROWS = 20
 

@@ -100,6 +100,10 @@ class OrderTest(unittest.TestCase):
         self.assertEqual(changes('T t[] = {\n    {x, y},\n    {u, v},\n};\n'),
                          [("{x, y}, {u, v},", "{u, v}, {x, y},")])
 
+    def test_rows_of_words_change_places(self) -> None:
+        self.assertIn(("0x00, 0x01, 0x02, 0x03,", "0x02, 0x03, 0x00, 0x01,"),
+                      changes("T t[] = {\n    0x00, 0x01,\n    0x02, 0x03,\n};\n"))
+
 
 class SkippedTest(unittest.TestCase):
     def test_comments_includes_and_assertions_stay(self) -> None:
