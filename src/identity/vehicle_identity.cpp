@@ -60,7 +60,7 @@ void getModelName(std::string& model) {
     try {
         model = hasName ? ModelNameTable[code - 1U] : MODEL_NAME_FALLBACK;
     } catch (...) {
-        model = MODEL_NAME_FALLBACK; // short enough to need no memory
+        model = MODEL_NAME_FALLBACK; // so short that most libraries need no memory
     }
 }
 

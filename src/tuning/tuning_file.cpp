@@ -85,7 +85,7 @@ void generateTuningFile(std::int32_t blockId, const std::string& path) {
     DpsArea area{};
     readTuningArea(area.data(), sizeof area);
 
-    // Longer than any line. Opening the file needs no memory then.
+    // Longer than any line. A library that takes it needs no memory to open the file.
     constexpr std::streamsize BUFFER_SIZE = 512; // bytes
     std::array<char, BUFFER_SIZE> buffer;        // NOLINT(*-member-init): a stream writes it first
     std::ofstream file;

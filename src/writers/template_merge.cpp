@@ -11,7 +11,7 @@ namespace {
 constexpr std::size_t INPUT_BUFFER_SIZE = 131073; // bytes
 std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-variables)
 
-/// The buffer comes first: a file stream takes one only before its first use.
+/// The buffer comes first: a file stream takes one only before its first use, if at all.
 template <typename FileStream, std::size_t SIZE>
 void open(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
     stream.rdbuf()->pubsetbuf(buffer.data(), SIZE);
