@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <fstream>
+#include <utility>
 
 namespace orvane {
 

@@ -6,8 +6,6 @@
 #include "tuning/dps_block.h"
 #include "tuning/tuning_file.h"
 
-#include <string>
-
 namespace orvane {
 
 namespace {

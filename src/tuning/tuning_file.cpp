@@ -6,8 +6,6 @@
 
 #include <algorithm>
 #include <array>
-#include <cstddef>
-#include <cstdlib>
 #include <cstring>
 #include <fstream>
 
@@ -36,11 +34,13 @@ void append(Line& line, char character) {
 void append(Line& line, std::int32_t value) {
     if (value < 0) {
         append(line, '-');
+        value = -value;
     }
     const std::size_t first = line.length;
-    for (std::int32_t rest = std::abs(value); rest != 0 || line.length == first; rest /= 10) {
-        append(line, static_cast<char>('0' + rest % 10)); // the lowest digit first
-    }
+    do {
+        append(line, static_cast<char>('0' + value % 10)); // the lowest digit first
+        value /= 10;
+    } while (value != 0);
     std::reverse(line.text.data() + first, line.text.data() + line.length);
 }
 
