@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
 # QNX Neutrino on 32-bit ARM, by the SDK's q++: the unit. No SDK was at hand: never run with a real
-# one. docs/porting.md says what was tried in its place.
+# one. tests/target_build runs it with a stand-in.
 #
 #   . <the SDK's environment script>      # sets QNX_HOST and QNX_TARGET
 #   cmake -B build -DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/qnx-armv7.cmake
@@ -14,19 +14,30 @@ foreach(variable QNX_HOST QNX_TARGET)
   file(TO_CMAKE_PATH "$ENV{${variable}}" ${variable})
 endforeach()
 
-# The GNU C++ library, one of the two that the tests ran with. `q++ -V` lists what an SDK has; a
-# compiler's version may stand before it, as in 8.3.0,gcc_ntoarmv7le_gpp.
+# With the GNU C++ library, one of the two that the tests ran with. `q++ -V` lists what an SDK has.
+# Alone, as here, it names the SDK's default compiler; behind a version, one of several: 4.7.3, 5.4.0 or
+# 8.3.0, as in 4.7.3,gcc_ntoarmv7le_gpp. cmake/OldestCompiler.cmake refuses what is too old.
 set(ORVANE_QNX_VARIANT gcc_ntoarmv7le_gpp CACHE STRING "What q++ gets after -V")
 set(CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ORVANE_QNX_VARIANT)
 
-# It finds headers and libraries by QNX_TARGET itself.
-set(CMAKE_CXX_COMPILER ${QNX_HOST}/usr/bin/q++)
-set(CMAKE_CXX_FLAGS_INIT -V${ORVANE_QNX_VARIANT})
+# orvane_find_tool(VARIABLE NAME...): only among the SDK's own, or the host's could be taken.
+function(orvane_find_tool variable)
+  find_program(${variable} NAMES ${ARGN} PATHS ${QNX_HOST}/usr/bin NO_DEFAULT_PATH REQUIRED)
+endfunction()
 
-# By name, or CMake would take the host's.
+# The variant is a part of the command: no CXXFLAGS or CMAKE_CXX_FLAGS can replace it, and CMake asks
+# that compiler for its version. It finds headers and libraries by QNX_TARGET itself.
+orvane_find_tool(ORVANE_QPP q++)
+set(CMAKE_CXX_COMPILER ${ORVANE_QPP} -V${ORVANE_QNX_VARIANT})
+
+# SDKs name a tool for its processor, for its whole target with the system's version, or both ways.
 foreach(tool AR RANLIB STRIP OBJCOPY)
   string(TOLOWER ${tool} name)
-  set(CMAKE_${tool} ${QNX_HOST}/usr/bin/ntoarmv7-${name} CACHE FILEPATH "")
+  set(names ntoarmv7-${name})
+  foreach(version 6.5.0 6.6.0 7.0.0 7.1.0)
+    list(APPEND names arm-unknown-nto-qnx${version}eabi-${name})
+  endforeach()
+  orvane_find_tool(CMAKE_${tool} ${names})
 endforeach()
 
 set(CMAKE_FIND_ROOT_PATH ${QNX_TARGET} ${QNX_TARGET}/armle-v7)
