@@ -2,9 +2,17 @@
 # The same sources give the same bytes, wherever they lie and whenever they are built: no folder's
 # name and no date gets into a program, not even with debugging records. Not in Debug builds, where a
 # debugger and the counter of lines want to find the sources.
-add_compile_options(-Wdate-time)
+orvane_accepts(ORVANE_ACCEPTS_DATE_TIME -Wdate-time)
+if(ORVANE_ACCEPTS_DATE_TIME)
+  add_compile_options(-Wdate-time)
+endif()
 if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
-  set(names -ffile-prefix-map=${PROJECT_SOURCE_DIR}=. -ffile-prefix-map=${PROJECT_BINARY_DIR}=build)
+  set(map -ffile-prefix-map)
+  orvane_accepts(ORVANE_ACCEPTS_FILE_PREFIX_MAP ${map}=here=there)
+  if(NOT ORVANE_ACCEPTS_FILE_PREFIX_MAP)
+    set(map -fdebug-prefix-map) # GCC before 8; no text of ours has the name of a file in it
+  endif()
+  set(names ${map}=${PROJECT_SOURCE_DIR}=. ${map}=${PROJECT_BINARY_DIR}=build)
   add_compile_options(${names})
   # GCC's link compiles, too.
   add_link_options("$<$<CXX_COMPILER_ID:GNU>:${names}>")
