@@ -7,10 +7,14 @@ if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   target_link_options(orvane_size INTERFACE LINKER:--gc-sections)
 endif()
 
-# Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC
-# (as the unit's SDK has it, also when CMake calls it QCC), whose objects keep their machine code
-# beside what the link reads, for other programs and for tests.
-if(CMAKE_CXX_COMPILER_ID MATCHES "GNU|QCC" AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
+# Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC,
+# whose objects keep their machine code beside what the link reads, for other programs and for tests.
+# Not by the unit's SDK: CMake's rules for its driver (QCC) have no such optimisation, and it is not
+# worth asking for by hand. Measured with the ARM compiler for Linux: with the C++ library linked
+# statically, as for a unit, the stripped program stays at 341,832 bytes (2.3 KB less, lost to
+# alignment) and runs 0.4 % fewer instructions; with a dynamic one it has 30,348 bytes instead of
+# 34,444 and runs 0.3 % fewer.
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   include(CheckIPOSupported)
   check_ipo_supported(RESULT ORVANE_LINK_TIME_OPTIMISATION OUTPUT ignored LANGUAGES CXX)
   if(ORVANE_LINK_TIME_OPTIMISATION)
