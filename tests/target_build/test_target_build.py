@@ -1,0 +1,236 @@
+# SPDX-License-Identifier: Apache-2.0
+"""The unit's toolchain file, with a stand-in for the SDK: what it has CMake do, and where it stops. All
+paths hold blanks, as those of a user may."""
+
+from __future__ import annotations
+
+import os
+import re
+import shlex
+import shutil
+import subprocess
+import tarfile
+import tempfile
+import unittest
+from collections.abc import Iterable
+from io import BytesIO
+from pathlib import Path
+
+from elftools.elf.elffile import ELFFile
+
+PROJECT = Path(__file__).resolve().parents[2]
+STAND_IN = Path(__file__).with_name("stand_in.sh")
+TOOLCHAIN = "cmake/toolchains/qnx-armv7.cmake"
+DEFAULT_VARIANT = "gcc_ntoarmv7le_gpp"
+DEFINITIONS = {"-D_QNX_SOURCE", "-D_LARGEFILE64_SOURCE", "-D_FILE_OFFSET_BITS=64"}
+STATIC_LIBRARIES = {"-static-libstdc++", "-static-libgcc"}
+USAGE = (b"Usage: orvane <options>\r\n\r\nOptions:\r\n  -i -- Update iAP config files\r\n"
+         b"  -a -- Update airplay config file\r\n\r\n")
+# Options of GCC that 4.7, the oldest compiler of a unit, ends at.
+NEWER_THAN_THE_OLDEST = (
+    "-Wpedantic", "-Wuseless-cast",  # 4.8
+    "-Wdate-time", "-fstack-protector-strong", "-fdiagnostics-color",  # 4.9
+    "-Wsuggest-override", "-Wformat-signedness",  # 5
+    "-Wduplicated-cond", "-Wnull-dereference",  # 6
+    "-Wduplicated-branches", "-Wimplicit-fallthrough",  # 7
+    "-ffile-prefix-map", "-fmacro-prefix-map", "-fcf-protection", "-fstack-clash-protection",
+    "-Wextra-semi")  # 8
+
+
+class Sdk:
+    """The folders that its environment script would name."""
+
+    def __init__(self, folder: Path, version: str = "4.7.3", unknown: Iterable[str] = (),
+                 ignored: Iterable[str] = (), tools: str = "ntoarmv7-") -> None:
+        self.host, self.target = folder / "the SDK/host", folder / "the SDK/target"
+        self.variables = {"QNX_HOST": str(self.host), "QNX_TARGET": str(self.target)}
+        programs, state = self.host / "usr/bin", self.host / "stand-in"
+        for place in (programs, state, self.host / "calls", self.target):
+            place.mkdir(parents=True)
+        (state / "version").write_text(f"{version}\n")
+        (state / "unknown").write_text("".join(f"{word}\n" for word in unknown))
+        (state / "ignored").write_text("".join(f"{word}\n" for word in ignored))
+        (programs / "q++").symlink_to(STAND_IN)
+        for tool in ("ar", "ranlib", "strip", "objcopy"):
+            found = shutil.which(f"arm-linux-gnueabihf-{tool}")
+            assert found is not None, tool
+            (programs / f"{tools}{tool}").symlink_to(found)
+
+    def calls(self) -> list[list[str]]:
+        """The words of each call of the driver, in no order."""
+        return [path.read_text().splitlines() for path in (self.host / "calls").iterdir()]
+
+
+class TargetBuildTest(unittest.TestCase):
+    """Each test has a folder; all share a copy of the project, and one build."""
+
+    shared: Path
+    sources: Path
+    build: Path
+    sdk: Sdk
+
+    @classmethod
+    def setUpClass(cls) -> None:
+        holder = tempfile.TemporaryDirectory(prefix="orvane-target build-")
+        cls.addClassCleanup(holder.cleanup)
+        cls.shared = Path(holder.name)
+        cls.sources, cls.build = cls.shared / "the project", cls.shared / "the build"
+        shutil.copytree(PROJECT, cls.sources,
+                        ignore=shutil.ignore_patterns("build", ".git", "__pycache__"))
+        cls.sdk = Sdk(cls.shared, unknown=NEWER_THAN_THE_OLDEST)
+        environment = {**os.environ, **cls.sdk.variables}
+        for words in (cls.configuration(cls.build), ["cmake", "--build", cls.build],
+                      ["cpack", "-G", "TGZ", "--config", cls.build / "CPackConfig.cmake"]):
+            done = subprocess.run(words, env=environment, cwd=cls.build.parent, text=True,
+                                  stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
+            if done.returncode != 0:
+                raise AssertionError(f"{words}\n{done.stdout}")
+
+    def setUp(self) -> None:
+        self.folder = Path(tempfile.mkdtemp(dir=self.shared))
+
+    @classmethod
+    def configuration(cls, build: Path, *options: str) -> list[str | Path]:
+        return ["cmake", "-G", "Ninja", "-S", cls.sources, "-B", build,
+                f"-DCMAKE_TOOLCHAIN_FILE={cls.sources / TOOLCHAIN}", *options]
+
+    def configure(self, variables: dict[str, str], *options: str) -> subprocess.CompletedProcess[str]:
+        environment = {name: text for name, text in os.environ.items() if not name.startswith("QNX_")}
+        done = subprocess.run(self.configuration(self.folder / "build", *options), text=True,
+                              env={**environment, **variables}, stdout=subprocess.PIPE,
+                              stderr=subprocess.STDOUT, check=False)
+        done.stdout = " ".join(done.stdout.split())  # CMake breaks the lines of a message
+        return done
+
+    def link_words(self, *options: str, sdk: Sdk) -> list[str]:
+        """Of the program, in a build that is configured only."""
+        done = self.configure(sdk.variables, *options)
+        self.assertEqual(done.returncode, 0, done.stdout)
+        commands = subprocess.run(["ninja", "-C", self.folder / "build", "-t", "commands", "orvane"],
+                                  text=True, stdout=subprocess.PIPE, check=True).stdout
+        return shlex.split(commands.splitlines()[-1])
+
+    def compiled(self) -> dict[str, list[str]]:
+        """The words that each source of the project was compiled with."""
+        sources = {}
+        for words in self.sdk.calls():
+            if "-c" in words and words[-1].startswith(f"{self.sources}/"):
+                name = str(Path(words[-1]).relative_to(self.sources))
+                self.assertNotIn(name, sources)
+                sources[name] = words
+        return sources
+
+    def packed(self) -> tarfile.TarFile:
+        [path] = (self.build / "packages").glob("*.tar.gz")
+        archive = tarfile.open(path)
+        self.addCleanup(archive.close)
+        return archive
+
+    def packed_program(self) -> ELFFile:
+        member = next(entry for entry in self.packed() if entry.name.endswith("bin/orvane"))
+        content = self.packed().extractfile(member.name)
+        assert content is not None
+        return ELFFile(BytesIO(content.read()))
+
+    def test_cmake_takes_the_driver_for_what_it_is(self) -> None:
+        [found] = (self.build / "CMakeFiles").glob("*/CMakeCXXCompiler.cmake")
+        self.assertIn('set(CMAKE_CXX_COMPILER_ID "QCC")', found.read_text())
+
+    def test_every_call_names_the_variant(self) -> None:
+        question = ["-V"]  # of CMake, whether it is that driver
+        self.assertIn(question, self.sdk.calls())
+        calls = [words for words in self.sdk.calls() if words != question]
+        self.assertGreater(len(calls), 20)
+        for words in calls:
+            self.assertEqual([word for word in words if word.startswith("-V")],
+                             [f"-V{DEFAULT_VARIANT}"])
+
+    def test_the_product_for_the_unit_is_built_and_nothing_else(self) -> None:
+        product = {str(path.relative_to(PROJECT)) for path in (PROJECT / "src").rglob("*.cpp")}
+        self.assertEqual(set(self.compiled()),
+                         {name for name in product if not name.startswith("src/platform/linux/")})
+
+    def test_the_platform_is_compiled_with_the_definitions_that_it_needs(self) -> None:
+        for name in ("option_parser", "shared_memory"):
+            with self.subTest(name=name):
+                words = self.compiled()[f"src/platform/qnx/{name}.cpp"]
+                self.assertEqual(DEFINITIONS - set(words), set())
+
+    def test_the_usage_record_is_in_the_packed_program(self) -> None:
+        section = self.packed_program().get_section_by_name("QNX_usage")
+        self.assertEqual(section.data(), USAGE)
+        self.assertEqual(section["sh_flags"], 0)
+
+    def test_the_packed_program_is_stripped(self) -> None:
+        with (self.build / "orvane").open("rb") as built:
+            self.assertIsNotNone(ELFFile(built).get_section_by_name(".symtab"))
+        self.assertIsNone(self.packed_program().get_section_by_name(".symtab"))
+
+    def test_the_package_is_for_the_unit(self) -> None:
+        version = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())
+        assert version is not None
+        self.assertEqual(Path(str(self.packed().name)).name,
+                         f"orvane-{version[1]}-qnx-armv7.tar.gz")
+        names = {Path(name) for name in self.packed().getnames()}
+        self.assertIn(Path("bin/orvane"), names)
+        self.assertNotIn(Path("bin/orvane-unit"), names)
+
+    def test_the_program_brings_the_c_plus_plus_library_and_needs_the_c_library(self) -> None:
+        dynamic = self.packed_program().get_section_by_name(".dynamic")
+        needed = {tag.needed for tag in dynamic.iter_tags("DT_NEEDED")}
+        self.assertIn("libc.so.6", needed)
+        self.assertEqual({name for name in needed if re.match(r"libstdc\+\+|libgcc", name)}, set())
+
+    def test_the_c_plus_plus_library_is_dynamic_where_the_driver_has_no_other(self) -> None:
+        for kind in ("unknown", "ignored"):
+            with self.subTest(kind=kind):
+                self.folder = Path(tempfile.mkdtemp(dir=self.shared))
+                sdk = Sdk(self.folder, **{kind: ["-static-libstdc++"]})
+                self.assertEqual(STATIC_LIBRARIES & set(self.link_words(sdk=sdk)), set())
+
+    def test_a_static_build_stays_one(self) -> None:
+        words = set(self.link_words("-DORVANE_STATIC=ON", sdk=Sdk(self.folder)))
+        self.assertIn("-static", words)
+        self.assertEqual(STATIC_LIBRARIES & words, set())
+
+    def test_an_sdk_of_several_compilers_with_the_long_names_of_tools(self) -> None:
+        sdk = Sdk(self.folder, tools="arm-unknown-nto-qnx7.0.0eabi-")
+        words = self.link_words("-DORVANE_QNX_VARIANT=5.4.0,gcc_ntoarmv7le_gpp",
+                                "-DCMAKE_CXX_FLAGS=-g", sdk=sdk)
+        self.assertIn("-V5.4.0,gcc_ntoarmv7le_gpp", words)
+        self.assertIn("-g", words)
+        cache = (self.folder / "build/CMakeCache.txt").read_text()
+        for tool in ("AR", "RANLIB", "STRIP", "OBJCOPY"):
+            self.assertIn(f"CMAKE_{tool}:FILEPATH={sdk.host}/usr/bin/arm-unknown-nto-qnx7.0.0eabi-"
+                          f"{tool.lower()}\n", cache)
+
+    def test_a_missing_tool_is_named(self) -> None:
+        done = self.configure(Sdk(self.folder, tools="another-").variables)
+        self.assertNotEqual(done.returncode, 0)
+        self.assertIn("Could not find CMAKE_AR using the following names: ntoarmv7-ar", done.stdout)
+
+    def test_a_missing_variable_of_the_environment_is_named(self) -> None:
+        variables = Sdk(self.folder).variables
+        for name in variables:
+            for broken in ({key: text for key, text in variables.items() if key != name},
+                           {**variables, name: ""}):
+                with self.subTest(name=name, broken=broken):
+                    done = self.configure(broken)
+                    self.assertNotEqual(done.returncode, 0)
+                    self.assertIn(f"{name} is not set: run the QNX SDK's environment script first",
+                                  done.stdout)
+
+    def test_an_old_compiler_is_refused(self) -> None:
+        done = self.configure(Sdk(self.folder, version="4.6.3").variables)
+        self.assertNotEqual(done.returncode, 0)
+        self.assertIn("orvane needs GCC 4.7 or newer.", done.stdout)
+        self.assertIn(f"q++ -V{DEFAULT_VARIANT} is GCC 4.6.3.", done.stdout)
+
+    def test_the_oldest_compiler_is_not_refused(self) -> None:
+        done = self.configure(Sdk(self.folder, version="4.7.0").variables)
+        self.assertIn("The CXX compiler identification is QCC 4.7.0", done.stdout)
+        self.assertNotIn("needs GCC", done.stdout)
+
+
+if __name__ == "__main__":
+    unittest.main()
