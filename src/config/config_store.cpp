@@ -21,8 +21,8 @@ constexpr mode_t SHM_MODE = 0640;
 
 CalibrationPath composeCalibrationPath() {
     CalibrationPath path;
-    char* const slash =
-        std::copy(std::begin(CAL_FILE_DIR), std::end(CAL_FILE_DIR), path.data()) - 1;
+    char* const slash = std::copy(std::begin(CAL_FILE_DIR), std::end(CAL_FILE_DIR), path.data()) -
+                        1; // over the NUL
     *slash = '/';
     std::copy(std::begin(CAL_FILE_NAME), std::end(CAL_FILE_NAME), slash + 1);
     return path;
@@ -55,13 +55,13 @@ std::int32_t ConfigStore::open() {
     if (size < 0) {
         return -2;
     }
-    void* const mapped =
-        mmap(nullptr, static_cast<std::size_t>(size), PROT_READ, MAP_PRIVATE, descriptor, 0);
+    const auto bytes = static_cast<std::size_t>(size);
+    void* const mapped = mmap(nullptr, bytes, PROT_READ, MAP_PRIVATE, descriptor, 0);
     // Stored even when it is the failure value: close hands that to munmap, which refuses it.
     data = static_cast<const std::uint8_t*>(mapped);
     // Linux refuses to map nothing. A system that does not would leave the getters without a byte
-    // to read, so an object of size 0 counts as one that can't be mapped, whatever mmap says.
-    if (size == 0 || mapped == MAP_FAILED) {
+    // to read, so a length of 0 counts as one that can't be mapped, whatever mmap says.
+    if (bytes == 0 || mapped == MAP_FAILED) {
         close();
         return -1;
     }

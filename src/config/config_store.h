@@ -17,7 +17,8 @@ constexpr char CONFIG_SHM_NAME[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"
 constexpr char CAL_FILE_DIR[] = "/fs/rwdata/CALS";
 constexpr char CAL_FILE_NAME[] = "cal_active.bin";
 
-/// CAL_FILE_DIR, "/", CAL_FILE_NAME and a NUL.
+/// The calibration file's path, with a NUL behind it. ConfigStore::open composes it and does
+/// nothing with it.
 using CalibrationPath = std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME>;
 CalibrationPath composeCalibrationPath();
 

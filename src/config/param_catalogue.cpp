@@ -4,7 +4,7 @@
 namespace orvane {
 
 // clang-format off
-const ParamTable ParamCatalogue = {
+constexpr ParamTable ParamCatalogue = {
     {{1, 2, 4, 1, 1, 2, 4, 4, 8}},
     // The rows as issued: number, type, group, offset, id, default, mask.
     {{

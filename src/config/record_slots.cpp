@@ -14,7 +14,7 @@ struct RecordSlot {
 
 // By slot number. Bytes 137 to 2184 belong to no slot.
 // clang-format off
-const std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
+constexpr std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
     {  1,    0}, // 0
     { 16,    1}, // 1
     { 16,   17}, // 2

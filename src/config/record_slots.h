@@ -16,12 +16,12 @@ constexpr std::int64_t AUX_AREA_START = 0xFF400;
 constexpr std::int64_t TUNING_AREA_START = 0xFF000;
 constexpr std::uint32_t AUX_AREA_SIZE = 1024;
 constexpr std::uint32_t TUNING_AREA_SIZE = 4096;
-static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072, "counted from the area's base");
-static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096, "counted from the area's base");
+static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072, "begins 3072 bytes past the base");
+static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096, "begins 4096 bytes past the base");
 
 /// The CRC is taken over slot 15, which begins one byte past the base.
 constexpr std::int64_t CRC_RANGE_START = 0xFFFFF;
-static_assert(RECORD_AREA_SIZE - CRC_RANGE_START == 1, "one byte past the area's base");
+static_assert(RECORD_AREA_SIZE - CRC_RANGE_START == 1, "begins one byte past the base");
 
 constexpr std::uint32_t RECORD_SLOT_COUNT = 18;
 /// The longest slot, slot 15, in bytes.

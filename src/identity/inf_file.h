@@ -11,12 +11,12 @@ namespace orvane {
 /// One parsed file: values by key, in the byte-wise order of the keys. Both without blanks around.
 using Inf_Data = std::map<std::string, std::string>;
 
-/// Takes one line, without its line end, apart. False, with both outputs as they were, for a line
+/// Splits one line, given without its line end. False, with both outputs as they were, for a line
 /// without "=" or with nothing behind it. A carriage return at its end belongs to the value.
 bool parseInfLine(const std::string& line, std::string& key, std::string& value);
 
 /// Adds the lines of the file at `path` to `record`; a later line replaces an earlier one of the
-/// same key. A line that is none (parseInfLine) is skipped. A file that can't be opened or read
+/// same key. A line that parseInfLine refuses is skipped. A file that can't be opened or read
 /// adds nothing.
 void readInfFile(const std::string& path, Inf_Data& record);
 

@@ -4,7 +4,7 @@
 namespace orvane {
 
 // clang-format off
-const std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {{
+constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {{
     "Marl Tulvari",          // 1
     "Marl Ondrix",           // 2
     "Marl Pelluma",          // 3

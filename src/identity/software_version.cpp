@@ -20,10 +20,6 @@ constexpr char APPLICATION_TYPE[] = "Application";
 constexpr char NO_VERSION[] = "N/A";
 constexpr char COMPONENT_SEPARATOR = '.';
 constexpr char AFFIX_SEPARATOR = '_';
-constexpr char HEX_DIGITS[] = "0123456789abcdef";
-
-/// Of a number in a version.
-using Limits = std::numeric_limits<std::int32_t>;
 
 /// The records of the last scan, in listing order. They live as long as the process; each scan
 /// empties them first.
@@ -108,15 +104,18 @@ std::string formatVersion(const std::string& text) {
 }
 
 std::string formatVersionByte(const std::string& component) {
+    using Limits = std::numeric_limits<std::int32_t>;
+    constexpr char HEX_DIGITS[] = "0123456789abcdef";
     // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
     const long nearest = std::strtol(component.c_str(), nullptr, 10);
     const long number = std::min<long>(std::max<long>(nearest, Limits::min()), Limits::max());
-    const auto value = static_cast<std::uint32_t>(number % 256); // keeps the dividend's sign
+    auto value = static_cast<std::uint32_t>(number % 256); // keeps the dividend's sign
     std::string hex;
-    for (std::uint32_t rest = value; rest != 0 || hex.size() < 2; rest /= 16) {
-        hex.insert(hex.begin(), HEX_DIGITS[rest % 16]);
-    }
-    return hex;
+    do {
+        hex.insert(hex.begin(), HEX_DIGITS[value % 16]);
+        value /= 16;
+    } while (value != 0);
+    return hex.size() < 2 ? "0" + hex : hex;
 }
 
 } // namespace orvane

@@ -29,7 +29,8 @@ bool isApplication(const Inf_Data& record);
 /// string when there is none.
 std::string versionText(const Inf_Data& record);
 
-/// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out.
+/// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out. Where
+/// even a short string needs memory (GCC before 5), std::bad_alloc may leave it then.
 std::string softwareVersion();
 
 /// Scans VERSION_DIR afresh and returns the versionText of the application: the first in the order

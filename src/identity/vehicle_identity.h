@@ -2,7 +2,8 @@
 //
 // The display values of the vehicle and of the unit. Each lookup opens its source, reads one value
 // and closes the source again; none fails towards its caller: where the source is missing or the
-// value unknown, it yields a default like any other value.
+// value unknown, it yields a default like any other value. Where even a short string needs memory
+// (GCC before 5), std::bad_alloc may leave one when there is none.
 #pragma once
 
 #include <cstdint>

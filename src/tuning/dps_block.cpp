@@ -4,7 +4,7 @@
 namespace orvane {
 
 // clang-format off
-const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
+constexpr std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
     // key, offset, bit, encoding, kind, count
     {"qwaAECSwitch",            0, 0, DpsEncoding::code2, DpsKind::switchWord, 1},
     {"qwaAGCSwitch",            0, 2, DpsEncoding::code2, DpsKind::switchWord, 1},
@@ -53,13 +53,13 @@ const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT = {{
 }};
 // clang-format on
 
-const std::array<QwaWord, 3> qwaSwitchWords = {{
+constexpr std::array<QwaWord, 3> qwaSwitchWords = {{
     {1, "qwaOff"},
     {2, "qwaOn"},
     {3, "qwaIdle"},
 }};
 
-const std::array<QwaWord, 3> qwaModeWords = {{
+constexpr std::array<QwaWord, 3> qwaModeWords = {{
     {1, "qwaSingleChannel"},
     {2, "qwaMultiChannel"},
     {3, "qwaCombined"},

@@ -17,9 +17,6 @@ constexpr std::size_t DPS_AREA_SIZE = 1880; ///< bytes
 constexpr std::int32_t DPS_BLOCK_SPEECHREC = 2;
 constexpr std::int32_t DPS_BLOCK_TELEPHONY = 3;
 
-/// Bytes at the start of a block that hold fields; those behind them are not read.
-constexpr std::size_t DPS_BYTES_READ = 179;
-
 /// One packed block; 16-bit fields may begin at odd offsets. Any content is accepted.
 struct DpsBlock {
     std::array<std::uint8_t, DPS_BLOCK_SIZE> bytes;

@@ -5,9 +5,10 @@ namespace orvane {
 
 namespace {
 
-/// The buffer of every file that is copied: one serves them all, since it holds bytes only while
-/// one copy runs. Its size is what a large template's speed comes from: reads of many whole pages,
-/// of one byte less than the buffer, as a file stream keeps one back.
+/// The buffer of every file that is copied. One serves them all: streams that share it may be open
+/// together, but none reads before its copy, and none after it. Its size is what a large template's
+/// speed comes from: reads of many whole pages, of one byte less than the buffer, as libstdc++
+/// keeps one back.
 constexpr std::size_t INPUT_BUFFER_SIZE = 131073; // bytes
 std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-variables)
 

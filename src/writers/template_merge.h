@@ -17,9 +17,9 @@ struct AccessoryFile {
     const char* stockFile;
 };
 
-/// Every output brings its buffer. A library that takes it needs no memory to open one; what is
-/// written does not depend on that. It is small, so that a run touches few pages: a head fits in,
-/// and a large template passes it by.
+/// Every output brings a buffer, small so that a run touches few pages: a head fits in, and a large
+/// template bypasses it. Where the library uses it, opening the file needs no memory. What is
+/// written never depends on it.
 constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
 using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 

@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -25,10 +26,11 @@ protected:
         const std::string report = (folder.path() / "report").string();
         const std::string image = hostRoot().string() + IMAGE_PATH;
         std::filesystem::create_directory(hostRoot() / "proc"); // a sanitized product wants it
-        const kit::RunResult result = runOnHost(
-            {"strace", "-E", "ASAN_OPTIONS=detect_leaks=0", "-f", "-qq", "-o", report, "-P", image,
-             "-e", "trace=mmap", "-e", std::string("inject=mmap:retval=") + NOTHING_THERE,
-             ORVANE_ENTER_BINARY, hostRoot().string(), ORVANE_BINARY, "-a"});
+        const kit::RunResult result =
+            runOnHost({"strace", "-E", "ASAN_OPTIONS=detect_leaks=0", "-f", "-qq", "-o", report,
+                       "-P", image, "-e", "trace=mmap,mmap2", "-e",
+                       std::string("inject=mmap,mmap2:retval=") + NOTHING_THERE,
+                       ORVANE_ENTER_BINARY, hostRoot().string(), ORVANE_BINARY, "-a"});
         EXPECT_EQ(result.exitStatus, 0) << result.standardError;
         return readFile(report);
     }

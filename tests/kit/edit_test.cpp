@@ -97,8 +97,9 @@ TEST_F(EditTest, SeveralFieldsOfABlockAreAllSet) {
 }
 
 TEST_F(EditTest, TuningFileOfAnyBlockSetsTheFieldsAndLeavesTheOtherBits) {
+    constexpr std::size_t BYTES_WITH_FIELDS = 179;
     DpsBlock source{};
-    for (std::size_t at = 0; at < DPS_BYTES_READ; ++at) {
+    for (std::size_t at = 0; at < BYTES_WITH_FIELDS; ++at) {
         source.bytes[at] = static_cast<std::uint8_t>(at * 7);
     }
     std::ostringstream text;
