@@ -1,10 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
-# What `cmake --install` lays down and `cpack` packs. Two components: `programs` runs on a unit or on
-# a host, `host` is what a host adds for the people who type. The Debian package holds both, the
-# tarball for a target the programs alone.
+# What `cmake --install` lays down and `cpack` packs. Three components: `programs` runs on a unit or on
+# a host, `host` is what a host adds for the people who type, `field` what a unit adds. The Debian
+# package holds the first two, the tarball for a target programs and field.
 include(GNUInstallDirs)
 
 install(TARGETS orvane RUNTIME COMPONENT programs)
+install(PROGRAMS field/orvane-field TYPE BIN COMPONENT field EXCLUDE_FROM_ALL)
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR} RENAME copyright COMPONENT programs)
 if(ORVANE_KIT_BUILT)
   install(TARGETS orvane-unit RUNTIME COMPONENT programs)
@@ -47,7 +48,7 @@ set(CPACK_STRIP_FILES ON)
 set(CPACK_PRE_BUILD_SCRIPTS ${CMAKE_CURRENT_LIST_DIR}/PackagedFolders.cmake)
 set(CPACK_PACKAGE_DIRECTORY ${PROJECT_BINARY_DIR}/packages)
 set(CPACK_GENERATOR DEB TGZ)
-set(CPACK_COMPONENTS_ALL programs host)
+set(CPACK_COMPONENTS_ALL programs host field)
 set(CPACK_PROJECT_CONFIG_FILE ${CMAKE_CURRENT_LIST_DIR}/PackagingByGenerator.cmake)
 
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)

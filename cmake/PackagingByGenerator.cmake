@@ -1,10 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
 # Read by cpack for each kind of package: what sets the two apart.
 if(CPACK_GENERATOR STREQUAL TGZ)
-  set(CPACK_COMPONENTS_ALL programs)
+  set(CPACK_COMPONENTS_ALL programs field)
   set(CPACK_ARCHIVE_COMPONENT_INSTALL ON)
   set(CPACK_COMPONENTS_GROUPING ALL_COMPONENTS_IN_ONE)
   set(CPACK_PACKAGING_INSTALL_PREFIX /)
 elseif(CPACK_GENERATOR STREQUAL DEB)
+  set(CPACK_COMPONENTS_ALL programs host)
   set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 endif()

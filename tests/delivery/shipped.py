@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What every tarball of the project holds, and the version that it is of."""
+"""What the project ships, and the version that it is of."""
 
 from __future__ import annotations
 
@@ -10,4 +10,5 @@ PROJECT = Path(__file__).resolve().parents[2]
 VERSION = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())[1]
 
 PROGRAMS = {"bin/orvane", "bin/orvane-unit"}
-IN_TARBALL = PROGRAMS | {"share/doc/orvane/copyright"}
+EVERYWHERE = PROGRAMS | {"share/doc/orvane/copyright"}
+IN_TARBALL = EVERYWHERE | {"bin/orvane-field"}

@@ -11,14 +11,14 @@ import tempfile
 import unittest
 from pathlib import Path
 
-from shipped import IN_TARBALL, PROJECT, VERSION
+from shipped import EVERYWHERE, IN_TARBALL, PROJECT, VERSION
 
 DOCUMENTS = {f"docs/{path.name}" for path in (PROJECT / "docs").iterdir()}
 GZIP_TIME = slice(4, 8)  # of the bytes of a gzip header
 # Changing the root and the owner of files takes the privilege for it, or a user namespace.
 AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
-IN_PACKAGE = {f"usr/{name}" for name in IN_TARBALL | {
+IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
     "share/man/man1/orvane.1.gz", "share/man/man1/orvane-unit.1.gz",
     "share/bash-completion/completions/orvane-unit", "share/doc/orvane/changelog.gz",
     "share/doc/orvane/README.md"} | {f"share/doc/orvane/{name}" for name in DOCUMENTS}}
@@ -118,6 +118,9 @@ class PackageTest(unittest.TestCase):
         with tarfile.open(self.tarball) as archive:
             archive.extractall(root)
         self.assertEqual(files(root), IN_TARBALL)
+        script = root / "bin/orvane-field"
+        self.assertEqual(script.read_bytes(), (PROJECT / "field/orvane-field").read_bytes())
+        self.assertEqual(script.stat().st_mode & 0o777, 0o755)
         self.check_that_it_runs(root, "/bin")
 
     def test_pages_and_changelog_are_compressed_without_a_date(self) -> None:
