@@ -7,11 +7,18 @@ import os
 import shutil
 import signal
 import subprocess
+import sys
 import unittest
+from pathlib import Path
 
 from car import (DISK, IMAGE, LOOK_UTILITIES, ORVANE_UNIT, OUTPUTS, SHELLS, SIGNALLER, VERSIONS, Car,
                  Done, is_root, snapshot)
 
+PROJECT = Path(__file__).resolve().parents[2]
+sys.path.append(str(PROJECT / "tests/documents"))
+from run_documents import blocks, matches  # noqa: E402
+
+DOCUMENT = PROJECT / "docs/deploy.md"
 OLD = b"of an earlier boot\n" * 200
 
 
@@ -71,6 +78,13 @@ class WholeUnitTest(LookTest):
                      "the modes are 0666 less the mask: with the mask 027 all -rw-r-----",
                      "where /tmp lies: /tmp", "where the image lies: /fs/tmpfs; a file"):
             self.assertEqual(done.line(line), f"ok       {line}")
+
+    def test_the_document_shows_what_it_says(self) -> None:
+        shown = [block for block in blocks(DOCUMENT.read_text(encoding="utf-8"))
+                 if block.lines[:1] and block.lines[0].startswith("$ orvane-field look ")]
+        self.assertEqual(len(shown), 1)
+        done = self.look()
+        self.assertTrue(matches(shown[0].lines[1:], [*done.out.splitlines(), str(done.status)]), done.out)
 
     def test_older_outputs_are_put_back_whole(self) -> None:
         for shell in SHELLS:
@@ -174,6 +188,14 @@ class UnitThatLacksSomethingTest(LookTest):
     def test_an_empty_template(self) -> None:
         (self.car / "fs/mp/etc/iap2_device_static.cfg").write_bytes(b"")
         self.check("differs", "/tmp/iap2_device.cfg comes whole", "nothing to be read")
+
+    def test_templates_of_any_bytes(self) -> None:
+        for content in (bytes(range(256)) * 3, b"a\\nb\\\n  c\t \n\x00", b"\n\n", b"no end of line"):
+            for name in ("airplay_static.conf", "iap2_device_static.cfg", "mm/iap1_static.cfg"):
+                (self.car / "fs/mp/etc" / name).write_bytes(content)
+            for shell in SHELLS:
+                with self.subTest(content=content[:9], shell=shell):
+                    self.assertEqual(self.look(shell=shell).lines("differs"), [])
 
     def test_no_tmp(self) -> None:
         shutil.rmtree(self.car / "tmp")
