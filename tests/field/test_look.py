@@ -267,6 +267,9 @@ class OtherOrvaneTest(LookTest):
         done = self.check("echo 'cannot load libx' >&2\nexit 1\n", "it starts:", 'says "cannot load libx"')
         self.assertIn("not tried", done.line("what it does"))
 
+    def test_it_ends_with_another_status(self) -> None:
+        self.check("exit 3\n", "it starts:", "exit status 3")
+
     def test_it_speaks(self) -> None:
         self.check('[ $# = 0 ] || echo hello\nexec /bin/orvane "$@"\n', "silence and", 'says "hello"')
 
