@@ -334,7 +334,7 @@ class TroubleTest(CaptureTest):
                     self.assertFalse((self.car / "home/car").exists())
 
     def test_files_that_may_grow_no_further(self) -> None:
-        for number, size in enumerate((1, 100, 511, 512, 600, AREA - 1)):
+        for number, size in enumerate((0, 1, 100, 511, 512, AREA - 1)):
             shell = list(SHELLS)[number % len(SHELLS)]
             with self.subTest(shell=shell, size=size):
                 self.again()
