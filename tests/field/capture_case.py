@@ -1,0 +1,47 @@
+# SPDX-License-Identifier: Apache-2.0
+"""What every test of `orvane-field capture` does: it captures, and requires that the unit stays as it is."""
+
+from __future__ import annotations
+
+import os
+import shutil
+import unittest
+from pathlib import Path
+
+from car import Car, Done, snapshot
+
+
+class CaptureTest(unittest.TestCase):
+    car: Car
+
+    @classmethod
+    def setUpClass(cls) -> None:
+        cls.car = Car()
+        cls.addClassCleanup(cls.car.close)
+
+    def setUp(self) -> None:
+        self.car.reset()
+
+    def capture(self, **given: object) -> Done:
+        """Captures into /home/car, and requires that the unit itself stays as it is."""
+        parts = [self.car / name for name in ("fs", "dev/hd0", "tmp")]
+        before = [snapshot(part) for part in parts if os.path.lexists(part)]
+        done = self.car.run("capture", "car", **given)
+        self.assertEqual([snapshot(part) for part in parts if os.path.lexists(part)], before)
+        self.assertFalse((self.car / "home/car/.block").exists())
+        self.assertFalse((self.car / "home/car/.byte").exists())
+        return done
+
+    def captured(self, path: str) -> Path:
+        return self.car / "home/car" / path
+
+    def check_success(self, done: Done) -> None:
+        self.assertEqual((done.status, done.out), (0, "captured into /home/car\n"), done.err)
+
+    def check_failure(self, done: Done, said: str) -> None:
+        self.assertEqual((done.status, done.out), (1, ""), done.err)
+        self.assertIn(said, done.err)
+        self.assertTrue(done.err.endswith("/home/car is not complete\n"), done.err)
+
+    def again(self) -> None:
+        shutil.rmtree(self.car / "home/car", ignore_errors=True)

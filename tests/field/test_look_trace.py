@@ -1,0 +1,174 @@
+# SPDX-License-Identifier: Apache-2.0
+"""`orvane-field look` leaves no trace, whatever stands in its way and whatever stops it."""
+
+from __future__ import annotations
+
+import os
+import signal
+import unittest
+
+from car import LOOK_UTILITIES, SHELLS, SIGNALLER, Done, snapshot
+from look_case import OLD, LookTest
+
+
+class SomethingInThePlaceOfAnOutputTest(LookTest):
+    def test_a_link_is_left_alone_and_so_is_its_target(self) -> None:
+        for target in ("/home/target", "/home/nothing"):
+            for shell in SHELLS:
+                with self.subTest(target=target, shell=shell):
+                    self.car.reset()
+                    (self.car / "home/target").write_bytes(OLD)
+                    (self.car / "tmp/airplay.conf").symlink_to(target)
+                    before = snapshot(self.car / "home")
+                    done = self.look(shell=shell)
+                    self.assertEqual(snapshot(self.car / "home"), before)
+                    self.assertIn("-a, since /tmp/airplay.conf is a link", done.line("not all is tried"))
+                    self.assertNotIn("audio profile", done.out)
+                    self.assertTrue(done.line("the serial arrives").startswith("ok"))
+                    self.assertEqual(done.status, 0)
+
+    def test_a_pipe_and_a_device_are_not_opened(self) -> None:
+        os.mkfifo(self.car / "tmp/speechrec_FFFF.txt")
+        os.mkfifo(self.car / "tmp/iap1.cfg")
+        done = self.look()
+        self.assertIn("-a, since /tmp/speechrec_FFFF.txt is a pipe; -i, since /tmp/iap1.cfg is a pipe",
+                      done.line("not all is tried"))
+
+    def test_a_folder_is_seen_and_left_alone(self) -> None:
+        (self.car / "tmp/iap2.cfg").mkdir()
+        (self.car / "tmp/iap2.cfg/inner").write_text("x")
+        for shell in SHELLS:
+            with self.subTest(shell):
+                done = self.look(shell=shell)
+                self.assertEqual(done.status, 1)
+                self.assertIn("a folder stands there", done.line("/tmp/iap2.cfg comes whole"))
+
+    def test_a_file_that_would_be_overwritten_by_what_is_put_aside(self) -> None:
+        self.put_older_outputs()
+        # The name has the number of the process, which a program of that process can tell.
+        path = self.car.wrap('read -r pid </pid\necho kept >/tmp/orvane-field-$pid-kept.airplay.conf\n',
+                             "uname")
+        done = self.car.run("look", path=path)
+        self.assertIn("-kept.airplay.conf or", done.line("not all is tried"))
+        left = [name.name for name in (self.car / "tmp").glob("orvane-field-*")]
+        self.assertEqual(len(left), 1)
+        self.assertEqual((self.car / "tmp" / left[0]).read_text(), "kept\n")
+        self.assertEqual((self.car / "tmp/airplay.conf").read_bytes(), OLD)
+
+
+class TroubleTest(LookTest):
+    def test_wrong_use(self) -> None:
+        for shell in SHELLS:
+            for words in ((), ("look", "a", "b"), ("capture",), ("see",), ("",), ("--look",)):
+                with self.subTest(shell=shell, words=words):
+                    done = self.car.run(*words, shell=shell)
+                    self.assertEqual((done.status, done.out), (2, ""))
+                    self.assertTrue(done.err.startswith("usage: orvane-field look [ORVANE]\n"))
+            done = self.car.run("look", "/nothing", shell=shell)
+            self.assertEqual((done.status, done.out), (2, ""))
+            self.assertEqual(done.err, "orvane-field: /nothing is not a program here\n")
+
+    def test_help(self) -> None:
+        done = self.car.run("--help")
+        self.assertEqual((done.status, done.err), (0, ""))
+        self.assertTrue(done.out.startswith("usage: orvane-field look [ORVANE]\n"))
+
+    def test_a_missing_utility_is_told_before_anything_else(self) -> None:
+        for shell in SHELLS:
+            for utility in LOOK_UTILITIES:
+                with self.subTest(shell=shell, utility=utility):
+                    self.car.reset()
+                    self.put_older_outputs()
+                    done = self.look(shell=shell, path=self.car.without(utility))
+                    self.assertEqual((done.status, done.out, done.err),
+                                     (2, "", f"orvane-field: missing here: {utility}\n"))
+
+    def test_other_utilities_may_be_missing(self) -> None:
+        for utility, question in (("ls", "the modes are"), ("uname", "a system that"),
+                                  ("mount", "where /tmp lies"), ("dd", "silence and")):
+            done = self.look(path=self.car.without(utility))
+            self.assertEqual((done.status, done.err), (0, ""), utility)
+            self.assertIn("unknown" if utility in ("ls", "uname") else "ok", done.line(question))
+
+    def test_nothing_can_be_put_aside(self) -> None:
+        self.put_older_outputs()
+        done = self.look(path=self.car.wrap("exit 1\n", "mv"))
+        self.assertIn("-a, since /tmp/airplay.conf cannot be put aside", done.line("not all is tried"))
+        self.assertEqual(done.err, "")
+
+    def test_putting_aside_copies_and_breaks_off(self) -> None:
+        """As where a file can't be renamed and there is no room for another."""
+        self.put_older_outputs()
+        path = self.car.wrap('case $1 in\n*/iap2.cfg) echo part >"$2"; exit 1 ;;\nesac\nexec /bin/mv "$@"\n',
+                             "mv")
+        done = self.look(path=path)
+        self.assertIn("-i, since /tmp/iap2.cfg cannot be put aside", done.line("not all is tried"))
+        self.assertIn("ok", done.line("the image arrives"))
+
+    def test_what_cannot_be_put_back_is_named(self) -> None:
+        self.put_older_outputs()
+        path = self.car.wrap('case $*:$# in\n*/iap2.cfg:3) exit 1 ;;\nesac\nexec /bin/mv "$@"\n', "mv")
+        done = self.car.run("look", path=path)
+        self.assertEqual(done.status, 1)
+        self.assertRegex(done.err, r"cannot put back /tmp/iap2.cfg: it is /tmp/orvane-field-\d+-kept")
+        kept = list((self.car / "tmp").glob("orvane-field-*"))
+        self.assertEqual([path.read_bytes() for path in kept], [OLD])
+
+    def test_a_full_disk(self) -> None:
+        for shell in SHELLS:
+            for size in (0, 100, 800):
+                with self.subTest(shell=shell, size=size):
+                    self.car.reset()
+                    self.put_older_outputs()
+                    done = self.look(shell=shell, largest_file=size)
+                    self.assertEqual(done.status, 1)
+                    self.assertEqual(done.err, "")
+
+    def test_nobody_reads_what_it_says(self) -> None:
+        self.put_older_outputs()
+        for shell in SHELLS:
+            reading, writing = os.pipe()
+            os.close(reading)
+            done = self.look(shell=shell, output=writing)
+            os.close(writing)
+            self.assertNotEqual(done.status, 0)
+
+
+class InterruptedTest(LookTest):
+    """A signal at every call of a utility or of orvane: the script alone gets it, or both do."""
+
+    SIGNALS = ("INT", "TERM", "HUP", "QUIT", "PIPE")
+
+    def interrupted(self, step: int, reaches: str, name: str, shell: str) -> Done:
+        (self.car / "home/count").unlink(missing_ok=True)
+        return self.look(shell=shell, path="/wrap:/bin",
+                         environment={"AT": str(step), "REACHES": reaches, "SIGNAL": name})
+
+    def test_every_step(self) -> None:
+        self.put_older_outputs()
+        self.car.wrap(SIGNALLER, "mv", "rm", "ls", "uname", "mount", "orvane")
+        self.assertEqual(self.interrupted(0, "script", "INT", "dash").status, 0)
+        steps = int((self.car / "home/count").read_text())
+        self.assertGreater(steps, 30)
+        shells = list(SHELLS)
+        stopped = 0
+        for step in range(1, steps + 1):
+            reaches = ("script", "both")[step % 2]
+            shell = shells[step % len(shells)]
+            name = self.SIGNALS[step % len(self.SIGNALS)]
+            number = signal.Signals[f"SIG{name}"]
+            with self.subTest(step=step, reaches=reaches, shell=shell, signal=name):
+                done = self.interrupted(step, reaches, name, shell)
+                # Early it touches nothing yet and simply ends; while it puts back it goes on.
+                self.assertIn(done.status, (0, -number, 128 + number))
+                # Some shells say more, of the utility that ended by the signal.
+                if done.err.endswith(f"orvane-field: stopped by SIG{name}; /tmp is as it was\n"):
+                    self.assertEqual(done.status, 128 + number)
+                    stopped += 1
+                else:
+                    self.assertNotIn("orvane-field", done.err)
+        self.assertGreater(stopped, steps // 2)
+
+
+if __name__ == "__main__":
+    unittest.main()
