@@ -12,7 +12,6 @@ import argparse
 import multiprocessing
 import os
 import random
-import shlex
 import sys
 import tempfile
 from collections import Counter
@@ -116,16 +115,14 @@ def print_difference(report: Report, options: argparse.Namespace) -> None:
     for line in report.lines:
         print(f"  {line}")
     print(f"  kept, and not run: {keep_unit(keep, options.seed, report.index)}")
-    print(f"  again: {sys.argv[0]} --orvane {options.orvane} --enter '{options.enter}' "
-          f"--names {options.names} --seed {options.seed} --only {report.index} --keep DIR")
+    again = runner.again(options, "--names", options.names, "--seed", options.seed,
+                         "--only", report.index, "--keep", "DIR")
+    print(f"  again: {again}")
 
 
 def parse_arguments() -> argparse.Namespace:
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("--orvane", required=True, help="the tool")
-    parser.add_argument("--enter", required=True,
-                        help="launcher, with its emulator if it needs one: "
-                             "ENTER... ROOT ORVANE ARGUMENTS...")
+    runner.add_arguments(parser)
     parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     parser.add_argument("--units", type=int, default=500)
     parser.add_argument("--seed", default="1", help='"random" draws one')
@@ -142,7 +139,7 @@ def parse_arguments() -> argparse.Namespace:
 def main() -> int:
     options = parse_arguments()
     names = tuple(load_names(options.names))
-    enter = tuple(shlex.split(options.enter))
+    enter = runner.launcher(options)
     indices = range(options.units) if options.only is None else [options.only]
     tasks = [Task(index, options.seed, options.orvane, enter, names)
              for index in indices]

@@ -15,7 +15,6 @@ from __future__ import annotations
 import argparse
 import multiprocessing
 import os
-import shlex
 import shutil
 import subprocess
 import sys
@@ -152,8 +151,7 @@ def print_table(injected: Counter[tuple[int, str]], agreed: Counter[tuple[int, s
 
 def parse_arguments() -> argparse.Namespace:
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("--orvane", required=True, help="the tool")
-    parser.add_argument("--enter", required=True, help="launcher: ENTER ROOT ORVANE ARGUMENTS...")
+    runner.add_arguments(parser)
     parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     parser.add_argument("--short-transfer", help="short_transfer, built anew when not given")
     parser.add_argument("--jobs", type=int, default=2)
@@ -190,7 +188,8 @@ def main() -> int:
     os.umask(MASK)
     with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
         helper = options.short_transfer or build_short_transfer(folder)
-        tools = Tools(options.orvane, tuple(shlex.split(options.enter)), helper, tuple(load_names(options.names)))
+        tools = Tools(options.orvane, runner.launcher(options), helper,
+                      tuple(load_names(options.names)))
         try:
             return run_all(tools, options.jobs)
         except runner.BrokenRun as error:

@@ -11,7 +11,6 @@ Exit status: 0 so it is, 1 a run that was otherwise, 2 the tool could not be run
 from __future__ import annotations
 
 import argparse
-import shlex
 import shutil
 import sys
 import tempfile
@@ -158,12 +157,10 @@ def check_long_line(tools: Tools) -> bool:
 
 def main() -> int:
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("--orvane", required=True, help="the tool")
-    parser.add_argument("--enter", required=True, help="launcher that can set limits")
+    runner.add_arguments(parser)
     parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     options = parser.parse_args()
-    tools = Tools(options.orvane, tuple(shlex.split(options.enter)),
-                  tuple(load_names(options.names)))
+    tools = Tools(options.orvane, runner.launcher(options), tuple(load_names(options.names)))
     texts = accepted(tools)
     try:
         least = least_memory(tools)

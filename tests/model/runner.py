@@ -4,8 +4,11 @@
 
 from __future__ import annotations
 
+import argparse
 import os
+import shlex
 import subprocess
+import sys
 from collections.abc import Mapping, Sequence
 from dataclasses import dataclass
 from pathlib import Path
@@ -24,6 +27,26 @@ TIME_LIMIT = 60
 
 class BrokenRun(Exception):
     """The tool was not run at all: nothing can be said of it."""
+
+
+def add_arguments(parser: argparse.ArgumentParser) -> None:
+    """What every driver has to know to run the tool. A path is one word, blanks and all."""
+    parser.add_argument("--orvane", required=True, help="the tool")
+    parser.add_argument("--enter", required=True,
+                        help="launcher of the tool: ENTER ROOT ORVANE ARGUMENTS...")
+    parser.add_argument("--emulator", help="runs the launcher, where it is for another processor")
+
+
+def launcher(options: argparse.Namespace) -> tuple[str, ...]:
+    """The words that go before ROOT ORVANE ARGUMENTS..."""
+    return (options.emulator, options.enter) if options.emulator else (options.enter,)
+
+
+def again(options: argparse.Namespace, *more: object) -> str:
+    """This driver's command line with other words behind those of add_arguments, for a shell."""
+    emulator = ["--emulator", options.emulator] if options.emulator else []
+    return shlex.join([sys.argv[0], "--orvane", options.orvane, "--enter", options.enter, *emulator,
+                       *map(str, more)])
 
 
 @dataclass(frozen=True)

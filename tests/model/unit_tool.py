@@ -19,7 +19,6 @@ import argparse
 import multiprocessing
 import os
 import random
-import shlex
 import subprocess
 import sys
 import tempfile
@@ -177,9 +176,9 @@ def print_difference(report: Report, options: argparse.Namespace) -> None:
     for line in report.lines:
         print(f"  {line}")
     print(f"  kept, and not run: {keep_unit(keep, options.seed, report.index)}")
-    print(f"  again: {sys.argv[0]} --orvane {options.orvane} --enter '{options.enter}' "
-          f"--unit-tool {options.unit_tool} --names {options.names} --seed {options.seed} "
-          f"--only {report.index} --keep DIR")
+    again = runner.again(options, "--unit-tool", options.unit_tool, "--names", options.names,
+                         "--seed", options.seed, "--only", report.index, "--keep", "DIR")
+    print(f"  again: {again}")
 
 
 def print_coverage(reached: Counter[str]) -> list[str]:
@@ -191,10 +190,7 @@ def print_coverage(reached: Counter[str]) -> list[str]:
 
 def parse_arguments() -> argparse.Namespace:
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("--orvane", required=True, help="the tool")
-    parser.add_argument("--enter", required=True,
-                        help="launcher, with its emulator if it needs one: "
-                             "ENTER... ROOT ORVANE ARGUMENTS...")
+    runner.add_arguments(parser)
     parser.add_argument("--unit-tool", required=True, help="orvane-unit")
     parser.add_argument("--names", type=Path, default=Path(__file__).with_name("model_names.txt"),
                         help="47 model display names")
@@ -213,7 +209,7 @@ def parse_arguments() -> argparse.Namespace:
 def main() -> int:
     options = parse_arguments()
     names = tuple(load_names(options.names))
-    enter = tuple(shlex.split(options.enter))
+    enter = runner.launcher(options)
     indices = range(options.units) if options.only is None else [options.only]
     tasks = [Task(index, options.seed, options.orvane, enter, options.unit_tool, names)
              for index in indices]
