@@ -15,11 +15,11 @@ SCRIPT = Path(__file__).resolve().parents[2] / "completion/orvane-unit.bash"
 
 def offers(*words: str, folder: str = "/") -> list[str]:
     """What is offered for the last of the words, which follow the program's name."""
-    program = (f'source {SCRIPT}; shift; COMP_WORDS=(orvane-unit "$@"); COMP_CWORD=$#; '
+    program = ('source "$SCRIPT"; shift; COMP_WORDS=(orvane-unit "$@"); COMP_CWORD=$#; '
                'cd "$FOLDER"; _orvane_unit; printf "%s\\n" "${COMPREPLY[@]}"')
     result = subprocess.run(["bash", "-c", program, "bash", "-", *words], check=True,
-                            capture_output=True, text=True, env={"FOLDER": folder,
-                                                                 "PATH": "/usr/bin:/bin"})
+                            capture_output=True, text=True,
+                            env={"FOLDER": folder, "SCRIPT": SCRIPT, "PATH": "/usr/bin:/bin"})
     return sorted(result.stdout.split())
 
 
