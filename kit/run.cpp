@@ -44,7 +44,10 @@ RunResult runInside(const std::filesystem::path& root, const Program& program) {
     if (plan.isDynamic) {
         proc.emplace(absoluteRoot);
     }
-    return runCaptured([&] { executePlan(plan, absoluteRoot); });
+    return runCaptured([&] {
+        enterForPlan(plan, absoluteRoot);
+        executePlan(plan);
+    });
 }
 
 } // namespace orvane::kit

@@ -134,8 +134,7 @@ StartPlan planStart(const Program& program) {
     return plan;
 }
 
-void executePlan(const StartPlan& plan, const std::filesystem::path& root) {
-    const std::vector<char*> argv = pointers(plan.argv);
+void enterForPlan(const StartPlan& plan, const std::filesystem::path& root) {
     const bool isByDescriptor = plan.binary.isOpen();
     if (!isByDescriptor && ::chdir("/") != 0) {
         throw systemError("cannot enter the host's root directory");
@@ -147,7 +146,11 @@ void executePlan(const StartPlan& plan, const std::filesystem::path& root) {
     if (isByDescriptor && ::chdir("/") != 0) {
         throw systemError("cannot enter " + root.string());
     }
-    if (isByDescriptor) {
+}
+
+void executePlan(const StartPlan& plan) {
+    const std::vector<char*> argv = pointers(plan.argv);
+    if (plan.binary.isOpen()) {
         ::fexecve(plan.binary.number(), argv.data(), environ);
     } else {
         ::execv(plan.file.c_str(), argv.data());

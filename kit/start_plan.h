@@ -25,8 +25,12 @@ struct StartPlan {
 /// lie. Throws KitError when there is no such program or no way to start it.
 StartPlan planStart(const Program& program);
 
-/// Executes the plan with "/" = `root`, an absolute path. Does not return; throws KitError on
-/// failure.
-void executePlan(const StartPlan& plan, const std::filesystem::path& root);
+/// Makes `root`, an absolute path, the "/" of this process, with the working directory from which
+/// the plan can be executed. Throws KitError when it can't.
+void enterForPlan(const StartPlan& plan, const std::filesystem::path& root);
+
+/// Executes the plan once enterForPlan has prepared its process. Opens no file, so that limits of
+/// the program can be set in between. Does not return; throws KitError on failure.
+void executePlan(const StartPlan& plan);
 
 } // namespace orvane::kit

@@ -64,9 +64,11 @@ void enter(std::vector<std::string> words) {
     const std::filesystem::path root = std::filesystem::absolute(words[0]);
     const orvane::kit::StartPlan plan =
         orvane::kit::planStart({words[1], {words.begin() + 2, words.end()}});
+    orvane::kit::enterForPlan(plan, root);
+    // Not before: to enter a user namespace, files have to be opened.
     limit(RLIMIT_AS, limits.memory);
     limit(RLIMIT_NOFILE, limits.files);
-    orvane::kit::executePlan(plan, root);
+    orvane::kit::executePlan(plan);
 }
 
 } // namespace
