@@ -18,6 +18,9 @@ GZIP_TIME = slice(4, 8)  # of the bytes of a gzip header
 # Changing the root and the owner of files takes the privilege for it, or a user namespace.
 AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
+# A user's PATH need not hold the folders of what is the superuser's, as chroot and ldconfig are.
+PATH = f"{os.environ['PATH']}:/usr/local/sbin:/usr/sbin:/sbin"
+
 IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
     "share/man/man1/orvane.1.gz", "share/man/man1/orvane-unit.1.gz",
     "share/bash-completion/completions/orvane-unit", "share/doc/orvane/changelog.gz",
@@ -26,7 +29,7 @@ IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
 
 def call(*words: str | Path) -> str:
     done = subprocess.run(words, text=True, stdout=subprocess.PIPE, stderr=subprocess.STDOUT,
-                          check=False)
+                          env={**os.environ, "PATH": PATH}, check=False)
     if done.returncode != 0:
         raise AssertionError(f"{words}: {done.returncode}\n{done.stdout}")
     return done.stdout
