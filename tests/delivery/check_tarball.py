@@ -16,7 +16,7 @@ from shipped import IN_TARBALL, PROGRAMS, VERSION
 
 
 def complaints(tarball: Path, emulator: str) -> list[str]:
-    with tempfile.TemporaryDirectory(prefix="orvane-tarball-") as name:
+    with tempfile.TemporaryDirectory(prefix="orvane tarball-") as name:
         folder = Path(name)
         with tarfile.open(tarball) as archive:
             archive.extractall(folder)

@@ -48,7 +48,7 @@ class ReaderTest(unittest.TestCase):
     """Each protection in turn is left out of a program of a few lines."""
 
     def setUp(self) -> None:
-        holder = tempfile.TemporaryDirectory(prefix="orvane-hardening-")
+        holder = tempfile.TemporaryDirectory(prefix="orvane hardening-")
         self.addCleanup(holder.cleanup)
         self.folder = Path(holder.name)
         (self.folder / "source.cpp").write_text(SOURCE)

@@ -64,7 +64,7 @@ class PackageTest(unittest.TestCase):
 
     @classmethod
     def setUpClass(cls) -> None:
-        holder = tempfile.TemporaryDirectory(prefix="orvane-package-")
+        holder = tempfile.TemporaryDirectory(prefix="orvane package-")
         cls.addClassCleanup(holder.cleanup)
         cls.folder = Path(holder.name)
         cls.package = pack(cls.folder / "deb", "DEB")

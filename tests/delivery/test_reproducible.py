@@ -16,7 +16,7 @@ PROJECT = Path(__file__).resolve().parents[2]
 @unittest.skipIf(os.environ.get("ORVANE_PROCESSOR") == "arm", "the compiler is the same, but slower")
 class ReproducibleTest(unittest.TestCase):
     def test_two_folders_give_the_same_bytes(self) -> None:
-        with tempfile.TemporaryDirectory(prefix="orvane-reproducible-") as name:
+        with tempfile.TemporaryDirectory(prefix="orvane reproducible-") as name:
             programs = [self.build(Path(name) / place) for place in
                         ("here", "a folder/of another name, and deeper")]
         self.assertEqual(programs[0], programs[1])

@@ -17,7 +17,7 @@ STATIC_LIMIT = 800 * KIB
 @unittest.skipUnless(os.environ.get("ORVANE_PROCESSOR") == "arm", "other processors have no limit")
 class SizeTest(unittest.TestCase):
     def stripped_size(self, program: str) -> int:
-        with tempfile.NamedTemporaryFile(prefix="orvane-stripped-") as stripped:
+        with tempfile.NamedTemporaryFile(prefix="orvane stripped-") as stripped:
             subprocess.run([os.environ["ORVANE_STRIP"], "-o", stripped.name, program], check=True)
             return Path(stripped.name).stat().st_size
 

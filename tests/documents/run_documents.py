@@ -111,7 +111,7 @@ class Outcome:
 
 def check(document: Path, path: str) -> Outcome:
     outcome = Outcome()
-    with tempfile.TemporaryDirectory(prefix="orvane-documents-") as name:
+    with tempfile.TemporaryDirectory(prefix="orvane documents-") as name:
         folder = Path(name)
         for block in blocks(document.read_text(encoding="utf-8")):
             if block.note == "not run":

@@ -16,7 +16,7 @@ from pathlib import Path
 
 def leave(unit_tool: str, case: Path, orvane: str) -> dict[str, bytes | None]:
     """What the build leaves in /tmp: contents by name, None for a folder."""
-    with tempfile.TemporaryDirectory(prefix="orvane-same-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane same-") as folder:
         root = Path(folder) / "unit"
         subprocess.run([unit_tool, "new", root, "--from", case / "unit.toml"], check=True,
                        stdout=subprocess.DEVNULL)

@@ -81,7 +81,7 @@ def check_unit(task: Task, root: Path) -> Report:
 
 
 def check(task: Task) -> Report:
-    with tempfile.TemporaryDirectory(prefix="orvane-unit-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane unit-") as folder:
         return check_unit(task, Path(folder))
 
 
@@ -109,7 +109,7 @@ def print_coverage(reached: Counter[tuple[str, str]]) -> list[str]:
 
 
 def print_difference(report: Report, options: argparse.Namespace) -> None:
-    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane-kept-"))
+    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane kept-"))
     print(f"differential: unit {report.index} of seed {options.seed}, "
           f"arguments {report.arguments!r}")
     for line in report.lines:

@@ -101,7 +101,7 @@ def inject(injection: Injection, root: Path, report: Path) -> tuple[runner.Run, 
 def check(injection: Injection) -> tuple[Injection, list[str]]:
     """Nothing to say when the run agrees with the model."""
     scenario = SCENARIOS[injection.scenario]
-    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         root = Path(folder) / "unit"
         root.mkdir()
         scenario.make(root)
@@ -118,7 +118,7 @@ def check(injection: Injection) -> tuple[Injection, list[str]]:
 
 def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
     """The tool's calls in an undisturbed run, which must be as predicted itself."""
-    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         root, report = Path(folder) / "unit", Path(folder) / "report"
         root.mkdir()
         scenario.make(root)
@@ -186,7 +186,7 @@ def main() -> int:
         print("faults: strace is not installed")
         return 2
     os.umask(MASK)
-    with tempfile.TemporaryDirectory(prefix="orvane-fault-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         helper = options.short_transfer or build_short_transfer(folder)
         tools = Tools(options.orvane, runner.launcher(options), helper,
                       tuple(load_names(options.names)))

@@ -70,14 +70,14 @@ def accepted(tools: Tools) -> dict[str, set[bytes | None]]:
         for gone in ((), ("fs/rwdata/.Version",), ("dev/hd0",), ("fs/mp/etc/mm/iap1_static.cfg",),
                      ("fs/rwdata/.Version", "dev/hd0"),
                      ("fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM",)):
-            with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+            with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
                 root = Path(folder)
                 make_unit(root)
                 for path in gone:
                     shutil.rmtree(root / path) if (root / path).is_dir() else (root / path).unlink()
                 for name, text in texts_after(root, names, ARGUMENTS).items():
                     result[name].add(text)
-    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
         make_unit(root)
         for name, path in STOCK.items():
@@ -95,7 +95,7 @@ def least_memory(tools: Tools) -> int:
     """The least address space, to the page, in which the tool starts at all: below it the kernel
     or the C library end the process before its first line."""
     low, high = 0, 64 * MEBIBYTE
-    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
         make_unit(root)
         while high - low > PAGE:
@@ -109,7 +109,7 @@ def least_memory(tools: Tools) -> int:
 
 def check_run(tools: Tools, limit: str, texts: dict[str, set[bytes | None]]) -> tuple[bool, bool]:
     """Whether the run was as it must be, and whether nothing was missing in it."""
-    with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
         make_unit(root)
         whole = texts_after(root, tools.names, ARGUMENTS)
@@ -140,7 +140,7 @@ def check_long_line(tools: Tools) -> bool:
     """A line of 64 MiB is read when there is memory for it, and else the file is as good as none."""
     good = True
     for limit, is_read in (("--memory=1073741824", True), ("--memory=33554432", False)):
-        with tempfile.TemporaryDirectory(prefix="orvane-limit-") as folder:
+        with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
             root = Path(folder)
             make_unit(root)
             file = root / "fs/rwdata/.Version/application.inf"

@@ -155,7 +155,7 @@ def check_unit(task: Task, folder: Path) -> Report:
 
 
 def check(task: Task) -> Report:
-    with tempfile.TemporaryDirectory(prefix="orvane-unit-") as folder:
+    with tempfile.TemporaryDirectory(prefix="orvane unit-") as folder:
         return check_unit(task, Path(folder))
 
 
@@ -170,7 +170,7 @@ def keep_unit(keep: Path, seed: str, index: int) -> Path:
 
 
 def print_difference(report: Report, options: argparse.Namespace) -> None:
-    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane-kept-"))
+    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane kept-"))
     print(f"unit_tool: unit {report.index} of seed {options.seed}, "
           f"{' '.join(flags(report.letters))}")
     for line in report.lines:

@@ -14,11 +14,11 @@ namespace orvane::test {
 namespace fs = std::filesystem;
 
 TemporaryFolder::TemporaryFolder() {
-    std::string name = (fs::temp_directory_path() / "orvane-test-XXXXXX").string();
+    std::string name = (fs::temp_directory_path() / "orvane test-XXXXXX").string();
     if (mkdtemp(name.data()) == nullptr) {
         throw kit::systemError("no temporary folder " + name);
     }
-    path_ = name;
+    path_ = fs::canonical(name); // as the system tells the working directory
 }
 
 TemporaryFolder::~TemporaryFolder() {
