@@ -20,7 +20,7 @@ share=$(($1 / ${#TARGETS[@]}))
 [ "$share" -ge 1 ] || share=1
 
 # The units that the targets work in, which a finding leaves behind.
-TMPDIR=$(mktemp -d -p "$([ -d /dev/shm ] && echo /dev/shm || echo /tmp)" orvane-fuzz-run-XXXXXX)
+TMPDIR=$(mktemp -d -p "$([ -w /dev/shm ] && echo /dev/shm || echo "${TMPDIR:-/tmp}")" orvane-fuzz-run-XXXXXX)
 export TMPDIR
 trap 'rm -rf "$TMPDIR"' EXIT
 
@@ -79,7 +79,7 @@ for target in "${TARGETS[@]}"; do
         failed=1
         hints+=("$target: exit status $status; all of it in $log:" "$(what_happened "$log")")
         for artifact in "${artifacts[@]}"; do
-            hints+=("again: $program $artifact")
+            hints+=("again: $(printf '%q ' "$program" "$artifact")")
         done
     elif [ "$executions" -lt "$LEAST_EXECUTIONS" ]; then
         failed=1
