@@ -20,9 +20,13 @@ def complaints(tarball: Path, emulator: str) -> list[str]:
         folder = Path(name)
         with tarfile.open(tarball) as archive:
             archive.extractall(folder)
+            owners = {f"{member.uname} ({member.uid}:{member.gid})" for member in archive}
         found = {str(path.relative_to(folder)) for path in folder.rglob("*") if path.is_file()}
         if found != IN_TARBALL:
             return [f"it holds {sorted(found)}"]
+        if owners != {"root (0:0)"}:
+            return [f"its files belong to {', '.join(sorted(owners))} instead of root: pack as root, "
+                    "or where users can make user namespaces"]
         missing = [f"{program}: {reason}" for program in sorted(PROGRAMS)
                    for reason in hardening.missing_in_program(folder / program)]
         said = subprocess.run([emulator, folder / "bin/orvane-unit", "--version"], text=True,
