@@ -13,8 +13,8 @@
 
 namespace orvane::test {
 
-/// While it lives, the soft limit of `resource` (RLIMIT_NOFILE, RLIMIT_FSIZE, RLIMIT_AS) is `soft`. A write
-/// past RLIMIT_FSIZE fails and raises no signal.
+/// While it lives, the soft limit of `resource` (RLIMIT_NOFILE, RLIMIT_FSIZE, RLIMIT_AS) is `soft`.
+/// A write past RLIMIT_FSIZE fails and raises no signal.
 class ResourceLimit {
 public:
     ResourceLimit(int resource, rlim_t soft)
