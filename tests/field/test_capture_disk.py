@@ -104,6 +104,15 @@ class DiskTest(CaptureTest):
         self.check_failure(done, "/dev/hd0: block 256 cannot be read, so the end is not found")
         self.assertFalse(self.captured(DISK).exists())
 
+    def test_blocks_near_the_end_that_cannot_be_read(self) -> None:
+        """Some disks lose eight blocks at a time."""
+        for blocks in (6144 + 64, 6144 + 1000, 6144 + 2000):
+            self.make_disk(blocks * BLOCK)
+            self.again()
+            done = self.capture(path=self.failing_dd("[ $skip -ge 6144 ] && [ $skip -lt 6152 ]"))
+            self.check_failure(done, "/dev/hd0: block 6144 cannot be read, so the end is not found")
+            self.assertFalse(self.captured(DISK).exists())
+
     def test_a_disk_that_cannot_be_read_at_all(self) -> None:
         done = self.capture(path=self.failing_dd("true"))
         self.check_failure(done, "/dev/hd0: cannot be read")

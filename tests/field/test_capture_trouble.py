@@ -44,6 +44,32 @@ class TroubleTest(CaptureTest):
         (self.car / VERSIONS).chmod(0o700)
         self.check_failure(self.capture(is_ordinary=True), f"/{VERSIONS}: no permission to list it")
 
+    @unittest.skipUnless(is_root(), "only root can become another user")
+    def test_what_stands_in_a_folder_that_may_not_be_entered(self) -> None:
+        for folder, path in (("fs/rwdata", VERSIONS), ("fs/tmpfs", IMAGE), ("fs", IMAGE),
+                             ("fs/mp", "fs/mp/etc/mm/iap1.cfg"), ("tmp", "tmp/iap1.cfg")):
+            self.car.reset()
+            self.again()
+            (self.car / folder).chmod(0o700)
+            self.check_failure(self.capture(is_ordinary=True), f"/{path}: no permission to look there\n")
+
+    def test_names_that_a_terminal_would_obey(self) -> None:
+        for name in ("a\x1b[2J.inf", "b\\033[2J.inf", "c\\c.inf"):
+            os.mkfifo(self.car / VERSIONS / name)
+        for shell in SHELLS:
+            self.again()
+            done = self.capture(shell=shell)
+            self.check_failure(done, f"/{VERSIONS}/(not printable): a pipe is not read\n")
+            self.assertEqual(done.err.count("a pipe is not read\n"), 3)
+            self.assertNotIn("\x1b", done.err)
+
+    def test_names_that_the_folder_takes_for_one(self) -> None:
+        """As on a stick, where upper and lower case are the same."""
+        (self.car / VERSIONS / "b.inf").write_text("Type=x\n")
+        path = self.car.wrap('/bin/dd "$@"\ncase $1 in\n*/application.inf)'
+                             f" : >/home/car/{VERSIONS}/b.inf ;;\nesac\n", "dd")
+        self.check_failure(self.capture(path=path), f"/{VERSIONS}/b.inf: the folder cannot tell its name")
+
     def test_a_file_that_cannot_be_read_to_its_end(self) -> None:
         path = self.car.wrap('/bin/dd "$@"\ncase $1 in\n*/airplay.conf) echo "I/O error" >&2; exit 1 ;;\n'
                              "esac\n", "dd")

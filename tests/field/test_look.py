@@ -104,6 +104,31 @@ class UnitThatLacksSomethingTest(LookTest):
         (self.car / IMAGE).write_bytes(b"")
         self.check("differs", "where the image lies", "it is empty")
 
+    def test_an_image_that_is_not_whole(self) -> None:
+        image = (self.car / IMAGE).read_bytes()
+        for size in (1, 140, 178):
+            (self.car / IMAGE).write_bytes(image[:size])
+            self.check("differs", "where the image lies", f"{size} bytes instead of 179")
+
+    def test_a_stock_file_tells_nothing_of_the_inputs(self) -> None:
+        for name in ("airplay", "iap2_device", "mm/iap2"):
+            (self.car / f"fs/mp/etc/{name}_static.{'conf' if name == 'airplay' else 'cfg'}").unlink()
+        (self.car / "fs/mp/etc/airplay.conf").write_text(
+            "model = Stock\noemIconPath = /fs/mp/etc/MARL/oemIcon.png\naudioProfile = 3\n")
+        for path in ("iap2_device.cfg", "mm/iap2.cfg"):
+            (self.car / "fs/mp/etc" / path).write_text("model=Stock\nserial=1\nfirmware_version=1\n")
+        done = self.check("unknown", "the image arrives", "no generated lines")
+        self.assertIn("unknown", done.line("telephony_FFFF.txt arrives"))
+        self.assertIn("ok", done.line("the model arrives: Quarion Velmira"))
+        self.assertIn("ok", done.line("the serial arrives: SN004217"))
+        self.assertIn("unknown", done.line("the version arrives"))
+
+    def test_a_stock_file_that_was_copied_from_an_output(self) -> None:
+        self.car.program("home/orvane", '/bin/orvane "$@"\n[ ! -e /tmp/airplay.conf ] ||'
+                         " /bin/dd if=/tmp/airplay.conf of=/fs/mp/etc/airplay.conf 2>/dev/null\nexit 0\n")
+        self.look("/home/orvane")
+        self.assertEqual(self.look().lines("differs"), [])
+
     def test_a_model_without_a_name(self) -> None:
         self.set("param.139=200")
         done = self.check("differs", "the model arrives", "VOXA")
@@ -167,6 +192,15 @@ class UnitThatLacksSomethingTest(LookTest):
         self.assertEqual(done.status, 1)
         self.assertIn("there is no folder /tmp", done.line("where /tmp lies"))
         self.assertFalse((self.car / "tmp").exists())
+
+    @unittest.skipUnless(is_root(), "only root can become another user")
+    def test_tmp_cannot_be_written(self) -> None:
+        (self.car / "tmp").chmod(0o755)
+        for put in (lambda: None, self.put_older_outputs):
+            put()
+            for shell in SHELLS:
+                self.check("differs", "what it does to /tmp", "cannot be written", is_ordinary=True,
+                           shell=shell)
 
     def test_tmp_is_a_link(self) -> None:
         (self.car / "tmp").rename(self.car / "home/tmp")

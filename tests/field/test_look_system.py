@@ -61,6 +61,16 @@ class OtherOrvaneTest(LookTest):
         self.check('/bin/orvane "$@"\n[ ! -e /tmp/iap1.cfg ] || echo name >/tmp/iap1.cfg\n',
                    "/tmp/iap1.cfg comes whole", "its end is another")
 
+    def test_a_template_that_ends_with_an_empty_line_is_left_out(self) -> None:
+        """The generated lines end so, too."""
+        (self.car / "fs/mp/etc/mm/iap2_static.cfg").write_text("a\n\n")
+        self.check('/bin/orvane "$@"\n[ -e /tmp/iap2.cfg ] || exit 0\nwhile IFS= read -r l; do echo "$l"\n'
+                   '[ -n "$l" ] || break; done </tmp/iap2.cfg >/home/cut\n/bin/mv /home/cut /tmp/iap2.cfg\n',
+                   "/tmp/iap2.cfg comes whole", "9 lines, and its end is another")
+
+    def test_it_writes_before_it_is_asked_to(self) -> None:
+        self.check("echo >/tmp/airplay.conf\nexit 1\n", "it starts:", "exit status 1")
+
     def test_a_file_is_not_made(self) -> None:
         self.check('/bin/orvane "$@"\n[ $# = 0 ] || /bin/rm -f /tmp/iap1.cfg\n', "/tmp/iap1.cfg comes whole",
                    "it is not made")

@@ -56,6 +56,22 @@ class SomethingInThePlaceOfAnOutputTest(LookTest):
         self.assertEqual((self.car / "tmp/airplay.conf").read_bytes(), OLD)
 
 
+class TwoAtOnceTest(LookTest):
+    def test_the_second_touches_nothing(self) -> None:
+        self.put_older_outputs()
+        for shell in SHELLS:
+            (self.car / "tmp/orvane-field-lock").touch()
+            done = self.look(shell=shell)
+            self.assertEqual((done.status, done.lines("differs")), (0, []))
+            self.assertIn("another look runs, or one was killed", done.line("what it does to /tmp"))
+            (self.car / "tmp/orvane-field-lock").unlink()
+            # The first one's orvane starts the second.
+            self.car.program("home/orvane", "/bin/dash /bin/orvane-field look /bin/orvane >/home/second\n"
+                             'exec /bin/orvane "$@"\n')
+            self.look("/home/orvane", shell=shell)
+            self.assertIn("another look runs", (self.car / "home/second").read_text())
+
+
 class TroubleTest(LookTest):
     def test_wrong_use(self) -> None:
         for shell in SHELLS:
@@ -114,6 +130,14 @@ class TroubleTest(LookTest):
         kept = list((self.car / "tmp").glob("orvane-field-*"))
         self.assertEqual([path.read_bytes() for path in kept], [OLD])
 
+    def test_a_folder_is_made_in_the_place_of_an_output(self) -> None:
+        self.put_older_outputs()
+        self.car.program("home/orvane", "[ $# != 0 ] || exit 0\n/bin/mkdir /tmp/iap2.cfg 2>/dev/null\nexit 0\n")
+        done = self.car.run("look", "/home/orvane")
+        self.assertRegex(done.err, r"cannot put back /tmp/iap2.cfg: it is /tmp/orvane-field-\d+-kept")
+        kept = list((self.car / "tmp").glob("orvane-field-*"))
+        self.assertEqual([path.read_bytes() for path in kept], [OLD])
+
     def test_a_full_disk(self) -> None:
         for shell in SHELLS:
             for size in (0, 100, 800):
@@ -138,6 +162,16 @@ class InterruptedTest(LookTest):
     """A signal at every call of a utility or of orvane: the script alone gets it, or both do."""
 
     SIGNALS = ("INT", "TERM", "HUP", "QUIT", "PIPE")
+
+    def test_signals_that_nobody_sends_by_hand(self) -> None:
+        self.put_older_outputs()
+        self.car.wrap(SIGNALLER, "mv", "rm", "ls", "uname", "mount", "orvane")
+        for shell in SHELLS:
+            for name in ("ALRM", "USR1", "USR2", "VTALRM", "XCPU"):
+                with self.subTest(shell=shell, signal=name):
+                    done = self.interrupted(18, "script", name, shell)
+                    self.assertTrue(done.err.endswith(f"stopped by SIG{name}; /tmp is as it was\n"), done)
+                    self.assertEqual(done.status, 1)
 
     def interrupted(self, step: int, reaches: str, name: str, shell: str) -> Done:
         (self.car / "home/count").unlink(missing_ok=True)
