@@ -258,6 +258,7 @@ while getopts ia option; do
     case $option in
     a) update_airplay ;;
     i) update_iap ;;
+    *) ;;
     esac
 done
 exit 0

@@ -2,8 +2,8 @@
 # SPDX-License-Identifier: Apache-2.0
 # Runs every fuzz target for its share of a time, each on a fresh copy of its seeds, and reports.
 # usage: fuzz/run.sh SECONDS [BUILD_FOLDER]
-#   SECONDS       in all, shared evenly by the targets, at least one each; longer where it takes
-#                 longer to run the least number of inputs that means anything
+#   SECONDS       in all, shared evenly by the targets, at least one each; longer if a target needs
+#                 more time for its minimum of 1,000 inputs
 #   BUILD_FOLDER  holds the targets; build/fuzz unless given
 # Exit status 1: a target found something, or ran too few inputs to mean anything.
 set -euo pipefail

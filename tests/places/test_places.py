@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The tests run wherever the project lies, and for a user without privilege.
+"""The tests run wherever the project lies, and without the privileges of the superuser.
 
 A few units and documents each, in a copy of what they take in a folder with a blank in its name.
 """
@@ -66,7 +66,7 @@ class PlacesTest(unittest.TestCase):
         allowed = subprocess.run([*UNPRIVILEGED, "unshare", "--map-root-user", "true"],
                                  stderr=subprocess.PIPE, text=True, check=False)
         if allowed.returncode != 0:
-            self.skipTest(f"no user namespaces here: {allowed.stderr.strip()}")
+            self.skipTest(f"no privilege can be given up, or no user namespace made: {allowed.stderr.strip()}")
         self.check_driver("limits", before=UNPRIVILEGED)
 
 

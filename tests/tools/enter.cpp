@@ -65,7 +65,7 @@ void enter(std::vector<std::string> words) {
     const orvane::kit::StartPlan plan =
         orvane::kit::planStart({words[1], {words.begin() + 2, words.end()}});
     orvane::kit::enterForPlan(plan, root);
-    // Not before: to enter a user namespace, files have to be opened.
+    // After entering, because that opens files.
     limit(RLIMIT_AS, limits.memory);
     limit(RLIMIT_NOFILE, limits.files);
     orvane::kit::executePlan(plan);

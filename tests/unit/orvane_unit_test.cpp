@@ -266,9 +266,8 @@ bool isColoured(const kit::RunResult& result) {
     return result.standardOutput.find('\033') != std::string::npos;
 }
 
-/// The words, in an environment that `noColour` ("NAME" or "NAME=VALUE") is taken from or put into,
-/// with a standard output that passes for a terminal. That takes none: a terminal is told by an
-/// ioctl that succeeds, and strace lets each of them succeed.
+/// Runs the words as if standard output were a terminal: strace makes every ioctl succeed.
+/// `noColour` is NAME to unset, or NAME=VALUE to set.
 kit::RunResult startAsOnATerminal(const std::string& noColour, const Words& words) {
     Words command = {"strace", "-qq", "-o", "/dev/null", "-e", "inject=ioctl:retval=0",
                      // LeakSanitizer would trace the process as well
