@@ -66,7 +66,8 @@ class PlacesTest(unittest.TestCase):
         allowed = subprocess.run([*UNPRIVILEGED, "unshare", "--map-root-user", "true"],
                                  stderr=subprocess.PIPE, text=True, check=False)
         if allowed.returncode != 0:
-            self.skipTest(f"no privilege can be given up, or no user namespace made: {allowed.stderr.strip()}")
+            self.skipTest("no privilege can be given up, or no user namespace made: "
+                          f"{allowed.stderr.strip()}")
         self.check_driver("limits", before=UNPRIVILEGED)
 
 
