@@ -3,8 +3,9 @@
 # Stands in for the SDK's compiler driver, as $QNX_HOST/usr/bin/q++: the ARM compiler for Linux, with what
 # CMake knows the driver by. Files in $QNX_HOST/stand-in make another driver of it:
 #   version   of the compiler, for CMake's program that asks
-#   unknown   options that end it, one a line, as an older compiler does not know them
-#   ignored   options that it accepts and does nothing for
+#   known     patterns of the options that it has, one a line; any other ends it
+#   ignored   options among them that it does nothing for
+#   added     words that it adds to each link, as its configuration may say
 # Each call leaves its words, one a line, in a file in $QNX_HOST/calls.
 set -eu
 state=$QNX_HOST/stand-in
@@ -16,18 +17,30 @@ if [ "$*" = -V ]; then
     exit 0
 fi
 
-# is FILE WORD: whether the word, or what it has before a "=", stands in the file.
+# is FILE WORD: whether a pattern in the file fits the word.
 is() {
-    grep -qxF -e "${2%%=*}" "$state/$1"
+    while IFS= read -r pattern; do
+        # shellcheck disable=SC2254 # a pattern indeed
+        case $2 in $pattern) return 0 ;; esac
+    done <"$state/$1"
+    return 1
 }
 
 variant=
+links=yes
 for word in "$@"; do
     shift
-    if is unknown "$word"; then
-        echo "cc1plus: error: unrecognized command line option '$word'" >&2
-        exit 1
-    fi
+    case $word in
+    -*)
+        if ! is known "$word"; then
+            echo "cc1plus: error: unrecognized command line option '$word'" >&2
+            exit 1
+        fi
+        ;;
+    esac
+    case $word in
+    -c | -E) links= ;;
+    esac
     case $word in
     -V*) variant=${word#-V} ;;
     -lang-c++) ;;
@@ -36,9 +49,16 @@ for word in "$@"; do
         set -- "$@" -U__GNUC__ -U__GNUC_MINOR__ -U__GNUC_PATCHLEVEL__ "-D__GNUC__=$major" \
             "-D__GNUC_MINOR__=$minor" "-D__GNUC_PATCHLEVEL__=$patch" "$word"
         ;;
-    *) is ignored "$word" || set -- "$@" "$word" ;;
+    *)
+        is ignored "$word" || set -- "$@" "$word"
+        ;;
     esac
 done
+if [ -n "$links" ]; then
+    while IFS= read -r word; do
+        set -- "$@" "$word"
+    done <"$state/added"
+fi
 if [ -z "$variant" ]; then
     echo "q++: no -V, and the SDK's default may be another processor" >&2
     exit 1

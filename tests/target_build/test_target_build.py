@@ -23,33 +23,35 @@ STAND_IN = Path(__file__).with_name("stand_in.sh")
 TOOLCHAIN = "cmake/toolchains/qnx-armv7.cmake"
 DEFAULT_VARIANT = "gcc_ntoarmv7le_gpp"
 DEFINITIONS = {"-D_QNX_SOURCE", "-D_LARGEFILE64_SOURCE", "-D_FILE_OFFSET_BITS=64"}
-STATIC_LIBRARIES = {"-static-libstdc++", "-static-libgcc"}
+STATIC_OPTIONS = ["-static-libstdc++", "-static-libgcc"]
 USAGE = (b"Usage: orvane <options>\r\n\r\nOptions:\r\n  -i -- Update iAP config files\r\n"
          b"  -a -- Update airplay config file\r\n\r\n")
-# Options of GCC that 4.7, the oldest compiler of a unit, ends at.
-NEWER_THAN_THE_OLDEST = (
-    "-Wpedantic", "-Wuseless-cast",  # 4.8
-    "-Wdate-time", "-fstack-protector-strong", "-fdiagnostics-color",  # 4.9
-    "-Wsuggest-override", "-Wformat-signedness",  # 5
-    "-Wduplicated-cond", "-Wnull-dereference",  # 6
-    "-Wduplicated-branches", "-Wimplicit-fallthrough",  # 7
-    "-ffile-prefix-map", "-fmacro-prefix-map", "-fcf-protection", "-fstack-clash-protection",
-    "-Wextra-semi")  # 8
+# The options that a build for the unit may use, as patterns: GCC 4.7, the oldest compiler of a unit, or
+# its driver has each. The stand-in ends at any other.
+OPTIONS = (
+    "-c", "-o", "-E", "-v", "-V?*", "-lang-c++", "-std=c++11", "-D*", "-U*", "-I*", "-Wp,-M[DTF],*",
+    "-g", "-Os", "-O3", "-Wall", "-Wextra", "-fdata-sections", "-ffunction-sections",
+    "-fdebug-prefix-map=*", "-fstack-protector",
+    "-Wl,--gc-sections", "-Wl,-z,relro", "-Wl,-z,now", "-Wl,-z,noexecstack",
+    "-static", *STATIC_OPTIONS)
 
 
 class Sdk:
     """The folders that its environment script would name."""
 
     def __init__(self, folder: Path, version: str = "4.7.3", unknown: Iterable[str] = (),
-                 ignored: Iterable[str] = (), tools: str = "ntoarmv7-") -> None:
+                 ignored: Iterable[str] = (), added: Iterable[str] = (),
+                 tools: str = "ntoarmv7-") -> None:
         self.host, self.target = folder / "the SDK/host", folder / "the SDK/target"
         self.variables = {"QNX_HOST": str(self.host), "QNX_TARGET": str(self.target)}
         programs, state = self.host / "usr/bin", self.host / "stand-in"
         for place in (programs, state, self.host / "calls", self.target):
             place.mkdir(parents=True)
         (state / "version").write_text(f"{version}\n")
-        (state / "unknown").write_text("".join(f"{word}\n" for word in unknown))
-        (state / "ignored").write_text("".join(f"{word}\n" for word in ignored))
+        assert set(OPTIONS) >= {*unknown, *ignored}
+        known = [option for option in OPTIONS if option not in unknown]
+        for name, lines in (("known", known), ("ignored", ignored), ("added", added)):
+            (state / name).write_text("".join(f"{line}\n" for line in lines))
         (programs / "q++").symlink_to(STAND_IN)
         for tool in ("ar", "ranlib", "strip", "objcopy"):
             found = shutil.which(f"arm-linux-gnueabihf-{tool}")
@@ -77,7 +79,7 @@ class TargetBuildTest(unittest.TestCase):
         cls.sources, cls.build = cls.shared / "the project", cls.shared / "the build"
         shutil.copytree(PROJECT, cls.sources,
                         ignore=shutil.ignore_patterns("build", ".git", "__pycache__"))
-        cls.sdk = Sdk(cls.shared, unknown=NEWER_THAN_THE_OLDEST)
+        cls.sdk = Sdk(cls.shared)
         environment = {**os.environ, **cls.sdk.variables}
         for words in (cls.configuration(cls.build), ["cmake", "--build", cls.build],
                       ["cpack", "-G", "TGZ", "--config", cls.build / "CPackConfig.cmake"]):
@@ -102,13 +104,13 @@ class TargetBuildTest(unittest.TestCase):
         done.stdout = " ".join(done.stdout.split())  # CMake breaks the lines of a message
         return done
 
-    def link_words(self, *options: str, sdk: Sdk) -> list[str]:
-        """Of the program, in a build that is configured only."""
+    def commands(self, *options: str, sdk: Sdk) -> list[list[str]]:
+        """The words that would make the program, its link last, in a build that is configured only."""
         done = self.configure(sdk.variables, *options)
         self.assertEqual(done.returncode, 0, done.stdout)
-        commands = subprocess.run(["ninja", "-C", self.folder / "build", "-t", "commands", "orvane"],
-                                  text=True, stdout=subprocess.PIPE, check=True).stdout
-        return shlex.split(commands.splitlines()[-1])
+        lines = subprocess.run(["ninja", "-C", self.folder / "build", "-t", "commands", "orvane"],
+                               text=True, stdout=subprocess.PIPE, check=True).stdout
+        return [shlex.split(line) for line in lines.splitlines()]
 
     def compiled(self) -> dict[str, list[str]]:
         """The words that each source of the project was compiled with."""
@@ -135,6 +137,20 @@ class TargetBuildTest(unittest.TestCase):
     def test_cmake_takes_the_driver_for_what_it_is(self) -> None:
         [found] = (self.build / "CMakeFiles").glob("*/CMakeCXXCompiler.cmake")
         self.assertIn('set(CMAKE_CXX_COMPILER_ID "QCC")', found.read_text())
+
+    def test_the_rules_are_those_for_the_driver(self) -> None:
+        link = next(words for words in self.sdk.calls() if "src/liborvane_core.a" in words)
+        for name, words in [*self.compiled().items(), ("orvane", link)]:
+            with self.subTest(name=name):
+                self.assertIn("-lang-c++", words)
+                self.assertEqual([word for word in words if word.startswith("-flto")], [])
+                self.assertEqual(name.endswith(".cpp"),
+                                 any(word.startswith("-Wp,-MD,") for word in words))
+
+    def test_an_option_that_is_not_listed_ends_a_build(self) -> None:
+        done = self.configure(self.sdk.variables, "-DCMAKE_CXX_FLAGS=-Wduplicated-cond")
+        self.assertNotEqual(done.returncode, 0)
+        self.assertIn("unrecognized command line option '-Wduplicated-cond'", done.stdout)
 
     def test_every_call_names_the_variant(self) -> None:
         question = ["-V"]  # of CMake, whether it is that driver
@@ -186,17 +202,17 @@ class TargetBuildTest(unittest.TestCase):
             with self.subTest(kind=kind):
                 self.folder = Path(tempfile.mkdtemp(dir=self.shared))
                 sdk = Sdk(self.folder, **{kind: ["-static-libstdc++"]})
-                self.assertEqual(STATIC_LIBRARIES & set(self.link_words(sdk=sdk)), set())
+                self.assertEqual(set(STATIC_OPTIONS) & set(self.commands(sdk=sdk)[-1]), set())
 
     def test_a_static_build_stays_one(self) -> None:
-        words = set(self.link_words("-DORVANE_STATIC=ON", sdk=Sdk(self.folder)))
+        words = set(self.commands("-DORVANE_STATIC=ON", sdk=Sdk(self.folder))[-1])
         self.assertIn("-static", words)
-        self.assertEqual(STATIC_LIBRARIES & words, set())
+        self.assertEqual(set(STATIC_OPTIONS) & words, set())
 
     def test_an_sdk_of_several_compilers_with_the_long_names_of_tools(self) -> None:
         sdk = Sdk(self.folder, tools="arm-unknown-nto-qnx7.0.0eabi-")
-        words = self.link_words("-DORVANE_QNX_VARIANT=5.4.0,gcc_ntoarmv7le_gpp",
-                                "-DCMAKE_CXX_FLAGS=-g", sdk=sdk)
+        words = self.commands("-DORVANE_QNX_VARIANT=5.4.0,gcc_ntoarmv7le_gpp",
+                              "-DCMAKE_CXX_FLAGS=-g", sdk=sdk)[-1]
         self.assertIn("-V5.4.0,gcc_ntoarmv7le_gpp", words)
         self.assertIn("-g", words)
         cache = (self.folder / "build/CMakeCache.txt").read_text()
@@ -228,6 +244,7 @@ class TargetBuildTest(unittest.TestCase):
 
     def test_the_oldest_compiler_is_not_refused(self) -> None:
         done = self.configure(Sdk(self.folder, version="4.7.0").variables)
+        self.assertEqual(done.returncode, 0, done.stdout)
         self.assertIn("The CXX compiler identification is QCC 4.7.0", done.stdout)
         self.assertNotIn("needs GCC", done.stdout)
 
