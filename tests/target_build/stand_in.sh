@@ -50,7 +50,11 @@ for word in "$@"; do
             "-D__GNUC_MINOR__=$minor" "-D__GNUC_PATCHLEVEL__=$patch" "$word"
         ;;
     *)
-        is ignored "$word" || set -- "$@" "$word"
+        is ignored "$word" && continue
+        case $word in
+        -Bstatic | -Bdynamic) word=-Wl,$word ;; # the SDK's driver has them itself
+        esac
+        set -- "$@" "$word"
         ;;
     esac
 done

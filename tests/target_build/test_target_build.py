@@ -23,7 +23,10 @@ STAND_IN = Path(__file__).with_name("stand_in.sh")
 TOOLCHAIN = "cmake/toolchains/qnx-armv7.cmake"
 DEFAULT_VARIANT = "gcc_ntoarmv7le_gpp"
 DEFINITIONS = {"-D_QNX_SOURCE", "-D_LARGEFILE64_SOURCE", "-D_FILE_OFFSET_BITS=64"}
+# What links the C++ library statically: GCC's own options, and positions, which q++ has of its own.
 STATIC_OPTIONS = ["-static-libstdc++", "-static-libgcc"]
+POSITIONS = ["-Wl,--as-needed", "-Bstatic", "-lstdc++", "-lgcc_eh", "-lgcc", "-Bdynamic"]
+POSITIONS_WITHOUT_SHARED_LIBGCC = ["-Wl,--as-needed", "-Bstatic", "-lstdc++", "-Bdynamic"]
 USAGE = (b"Usage: orvane <options>\r\n\r\nOptions:\r\n  -i -- Update iAP config files\r\n"
          b"  -a -- Update airplay config file\r\n\r\n")
 # The options that a build for the unit may use, as patterns: GCC 4.7, the oldest compiler of a unit, or
@@ -33,7 +36,7 @@ OPTIONS = (
     "-g", "-Os", "-O3", "-Wall", "-Wextra", "-fdata-sections", "-ffunction-sections",
     "-fdebug-prefix-map=*", "-fstack-protector",
     "-Wl,--gc-sections", "-Wl,-z,relro", "-Wl,-z,now", "-Wl,-z,noexecstack",
-    "-static", *STATIC_OPTIONS)
+    "-static", *STATIC_OPTIONS, *POSITIONS)
 
 
 class Sdk:
@@ -111,6 +114,12 @@ class TargetBuildTest(unittest.TestCase):
         lines = subprocess.run(["ninja", "-C", self.folder / "build", "-t", "commands", "orvane"],
                                text=True, stdout=subprocess.PIPE, check=True).stdout
         return [shlex.split(line) for line in lines.splitlines()]
+
+    def libraries(self, *options: str, sdk: Sdk) -> list[str]:
+        """What the program is linked with, behind what it needs them for."""
+        words = self.commands(*options, sdk=sdk)[-1]
+        behind = words.index("src/liborvane_core.a") + 1
+        return words[behind:words.index("&&", behind)]
 
     def compiled(self) -> dict[str, list[str]]:
         """The words that each source of the project was compiled with."""
@@ -197,17 +206,29 @@ class TargetBuildTest(unittest.TestCase):
         self.assertIn("libc.so.6", needed)
         self.assertEqual({name for name in needed if re.match(r"libstdc\+\+|libgcc", name)}, set())
 
+    def test_the_c_plus_plus_library_is_static_by_position_where_the_driver_has_no_option(self) -> None:
+        sdk = Sdk(self.folder, ignored=["-static-libstdc++"])
+        self.assertEqual(self.libraries(sdk=sdk), POSITIONS)
+
+    def test_libgcc_is_not_named_where_it_is_static_alone(self) -> None:
+        sdk = Sdk(self.folder, unknown=["-static-libstdc++", "-lgcc_eh"], added=["-static-libgcc"])
+        self.assertEqual(self.libraries(sdk=sdk), POSITIONS_WITHOUT_SHARED_LIBGCC)
+
     def test_the_c_plus_plus_library_is_dynamic_where_the_driver_has_no_other(self) -> None:
-        for kind in ("unknown", "ignored"):
-            with self.subTest(kind=kind):
-                self.folder = Path(tempfile.mkdtemp(dir=self.shared))
-                sdk = Sdk(self.folder, **{kind: ["-static-libstdc++"]})
-                self.assertEqual(set(STATIC_OPTIONS) & set(self.commands(sdk=sdk)[-1]), set())
+        sdk = Sdk(self.folder, unknown=["-static-libstdc++"], ignored=["-Bstatic"])
+        self.assertEqual(self.libraries(sdk=sdk), [])
+
+    def test_a_c_plus_plus_library_of_any_name_is_noticed(self) -> None:
+        library = self.folder / "libcpp.so.4"
+        subprocess.run(["arm-linux-gnueabihf-g++", "-shared", f"-Wl,-soname,{library.name}",
+                        "-x", "c++", "/dev/null", "-o", library], check=True)
+        sdk = Sdk(self.folder, added=["-Wl,--no-as-needed", str(library)])
+        self.assertEqual(self.libraries(sdk=sdk), [])
 
     def test_a_static_build_stays_one(self) -> None:
-        words = set(self.commands("-DORVANE_STATIC=ON", sdk=Sdk(self.folder))[-1])
-        self.assertIn("-static", words)
-        self.assertEqual(set(STATIC_OPTIONS) & words, set())
+        sdk = Sdk(self.folder)
+        self.assertEqual(self.libraries("-DORVANE_STATIC=ON", sdk=sdk), [])
+        self.assertIn("-static", self.commands(sdk=sdk)[-1])
 
     def test_an_sdk_of_several_compilers_with_the_long_names_of_tools(self) -> None:
         sdk = Sdk(self.folder, tools="arm-unknown-nto-qnx7.0.0eabi-")
