@@ -3,15 +3,35 @@
 # canaries on the stack, checked library calls where the compiler can't prove a size, no executable
 # stack, and tables of the loader that are read-only once the program runs. Not in Debug builds:
 # _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
+include(CheckCXXSourceCompiles)
+
+# Sets RESULT to whether a function that OPTION protects is compiled and linked: a canary needs the C
+# library, too.
+function(orvane_protects result option)
+  set(CMAKE_CXX_STANDARD 11)
+  set(CMAKE_REQUIRED_FLAGS ${option})
+  set(source "int main(int count, char**) {
+    char text[64];
+    volatile char* end = text + count;
+    *end = 1;
+    return *end;
+  }")
+  check_cxx_source_compiles("${source}" ${result} FAIL_REGEX "warning: [^\n]*${option}")
+endfunction()
+
 add_library(orvane_hardening INTERFACE)
 if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   set(protector -fstack-protector-strong)
-  orvane_accepts(ORVANE_ACCEPTS_STACK_PROTECTOR_STRONG ${protector})
-  if(NOT ORVANE_ACCEPTS_STACK_PROTECTOR_STRONG)
+  orvane_protects(ORVANE_STACK_PROTECTOR_STRONG ${protector})
+  if(NOT ORVANE_STACK_PROTECTOR_STRONG)
     set(protector -fstack-protector) # GCC before 4.9: functions with an array of characters only
+    orvane_protects(ORVANE_STACK_PROTECTOR ${protector})
+    if(NOT ORVANE_STACK_PROTECTOR)
+      set(protector "")
+      message(STATUS "no stack protector: this compiler and its C library have none")
+    endif()
   endif()
   target_compile_options(orvane_hardening INTERFACE
     ${protector} -U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2)
-  target_link_options(orvane_hardening INTERFACE
-    LINKER:-z,relro LINKER:-z,now LINKER:-z,noexecstack)
+  orvane_add_linker_options(orvane_hardening -z,relro -z,now -z,noexecstack)
 endif()

@@ -4,7 +4,7 @@
 add_library(orvane_size INTERFACE)
 if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   target_compile_options(orvane_size INTERFACE -Os -ffunction-sections -fdata-sections)
-  target_link_options(orvane_size INTERFACE LINKER:--gc-sections)
+  orvane_add_linker_options(orvane_size --gc-sections)
 endif()
 
 # Optimised at the link, too, a tenth of the code goes: what has one caller is inlined there. By GCC,

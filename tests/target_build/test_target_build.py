@@ -230,6 +230,15 @@ class TargetBuildTest(unittest.TestCase):
         self.assertEqual(self.libraries("-DORVANE_STATIC=ON", sdk=sdk), [])
         self.assertIn("-static", self.commands(sdk=sdk)[-1])
 
+    def test_what_the_linker_or_the_c_library_lacks_is_left_out(self) -> None:
+        options = ["-Wl,--gc-sections", "-Wl,-z,relro", "-Wl,-z,now", "-Wl,-z,noexecstack"]
+        absent_symbol = "-Wl,--wrap=__stack_chk_fail"  # gives it another name, which nothing defines
+        sdk = Sdk(self.folder, unknown=options[:2], ignored=options[2:], added=[absent_symbol])
+        *compiles, link = self.commands(sdk=sdk)
+        self.assertEqual(set(options) & set(link), set(options[2:]))
+        for words in compiles:
+            self.assertNotIn("-fstack-protector", words)
+
     def test_an_sdk_of_several_compilers_with_the_long_names_of_tools(self) -> None:
         sdk = Sdk(self.folder, tools="arm-unknown-nto-qnx7.0.0eabi-")
         words = self.commands("-DORVANE_QNX_VARIANT=5.4.0,gcc_ntoarmv7le_gpp",
