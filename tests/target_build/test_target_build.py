@@ -278,6 +278,16 @@ class TargetBuildTest(unittest.TestCase):
         self.assertIn("The CXX compiler identification is QCC 4.7.0", done.stdout)
         self.assertNotIn("needs GCC", done.stdout)
 
+    def test_another_variant_for_a_configured_folder_is_refused(self) -> None:
+        sdk, option = Sdk(self.folder), "-DORVANE_QNX_VARIANT=5.4.0,gcc_ntoarmv7le_gpp"
+        self.commands(sdk=sdk)
+        done = self.configure(sdk.variables, option)
+        self.assertNotEqual(done.returncode, 0)
+        self.assertIn(f"This folder was configured with -V{DEFAULT_VARIANT}. For "
+                      "-V5.4.0,gcc_ntoarmv7le_gpp configure anew, with cmake --fresh.", done.stdout)
+        words = self.commands("--fresh", option, sdk=sdk)[-1]
+        self.assertIn("-V5.4.0,gcc_ntoarmv7le_gpp", words)
+
 
 if __name__ == "__main__":
     unittest.main()
