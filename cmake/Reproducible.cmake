@@ -12,7 +12,12 @@ if(NOT CMAKE_BUILD_TYPE STREQUAL Debug)
   if(NOT ORVANE_ACCEPTS_FILE_PREFIX_MAP)
     set(map -fdebug-prefix-map) # GCC before 8; no text of ours has the name of a file in it
   endif()
-  set(names ${map}=${PROJECT_SOURCE_DIR}=. ${map}=${PROJECT_BINARY_DIR}=build)
+  # A compiler may write a folder's name with or without the links in it.
+  file(REAL_PATH ${PROJECT_SOURCE_DIR} source)
+  file(REAL_PATH ${PROJECT_BINARY_DIR} binary)
+  set(names ${map}=${PROJECT_SOURCE_DIR}=. ${map}=${source}=.
+    ${map}=${PROJECT_BINARY_DIR}=build ${map}=${binary}=build)
+  list(REMOVE_DUPLICATES names)
   add_compile_options(${names})
   # GCC's link compiles, too.
   add_link_options("$<$<CXX_COMPILER_ID:GNU>:${names}>")
