@@ -15,8 +15,9 @@ foreach(variable QNX_HOST QNX_TARGET)
 endforeach()
 
 # With the GNU C++ library, one of the two that the tests ran with. `q++ -V` lists what an SDK has.
-# Alone, as here, it names the SDK's default compiler; behind a version, one of several: 4.7.3, 5.4.0 or
-# 8.3.0, as in 4.7.3,gcc_ntoarmv7le_gpp. cmake/Compiler.cmake refuses what is too old.
+# A variant alone takes the SDK's default compiler. With a version before it, 4.7.3,gcc_ntoarmv7le_gpp,
+# it takes that one. A build by 7.1, for 64-bit ARM, has gcc/8.3.0 there. cmake/Compiler.cmake refuses
+# a compiler that is too old.
 set(ORVANE_QNX_VARIANT gcc_ntoarmv7le_gpp CACHE STRING "What q++ gets after -V")
 set(CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ORVANE_QNX_VARIANT)
 
