@@ -164,6 +164,19 @@ class UnitThatLacksSomethingTest(LookTest):
         (self.car / VERSIONS / "b.inf").write_text("Type = Application\nVersion Number=Z_9.8.7\n")
         self.check("ok", "the version arrives", "applications: 2")
 
+    def test_a_version_file_with_a_zero_byte(self) -> None:
+        """No shell can hold that byte, so it cannot tell what orvane makes of it."""
+        (self.car / VERSIONS / "application.inf").write_bytes(b"Type=Application\nVersion Number=3.1\x009\n")
+        for shell in SHELLS:
+            self.check("unknown", "the version arrives", "a zero byte may hide another in application.inf",
+                       shell=shell)
+
+    def test_a_version_file_whose_name_begins_with_a_line_end(self) -> None:
+        (self.car / VERSIONS / "application.inf").rename(self.car / VERSIONS / "\na.inf")
+        for shell in SHELLS:
+            self.check("ok", "the version arrives", "3.10.2_rc, from (not printable); applications: 1",
+                       shell=shell)
+
     def test_no_template(self) -> None:
         (self.car / "fs/mp/etc/mm/iap2_static.cfg").unlink()
         self.check("differs", "/tmp/iap2.cfg comes whole", "it is the stock file /fs/mp/etc/mm/iap2.cfg")

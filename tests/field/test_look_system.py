@@ -5,17 +5,17 @@ from __future__ import annotations
 
 import unittest
 
-from car import Done
+from car import SHELLS, Done
 from look_case import LookTest
 
 
 class OtherOrvaneTest(LookTest):
     """Every reliance that a system may lack, shown by a program that behaves as there."""
 
-    def check(self, text: str, question: str, seen: str = "") -> Done:
+    def check(self, text: str, question: str, seen: str = "", **given: object) -> Done:
         self.put_older_outputs()
         self.car.program("home/orvane", text)
-        done = self.look("/home/orvane")
+        done = self.look("/home/orvane", **given)
         self.assertEqual(done.status, 1)
         line = done.line(question)
         self.assertTrue(line.startswith("differs "), line)
@@ -82,6 +82,13 @@ class OtherOrvaneTest(LookTest):
         self.check('/bin/orvane "$@"\n[ $# = 0 ] || [ ! -e /tmp/iap2_device.cfg ] || '
                    "echo firmware_version=0 >/tmp/iap2_device.cfg\n", "the version arrives",
                    "no application")
+
+    def test_the_version_is_another_and_the_last_line_has_no_end(self) -> None:
+        (self.car / "fs/rwdata/.Version/b.inf").write_bytes(b"\xff \\n\n\nType=Application\nVersion Number=8")
+        for shell in SHELLS:
+            self.check('/bin/orvane "$@"\n[ $# = 0 ] || [ ! -e /tmp/iap2_device.cfg ] || '
+                       "echo firmware_version=0 >/tmp/iap2_device.cfg\n", "the version arrives",
+                       "no application", shell=shell)
 
     def test_a_tuning_file_is_missing(self) -> None:
         self.check('/bin/orvane "$@"\n[ $# = 0 ] || /bin/rm -f /tmp/speechrec_FFFF.txt\n',
