@@ -4,11 +4,27 @@
 from __future__ import annotations
 
 import os
+import resource
 import signal
+import subprocess
 import unittest
 
 from car import LOOK_UTILITIES, SHELLS, SIGNALLER, Done, snapshot
 from look_case import OLD, LookTest
+
+# Leaves iap1.cfg empty where a longer one was.
+CUTTER = """
+longer=
+[ ! -e /tmp/iap1.cfg ] || while read -r line; do
+    case $line in longer*) longer=yes ;; esac
+done </tmp/iap1.cfg
+/bin/orvane "$@"
+[ -z "$longer" ] || {
+    true >/tmp/iap1.cfg
+    FULL
+}
+exit 0
+"""
 
 
 class SomethingInThePlaceOfAnOutputTest(LookTest):
@@ -129,6 +145,42 @@ class TroubleTest(LookTest):
         self.assertRegex(done.err, r"cannot put back /tmp/iap2.cfg: it is /tmp/orvane-field-\d+-kept")
         kept = list((self.car / "tmp").glob("orvane-field-*"))
         self.assertEqual([path.read_bytes() for path in kept], [OLD])
+
+    def test_a_file_to_compare_with_cannot_be_renamed(self) -> None:
+        path = self.car.wrap('case $2 in\n*-first.iap2.cfg) exit 1 ;;\nesac\nexec /bin/mv "$@"\n', "mv")
+        done = self.look(path=path)
+        self.assertEqual(done.line("/tmp/iap2.cfg is made anew"), "unknown  /tmp/iap2.cfg is made anew "
+                         "where a longer one was: the file to compare with cannot be renamed")
+        self.assertEqual((done.status, done.lines("differs"), done.err), (0, [], ""))
+
+    def test_there_is_little_room(self) -> None:
+        """For less than one run at first, at last for the files of two."""
+        shells = list(SHELLS)
+        for size in range(1, 13):
+            shell = shells[size % len(shells)]
+            with self.subTest(shell=shell, pages=size):
+                try:
+                    done = self.look(shell=shell, room=("tmp", size * resource.getpagesize()))
+                except subprocess.SubprocessError:
+                    self.skipTest("nothing can be mounted here")
+                self.assertEqual([line for line in done.lines("differs") if "made anew" in line], [])
+                self.assertEqual("made anew" in "".join(done.lines("unknown")), size < 12)
+                self.assertEqual((done.status, done.err), (int(size < 6), ""))
+
+    def test_an_output_that_the_last_run_cuts_short(self) -> None:
+        """Only where nothing more can be written, the room is the cause."""
+        for full, word, seen in (("true", "differs", "its content is not the same"),
+                                 ("/bin/dd if=/bin/orvane of=/tmp/other 2>/dev/null", "unknown",
+                                  "it is cut short, since /tmp has no room for it")):
+            self.car.program("home/orvane", CUTTER.replace("FULL", full))
+            for shell in SHELLS:
+                with self.subTest(shell=shell, full=full):
+                    try:
+                        done = self.look("/home/orvane", shell=shell, room=("tmp", 1 << 17))
+                    except subprocess.SubprocessError:
+                        self.skipTest("nothing can be mounted here")
+                    self.assertEqual(done.line("/tmp/iap1.cfg is made anew"),
+                                     f"{word:9}/tmp/iap1.cfg is made anew where a longer one was: {seen}")
 
     def test_a_folder_is_made_in_the_place_of_an_output(self) -> None:
         self.put_older_outputs()
