@@ -37,11 +37,24 @@ class CaptureTest(unittest.TestCase):
 
     def check_success(self, done: Done) -> None:
         self.assertEqual((done.status, done.out), (0, "captured into /home/car\n"), done.err)
+        self.check_record(done, "complete")
 
     def check_failure(self, done: Done, said: str) -> None:
+        self.check_failure_without_record(done, said)
+        self.check_record(done, "not complete")
+
+    def check_failure_without_record(self, done: Done, said: str) -> None:
+        """Where there is no room for a record."""
         self.assertEqual((done.status, done.out), (1, ""), done.err)
         self.assertIn(said, done.err)
         self.assertTrue(done.err.endswith("/home/car is not complete\n"), done.err)
+        if self.captured("capture.txt").exists():
+            self.assertNotIn("complete", self.captured("capture.txt").read_text().splitlines())
+
+    def check_record(self, done: Done, last: str) -> None:
+        said = [line.removeprefix("orvane-field: ") for line in done.err.splitlines()
+                if line.startswith("orvane-field: ")]
+        self.assertEqual(self.captured("capture.txt").read_text().splitlines(), [*said, last])
 
     def again(self) -> None:
         shutil.rmtree(self.car / "home/car", ignore_errors=True)

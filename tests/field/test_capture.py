@@ -33,6 +33,7 @@ class WholeUnitTest(CaptureTest):
                           for part in ("fs", "tmp") for path in (self.car / part).rglob("*")
                           if path.is_file() and path.name != "other"}
                 wanted[DISK] = (self.car / DISK).read_bytes()[-AREA:]
+                wanted["capture.txt"] = b"/tmp/iap1.cfg: missing\ncomplete\n"
                 self.assertEqual(files, wanted)
 
     @unittest.skipUnless(is_root(), "only root can become another user")
@@ -122,6 +123,7 @@ class ToTheDeskTest(CaptureTest):
         self.assertEqual(self.tool("explain", self.captured("."), "--all"), wanted)
         self.tool("capture", self.captured("."), desk, status=(0,))
         self.assertEqual(self.tool("explain", desk, "--all"), wanted)
+        self.assertFalse((desk / "capture.txt").exists())
 
     def test_explanations_are_the_same(self) -> None:
         for name in ("airplay-image-absent", "airplay-image-empty", "airplay-template-folder",
@@ -134,6 +136,14 @@ class ToTheDeskTest(CaptureTest):
                 self.car.replace_unit(Path(folder) / "unit")
                 self.check_success(self.capture())
                 self.check_explanations(Path(folder) / "desk")
+
+    def test_the_record_is_no_part_of_the_unit(self) -> None:
+        self.check_success(self.capture())
+        with tempfile.TemporaryDirectory(prefix="orvane-field-") as folder:
+            self.tool("capture", self.captured("."), f"{folder}/desk", status=(0,))
+            self.assertEqual(self.tool("diff", self.captured("."), f"{folder}/desk", status=(0,)), "")
+            self.tool("set", f"{folder}/desk", "serial=ZZ", status=(0,))
+            self.assertIn("ZZ", self.tool("diff", self.captured("."), f"{folder}/desk", status=(1,)))
 
     def test_what_stood_in_tmp_is_compared_with_a_run(self) -> None:
         with tempfile.TemporaryDirectory(prefix="orvane-field-") as folder:
