@@ -97,6 +97,23 @@ class DiskTest(CaptureTest):
             self.check_success(self.capture())
             shutil.rmtree(self.car / "sys")
 
+    def test_a_disk_that_only_dd_can_look_at(self) -> None:
+        """As in a shell of 32 bits whose call for the size of a large disk fails."""
+        wanted = self.make_disk(3 * AREA + 7)
+        (self.car / DISK).rename(self.car / "home/disk")
+        path = self.car.wrap('for word in "$@"; do\nshift\n[ "$word" != if=/dev/hd0 ] || word=if=/home/disk\n'
+                             'set -- "$@" "$word"\ndone\nexec /bin/dd "$@"\n', "dd")
+        for shell in SHELLS:
+            for is_link in (False, True):
+                if is_link:
+                    (self.car / DISK).symlink_to("/nothing")
+                self.again()
+                done = self.capture(shell=shell, path=path)
+                self.check_success(done)
+                self.assertNotIn(DISK, done.err)
+                self.assertTrue(self.captured(DISK).read_bytes() == wanted)
+            (self.car / DISK).unlink()
+
     def failing_dd(self, condition: str) -> str:
         """A dd that fails for some blocks of the disk, as it does where one can't be read."""
         return self.car.wrap(
