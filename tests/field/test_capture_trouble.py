@@ -4,6 +4,7 @@
 from __future__ import annotations
 
 import os
+import shutil
 import signal
 import subprocess
 import unittest
@@ -63,6 +64,28 @@ class TroubleTest(CaptureTest):
             self.check_failure(done, f"/{VERSIONS}/(not printable): a pipe is not read\n")
             self.assertEqual(done.err.count("a pipe is not read\n"), 3)
             self.assertNotIn("\x1b", done.err)
+
+    def test_folders_that_a_terminal_would_obey(self) -> None:
+        for name in ("a\x1b[2J", "b\\033[2J", "c\\c", "d\n\ne"):
+            for shell in SHELLS:
+                with self.subTest(name=name, shell=shell):
+                    done = self.car.run("capture", name, shell=shell)
+                    self.assertEqual((done.status, done.out), (0, "captured into (not printable)\n"))
+                    self.assertTrue((self.car / "home" / name / DISK).is_file())
+                    done = self.car.run("capture", name, shell=shell)
+                    self.assertEqual((done.status, done.err),
+                                     (2, "orvane-field: (not printable) is not empty\n"))
+                    shutil.rmtree(self.car / "home" / name)
+                    (self.car / DISK).rename(self.car / "home/disk")
+                    os.mkfifo(self.car / DISK)
+                    done = self.car.run("capture", name, shell=shell)
+                    self.assertTrue(done.err.endswith("orvane-field: (not printable) is not complete\n"))
+                    (self.car / "home/disk").rename(self.car / DISK)
+                    shutil.rmtree(self.car / "home" / name)
+                    done = self.car.run("capture", name, shell=shell, largest_file=1)
+                    self.assertEqual((done.status, done.err.splitlines()[-1]),
+                                     (1, "orvane-field: cannot write (not printable): (not printable) is not complete"))
+                    shutil.rmtree(self.car / "home" / name)
 
     def test_names_that_the_folder_takes_for_one(self) -> None:
         """As on a stick, where upper and lower case are the same."""

@@ -226,6 +226,19 @@ class UnitThatLacksSomethingTest(LookTest):
         self.assertEqual(done.line("where /tmp lies"),
                          "ok       where /tmp lies: /tmp is a link to /home/tmp")
 
+    def test_a_place_that_a_terminal_would_obey(self) -> None:
+        (self.car / "tmp").rename(self.car / "home/t\x1b[2J")
+        (self.car / "tmp").symlink_to("home/t\x1b[2J")
+        path = self.car.wrap("echo 'a on /fs type qn\033[2Jx6'\n", "mount")
+        for shell in SHELLS:
+            done = self.car.run("look", path=path, shell=shell)
+            self.assertEqual(done.line("where /tmp lies"),
+                             "ok       where /tmp lies: /tmp is a link to (not printable)")
+            self.assertEqual(done.line("where the image lies"),
+                             "ok       where the image lies: /fs/tmpfs, mounted at (not printable); a file")
+            done = self.car.run("look", "/home/a\\033[2J", shell=shell)
+            self.assertEqual(done.err, "orvane-field: (not printable) is not a program here\n")
+
     def test_tmp_is_shared_memory(self) -> None:
         (self.car / "dev/shmem").mkdir()
         shutil.rmtree(self.car / "tmp")
@@ -246,6 +259,8 @@ class UnitThatLacksSomethingTest(LookTest):
         for said, line in (
                 ("libc.so.3 => /lib/libc.so.3 (0x1)\nlibm.so.2 => /lib/libm.so.2 (0x2)",
                  "ok       the libraries that it finds: /lib/libc.so.3 /lib/libm.so.2"),
+                ("libx.so => /bin/* (0x1)\nliby.so => /lib/\033y", "ok       the libraries that it finds: "
+                 "/bin/* (not printable)"),
                 ("libc.so.3 => /lib/libc.so.3 (0x1)\nlibgone.so => not found",
                  "differs  the libraries that it finds: libgone.so => not found"),
                 ("not a dynamic executable", "ok       the libraries that it finds: it needs none"),
