@@ -83,8 +83,9 @@ class TroubleTest(CaptureTest):
                     (self.car / "home/disk").rename(self.car / DISK)
                     shutil.rmtree(self.car / "home" / name)
                     done = self.car.run("capture", name, shell=shell, largest_file=1)
-                    self.assertEqual((done.status, done.err.splitlines()[-1]),
-                                     (1, "orvane-field: cannot write (not printable): (not printable) is not complete"))
+                    self.assertEqual(done.status, 1)
+                    self.assertTrue(done.err.endswith("orvane-field: cannot write (not printable): "
+                                                      "(not printable) is not complete\n"))
                     shutil.rmtree(self.car / "home" / name)
 
     def test_names_that_the_folder_takes_for_one(self) -> None:
