@@ -216,7 +216,9 @@ class Car:
                 os.setgroups([])
                 os.setgid(NOBODY)
                 os.setuid(NOBODY)
-            signal.signal(signal.SIGPIPE, signal.SIG_DFL)
+            # What is ignored from the start, as in a job in the background, no shell can trap.
+            for number in (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGPIPE):
+                signal.signal(number, signal.SIG_DFL)
             if given.largest_file is not None:
                 # Python ignores the signal of the limit, and so does what it starts.
                 resource.setrlimit(resource.RLIMIT_FSIZE, (given.largest_file,) * 2)
