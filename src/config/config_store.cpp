@@ -21,10 +21,9 @@ constexpr mode_t SHM_MODE = 0640;
 
 CalibrationPath composeCalibrationPath() {
     CalibrationPath path;
-    char* const slash = std::copy(std::begin(CAL_FILE_DIR), std::end(CAL_FILE_DIR), path.data()) -
-                        1; // over the NUL
-    *slash = '/';
-    std::copy(std::begin(CAL_FILE_NAME), std::end(CAL_FILE_NAME), slash + 1);
+    char* const end = std::copy(std::begin(CAL_FILE_DIR), std::end(CAL_FILE_DIR), path.data());
+    end[-1] = '/'; // over the NUL
+    std::copy(std::begin(CAL_FILE_NAME), std::end(CAL_FILE_NAME), end);
     return path;
 }
 

@@ -5,23 +5,13 @@ from __future__ import annotations
 
 import os
 import shutil
-import unittest
 from pathlib import Path
 
-from car import Car, Done, snapshot
+from car import Done, snapshot
+from car_case import CarTest
 
 
-class CaptureTest(unittest.TestCase):
-    car: Car
-
-    @classmethod
-    def setUpClass(cls) -> None:
-        cls.car = Car()
-        cls.addClassCleanup(cls.car.close)
-
-    def setUp(self) -> None:
-        self.car.reset()
-
+class CaptureTest(CarTest):
     def capture(self, **given: object) -> Done:
         """Captures into /home/car, and requires that the unit itself stays as it is."""
         parts = [self.car / name for name in ("fs", "dev/hd0", "tmp")]

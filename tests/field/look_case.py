@@ -4,24 +4,14 @@
 from __future__ import annotations
 
 import subprocess
-import unittest
 
-from car import ORVANE_UNIT, OUTPUTS, Car, Done, snapshot
+from car import ORVANE_UNIT, OUTPUTS, Done, snapshot
+from car_case import CarTest
 
 OLD = b"of an earlier boot\n" * 200
 
 
-class LookTest(unittest.TestCase):
-    car: Car
-
-    @classmethod
-    def setUpClass(cls) -> None:
-        cls.car = Car()
-        cls.addClassCleanup(cls.car.close)
-
-    def setUp(self) -> None:
-        self.car.reset()
-
+class LookTest(CarTest):
     def set(self, *assignments: str) -> None:
         marker = self.car / ".orvane-unit"
         marker.write_text("made by orvane-unit, layout 1\n")

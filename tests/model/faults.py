@@ -155,18 +155,24 @@ def parse_arguments() -> argparse.Namespace:
     parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     parser.add_argument("--short-transfer", help="short_transfer, built anew when not given")
     parser.add_argument("--jobs", type=int, default=2)
-    # No call has five faults, so every kind of them is among each fifth.
     parser.add_argument("--every", type=int, default=1, help="only each N-th fault, such as 5")
     return parser.parse_args()
 
 
+def kinds(injections: list[Injection]) -> set[tuple[str, str, str]]:
+    return {(each.call.operation, each.fault.kind, each.fault.error) for each in injections}
+
+
 def run_all(tools: Tools, jobs: int, every: int) -> int:
-    injections = [
+    all_of_them = [
         Injection(index, call, fault, tools)
         for index, scenario in enumerate(SCENARIOS)
         for call in calls_of(scenario, tools)
         for fault in faults_of(call)
-    ][::every]
+    ]
+    injections = all_of_them[::every]
+    if kinds(injections) != kinds(all_of_them):
+        raise SystemExit(f"faults: every {every}th leaves out a kind of fault")
     injected: Counter[tuple[int, str]] = Counter()
     agreed: Counter[tuple[int, str]] = Counter()
     with multiprocessing.Pool(jobs) as pool:
