@@ -3,9 +3,9 @@
 // The text of a unit's description. What is refused, is refused with its place; what is taken comes
 // back, to the byte, through the text that is made of it.
 #include "fuzz/support.h"
-#include "kit/description_text.h"
-#include "kit/kit_error.h"
-#include "kit/unit.h"
+#include "kit/description/description_text.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/kit_error.h"
 
 #include <algorithm>
 #include <cctype>

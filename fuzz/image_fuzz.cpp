@@ -5,7 +5,7 @@
 #include "config/config_store.h"
 #include "config/param_access.h"
 #include "fuzz/support.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 
 #include <sys/mman.h>
 #include <unistd.h>

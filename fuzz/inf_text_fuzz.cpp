@@ -6,7 +6,7 @@
 #include "fuzz/support.h"
 #include "identity/inf_file.h"
 #include "identity/software_version.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 
 #include <array>
 #include <cstddef>

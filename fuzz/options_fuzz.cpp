@@ -4,8 +4,8 @@
 // /proc/self/cmdline; at most 32, of at most 64 bytes each, and none from the one on that would
 // make it more than 16 letters that run a writer: those take nearly all of the time.
 #include "fuzz/support.h"
-#include "kit/descriptor.h"
-#include "kit/kit_error.h"
+#include "kit/host/descriptor.h"
+#include "kit/host/kit_error.h"
 #include "main/options.h"
 
 #include <sys/inotify.h>

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "fuzz/support.h"
 
-#include "kit/kit_error.h"
-#include "kit/root.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
 
 #include <fcntl.h>
 #include <sanitizer/asan_interface.h>

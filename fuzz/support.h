@@ -3,7 +3,7 @@
 // What every fuzz target needs: a unit to run the product in, and a way to say what is wrong.
 #pragma once
 
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 
 #include <cstddef>
 #include <cstdint>

@@ -6,8 +6,8 @@
 #include "config/boot_disk.h"
 #include "fuzz/support.h"
 #include "fuzz/tuning_reading.h"
-#include "kit/descriptor.h"
-#include "kit/kit_error.h"
+#include "kit/host/descriptor.h"
+#include "kit/host/kit_error.h"
 #include "tuning/tuning_file.h"
 
 #include <unistd.h>

@@ -5,8 +5,8 @@
 // chooses how the text begins: 0 for what the input says, any other for a whole tuning file in
 // which a line, by the remainder, is replaced by the rest of the input.
 #include "fuzz/support.h"
-#include "kit/kit_error.h"
-#include "kit/tuning_text.h"
+#include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_text.h"
 #include "tuning/dps_block.h"
 #include "tuning/tuning_file.h"
 

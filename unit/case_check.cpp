@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/case_check.h"
 
-#include "kit/kit_error.h"
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
 #include "unit/explain.h"
 #include "unit/explanation.h"
 #include "unit/scratch_folder.h"

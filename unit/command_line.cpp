@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/command_line.h"
 
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 #include "unit/commands.h"
 #include "unit/contents_text.h"
 #include "unit/terminal.h"

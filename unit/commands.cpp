@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/commands.h"
 
-#include "kit/capture_unit.h"
-#include "kit/description_text.h"
-#include "kit/edit.h"
-#include "kit/inspect.h"
-#include "kit/inspect_inputs.h"
-#include "kit/unit.h"
+#include "kit/description/description_text.h"
+#include "kit/description/unit_description.h"
+#include "kit/unit/capture_unit.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/describe_unit.h"
+#include "kit/unit/edit.h"
 #include "unit/contents.h"
 #include "unit/contents_text.h"
 #include "unit/explain.h"

@@ -3,8 +3,8 @@
 
 #include "config/param_catalogue.h"
 #include "identity/inf_file.h"
-#include "kit/non_zero_runs.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/sparse_content.h"
 #include "tuning/dps_block.h"
 #include "unit/explanation.h"
 #include "unit/reasons.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/explain.h"
 
-#include "kit/root.h"
+#include "kit/enter/root.h"
 #include "unit/explain_files.h"
 #include "unit/planned_files.h"
 

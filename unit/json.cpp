@@ -3,7 +3,7 @@
 
 #include "config/param_catalogue.h"
 #include "identity/inf_file.h"
-#include "kit/utf8.h"
+#include "kit/host/utf8.h"
 #include "tuning/dps_block.h"
 #include "unit/contents_text.h"
 #include "unit/reasons.h"

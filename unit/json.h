@@ -5,7 +5,7 @@
 // rest. Bytes are a text where they are UTF-8, else {"hex": "..."}.
 #pragma once
 
-#include "kit/root.h"
+#include "kit/enter/root.h"
 #include "unit/case_check.h"
 #include "unit/contents.h"
 #include "unit/explanation.h"

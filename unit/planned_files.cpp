@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/planned_files.h"
 
-#include "kit/output_place.h"
+#include "kit/host/output_place.h"
 #include "unit/whole_file.h"
 
 #include <sys/stat.h>

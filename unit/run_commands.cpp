@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The commands that run orvane itself.
-#include "kit/kit_error.h"
-#include "kit/marker.h"
-#include "kit/root.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/marker.h"
 #include "unit/case_check.h"
 #include "unit/commands.h"
 #include "unit/json.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/scratch_folder.h"
 
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 
 #include <cstdlib>
 #include <string>

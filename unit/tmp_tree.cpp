@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "unit/tmp_tree.h"
 
-#include "kit/root.h"
+#include "kit/enter/root.h"
 #include "unit/whole_file.h"
 
 #include <system_error>

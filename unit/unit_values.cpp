@@ -6,7 +6,7 @@
 #include "config/crc32.h"
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
-#include "kit/inspect.h"
+#include "kit/unit/describe_unit.h"
 #include "tuning/dps_block.h"
 #include "unit/contents.h"
 #include "unit/terminal.h"

@@ -4,7 +4,7 @@
 // and such with a path for all else that a run can meet.
 #pragma once
 
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
 
 #include <algorithm>
 #include <string>

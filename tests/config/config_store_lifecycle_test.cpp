@@ -3,7 +3,7 @@
 // What ConfigStore holds over its life: close, close again, destruction, and a second open.
 #include "config/config_store.h"
 #include "config/param_access.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 #include "tests/config/freed_standard_input.h"
 #include "tests/config/memory_map.h"
 #include "tests/support/unit_test.h"

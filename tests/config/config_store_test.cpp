@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/config_store.h"
 #include "config/param_access.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 #include "tests/config/memory_map.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"

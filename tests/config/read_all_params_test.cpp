@@ -2,7 +2,7 @@
 //
 // The bulk reader of param_access.h.
 #include "config/param_access.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 #include "tests/support/unit_test.h"
 
 #include <fcntl.h>

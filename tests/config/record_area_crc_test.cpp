@@ -2,7 +2,7 @@
 //
 // recordAreaCrc of record_area.h.
 #include "config/record_area.h"
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 #include "tests/config/area_disk.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"

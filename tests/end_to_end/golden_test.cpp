@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A unit in, its /tmp out: tests/golden/CASE holds the unit, the arguments and what must be left.
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
 #include "main/options.h"
 #include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"

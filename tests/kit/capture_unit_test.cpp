@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/capture_unit.h"
-#include "kit/inspect.h"
-#include "kit/inspect_inputs.h"
-#include "kit/kit_error.h"
-#include "kit/marker.h"
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/capture_unit.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/describe_unit.h"
+#include "kit/unit/marker.h"
 #include "tests/kit/source_unit.h"
 
 #include <gtest/gtest.h>

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/kit_error.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/kit_error.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/description_text.h"
-#include "kit/toml_text.h"
+#include "kit/description/description_text.h"
+#include "kit/description/toml_text.h"
 #include "tests/kit/random_unit.h"
 
 #include <gtest/gtest.h>

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/edit.h"
-#include "kit/inspect.h"
-#include "kit/kit_error.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_unit.h"
+#include "kit/unit/edit.h"
 #include "tests/kit/unit_tree.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // What setValues refuses, and that nothing is changed by then.
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 #include "tests/kit/edit_fixture.h"
 
 #include <gtest/gtest.h>

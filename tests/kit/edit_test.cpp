@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/tuning_encode.h"
+#include "kit/tuning/tuning_encode.h"
 #include "tests/kit/edit_fixture.h"
 #include "tests/kit/open_descriptors.h"
 #include "tuning/tuning_file.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/capture.h"
-#include "kit/kit_error.h"
-#include "kit/root.h"
+#include "kit/enter/child_output.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
 #include "tests/kit/open_descriptors.h"
 #include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/finished_folder.h"
-#include "kit/kit_error.h"
+#include "kit/host/finished_folder.h"
+#include "kit/host/kit_error.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"

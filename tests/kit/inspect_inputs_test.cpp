@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/inspect_inputs.h"
-#include "kit/kit_error.h"
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_inputs.h"
 #include "tests/kit/source_unit.h"
 #include "tests/support/permissions.h"
 

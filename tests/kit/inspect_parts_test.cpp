@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/host_file.h"
-#include "kit/inspect.h"
-#include "kit/tuning_encode.h"
+#include "kit/host/host_file.h"
+#include "kit/tuning/tuning_encode.h"
+#include "kit/unit/describe_unit.h"
 #include "tests/kit/random_unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

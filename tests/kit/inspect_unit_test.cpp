@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/description_text.h"
-#include "kit/host_file.h"
-#include "kit/inspect.h"
-#include "kit/kit_error.h"
+#include "kit/description/description_text.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_unit.h"
 #include "tests/kit/random_unit.h"
 #include "tests/kit/unit_tree.h"
 #include "tests/support/permissions.h"

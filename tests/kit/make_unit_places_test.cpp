@@ -2,7 +2,7 @@
 //
 // What gives way to what when a unit is made: standard folders, image and disk to files, links,
 // folders and absent paths.
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
 #include "tests/kit/unit_tree.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

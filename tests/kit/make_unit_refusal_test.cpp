@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // What makeUnit refuses, and that nothing is left of it.
-#include "kit/kit_error.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/kit_error.h"
 #include "tests/kit/open_descriptors.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/temporary_folder.h"

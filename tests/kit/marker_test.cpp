@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/kit_error.h"
-#include "kit/marker.h"
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/marker.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/host_file.h"
-#include "kit/kit_error.h"
-#include "kit/non_zero_runs.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/host/sparse_content.h"
 #include "tests/kit/random_unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

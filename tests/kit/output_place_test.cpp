@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/output_place.h"
+#include "kit/host/output_place.h"
 #include "tests/support/unit_test.h"
 
 #include <fcntl.h>

@@ -3,8 +3,8 @@
 // Random parts of units, odd ones among them. The same seed gives the same unit everywhere.
 #pragma once
 
-#include "kit/unit.h"
-#include "kit/unit_misfit.h"
+#include "kit/description/conflicts.h"
+#include "kit/description/unit_description.h"
 #include "tuning/dps_block.h"
 
 #include <cstdint>

@@ -4,8 +4,8 @@
 #include "config/config_store.h"
 #include "config/param_access.h"
 #include "config/record_area.h"
-#include "kit/root.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
@@ -47,7 +47,7 @@ bool isZero(const DpsBlock& block) {
 }
 
 TEST_F(SampleUnitTest, IsTheFileThatOneMayCopy) {
-    EXPECT_EQ(kit::sampleDescriptionText(), readFile(ORVANE_DOCS_DIR "/../kit/sample/unit.toml"));
+    EXPECT_EQ(kit::sampleDescriptionText(), readFile(ORVANE_DOCS_DIR "/../kit/description/sample_unit.toml"));
 }
 
 TEST_F(SampleUnitTest, IsOfTheSecondBrandWithAGeneratedAudioProfile) {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/kit_error.h"
-#include "kit/tuning_encode.h"
+#include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_encode.h"
 
 #include <gtest/gtest.h>
 

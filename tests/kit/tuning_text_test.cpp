@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/kit_error.h"
-#include "kit/tuning_encode.h"
-#include "kit/tuning_text.h"
+#include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_encode.h"
+#include "kit/tuning/tuning_text.h"
 #include "tests/kit/random_unit.h"
 #include "tuning/tuning_file.h"
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/kit_error.h"
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/kit_error.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 

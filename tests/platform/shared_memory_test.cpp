@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/descriptor.h"
+#include "kit/host/descriptor.h"
 #include "platform/shared_memory.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"

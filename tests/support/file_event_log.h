@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/descriptor.h"
-#include "kit/kit_error.h"
+#include "kit/host/descriptor.h"
+#include "kit/host/kit_error.h"
 
 #include <sys/inotify.h>
 #include <unistd.h>

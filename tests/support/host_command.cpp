@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/support/host_command.h"
 
-#include "kit/capture.h"
-#include "kit/kit_error.h"
+#include "kit/enter/child_output.h"
+#include "kit/host/kit_error.h"
 
 #include <unistd.h>
 

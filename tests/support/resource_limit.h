@@ -3,7 +3,7 @@
 // Limits of the kernel, for faults that come from outside the product and hit a superuser as well.
 #pragma once
 
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 
 #include <fcntl.h>
 #include <sys/resource.h>

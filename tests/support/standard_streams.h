@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 
 #include <fcntl.h>
 #include <unistd.h>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/boot_disk.h"
 #include "config/config_store.h"
-#include "kit/non_zero_runs.h"
+#include "kit/host/sparse_content.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
 #include "unit/contents.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/unit.h"
+#include "kit/description/unit_description.h"
 #include "tests/support/temporary_folder.h"
 
 #include <filesystem>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/marker.h"
+#include "kit/unit/marker.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
 #include "tests/unit/tree_state.h"

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/inspect.h"
-#include "kit/kit_error.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/unit/described_unit.h"
 #include "unit/impact.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The one place that parses the reports again.
-#include "kit/inspect_inputs.h"
+#include "kit/unit/describe_inputs.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"

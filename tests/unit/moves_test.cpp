@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/boot_disk.h"
 #include "config/config_store.h"
-#include "kit/inspect_inputs.h"
+#include "kit/unit/describe_inputs.h"
 #include "tests/unit/described_unit.h"
 #include "unit/explain.h"
 #include "unit/moves.h"

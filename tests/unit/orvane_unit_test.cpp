@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The program orvane-unit from its command line to its exit status.
-#include "kit/capture.h"
-#include "kit/kit_error.h"
-#include "kit/marker.h"
+#include "kit/enter/child_output.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/marker.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"

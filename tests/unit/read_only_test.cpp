@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The commands that only read, on a unit that orvane-unit has not made: a real one.
-#include "kit/marker.h"
+#include "kit/unit/marker.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"

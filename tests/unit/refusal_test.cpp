@@ -2,7 +2,7 @@
 //
 // Wrong use and bad input: exit status 2, a complaint on standard error, nothing on standard
 // output.
-#include "kit/marker.h"
+#include "kit/unit/marker.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"

@@ -2,7 +2,7 @@
 //
 // Kinds of values that no output comes from, and changes that no value accounts for.
 #include "config/boot_disk.h"
-#include "kit/inspect_inputs.h"
+#include "kit/unit/describe_inputs.h"
 #include "tests/unit/described_unit.h"
 #include "unit/explain.h"
 #include "unit/moves.h"

@@ -1,0 +1,37 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The texts inside a description that have a form of their own. Each function throws KitError with
+// what is wrong and what would be right; where, the caller knows.
+#pragma once
+
+#include "kit/description/unit_description.h"
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace orvane::kit {
+
+/// What a text begins with whose rest is hex.
+constexpr std::string_view HEX_PREFIX = "hex:";
+
+/// The bytes of a hex text: two digits a byte, blanks and line ends ignored.
+Bytes hexBytes(std::string_view text);
+
+/// The bytes of a text that is taken as it is, or in hex when it begins with "hex:".
+Bytes textOrHexBytes(std::string_view text);
+
+/// The numbers that may stand as a key.
+struct KeyRange {
+    std::uint64_t least;
+    std::uint64_t greatest;
+};
+
+/// A number that stands as a key: decimal, or hex after "0x", in `range`. `what` names it in the
+/// error.
+std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what);
+
+/// `text` in quotes, for an error.
+std::string inQuotes(std::string_view text);
+
+} // namespace orvane::kit

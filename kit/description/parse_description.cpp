@@ -1,0 +1,74 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description/conflicts.h"
+#include "kit/description/description_reading.h"
+#include "kit/description/toml_library.h"
+#include "kit/description/toml_values.h"
+#include "kit/description/unit_description.h"
+#include "kit/description/unit_layout.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+
+#include <filesystem>
+#include <map>
+#include <optional>
+#include <string>
+#include <system_error>
+#include <utility>
+#include <vector>
+
+namespace orvane::kit {
+
+namespace {
+
+void readTable(const toml::table& table, DescriptionReading& reading) {
+    for (const auto& [key, value] : table) {
+        if (key == "folders") {
+            reading.unit.folders = readPaths(key, value, reading);
+        } else if (key == "absent") {
+            reading.unit.absent = readPaths(key, value, reading);
+        } else if (key == "image") {
+            readImage(tableOf(key, value), reading);
+        } else if (key == "disk") {
+            readDisk(tableOf(key, value), reading);
+        } else if (key == "files") {
+            readFiles(tableOf(key, value), reading);
+        } else if (key == "links") {
+            readLinks(tableOf(key, value), reading);
+        } else {
+            failUnknown(key, "a unit", "folders, absent, image, disk, files, links");
+        }
+    }
+}
+
+void failIfAny(const std::optional<Misfit>& misfit, const DescriptionReading& reading) {
+    if (misfit) {
+        failAt(reading.places.at(misfit->part), misfit->what);
+    }
+}
+
+} // namespace
+
+UnitDescription parseDescription(const std::string& text, const std::string& name) {
+    toml::table table;
+    try {
+        table = toml::parse(text, name);
+    } catch (const toml::parse_error& error) {
+        failAt(error.source(), std::string(error.description()));
+    }
+    DescriptionReading reading;
+    reading.folder = std::filesystem::path(name).parent_path();
+    readTable(table, reading);
+    failIfAny(findPathMisfit(reading.unit), reading);
+    failIfAny(findSizeMisfit(reading.unit, layoutOf(reading.unit)), reading);
+    return std::move(reading.unit);
+}
+
+UnitDescription readDescription(const std::filesystem::path& file) {
+    std::error_code error;
+    if (std::filesystem::is_directory(file, error)) {
+        throw KitError(file.string() + " is a folder, not a description");
+    }
+    return parseDescription(readStream(file), file.string());
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,122 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description/toml_text.h"
+
+#include "kit/description/description_values.h"
+#include "kit/host/utf8.h"
+
+#include <algorithm>
+#include <cstddef>
+
+namespace orvane::kit {
+
+namespace {
+
+constexpr std::size_t HEX_LINE = 32; ///< bytes
+constexpr char DIGITS[] = "0123456789abcdef";
+
+bool isControl(char c) {
+    return static_cast<unsigned char>(c) < 0x20 || c == 0x7F;
+}
+
+std::string escaped(char c) {
+    switch (c) {
+    case '\n':
+        return "\\n";
+    case '\r':
+        return "\\r";
+    case '\t':
+        return "\\t";
+    case '"':
+    case '\\':
+        return std::string("\\") + c;
+    default:
+        break;
+    }
+    const auto byte = static_cast<unsigned char>(c);
+    return std::string("\\u00") + DIGITS[byte >> 4U] + DIGITS[byte & 0xFU];
+}
+
+/// On one line, however long: a key can't have more.
+std::string hexPairs(std::string_view bytes) {
+    std::string line;
+    for (const char c : bytes) {
+        const auto byte = static_cast<unsigned char>(c);
+        line += line.empty() ? "" : " ";
+        line += DIGITS[byte >> 4U];
+        line += DIGITS[byte & 0xFU];
+    }
+    return line;
+}
+
+/// What stands between the quotes, whichever they are.
+std::string hexText(std::string_view bytes) {
+    if (bytes.size() <= HEX_LINE) {
+        return hexPairs(bytes);
+    }
+    std::string text = "\n";
+    for (std::size_t begin = 0; begin < bytes.size(); begin += HEX_LINE) {
+        text += hexPairs(bytes.substr(begin, HEX_LINE)) + '\n';
+    }
+    return text;
+}
+
+std::string betweenQuotes(const std::string& text) {
+    const std::string quotes = text.find('\n') == std::string::npos ? "\"" : R"(""")";
+    return quotes + text + quotes;
+}
+
+bool beginsWithHexPrefix(std::string_view text) {
+    return text.substr(0, HEX_PREFIX.size()) == HEX_PREFIX;
+}
+
+} // namespace
+
+bool isReadable(std::string_view text) {
+    const auto unreadable = std::count_if(text.begin(), text.end(), [](char c) {
+        return isControl(c) && c != '\n' && c != '\t' && c != '\r';
+    });
+    return static_cast<std::size_t>(unreadable) * 8 <= text.size() && isUtf8(text);
+}
+
+std::string tomlText(std::string_view text) {
+    std::string result = "\"";
+    for (const char c : text) {
+        result += isControl(c) || c == '"' || c == '\\' ? escaped(c) : std::string(1, c);
+    }
+    return result + '"';
+}
+
+std::string tomlLines(std::string_view text) {
+    const std::size_t end = text.find('\n');
+    if (end == std::string_view::npos || end + 1 == text.size()) {
+        return tomlText(text);
+    }
+    std::string result = "\"\"\"\n"; // the first line end is not part of the text
+    for (std::size_t at = 0; at < text.size(); ++at) {
+        const char c = text[at];
+        // A quote may stand as it is, but not beside another, nor before the three at the end.
+        const bool isPlainQuote = c == '"' && result.back() != '"' && at + 1 < text.size();
+        const bool isPlain =
+            c == '\n' || c == '\t' || isPlainQuote || (!isControl(c) && c != '"' && c != '\\');
+        result += isPlain ? std::string(1, c) : escaped(c);
+    }
+    return result + R"(""")";
+}
+
+std::string tomlHex(std::string_view bytes) {
+    return betweenQuotes(hexText(bytes));
+}
+
+std::string tomlTextOrHex(std::string_view bytes) {
+    return isReadable(bytes) && !beginsWithHexPrefix(bytes)
+               ? tomlText(bytes)
+               : betweenQuotes(std::string(HEX_PREFIX) + hexText(bytes));
+}
+
+std::string tomlPath(std::string_view path) {
+    return isUtf8(path) && !beginsWithHexPrefix(path)
+               ? tomlText(path)
+               : tomlText(std::string(HEX_PREFIX) + hexPairs(path));
+}
+
+} // namespace orvane::kit

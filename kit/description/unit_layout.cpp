@@ -1,0 +1,86 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description/unit_layout.h"
+
+#include "config/boot_disk.h"
+#include "config/config_store.h"
+
+#include <algorithm>
+#include <iterator>
+#include <utility>
+#include <vector>
+
+namespace orvane::kit {
+
+namespace {
+
+constexpr const char* UNIT_FOLDERS[] = {"/fs/mp/etc/mm", "/fs/rwdata/.Version", "/fs/tmpfs", "/dev",
+                                        "/tmp"};
+
+/// The folders above each entry, where nothing stands yet.
+void addFoldersAbove(const std::string& path, Layout& layout) {
+    for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
+        layout.emplace(above, EntryKind::folder);
+    }
+}
+
+/// What is there unless something else is: nothing lies below a file or a link.
+void addUnlessTaken(const std::string& path, EntryKind kind, Layout& layout) {
+    for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
+        const auto taken = layout.find(above);
+        if (taken != layout.end() && taken->second != EntryKind::folder) {
+            return;
+        }
+    }
+    layout.emplace(path, kind);
+    addFoldersAbove(path, layout);
+}
+
+} // namespace
+
+Layout layoutOf(const UnitDescription& unit) {
+    Layout layout;
+    for (const auto& [path, content] : unit.files) {
+        layout.emplace(path, EntryKind::file);
+    }
+    for (const auto& [path, content] : unit.sparseFiles) {
+        layout.emplace(path, EntryKind::sparseFile);
+    }
+    for (const auto& [path, target] : unit.links) {
+        layout.emplace(path, EntryKind::link);
+    }
+    for (const std::string& path : unit.folders) {
+        layout.emplace(path, EntryKind::folder);
+    }
+    const Layout named = layout;
+    for (const auto& [path, kind] : named) {
+        addFoldersAbove(path, layout);
+    }
+    for (const char* folder : UNIT_FOLDERS) {
+        addUnlessTaken(folder, EntryKind::folder, layout);
+    }
+    addUnlessTaken(CONFIG_SHM_NAME, EntryKind::image, layout);
+    addUnlessTaken(BOOT_DISK, EntryKind::disk, layout);
+    for (const std::string& absent : unit.absent) {
+        for (auto entry = layout.lower_bound(absent); entry != layout.end();) {
+            entry = isAtOrBelow(entry->first, absent) ? layout.erase(entry) : std::next(entry);
+        }
+    }
+    return layout;
+}
+
+std::string pathAbove(const std::string& path) {
+    return path.substr(0, path.rfind('/'));
+}
+
+bool isAtOrBelow(const std::string& path, const std::string& ancestor) {
+    return path.compare(0, ancestor.size(), ancestor) == 0 &&
+           (path.size() == ancestor.size() || path[ancestor.size()] == '/');
+}
+
+bool isStandardFolder(const std::string& path) {
+    return std::any_of(
+        std::begin(UNIT_FOLDERS), std::end(UNIT_FOLDERS),
+        [&ancestor = path](const std::string& folder) { return isAtOrBelow(folder, ancestor); });
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,32 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a description puts where: the standard folders, image and disk, and what gives way to what.
+#pragma once
+
+#include "kit/description/unit_description.h"
+
+#include <map>
+#include <string>
+
+namespace orvane::kit {
+
+enum class EntryKind { folder, file, sparseFile, link, image, disk };
+
+/// All entries of a unit by their paths, those above before those below.
+using Layout = std::map<std::string, EntryKind>;
+
+/// The layout that `unit` asks for, the folders above each entry included. Image, disk and standard
+/// folders give way to what `unit` names at their path or, but for a folder, above it. Takes it
+/// that findPathMisfit finds nothing.
+Layout layoutOf(const UnitDescription& unit);
+
+/// The path without its last name: "/tmp" for "/tmp/x", empty for "/tmp".
+std::string pathAbove(const std::string& path);
+
+/// Whether `path` is `ancestor` or lies below it.
+bool isAtOrBelow(const std::string& path, const std::string& ancestor);
+
+/// Whether every unit has the folder `path`, unless something else takes its place.
+bool isStandardFolder(const std::string& path);
+
+} // namespace orvane::kit

@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/enter/root.h"
+
+#include "kit/enter/change_root.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+
+namespace orvane::kit {
+
+namespace {
+
+/// Must not fail: to go on after that would mean to work on the unit as if it were the host.
+void leaveRoot(const Descriptor& outerRoot, const Descriptor& outerCwd) {
+    const bool isRootBack =
+        !outerRoot.isOpen() || (::fchdir(outerRoot.number()) == 0 && ::chroot(".") == 0);
+    if (!isRootBack || ::fchdir(outerCwd.number()) != 0) {
+        std::perror("cannot leave the unit");
+        std::abort();
+    }
+}
+
+} // namespace
+
+EnteredRoot::EnteredRoot(const std::filesystem::path& root)
+    : outerRoot_(::open("/", O_PATH | O_DIRECTORY | O_CLOEXEC)),
+      outerCwd_(::open(".", O_PATH | O_DIRECTORY | O_CLOEXEC)) {
+    if (!outerRoot_.isOpen() || !outerCwd_.isOpen()) {
+        throw systemError("cannot keep the present root and working directory");
+    }
+    if (isRootDirectory(root)) {
+        outerRoot_.close();
+    } else {
+        changeRoot(root);
+    }
+    if (::chdir("/") != 0) {
+        const std::string failure = systemError("cannot enter " + root.string()).what();
+        leaveRoot(outerRoot_, outerCwd_);
+        throw KitError(failure);
+    }
+}
+
+EnteredRoot::~EnteredRoot() {
+    leaveRoot(outerRoot_, outerCwd_);
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/enter/child_output.h"
+#include "kit/enter/root.h"
+#include "kit/enter/start_plan.h"
+
+#include <sys/mount.h>
+
+#include <filesystem>
+#include <optional>
+#include <system_error>
+
+namespace orvane::kit {
+
+namespace {
+
+/// The folder for /proc in a unit that has none, as long as a program needs it.
+class ProcFolder {
+public:
+    explicit ProcFolder(const std::filesystem::path& root) : folder_(root / "proc") {
+        std::error_code ignored; // a program that can't have it says so itself
+        isOurs_ = std::filesystem::create_directory(folder_, ignored);
+    }
+    ~ProcFolder() {
+        if (isOurs_) {
+            ::umount2(folder_.c_str(), MNT_DETACH); // nothing, but in a changed root (showProc)
+            std::error_code ignored;
+            std::filesystem::remove(folder_, ignored);
+        }
+    }
+    ProcFolder(const ProcFolder&) = delete;
+    ProcFolder& operator=(const ProcFolder&) = delete;
+
+private:
+    std::filesystem::path folder_;
+    bool isOurs_ = false;
+};
+
+} // namespace
+
+RunResult runInside(const std::filesystem::path& root, const Program& program) {
+    const StartPlan plan = planStart(program);
+    const std::filesystem::path absoluteRoot = std::filesystem::absolute(root);
+    std::optional<ProcFolder> proc;
+    if (plan.isDynamic) {
+        proc.emplace(absoluteRoot);
+    }
+    return runCaptured([&] {
+        enterForPlan(plan, absoluteRoot);
+        executePlan(plan);
+    });
+}
+
+} // namespace orvane::kit

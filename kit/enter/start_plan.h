@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// How a program of the host gets started when the root directory is no longer the host's: either by
+// a descriptor opened before, or by a path relative to a working directory that is still the host's
+// "/".
+#pragma once
+
+#include "kit/enter/root.h"
+#include "kit/host/descriptor.h"
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace orvane::kit {
+
+struct StartPlan {
+    Descriptor binary;             ///< open: execute this, from the unit's "/"; closed: use `file`
+    std::string file;              ///< the file to execute, relative to the host's "/"
+    std::vector<std::string> argv; ///< the whole command line
+    bool isDynamic = false;        ///< the program is started by a loader
+};
+
+/// Looks at the program and decides. Runs the loader of a dynamic one to learn where its libraries
+/// lie. Throws KitError when there is no such program or no way to start it.
+StartPlan planStart(const Program& program);
+
+/// Makes `root`, an absolute path, the "/" of this process, with the working directory from which
+/// the plan can be executed. Throws KitError when it can't.
+void enterForPlan(const StartPlan& plan, const std::filesystem::path& root);
+
+/// Executes the plan once enterForPlan has prepared its process. Opens no file, so that limits of
+/// the program can be set in between. Does not return; throws KitError on failure.
+void executePlan(const StartPlan& plan);
+
+} // namespace orvane::kit

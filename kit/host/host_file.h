@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Reading and writing a unit's files through the host's file system. Every function throws
+// KitError, the file's path in its text.
+#pragma once
+
+#include "kit/description/unit_description.h"
+#include "kit/host/descriptor.h"
+
+#include <cstdint>
+#include <filesystem>
+
+namespace orvane::kit {
+
+/// Makes `file` with `size` zero bytes, which take no room on the host's disk.
+Descriptor makeSparseFile(const std::filesystem::path& file, std::uint64_t size);
+
+/// Puts `bytes` at `offset`.
+void writeAt(const Descriptor& descriptor, const std::filesystem::path& file, std::uint64_t offset,
+             const Bytes& bytes);
+
+/// Opens without waiting for the other end of a pipe.
+Descriptor openForReading(const std::filesystem::path& file);
+
+/// Where the end is, by a seek: devices tell their size in no other way.
+std::uint64_t sizeOf(const Descriptor& descriptor, const std::filesystem::path& file);
+
+/// `length` bytes from `offset` on; fewer only where the file ends.
+Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, std::uint64_t offset,
+             std::uint64_t length);
+
+/// All bytes, up to the size that sizeOf tells.
+Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file);
+
+/// All bytes up to the end of `file`, which may be a pipe.
+Bytes readStream(const std::filesystem::path& file);
+
+/// All bytes of the regular file `file`, a link to one included, of at most `limit` bytes.
+Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit);
+
+/// Whether `folder` is this process's "/", by whatever name. Throws nothing.
+bool isRootDirectory(const std::filesystem::path& folder);
+
+} // namespace orvane::kit

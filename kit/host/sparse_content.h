@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a mostly empty file or device holds, without a look at the zeros one by one.
+#pragma once
+
+#include "kit/description/unit_description.h"
+#include "kit/host/descriptor.h"
+
+#include <cstdint>
+#include <filesystem>
+#include <map>
+#include <string_view>
+
+namespace orvane::kit {
+
+/// So many zero bytes or more between two others end a run; fewer are part of it.
+constexpr std::uint64_t RUN_GAP = 16;
+
+/// The runs of bytes that are not zero, by offset. Each begins and ends with such a byte.
+using Runs = std::map<std::uint64_t, Bytes>;
+
+/// The runs of `bytes`, which stand at `offset`.
+Runs nonZeroRuns(std::string_view bytes, std::uint64_t offset = 0);
+
+/// The runs of the first `size` bytes of a file or device; holes are skipped where it tells them.
+/// Throws KitError, `file` in its text.
+Runs nonZeroRuns(const Descriptor& descriptor, const std::filesystem::path& file,
+                 std::uint64_t size);
+
+/// Whether all of `bytes` are zero.
+bool isAllZero(std::string_view bytes);
+
+/// `bytes` without the zeros at their end.
+Bytes withoutEndZeros(const Bytes& bytes);
+
+} // namespace orvane::kit

@@ -1,0 +1,156 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/tuning/tuning_encode.h"
+
+#include "kit/host/kit_error.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <map>
+#include <variant>
+#include <vector>
+
+namespace orvane::kit {
+
+namespace {
+
+bool hasWords(const DpsField& field) {
+    return field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord;
+}
+
+std::string rangeText(const DpsField& field) {
+    return std::to_string(leastOf(field)) + " to " + std::to_string(greatestOf(field));
+}
+
+/// The code of `word` in the field's own table.
+std::int64_t codeOf(const DpsField& field, const std::string& word) {
+    if (!hasWords(field)) {
+        throw KitError(std::string(field.key) + " takes numbers, not the word \"" + word + "\"");
+    }
+    std::string known;
+    for (const QwaWord& row : wordsOf(field)) {
+        if (word == row.word) {
+            return row.code;
+        }
+        known += std::string(row.word) + ", ";
+    }
+    throw KitError(std::string(field.key) + " has no word \"" + word + "\": it takes " + known +
+                   "or a code " + rangeText(field));
+}
+
+/// The value as a list of numbers, whatever it was.
+std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& value) {
+    if (const auto* list = std::get_if<std::vector<std::int64_t>>(&value)) {
+        if (field.kind != DpsKind::list) {
+            throw KitError(std::string(field.key) + " takes one value, not a list");
+        }
+        return *list;
+    }
+    if (const auto* word = std::get_if<std::string>(&value)) {
+        return {codeOf(field, *word)};
+    }
+    if (field.kind == DpsKind::list) {
+        throw KitError(std::string(field.key) + " takes a list of " + std::to_string(field.count) +
+                       " numbers, not " + std::to_string(std::get<std::int64_t>(value)));
+    }
+    return {std::get<std::int64_t>(value)};
+}
+
+/// Puts one number, known to be in range.
+void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std::int64_t number) {
+    const auto bits = static_cast<std::uint16_t>(number); // two's complement
+    const std::size_t at = field.offset + element * dpsElementSize(field.encoding);
+    switch (field.encoding) {
+    case DpsEncoding::code2:
+        block.bytes[at] = static_cast<std::uint8_t>((block.bytes[at] & ~(3U << field.bit)) |
+                                                    (unsigned{bits} << field.bit));
+        break;
+    case DpsEncoding::i16:
+        block.bytes[at + 1] = static_cast<std::uint8_t>(bits >> 8U);
+        [[fallthrough]];
+    case DpsEncoding::u8:
+        block.bytes[at] = static_cast<std::uint8_t>(bits);
+        break;
+    }
+}
+
+} // namespace
+
+bool isTuningField(const std::string& key) {
+    return std::any_of(DPS_LAYOUT.begin(), DPS_LAYOUT.end(),
+                       [&key](const DpsField& row) { return key == row.key; });
+}
+
+const DpsField& tuningField(const std::string& key) {
+    const auto* field = std::find_if(DPS_LAYOUT.begin(), DPS_LAYOUT.end(),
+                                     [&key](const DpsField& row) { return key == row.key; });
+    if (field == DPS_LAYOUT.end()) {
+        throw KitError("there is no tuning field \"" + key + "\"");
+    }
+    return *field;
+}
+
+void encodeTuningField(DpsBlock& block, const std::string& key, const TuningValue& value) {
+    const DpsField& field = tuningField(key);
+    const std::vector<std::int64_t> numbers = numbersOf(field, value);
+    if (numbers.size() != field.count) {
+        throw KitError(key + " takes " + std::to_string(field.count) + " numbers, not " +
+                       std::to_string(numbers.size()));
+    }
+    for (const std::int64_t number : numbers) {
+        if (number < leastOf(field) || number > greatestOf(field)) {
+            throw KitError(key + " takes " + rangeText(field) + ": " + std::to_string(number) +
+                           " does not fit");
+        }
+    }
+    for (std::size_t i = 0; i < numbers.size(); ++i) {
+        putNumber(block, field, i, numbers[i]);
+    }
+}
+
+DpsBlock encodeTuningBlock(const TuningDescription& description) {
+    if (description.raw.size() > DPS_BLOCK_SIZE) {
+        throw KitError("a tuning block has " + std::to_string(DPS_BLOCK_SIZE) + " bytes, not " +
+                       std::to_string(description.raw.size()));
+    }
+    DpsBlock block{};
+    std::copy(description.raw.begin(), description.raw.end(), block.bytes.begin());
+    for (const auto& [key, value] : description.fields) {
+        encodeTuningField(block, key, value);
+    }
+    return block;
+}
+
+std::int64_t leastOf(const DpsField& field) {
+    return field.encoding == DpsEncoding::i16 ? -32768 : 0;
+}
+
+std::int64_t greatestOf(const DpsField& field) {
+    switch (field.encoding) {
+    case DpsEncoding::code2:
+        return 3;
+    case DpsEncoding::u8:
+        return 255;
+    case DpsEncoding::i16:
+        break;
+    }
+    return 32767;
+}
+
+const std::array<QwaWord, 3>& wordsOf(const DpsField& field) {
+    return field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords;
+}
+
+std::string tuningWord(const DpsField& field, std::int64_t code) {
+    return hasWords(field) ? qwaWord(wordsOf(field), static_cast<std::int32_t>(code)) : "";
+}
+
+DpsBlock withoutFields(DpsBlock block) {
+    for (const DpsField& field : DPS_LAYOUT) {
+        for (std::size_t element = 0; element < field.count; ++element) {
+            putNumber(block, field, element, 0);
+        }
+    }
+    return block;
+}
+
+} // namespace orvane::kit

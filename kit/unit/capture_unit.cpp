@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/unit/capture_unit.h"
+
+#include "kit/description/unit_description.h"
+#include "kit/unit/redact_serial.h"
+#include "kit/unit/unit_inputs.h"
+
+#include <utility>
+
+namespace orvane::kit {
+
+void captureUnit(const std::filesystem::path& source, const std::filesystem::path& root,
+                 bool redactsSerial) {
+    UnitInputs inputs = readInputs(source);
+    if (redactsSerial) {
+        redactSerial(inputs);
+    }
+    makeUnit(describeInputs(std::move(inputs)), root);
+}
+
+} // namespace orvane::kit

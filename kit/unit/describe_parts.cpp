@@ -1,0 +1,181 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "config/param_catalogue.h"
+#include "config/record_slots.h"
+#include "kit/description/conflicts.h"
+#include "kit/description/unit_description.h"
+#include "kit/host/descriptor.h"
+#include "kit/host/host_file.h"
+#include "kit/host/sparse_content.h"
+#include "kit/tuning/tuning_encode.h"
+#include "kit/unit/describe_unit.h"
+#include "tuning/dps_block.h"
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <filesystem>
+#include <functional>
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <variant>
+#include <vector>
+
+namespace orvane::kit {
+
+namespace {
+
+constexpr std::uint32_t SLOT_OF_SLOTS = 15; ///< slots 1 to 9 once more
+constexpr std::uint32_t FIRST_SLOT_BEHIND_GAP = 10;
+
+/// Gives a part of `area` and leaves zeros in its place.
+Bytes takePart(Bytes& area, std::int64_t begin, std::size_t length) {
+    const auto at = static_cast<std::size_t>(begin);
+    Bytes part = area.substr(at, length);
+    area.replace(at, part.size(), part.size(), '\0');
+    return part;
+}
+
+/// Takes the slots out of `area`, the record area.
+void takeSlots(Bytes& area, DiskDescription& disk) {
+    for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
+        std::uint32_t size = 0;
+        std::uint64_t offset = 0;
+        recordSlotLayout(slot, size, offset);
+        if (slot == SLOT_OF_SLOTS) {
+            continue;
+        }
+        const Bytes bytes =
+            withoutEndZeros(takePart(area, static_cast<std::int64_t>(offset), size));
+        if (!bytes.empty()) {
+            disk.slots.emplace(slot, bytes);
+        }
+    }
+}
+
+void takeTuning(Bytes& area, DiskDescription& disk) {
+    for (std::uint32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
+        const auto begin = static_cast<std::int64_t>(id * DPS_BLOCK_SIZE);
+        const Bytes bytes =
+            takePart(area, RECORD_AREA_SIZE - TUNING_AREA_START + begin, DPS_BLOCK_SIZE);
+        if (!isAllZero(bytes)) {
+            DpsBlock block{};
+            std::copy(bytes.begin(), bytes.end(), block.bytes.begin());
+            disk.tuning.emplace(id, describeTuningBlock(block));
+        }
+    }
+}
+
+std::int64_t slotOffset(std::uint32_t slot) {
+    std::uint32_t size = 0;
+    std::uint64_t offset = 0;
+    recordSlotLayout(slot, size, offset);
+    return static_cast<std::int64_t>(offset);
+}
+
+/// Where a group of parts that were taken begins, from the area's base: what is left before and
+/// behind it must not become one run. Slots 0 to 9 stand at the base.
+std::array<std::int64_t, 5> bordersOfParts() {
+    return {0, slotOffset(FIRST_SLOT_BEHIND_GAP), RECORD_AREA_SIZE - AUX_AREA_START,
+            RECORD_AREA_SIZE - TUNING_AREA_START, RECORD_AREA_SIZE};
+}
+
+/// `area` is the record area, the last part of the disk.
+void describeRecordArea(Bytes area, DiskDescription& disk) {
+    takeSlots(area, disk);
+    const Bytes aux =
+        withoutEndZeros(takePart(area, RECORD_AREA_SIZE - AUX_AREA_START, AUX_AREA_SIZE));
+    if (!aux.empty()) {
+        disk.aux = aux;
+    }
+    takeTuning(area, disk);
+    const std::uint64_t base = disk.size - static_cast<std::uint64_t>(RECORD_AREA_SIZE);
+    const auto borders = bordersOfParts();
+    for (std::size_t border = 1; border < borders.size(); ++border) {
+        const auto begin = static_cast<std::size_t>(borders[border - 1]);
+        const auto end = static_cast<std::size_t>(borders[border]);
+        disk.bytes.merge(
+            nonZeroRuns(std::string_view(area).substr(begin, end - begin), base + begin));
+    }
+}
+
+bool hasRecordArea(std::uint64_t size) {
+    return size >= static_cast<std::uint64_t>(RECORD_AREA_SIZE);
+}
+
+} // namespace
+
+ImageDescription describeImage(const Bytes& image) {
+    ImageDescription description;
+    description.size = static_cast<std::uint32_t>(image.size());
+    Bytes rest = image;
+    for (std::uint16_t number = 1; number <= PARAM_COUNT; ++number) {
+        const ParamPlace place = paramPlace(number);
+        if (place.offset + place.size > image.size()) {
+            continue;
+        }
+        const Bytes bytes = takePart(rest, place.offset, place.size);
+        unsigned value = 0;
+        for (std::size_t i = 0; i < bytes.size(); ++i) {
+            value |= unsigned{static_cast<unsigned char>(bytes[i])} << (8 * i);
+        }
+        if (value != 0) {
+            description.params.emplace(number, static_cast<std::uint16_t>(value));
+        }
+    }
+    for (auto& [offset, bytes] : nonZeroRuns(rest)) {
+        description.bytes.emplace(static_cast<std::uint32_t>(offset), bytes);
+    }
+    return description;
+}
+
+DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem::path& file,
+                             std::uint64_t size) {
+    DiskDescription disk;
+    disk.size = size;
+    const std::uint64_t base = hasRecordArea(size) ? size - RECORD_AREA_SIZE : size;
+    disk.bytes = nonZeroRuns(descriptor, file, base);
+    if (hasRecordArea(size)) {
+        Bytes area = readAt(descriptor, file, base, RECORD_AREA_SIZE);
+        area.resize(RECORD_AREA_SIZE);
+        describeRecordArea(std::move(area), disk);
+    }
+    return disk;
+}
+
+DiskDescription describeDisk(const Bytes& content) {
+    DiskDescription disk;
+    disk.size = content.size();
+    const std::size_t base =
+        hasRecordArea(disk.size) ? content.size() - RECORD_AREA_SIZE : content.size();
+    disk.bytes = nonZeroRuns(std::string_view(content).substr(0, base));
+    if (hasRecordArea(disk.size)) {
+        describeRecordArea(content.substr(base), disk);
+    }
+    return disk;
+}
+
+TuningDescription describeTuningBlock(const DpsBlock& block) {
+    TuningDescription description;
+    for (const DpsField& field : DPS_LAYOUT) {
+        std::vector<std::int64_t> numbers;
+        for (std::size_t element = 0; element < field.count; ++element) {
+            numbers.push_back(decodeField(block, field, element));
+        }
+        TuningValue& value = description.fields[field.key];
+        if (field.kind == DpsKind::list) {
+            value = std::move(numbers);
+            continue;
+        }
+        const std::string word = tuningWord(field, numbers.front());
+        value = word.empty() ? TuningValue(numbers.front()) : TuningValue(word);
+    }
+    const DpsBlock rest = withoutFields(block);
+    description.raw = withoutEndZeros(Bytes(rest.bytes.begin(), rest.bytes.end()));
+    return description;
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,107 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/unit/describe_unit.h"
+
+#include "config/boot_disk.h"
+#include "config/config_store.h"
+#include "kit/description/unit_layout.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/host/tree_entries.h"
+#include "kit/unit/marker.h"
+
+#include <algorithm>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace orvane::kit {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+/// Fills in what can't be told from one entry: which paths a unit would have and this one has not.
+void findAbsent(const std::vector<std::string>& there, UnitDescription& unit) {
+    for (const auto& [path, kind] : layoutOf(unit)) {
+        const bool isThere = std::binary_search(there.begin(), there.end(), path);
+        const bool isKnown =
+            std::any_of(unit.absent.begin(), unit.absent.end(),
+                        [&p = path](const std::string& absent) { return isAtOrBelow(p, absent); });
+        if (!isThere && !isKnown) {
+            unit.absent.push_back(path);
+        }
+    }
+}
+
+class Inspector {
+public:
+    explicit Inspector(fs::path root) : root_(std::move(root)) {}
+
+    UnitDescription inspect() {
+        for (pending_ = {""}; !pending_.empty();) {
+            const std::string path = std::move(pending_.back());
+            pending_.pop_back();
+            inspectFolder(path);
+        }
+        std::sort(there_.begin(), there_.end());
+        std::sort(unit_.folders.begin(), unit_.folders.end());
+        findAbsent(there_, unit_);
+        return std::move(unit_);
+    }
+
+private:
+    /// `path` is a folder of the unit, empty for the top.
+    void inspectFolder(const std::string& path) {
+        const auto entries = listFolder(root_ / fs::path(path).relative_path());
+        for (const fs::directory_entry& entry : entries) {
+            const std::string name = entry.path().filename().string();
+            if (!path.empty() || name != MARKER_NAME) {
+                inspectEntry(std::string(path).append("/").append(name), entry);
+            }
+        }
+        if (entries.empty() && !isStandardFolder(path)) {
+            unit_.folders.push_back(path);
+        }
+    }
+
+    void inspectEntry(const std::string& path, const fs::directory_entry& entry) {
+        there_.push_back(path);
+        const fs::file_type kind = kindOf(entry.path());
+        if (kind == fs::file_type::directory) {
+            pending_.push_back(path);
+        } else if (kind == fs::file_type::symlink) {
+            unit_.links.emplace(path, targetOf(entry.path()));
+        } else if (kind == fs::file_type::regular) {
+            inspectFile(path, entry.path());
+        } else {
+            throw KitError(entry.path().string() + " is neither a file, a folder nor a link");
+        }
+    }
+
+    void inspectFile(const std::string& path, const fs::path& file) {
+        const Descriptor descriptor = openForReading(file);
+        const std::uint64_t size = sizeOf(descriptor, file);
+        if (path == CONFIG_SHM_NAME && size <= LONGEST_IMAGE) {
+            unit_.image = describeImage(readAt(descriptor, file, 0, size));
+        } else if (path == BOOT_DISK) {
+            unit_.disk = describeDisk(descriptor, file, size);
+        } else {
+            describeFile(descriptor, file, path, unit_);
+        }
+    }
+
+    fs::path root_;
+    UnitDescription unit_;
+    std::vector<std::string> there_;   ///< all paths
+    std::vector<std::string> pending_; ///< folders that are still to be looked into
+};
+
+} // namespace
+
+UnitDescription inspectUnit(const fs::path& root) {
+    requireKitUnit(root);
+    return Inspector(root).inspect();
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The way back of makeUnit: what there is, as a description. Each function gives one canonical
+// description of the many that make the same.
+#pragma once
+
+#include "kit/description/unit_description.h"
+#include "kit/host/descriptor.h"
+#include "tuning/dps_block.h"
+
+#include <cstdint>
+#include <filesystem>
+
+namespace orvane::kit {
+
+/// The image: its size, the parameters that lie wholly inside and are not zero, and as raw bytes
+/// what else is not zero: behind the catalogue's end, or the first byte of a two-byte parameter
+/// that is cut off.
+ImageDescription describeImage(const Bytes& image);
+
+/// The disk of the first `size` bytes: slots (never slot 15, which repeats slots 1 to 9), auxiliary
+/// area and tuning blocks that are not all zero, without the zeros at their ends, and as raw bytes
+/// what else is not zero. A disk shorter than the record area is raw bytes only. Holes and zeros
+/// take no time to speak of. `file` stands in the text of the KitError of a failed read.
+DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem::path& file,
+                             std::uint64_t size);
+DiskDescription describeDisk(const Bytes& content);
+
+/// The block: all 44 fields, a word where the code has one, and as raw bytes the bits that no field
+/// reads, without the zeros at their end.
+TuningDescription describeTuningBlock(const DpsBlock& block);
+
+/// Everything below `root`, which must be a unit that the kit made: makeUnit of it gives the same
+/// folders, files, contents and links. Modes, times and owners are not part of a description, nor
+/// is the kit's own mark. Reads only. Throws KitError when something can't be read, or is neither a
+/// file, a folder nor a link.
+UnitDescription inspectUnit(const std::filesystem::path& root);
+
+} // namespace orvane::kit

@@ -1,0 +1,134 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "config/record_area.h"
+#include "kit/description/conflicts.h"
+#include "kit/description/unit_checks.h"
+#include "kit/description/unit_description.h"
+#include "kit/description/unit_layout.h"
+#include "kit/enter/root.h"
+#include "kit/host/descriptor.h"
+#include "kit/host/finished_folder.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_encode.h"
+#include "kit/unit/marker.h"
+#include "tuning/dps_block.h"
+
+#include <array>
+#include <type_traits>
+
+namespace orvane::kit {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+void makeImage(const ImageDescription& image, const fs::path& file) {
+    const Descriptor descriptor = makeSparseFile(file, image.size);
+    for (const auto& [number, value] : image.params) {
+        const ParamPlace place = paramPlace(number);
+        Bytes bytes(1, static_cast<char>(value & 0xFFU));
+        if (place.size == 2) {
+            bytes += static_cast<char>(value >> 8U);
+        }
+        writeAt(descriptor, file, place.offset, bytes);
+    }
+    for (const auto& [offset, bytes] : image.bytes) {
+        writeAt(descriptor, file, offset, bytes);
+    }
+}
+
+std::uint32_t lengthOf(const Bytes& bytes) {
+    const std::uint64_t length = bytes.size();
+    return static_cast<std::uint32_t>(length);
+}
+
+void expectWritten(std::int32_t result, const std::string& what) {
+    if (result != 0) {
+        throw KitError("cannot write " + what + " to the unit's disk");
+    }
+}
+
+/// Through the product's own operations, in a process that has entered the unit.
+void writeRecords(const DiskDescription& disk) {
+    for (const auto& [slot, bytes] : disk.slots) {
+        expectWritten(writeRecordSlot(slot, bytes.data(), lengthOf(bytes)),
+                      "slot " + std::to_string(slot));
+    }
+    if (disk.aux) {
+        expectWritten(writeAuxArea(disk.aux->data(), lengthOf(*disk.aux)), "the auxiliary area");
+    }
+    if (!disk.tuning.empty()) {
+        DpsArea area{};
+        for (const auto& [id, block] : disk.tuning) {
+            area.at(id) = encodeTuningBlock(block);
+        }
+        expectWritten(writeTuningArea(area.data(), DPS_AREA_SIZE), "the tuning area");
+    }
+}
+
+void makeDisk(const DiskDescription& disk, const fs::path& file, const fs::path& root) {
+    const Descriptor descriptor = makeSparseFile(file, disk.size);
+    if (!disk.slots.empty() || disk.aux || !disk.tuning.empty()) {
+        const EnteredRoot entered(root);
+        writeRecords(disk);
+    }
+    for (const auto& [offset, bytes] : disk.bytes) {
+        writeAt(descriptor, file, offset, bytes);
+    }
+}
+
+void makeSparse(const SparseFile& content, const fs::path& file) {
+    const Descriptor descriptor = makeSparseFile(file, content.size);
+    for (const auto& [offset, bytes] : content.bytes) {
+        writeAt(descriptor, file, offset, bytes);
+    }
+}
+
+/// One entry, where nothing is yet and the folder above is there.
+void makeEntry(const UnitDescription& unit, const std::string& path, EntryKind kind,
+               const fs::path& root) {
+    const fs::path place = root / fs::path(path).relative_path();
+    switch (kind) {
+    case EntryKind::folder:
+        fs::create_directory(place);
+        break;
+    case EntryKind::file:
+        writeAt(makeSparseFile(place, 0), place, 0, unit.files.at(path));
+        break;
+    case EntryKind::sparseFile:
+        makeSparse(unit.sparseFiles.at(path), place);
+        break;
+    case EntryKind::link:
+        fs::create_symlink(unit.links.at(path), place);
+        break;
+    case EntryKind::image:
+        makeImage(unit.image, place);
+        break;
+    case EntryKind::disk:
+        makeDisk(unit.disk, place, root);
+        break;
+    }
+}
+
+void throwIfAny(const std::optional<Misfit>& misfit) {
+    if (misfit) {
+        throw KitError(misfit->what);
+    }
+}
+
+} // namespace
+
+void makeUnit(const UnitDescription& unit, const fs::path& root) {
+    checkUnit(unit);
+    throwIfAny(findPathMisfit(unit));
+    const Layout layout = layoutOf(unit);
+    throwIfAny(findSizeMisfit(unit, layout));
+    makeFinishedFolder(root, [&](const fs::path& folder) {
+        for (const auto& [path, kind] : layout) {
+            makeEntry(unit, path, kind, folder);
+        }
+        markUnit(folder);
+    });
+}
+
+} // namespace orvane::kit
