@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/kit_error.h"
+#include "orvane_unit/check/case_check.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
-#include "unit/case_check.h"
 
 #include <gtest/gtest.h>
 

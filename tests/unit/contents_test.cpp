@@ -2,10 +2,10 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "kit/host/sparse_content.h"
+#include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/show/decoded_unit.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
-#include "unit/contents.h"
-#include "unit/contents_text.h"
 
 #include <iterator>
 #include <sstream>

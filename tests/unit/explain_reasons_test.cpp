@@ -3,9 +3,9 @@
 // Every reason by a unit that lays it, and the same unit run by the real binary.
 #include "config/boot_disk.h"
 #include "config/config_store.h"
+#include "orvane_unit/explain/explain.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
-#include "unit/explain.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 

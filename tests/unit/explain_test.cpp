@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/marker.h"
+#include "orvane_unit/explain/explain.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
 #include "tests/unit/tree_state.h"
-#include "unit/explain.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The lines of an explanation, one behind the other, are the file that the golden units expect.
+#include "orvane_unit/check/case_check.h"
+#include "orvane_unit/explain/explain.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
-#include "unit/case_check.h"
-#include "unit/explain.h"
 
 #include <set>
 #include <sstream>

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_unit.h"
+#include "orvane_unit/compare/impact.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/unit/described_unit.h"
-#include "unit/impact.h"
 
 #include <gtest/gtest.h>
 

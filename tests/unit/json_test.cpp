@@ -2,12 +2,12 @@
 //
 // The one place that parses the reports again.
 #include "kit/unit/describe_inputs.h"
+#include "orvane_unit/explain/explain.h"
+#include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/report/json.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 #include "tests/unit/described_unit.h"
-#include "unit/contents_text.h"
-#include "unit/explain.h"
-#include "unit/json.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>

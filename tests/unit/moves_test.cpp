@@ -2,9 +2,9 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "kit/unit/describe_inputs.h"
+#include "orvane_unit/compare/output_differences.h"
+#include "orvane_unit/explain/explain.h"
 #include "tests/unit/described_unit.h"
-#include "unit/explain.h"
-#include "unit/moves.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 

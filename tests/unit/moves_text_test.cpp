@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "unit/moves_text.h"
+#include "orvane_unit/report/comparison_text.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "unit/terminal.h"
-#include "unit/text_diff.h"
+#include "orvane_unit/compare/text_diff.h"
+#include "orvane_unit/report/terminal.h"
 
 #include <gtest/gtest.h>
 

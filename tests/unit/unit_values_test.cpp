@@ -3,9 +3,9 @@
 // Kinds of values that no output comes from, and changes that no value accounts for.
 #include "config/boot_disk.h"
 #include "kit/unit/describe_inputs.h"
+#include "orvane_unit/compare/output_differences.h"
+#include "orvane_unit/explain/explain.h"
 #include "tests/unit/described_unit.h"
-#include "unit/explain.h"
-#include "unit/moves.h"
 #include "writers/iap_writer.h"
 
 #include <gtest/gtest.h>

@@ -1,0 +1,222 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/check/case_check.h"
+
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "orvane_unit/check/scratch_folder.h"
+#include "orvane_unit/check/tmp_tree.h"
+#include "orvane_unit/check/whole_file.h"
+#include "orvane_unit/explain/explain.h"
+#include "orvane_unit/explain/explanation.h"
+
+#include <algorithm>
+#include <array>
+#include <fstream>
+#include <iterator>
+#include <map>
+#include <memory>
+#include <optional>
+#include <sstream>
+#include <system_error>
+#include <utility>
+
+namespace orvane::unit {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr char NO_TMP[] = "(absent)";
+
+std::vector<fs::path> caseFolders(const fs::path& folder) {
+    std::vector<fs::path> folders;
+    std::error_code error;
+    for (const fs::directory_entry& entry : fs::directory_iterator(folder, error)) {
+        if (fs::exists(entry.path() / "unit.toml", error)) {
+            folders.push_back(entry.path());
+        }
+    }
+    if (folders.empty()) {
+        throw kit::KitError("no folder in " + folder.string() + " holds a unit.toml");
+    }
+    std::sort(folders.begin(), folders.end());
+    return folders;
+}
+
+void writeWhole(const fs::path& file, const std::string& text) {
+    std::error_code error;
+    fs::create_directories(file.parent_path(), error);
+    std::ofstream out(file, std::ios::binary);
+    out << text;
+    out.close();
+    if (!out) {
+        throw kit::KitError("cannot write " + file.string());
+    }
+}
+
+std::vector<std::string> argumentsOf(const fs::path& folder) {
+    const std::optional<std::string> text = readWholeFile(folder / "arguments");
+    if (!text) {
+        return {"-a", "-i"};
+    }
+    std::vector<std::string> arguments;
+    std::istringstream lines(*text);
+    for (std::string line; std::getline(lines, line);) {
+        arguments.push_back(line);
+    }
+    return arguments;
+}
+
+std::string listOf(const TmpTree& tree) {
+    if (!tree.isThere) {
+        return std::string(NO_TMP) + "\n";
+    }
+    std::string list;
+    for (const auto& [path, content] : tree.entries) {
+        list += path + "\n";
+    }
+    return list;
+}
+
+void compareLists(const std::string& found, const std::string& expected,
+                  std::vector<std::string>& differences) {
+    const auto lines = [](const std::string& text) {
+        std::set<std::string> names;
+        std::istringstream in(text);
+        for (std::string line; std::getline(in, line);) {
+            names.insert(line);
+        }
+        return names;
+    };
+    const std::set<std::string> there = lines(found);
+    const std::set<std::string> wanted = lines(expected);
+    for (const std::string& name : wanted) {
+        if (there.count(name) == 0) {
+            differences.push_back("/tmp/" + name + " is missing");
+        }
+    }
+    for (const std::string& name : there) {
+        if (wanted.count(name) == 0) {
+            differences.push_back("/tmp/" + name + " is not expected");
+        }
+    }
+}
+
+/// What no expectation can hold: the tool always ends with 0 and prints nothing of its own.
+void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences) {
+    if (run.exitStatus != 0) {
+        differences.push_back("exit status " + std::to_string(run.exitStatus));
+    }
+    if (!run.standardOutput.empty()) {
+        differences.push_back("standard output is not empty");
+    }
+}
+
+void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run,
+             std::vector<std::string>& differences) {
+    if (run.standardError != readWholeFile(expected / "stderr").value_or("")) {
+        differences.push_back("standard error differs");
+    }
+    const std::optional<std::string> list = readWholeFile(expected / "tmp.list");
+    if (!list) {
+        differences.push_back("there is no expectation: no expected/tmp.list");
+        return;
+    }
+    compareLists(listOf(tree), *list, differences);
+    for (const auto& [path, content] : tree.entries) {
+        if (content && list->find(path) != std::string::npos &&
+            *content != readWholeFile(expected / "tmp" / path)) {
+            differences.push_back("/tmp/" + path + " differs");
+        }
+    }
+}
+
+void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
+    std::error_code error;
+    fs::remove_all(expected, error);
+    writeWhole(expected / "tmp.list", listOf(tree));
+    if (!run.standardError.empty()) {
+        writeWhole(expected / "stderr", run.standardError);
+    }
+    for (const auto& [path, content] : tree.entries) {
+        if (content) {
+            writeWhole(expected / "tmp" / path, *content);
+        }
+    }
+}
+
+/// Whether the run has left what the explanation says.
+void compareWithRun(const Explanation& explanation, const TmpTree& tree,
+                    std::vector<std::string>& surprises) {
+    constexpr char TMP[] = "/tmp/";
+    for (const Output& output : explanation) {
+        const std::string name = output.path.substr(sizeof TMP - 1);
+        const std::optional<std::string> file = tree.file(name);
+        const bool agrees = output.left == Left::file     ? file == output.content
+                            : output.left == Left::folder ? tree.hasFolder(name)
+                                                          : !file && !tree.hasFolder(name);
+        if (!agrees) {
+            surprises.push_back(output.path + " is not what the explanation says");
+        }
+    }
+}
+
+CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool updates) {
+    const ScratchFolder scratch;
+    const fs::path root = scratch.path() / "unit";
+    kit::makeUnit(kit::readDescription(folder / "unit.toml"), root);
+    const std::vector<std::string> arguments = argumentsOf(folder);
+
+    CaseResult result;
+    result.name = folder.filename().string();
+    const Explanation explanation = explainUnit(root, optionLetters(arguments));
+    for (const Output& output : explanation) {
+        result.reasons.insert(output.reasons.begin(), output.reasons.end());
+        for (const Line& line : output.lines) {
+            result.reasons.insert(line.reasons.begin(), line.reasons.end());
+        }
+    }
+    const kit::RunResult run = kit::runInside(root, {binary, arguments});
+    const TmpTree tree = readTmp(root);
+    compareWithRun(explanation, tree, result.surprises);
+    compareEnd(run, result.differences);
+    if (updates) {
+        update(folder / "expected", tree, run);
+    } else {
+        compare(folder / "expected", tree, run, result.differences);
+    }
+    return result;
+}
+
+} // namespace
+
+std::string optionLetters(const std::vector<std::string>& arguments) {
+    std::string letters;
+    for (const std::string& argument : arguments) {
+        if (argument.size() < 2 || argument[0] != '-' || argument == "--") {
+            break;
+        }
+        std::copy_if(argument.begin() + 1, argument.end(), std::back_inserter(letters),
+                     [](char letter) { return letter == 'a' || letter == 'i'; });
+    }
+    return letters;
+}
+
+CheckReport checkCases(const fs::path& folder, const fs::path& binary, bool updates) {
+    CheckReport report;
+    report.isUpdate = updates;
+    std::set<Reason> reached;
+    for (const fs::path& path : caseFolders(folder)) {
+        report.cases.push_back(checkCase(path, binary, updates));
+        reached.insert(report.cases.back().reasons.begin(), report.cases.back().reasons.end());
+    }
+    for (const ReasonInfo& info : REASONS) {
+        if (reached.count(info.reason) == 0) {
+            report.unreached.push_back(info.code);
+        }
+    }
+    return report;
+}
+
+} // namespace orvane::unit

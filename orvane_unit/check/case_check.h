@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Units with the outputs that are expected of them, in a folder: for each, NAME/unit.toml, the
+// options in NAME/arguments, one a line ("-a", "-i" without that file), and below NAME/expected
+// what /tmp holds afterwards: tmp.list names every entry, folders with a slash behind, or says
+// "(absent)"; tmp/ holds the files; stderr, if there, what the tool says.
+#pragma once
+
+#include "orvane_unit/explain/reasons.h"
+
+#include <filesystem>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace orvane::unit {
+
+struct CaseResult {
+    std::string name;
+    std::vector<std::string> differences; ///< none when all is as expected
+    std::vector<std::string> surprises;   ///< where the explanation and the run do not agree
+    std::set<Reason> reasons;             ///< all that its explanation gives
+};
+
+struct CheckReport {
+    std::vector<CaseResult> cases;      ///< by name
+    std::vector<const char*> unreached; ///< codes that no case has
+    bool isUpdate = false;
+};
+
+/// Runs `binary` in every unit of `folder`. With `updates`, writes what it leaves as the new
+/// expectations instead of comparing. Throws kit::KitError for a folder without units, a bad
+/// description, or a binary that can't be run.
+CheckReport checkCases(const std::filesystem::path& folder, const std::filesystem::path& binary,
+                       bool updates);
+
+/// The option letters of a command line as getopt(3) finds them, those that count.
+std::string optionLetters(const std::vector<std::string>& arguments);
+
+} // namespace orvane::unit

@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/check/scratch_folder.h"
+
+#include "kit/host/kit_error.h"
+
+#include <cstdlib>
+#include <string>
+#include <system_error>
+
+namespace orvane::unit {
+
+namespace fs = std::filesystem;
+
+ScratchFolder::ScratchFolder() {
+    std::string name = fs::temp_directory_path() / "orvane-unit-XXXXXX";
+    if (::mkdtemp(name.data()) == nullptr) {
+        throw kit::systemError("cannot make " + name);
+    }
+    path_ = name;
+}
+
+ScratchFolder::~ScratchFolder() {
+    std::error_code ignored;
+    fs::remove_all(path_, ignored);
+}
+
+} // namespace orvane::unit

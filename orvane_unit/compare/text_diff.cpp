@@ -1,0 +1,145 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/compare/text_diff.h"
+
+#include "orvane_unit/report/terminal.h"
+
+#include <dtl/dtl.hpp>
+
+#include <algorithm>
+#include <memory>
+#include <ostream>
+#include <type_traits>
+
+namespace orvane::unit {
+
+namespace {
+
+std::vector<std::string> linesOf(const std::string& text) {
+    std::vector<std::string> lines;
+    for (std::size_t begin = 0; begin < text.size();) {
+        const std::size_t end = std::min(text.find('\n', begin), text.size() - 1) + 1;
+        lines.push_back(text.substr(begin, end - begin));
+        begin = end;
+    }
+    return lines;
+}
+
+/// All lines of both texts, common ones once, with their numbers.
+std::vector<DiffLine> editScript(const std::string& before, const std::string& after) {
+    dtl::Diff<std::string> diff(linesOf(before), linesOf(after));
+    diff.onHuge();
+    diff.compose();
+    std::vector<DiffLine> lines;
+    std::size_t oldNumber = 0;
+    std::size_t newNumber = 0;
+    for (const auto& [text, info] : diff.getSes().getSequence()) {
+        if (info.type == dtl::SES_DELETE) {
+            lines.push_back({DiffLine::Kind::removed, text, ++oldNumber, 0});
+        } else if (info.type == dtl::SES_ADD) {
+            lines.push_back({DiffLine::Kind::added, text, 0, ++newNumber});
+        } else {
+            lines.push_back({DiffLine::Kind::common, text, ++oldNumber, ++newNumber});
+        }
+    }
+    // Of lines that take each other's place, the old ones come first.
+    for (auto begin = lines.begin(); begin != lines.end();) {
+        const auto isCommon = [](const DiffLine& line) {
+            return line.kind == DiffLine::Kind::common;
+        };
+        const auto end = std::find_if(begin, lines.end(), isCommon);
+        std::stable_partition(
+            begin, end, [](const DiffLine& line) { return line.kind == DiffLine::Kind::removed; });
+        begin = std::find_if_not(end, lines.end(), isCommon);
+    }
+    return lines;
+}
+
+/// A hunk of the lines from `begin` to `end`.
+Hunk hunkOf(const std::vector<DiffLine>& script, std::size_t begin, std::size_t end) {
+    Hunk hunk;
+    for (std::size_t i = 0; i < begin; ++i) {
+        hunk.before += script[i].before != 0 ? 1U : 0U;
+        hunk.after += script[i].after != 0 ? 1U : 0U;
+    }
+    for (std::size_t i = begin; i < end; ++i) {
+        hunk.beforeCount += script[i].before != 0 ? 1U : 0U;
+        hunk.afterCount += script[i].after != 0 ? 1U : 0U;
+        hunk.lines.push_back(script[i]);
+    }
+    hunk.before += hunk.beforeCount != 0 ? 1U : 0U;
+    hunk.after += hunk.afterCount != 0 ? 1U : 0U;
+    return hunk;
+}
+
+void printLine(std::ostream& out, const DiffLine& line) {
+    const std::string text = lineForEyes(line.text);
+    switch (line.kind) {
+    case DiffLine::Kind::common:
+        out << ' ' << text;
+        break;
+    case DiffLine::Kind::removed:
+        out << painted(Colour::removed, "-" + text);
+        break;
+    case DiffLine::Kind::added:
+        out << painted(Colour::added, "+" + text);
+        break;
+    }
+    out << '\n';
+    if (line.text.back() != '\n') {
+        out << "\\ No newline at end of file\n";
+    }
+}
+
+} // namespace
+
+std::vector<Hunk> differingHunks(const std::string& before, const std::string& after) {
+    if (before == after) {
+        return {};
+    }
+    constexpr std::size_t CONTEXT = 3; // common lines around a change
+    const std::vector<DiffLine> script = editScript(before, after);
+    std::vector<Hunk> hunks;
+    std::size_t begin = 0;
+    std::size_t end = 0; // of the hunk that is being gathered
+    for (std::size_t i = 0; i < script.size(); ++i) {
+        if (script[i].kind == DiffLine::Kind::common) {
+            continue;
+        }
+        const std::size_t first = i < CONTEXT ? 0 : i - CONTEXT;
+        if (end != 0 && first > end) {
+            hunks.push_back(hunkOf(script, begin, end));
+            end = 0;
+        }
+        begin = end == 0 ? first : begin;
+        end = std::min(i + 1 + CONTEXT, script.size());
+    }
+    hunks.push_back(hunkOf(script, begin, end));
+    return hunks;
+}
+
+std::string lineForEyes(const std::string& line) {
+    const bool hasEnd = !line.empty() && line.back() == '\n';
+    return printable(line.substr(0, line.size() - (hasEnd ? 1 : 0)));
+}
+
+void printUnifiedDiff(std::ostream& out, const std::string& name,
+                      const std::optional<std::string>& before,
+                      const std::optional<std::string>& after) {
+    if (before == after) {
+        return;
+    }
+    out << "--- " << (before ? printable(name) : "/dev/null") << "\n+++ "
+        << (after ? printable(name) : "/dev/null") << '\n';
+    for (const Hunk& hunk : differingHunks(before.value_or(""), after.value_or(""))) {
+        out << painted(Colour::place, "@@ -" + std::to_string(hunk.before) + "," +
+                                          std::to_string(hunk.beforeCount) + " +" +
+                                          std::to_string(hunk.after) + "," +
+                                          std::to_string(hunk.afterCount) + " @@")
+            << '\n';
+        for (const DiffLine& line : hunk.lines) {
+            printLine(out, line);
+        }
+    }
+}
+
+} // namespace orvane::unit

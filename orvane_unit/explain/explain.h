@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a run would leave in a unit, found out without writing: the values, the lines and the order
+// of the files are made by the tool's own functions; only the opening of its outputs is replaced.
+#pragma once
+
+#include "orvane_unit/explain/explanation.h"
+
+#include <filesystem>
+#include <string>
+
+namespace orvane::unit {
+
+/// Explains a run with the option letters `letters` ("a", "i", each as often as wanted) in the unit
+/// that this process has as its root.
+Explanation explain(const std::string& letters);
+
+/// The same for the unit at `root`, "/" for the system itself. Throws kit::KitError when it can't
+/// be entered.
+Explanation explainUnit(const std::filesystem::path& root, const std::string& letters);
+
+} // namespace orvane::unit

@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/explain/explanation.h"
+
+#include <algorithm>
+
+namespace orvane::unit {
+
+const char* outcomeName(Outcome outcome) {
+    switch (outcome) {
+    case Outcome::generated:
+        return "generated";
+    case Outcome::stock:
+        return "stock";
+    case Outcome::empty:
+        return "empty";
+    case Outcome::kept:
+        return "kept";
+    case Outcome::notAsked:
+        return "not-asked";
+    }
+    return "";
+}
+
+bool isIntended(const std::vector<Reason>& reasons) {
+    return std::all_of(reasons.begin(), reasons.end(),
+                       [](Reason reason) { return reasonInfo(reason).isIntended; });
+}
+
+bool isIntended(const Output& output) {
+    return isIntended(output.reasons) &&
+           std::all_of(output.lines.begin(), output.lines.end(),
+                       [](const Line& line) { return isIntended(line.reasons); });
+}
+
+bool isIntended(const Explanation& explanation) {
+    return std::all_of(explanation.begin(), explanation.end(),
+                       [](const Output& output) { return isIntended(output); });
+}
+
+} // namespace orvane::unit

@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a run of orvane would leave, and why: the answer of explain.h, without any input in it.
+#pragma once
+
+#include "orvane_unit/explain/reasons.h"
+
+#include <string>
+#include <vector>
+
+namespace orvane::unit {
+
+/// A piece of an output: one line with its line end; of a value that holds line ends, or of a
+/// template, all its lines. The pieces of an output, one behind the other, are its content.
+struct Line {
+    std::string text; ///< empty for a line that was left out
+    std::vector<Reason> reasons;
+    std::string key; ///< of the value it comes from, as in `orvane-unit set`; empty for fixed text
+    std::string detail; ///< the raw value and its place, or what stands in; may be empty
+};
+
+enum class Outcome {
+    generated,
+    stock,    ///< a copy of the stock file
+    empty,    ///< opened, and nothing was written
+    kept,     ///< could not be opened: what was there, if anything, is there still
+    notAsked, ///< nothing asked for it: what was there is there still
+};
+
+const char* outcomeName(Outcome outcome);
+
+/// What is at a path in the end.
+enum class Left { nothing, file, folder, other };
+
+struct Output {
+    std::string path;
+    Outcome outcome = Outcome::generated;
+    std::vector<Reason> reasons;   ///< what decided the outcome, in the order of the decisions
+    std::vector<std::string> keys; ///< of the values that decided it
+    std::vector<Line> lines;       ///< none when kept or not asked
+    Left left = Left::nothing;     ///< after the whole run, links followed
+    std::string content;           ///< of a file, after the whole run
+};
+
+/// The outputs in the order in which the run comes to them: one entry for each time.
+using Explanation = std::vector<Output>;
+
+/// Whether neither a fallback nor a default stands in anywhere.
+bool isIntended(const std::vector<Reason>& reasons);
+bool isIntended(const Output& output);
+bool isIntended(const Explanation& explanation);
+
+} // namespace orvane::unit

@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/explain/planned_files.h"
+
+#include "kit/host/output_place.h"
+#include "orvane_unit/check/whole_file.h"
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <utility>
+
+namespace orvane::unit {
+
+bool PlannedFiles::openForWriting(const std::string& path) {
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
+    if (!place || !(written_.count(place->path) != 0 || kit::canBeWritten(*place))) {
+        return false;
+    }
+    written_[place->path].clear();
+    return true;
+}
+
+std::optional<std::string> PlannedFiles::read(const std::string& path) const {
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
+    if (!place) {
+        return std::nullopt;
+    }
+    const auto written = written_.find(place->path);
+    if (written != written_.end()) {
+        return written->second;
+    }
+    if (place->kind == S_IFDIR) {
+        // Opens and yields nothing.
+        return ::access(place->path.c_str(), R_OK) == 0 ? std::optional<std::string>("")
+                                                        : std::nullopt;
+    }
+    // Anything but a file is left alone: looking into a pipe would take from it, or wait for ever.
+    return place->kind == S_IFREG ? readWholeFile(place->path) : std::nullopt;
+}
+
+void PlannedFiles::write(const std::string& path, const std::string& text) {
+    if (const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path)) {
+        written_[place->path] += text;
+    }
+}
+
+Left PlannedFiles::look(const std::string& path, std::string& content) const {
+    content.clear();
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
+    if (!place) {
+        return Left::nothing;
+    }
+    if (place->kind == S_IFDIR) {
+        return Left::folder;
+    }
+    const std::optional<std::string> text = read(path);
+    if (text) {
+        content = *text;
+        return Left::file;
+    }
+    return place->kind == 0 ? Left::nothing : Left::other;
+}
+
+} // namespace orvane::unit

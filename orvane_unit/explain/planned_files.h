@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The files of a unit as a run would change them, while nothing is written. An output can be a link
+// to another output, a template or a stock file: so what a run writes counts for what it reads
+// later.
+#pragma once
+
+#include "orvane_unit/explain/explanation.h"
+
+#include <map>
+#include <optional>
+#include <string>
+
+namespace orvane::unit {
+
+/// Paths are those of the unit, which the process must have as its root.
+class PlannedFiles {
+public:
+    /// Opens and truncates, as an output stream does. False when it can't be opened.
+    bool openForWriting(const std::string& path);
+
+    /// What an input stream gets: nothing when `path` can't be opened, an empty text for a folder.
+    std::optional<std::string> read(const std::string& path) const;
+
+    /// Adds to what was opened for writing.
+    void write(const std::string& path, const std::string& text);
+
+    /// Tells what is at `path` now, links followed.
+    Left look(const std::string& path, std::string& content) const;
+
+private:
+    std::map<std::string, std::string> written_; ///< content by place: a path without links
+};
+
+} // namespace orvane::unit

@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Where the values of the outputs come from: for each, the value's key, the reason why it is what
+// it is, and its raw form. All read the unit that the process has as its root.
+#pragma once
+
+#include "orvane_unit/explain/reasons.h"
+#include "tuning/dps_block.h"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace orvane::unit {
+
+struct Origin {
+    std::vector<Reason> reasons;
+    std::string key;    ///< as in `orvane-unit set`
+    std::string detail; ///< the raw value and its place
+};
+
+/// Bytes in hex, two digits each, with blanks between them.
+std::string hexText(const std::string& bytes);
+
+/// Why the disk can't be read at a place; nothing when it can.
+std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
+
+/// Size of the disk in bytes, also of a device; 0 when it can't be opened.
+std::uint64_t diskSize();
+
+/// The configuration image as a run finds it.
+struct Image {
+    Reason reason = Reason::fromImage; ///< or why there is none
+    std::string bytes;
+};
+
+Image readImage();
+
+Origin paramOrigin(const Image& image, std::uint16_t number);
+
+/// That of the model's name: an unknown code is a reason of its own.
+Origin modelOrigin(const Image& image);
+
+Origin serialOrigin();
+
+/// All tuning blocks, zeros where the disk can't be read.
+struct TuningArea {
+    Reason reason = Reason::fromTuningBlock; ///< or why all is zero
+    std::uint64_t offset = 0;                ///< on the disk, in bytes
+    DpsArea blocks{};
+};
+
+TuningArea readTuningBlocks();
+
+Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField& field);
+
+} // namespace orvane::unit

@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The version description files of a unit, and how one of them becomes the firmware version.
+#pragma once
+
+#include "identity/inf_file.h"
+#include "orvane_unit/explain/value_origins.h"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace orvane::unit {
+
+struct VersionFile {
+    std::string path;
+    Inf_Data record;
+    bool isApplication = false;
+};
+
+/// All version description files of the unit that the process has as its root, in the order of the
+/// directory listing.
+struct VersionFiles {
+    bool hasFolder = false;
+    std::vector<VersionFile> files;
+    std::optional<std::size_t> chosen; ///< the first application
+};
+
+VersionFiles readVersionFiles();
+
+/// That of the version as a text, in the two iAP2 files.
+Origin versionTextOrigin(const VersionFiles& versions);
+
+/// That of the six digits in the iAP1 file.
+Origin versionDigitsOrigin(const VersionFiles& versions);
+
+} // namespace orvane::unit

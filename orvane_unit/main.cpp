@@ -1,0 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/command_line.h"
+
+int main(int argc, char** argv) {
+    return orvane::unit::runCommandLine(argc, argv);
+}

@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// An explanation for people.
+#pragma once
+
+#include "orvane_unit/explain/explanation.h"
+
+#include <iosfwd>
+
+namespace orvane::unit {
+
+/// Prints each output with its outcome and reasons, and below it its lines with theirs. The tool's
+/// own text is left out unless `showsAll`.
+void printExplanation(std::ostream& out, const Explanation& explanation, bool showsAll);
+
+} // namespace orvane::unit

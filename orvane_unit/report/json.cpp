@@ -1,0 +1,301 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/report/json.h"
+
+#include "config/param_catalogue.h"
+#include "identity/inf_file.h"
+#include "kit/host/utf8.h"
+#include "orvane_unit/compare/text_diff.h"
+#include "orvane_unit/compare/unit_values.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/explain/value_origins.h"
+#include "orvane_unit/explain/version_choice.h"
+#include "orvane_unit/report/decoded_unit_text.h"
+#include "tuning/dps_block.h"
+
+#include <nlohmann/json.hpp>
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <set>
+#include <utility>
+
+namespace orvane::unit {
+
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+Json begin(const char* command) {
+    return {{"format", JSON_FORMAT}, {"command", command}};
+}
+
+Json bytesJson(const std::string& bytes) {
+    if (kit::isUtf8(bytes)) {
+        return bytes;
+    }
+    std::string hex = hexText(bytes);
+    hex.erase(std::remove(hex.begin(), hex.end(), ' '), hex.end());
+    return {{"hex", hex}};
+}
+
+Json bytesOrNull(const std::optional<std::string>& bytes) {
+    return bytes ? bytesJson(*bytes) : Json();
+}
+
+Json textsJson(const std::vector<std::string>& texts) {
+    Json json = Json::array();
+    for (const std::string& text : texts) {
+        json.push_back(bytesJson(text));
+    }
+    return json;
+}
+
+Json codesJson(const std::vector<Reason>& reasons) {
+    Json codes = Json::array();
+    for (const Reason reason : reasons) {
+        codes.push_back(reasonInfo(reason).code);
+    }
+    return codes;
+}
+
+const char* leftName(Left left) {
+    switch (left) {
+    case Left::nothing:
+        return "nothing";
+    case Left::file:
+        return "file";
+    case Left::folder:
+        return "folder";
+    case Left::other:
+        return "other";
+    }
+    return "";
+}
+
+Json lineJson(const Line& line) {
+    return {{"text", bytesJson(line.text)},
+            {"reasons", codesJson(line.reasons)},
+            {"key", line.key.empty() ? Json() : bytesJson(line.key)},
+            {"detail", bytesJson(line.detail)}};
+}
+
+Json paramsJson(const Contents& contents) {
+    Json rows = Json::array();
+    for (const Param& param : contents.params) {
+        rows.push_back({{"number", param.row.number},
+                        {"group", param.row.group},
+                        {"offset", param.row.offset},
+                        {"size", param.size},
+                        {"raw", param.raw ? Json(*param.raw) : Json()},
+                        {"default", param.row.defaultValue},
+                        {"mask", param.row.mask},
+                        {"code", param.row.id >> 16U},
+                        {"meaning", param.meaning.empty() ? Json() : bytesJson(param.meaning)}});
+    }
+    return {{"image", reasonInfo(contents.image.reason).code},
+            {"size", contents.image.bytes.size()},
+            {"rows", rows}};
+}
+
+Json recordsJson(const Contents& contents) {
+    Json slots = Json::array();
+    for (const Slot& slot : contents.slots) {
+        slots.push_back({{"number", slot.number},
+                         {"size", slot.size},
+                         {"offset", slot.offset},
+                         {"bytes", slot.bytes ? Json(hexText(*slot.bytes)) : Json()}});
+    }
+    return {{"disk", contents.diskTrouble ? reasonInfo(*contents.diskTrouble).code
+                                          : reasonInfo(Reason::fromRecord).code},
+            {"size", contents.diskSize},
+            {"slots", slots},
+            {"aux", contents.aux ? Json(hexText(*contents.aux)) : Json()},
+            {"crc", contents.crc},
+            {"crcVerdict", crcVerdictName(contents.crcVerdict)}};
+}
+
+Json fieldJson(const DpsBlock& block, const DpsField& field) {
+    if (field.kind == DpsKind::list) {
+        Json values = Json::array();
+        for (std::size_t element = 0; element < field.count; ++element) {
+            values.push_back(decodeField(block, field, element));
+        }
+        return values;
+    }
+    const std::int32_t value = decodeField(block, field, 0);
+    if (field.kind == DpsKind::number) {
+        return value;
+    }
+    const auto& words = field.kind == DpsKind::modeWord ? qwaModeWords : qwaSwitchWords;
+    return {{"code", value}, {"word", qwaWord(words, value)}};
+}
+
+Json tuningJson(const Contents& contents) {
+    Json blocks = Json::array();
+    for (const DpsBlock& block : contents.tuning.blocks) {
+        Json fields;
+        for (const DpsField& field : DPS_LAYOUT) {
+            fields[field.key] = fieldJson(block, field);
+        }
+        blocks.push_back(fields);
+    }
+    return {{"disk", reasonInfo(contents.tuning.reason).code}, {"blocks", blocks}};
+}
+
+Json versionsJson(const Contents& contents) {
+    Json files = Json::array();
+    for (std::size_t i = 0; i < contents.versions.files.size(); ++i) {
+        const VersionFile& file = contents.versions.files[i];
+        Json record = Json::array();
+        for (const auto& [key, value] : file.record) {
+            record.push_back({{"key", bytesJson(key)}, {"value", bytesJson(value)}});
+        }
+        files.push_back({{"path", bytesJson(file.path)},
+                         {"isApplication", file.isApplication},
+                         {"isChosen", contents.versions.chosen == i},
+                         {"record", record}});
+    }
+    return {{"hasFolder", contents.versions.hasFolder},
+            {"files", files},
+            {"version", bytesJson(contents.version)},
+            {"digits", bytesJson(contents.versionDigits)}};
+}
+
+Json filesJson(const Contents& contents) {
+    Json files = Json::array();
+    for (const UnitFile& file : contents.files) {
+        files.push_back({{"path", file.path},
+                         {"role", file.role},
+                         {"kind", leftName(file.kind)},
+                         {"size", file.size}});
+    }
+    return files;
+}
+
+Json movedJson(const MovedOutput& output) {
+    Json lines = Json::array();
+    for (const MovedLine& line : output.lines) {
+        const bool isRemoved = line.line.kind == DiffLine::Kind::removed;
+        lines.push_back({{"side", isRemoved ? "first" : "second"},
+                         {"line", isRemoved ? line.line.before : line.line.after},
+                         {"text", bytesJson(line.line.text)}});
+    }
+    return {{"path", output.path},
+            {"first", outcomeName(output.before)},
+            {"second", outcomeName(output.after)},
+            {"lines", lines}};
+}
+
+} // namespace
+
+std::string explanationJson(const std::string& root, const std::string& letters,
+                            const Explanation& explanation, bool hasContent) {
+    Json json = begin("explain");
+    json["root"] = bytesJson(root);
+    json["letters"] = letters;
+    json["isIntended"] = isIntended(explanation);
+    json["outputs"] = Json::array();
+    for (const Output& output : explanation) {
+        Json lines = Json::array();
+        for (const Line& line : output.lines) {
+            lines.push_back(lineJson(line));
+        }
+        Json entry = {{"path", output.path},
+                      {"outcome", outcomeName(output.outcome)},
+                      {"isIntended", isIntended(output)},
+                      {"reasons", codesJson(output.reasons)},
+                      {"lines", lines},
+                      {"left", leftName(output.left)}};
+        if (hasContent) {
+            entry["content"] = output.left == Left::file ? bytesJson(output.content) : Json();
+        }
+        json["outputs"].push_back(entry);
+    }
+    return json.dump();
+}
+
+std::string contentsJson(const std::string& root, const Contents& contents,
+                         const std::string& only) {
+    Json json = begin("show");
+    json["root"] = bytesJson(root);
+    using Part = Json (*)(const Contents&);
+    constexpr Part PARTS[] = {paramsJson, recordsJson, tuningJson, versionsJson, filesJson};
+    std::size_t part = 0;
+    for (const char* name : CONTENT_PARTS) {
+        if (only.empty() || only == name) {
+            json[name] = PARTS[part](contents);
+        }
+        ++part;
+    }
+    return json.dump();
+}
+
+std::string runJson(const std::string& root, const kit::RunResult& result, const TmpTree& before,
+                    const TmpTree& after) {
+    Json json = begin("run");
+    json["root"] = bytesJson(root);
+    json["exitStatus"] = result.exitStatus;
+    json["standardOutput"] = bytesJson(result.standardOutput);
+    json["standardError"] = bytesJson(result.standardError);
+    json["files"] = Json::array();
+    for (const auto& [path, content] : after.entries) {
+        json["files"].push_back({{"path", bytesJson("/tmp/" + path)},
+                                 {"before", bytesOrNull(before.file(path))},
+                                 {"after", bytesOrNull(content)}});
+    }
+    return json.dump();
+}
+
+std::string consequencesJson(const std::string& first, const std::string& second,
+                             const std::vector<Consequence>& consequences) {
+    Json json = begin("diff");
+    json["first"] = bytesJson(first);
+    json["second"] = bytesJson(second);
+    json["values"] = Json::array();
+    for (const Consequence& consequence : consequences) {
+        Json outputs = Json::array();
+        for (const MovedOutput& output : consequence.moved) {
+            outputs.push_back(movedJson(output));
+        }
+        json["values"].push_back({{"key", bytesJson(consequence.change.key)},
+                                  {"first", bytesJson(consequence.change.before)},
+                                  {"second", bytesJson(consequence.change.after)},
+                                  {"outputs", outputs}});
+    }
+    return json.dump();
+}
+
+std::string impactsJson(const std::string& root, const std::vector<Impact>& impacts) {
+    Json json = begin("impact");
+    json["root"] = bytesJson(root);
+    json["inputs"] = Json::array();
+    for (const Impact& impact : impacts) {
+        json["inputs"].push_back({{"key", impact.key},
+                                  {"tried", impact.tried},
+                                  {"moving", impact.moving},
+                                  {"lines", impact.lines}});
+    }
+    return json.dump();
+}
+
+std::string checkJson(const std::string& folder, const CheckReport& report) {
+    Json json = begin("check");
+    json["folder"] = bytesJson(folder);
+    json["isUpdate"] = report.isUpdate;
+    json["cases"] = Json::array();
+    for (const CaseResult& result : report.cases) {
+        json["cases"].push_back(
+            {{"name", bytesJson(result.name)},
+             {"differences", textsJson(result.differences)},
+             {"surprises", textsJson(result.surprises)},
+             {"reasons", codesJson({result.reasons.begin(), result.reasons.end()})}});
+    }
+    json["unreached"] = report.unreached;
+    return json.dump();
+}
+
+} // namespace orvane::unit

@@ -1,6 +1,0 @@
-// SPDX-License-Identifier: Apache-2.0
-#include "unit/command_line.h"
-
-int main(int argc, char** argv) {
-    return orvane::unit::runCommandLine(argc, argv);
-}
