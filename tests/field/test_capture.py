@@ -13,7 +13,7 @@ from pathlib import Path
 from capture_case import CaptureTest
 from car import AREA, DISK, IMAGE, ORVANE_UNIT, OUTPUTS, SHELLS, VERSIONS, is_root
 
-GOLDEN = Path(__file__).resolve().parents[1] / "golden"
+GOLDEN = Path(__file__).resolve().parents[1] / "whole_runs/golden"
 
 
 class WholeUnitTest(CaptureTest):

@@ -27,11 +27,11 @@ from scratch import Broken, call, passes
 CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
                  "-DCMAKE_CXX_FLAGS=-O0 -w -D_GLIBCXX_ASSERTIONS", "-DCMAKE_CXX_FLAGS_DEBUG=",
                  "-DCMAKE_EXE_LINKER_FLAGS=-static", "-DORVANE_KIT=ON", "-DORVANE_TESTS=ON",
-                 "-DORVANE_TEST_FOLDERS=config;end_to_end;identity;main;platform;tuning;writers",
+                 "-DORVANE_TEST_FOLDERS=product;whole_runs",
                  "-DORVANE_FAULTS=ON")
 PROGRAMS = ("orvane", "orvane-enter", "orvane_tests", "orvane-short-transfer")
 
-END_TO_END = "end_to_end"
+WHOLE_RUNS = "whole_runs"
 DIFFERENTIAL = "differential"
 DIFFERENTIAL_UNITS = 150
 
@@ -101,7 +101,7 @@ class Base:
         suites: dict[str, list[str]] = {}
         for suite in json.loads(listing.read_text())["testsuites"]:
             path = Path(suite["testsuite"][0]["file"]).relative_to(self.tree / "tests")
-            suites.setdefault(path.parts[0], []).append(f"{suite['name']}.*")
+            suites.setdefault(path.parts[-2], []).append(f"{suite['name']}.*")
         return suites
 
 
@@ -171,12 +171,12 @@ class Job:
         """The tests that stand next to `folder` come first, whole runs of the tool last."""
         suites = self.base.suites
         near = suites.get(folder, [])
-        rest = [suite for name, group in sorted(suites.items()) if name != END_TO_END
+        rest = [suite for name, group in sorted(suites.items()) if name != WHOLE_RUNS
                 for suite in group if suite not in near]
         tests = str(self.folder / "orvane_tests")
         stages = [(name, [tests, "--gtest_fail_fast", f"--gtest_filter={':'.join(chosen)}"])
                   for name, chosen in ((folder, near), ("the rest", rest),
-                                       (END_TO_END, suites.get(END_TO_END, []))) if chosen]
+                                       (WHOLE_RUNS, suites.get(WHOLE_RUNS, []))) if chosen]
         return [*stages, (DIFFERENTIAL, [*self.driver(DIFFERENTIAL),
                                          "--units", str(DIFFERENTIAL_UNITS)])]
 

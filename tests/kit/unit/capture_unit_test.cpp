@@ -1,0 +1,164 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/capture_unit.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/describe_unit.h"
+#include "kit/unit/marker.h"
+#include "tests/kit/unit/source_unit.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <string>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+class CaptureUnitTest : public SourceUnitTest {
+protected:
+    /// Captures; the source is not touched.
+    void capture(bool redactsSerial = false) const {
+        const auto before = state();
+        kit::captureUnit(source(), root(), redactsSerial);
+        EXPECT_EQ(differenceOf(before, state()), "");
+    }
+
+    std::string disk() const { return wholeFile(root() / "dev/hd0"); }
+
+    /// A disk of a mebibyte and a bit with this in slot 9, and more by offset from the base.
+    void putDisk(const std::string& serial,
+                 const std::map<std::size_t, std::string>& more = {}) const {
+        std::string content(MEBIBYTE + 50, '\0');
+        content.replace(50 + 129, serial.size(), serial);
+        for (const auto& [offset, bytes] : more) {
+            content.replace(50 + offset, bytes.size(), bytes);
+        }
+        put("/dev/hd0", content);
+    }
+
+    /// What becomes of slot 9.
+    std::string redacted(const std::string& serial) const {
+        putDisk(serial);
+        fs::remove_all(root());
+        capture(true);
+        return disk().substr(129, 8);
+    }
+};
+
+TEST_F(CaptureUnitTest, UnitOfTheInputsIsMade) {
+    put(IMAGE_PATH, std::string(179, 'i'));
+    putDisk("SN004217", {{137, "gap"}, {3072, "aux"}, {4096, "tuning"}});
+    put("/fs/mp/etc/airplay.conf", "stock");
+    put("/fs/rwdata/.Version/a.inf", "Type=Application\n");
+    putFolder("/tmp/iap1.cfg");
+    capture();
+    EXPECT_TRUE(kit::isKitUnit(root()));
+    EXPECT_EQ(disk(), readFile(at("/dev/hd0")).substr(50));
+    EXPECT_EQ(readFile(root() / std::string(IMAGE_PATH).substr(1)), std::string(179, 'i'));
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "stock");
+    EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.inf"), "Type=Application\n");
+    EXPECT_TRUE(fs::is_directory(root() / "tmp/iap1.cfg"));
+    EXPECT_TRUE(kit::inspectUnit(root()) == kit::inspectInputs(source()));
+}
+
+TEST_F(CaptureUnitTest, CapturedUnitHasTheSameInputs) {
+    putLink(IMAGE_PATH, "elsewhere");
+    putFolder("/fs/mp/etc/airplay.conf");
+    putDisk("SN004217");
+    fs::remove(at("/tmp"));
+    capture();
+    EXPECT_TRUE(kit::inspectInputs(root()) == kit::inspectInputs(source()));
+    EXPECT_FALSE(fs::exists(root() / "tmp"));
+}
+
+TEST_F(CaptureUnitTest, PresentRootCanBeCapturedIntoAFolderOfItsOwn) {
+    putDisk("SN004217");
+    const kit::EnteredRoot entered(source());
+    fs::create_directory("/bench");
+    kit::captureUnit("/", "/bench/unit", true);
+    EXPECT_EQ(readFile("/bench/unit/dev/hd0").substr(129, 8), "XXXXXXXX");
+    EXPECT_TRUE(kit::isKitUnit("/bench/unit"));
+}
+
+TEST_F(CaptureUnitTest, SerialBecomesAsManyX) {
+    EXPECT_EQ(redacted("SN004217"), "XXXXXXXX");
+    EXPECT_EQ(redacted("SN"), std::string("XX\0\0\0\0\0\0", 8));
+    EXPECT_EQ(redacted("\xFF\n"), std::string("XX\0\0\0\0\0\0", 8));
+    EXPECT_EQ(redacted(std::string("AB\0CDEFG", 8)), std::string("XX\0\0\0\0\0\0", 8));
+    EXPECT_EQ(redacted(std::string("\0SECRET!", 8)), std::string(8, '\0'));
+    EXPECT_EQ(redacted(""), std::string(8, '\0'));
+}
+
+TEST_F(CaptureUnitTest, SerialIsLeftWhereItIsNotToBeRedacted) {
+    putDisk(std::string("AB\0CDEFG", 8));
+    capture();
+    EXPECT_EQ(disk().substr(129, 8), std::string("AB\0CDEFG", 8));
+}
+
+TEST_F(CaptureUnitTest, SerialIsRedactedWhereverElseItStands) {
+    putDisk("SN004217", {{1, "SN004217 again"},
+                         {134, "2SN004217"}, // over the end of slot 9 and in the gap
+                         {3072, "aux SN004217SN004217"},
+                         {4096, "SN004217"},
+                         {MEBIBYTE - 8, "SN004217"}});
+    put("/fs/mp/etc/airplay.conf", "serial = SN004217, not SN004218\nSN004217");
+    put("/fs/mp/etc/mm/iap1.cfg", std::string(9000, '\0') + "SN004217" + std::string(9000, '\0'));
+    put("/fs/rwdata/.Version/a.inf", "N=SN004217");
+    const std::string serial = "SN004217";
+    std::string content = readFile(at("/dev/hd0"));
+    content.replace(50 + 129, 8, serial);
+    put("/dev/hd0", content);
+    capture(true);
+    EXPECT_EQ(disk().find(serial), std::string::npos);
+    EXPECT_EQ(disk().substr(1, 14), "XXXXXXXX again");
+    EXPECT_EQ(disk().substr(3072, 20), "aux XXXXXXXXXXXXXXXX");
+    EXPECT_EQ(disk().substr(MEBIBYTE - 8), "XXXXXXXX");
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"),
+              "serial = XXXXXXXX, not SN004218\nXXXXXXXX");
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/mm/iap1.cfg"),
+              std::string(9000, '\0') + "XXXXXXXX" + std::string(9000, '\0'));
+    EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.inf"), "N=XXXXXXXX");
+}
+
+TEST_F(CaptureUnitTest, SerialOfFourBytesIsToldElsewhereAndAShorterOneIsNot) {
+    put("/fs/mp/etc/airplay.conf", "AB12 AB1 AB12");
+    putDisk("AB12");
+    capture(true);
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "XXXX AB1 XXXX");
+    fs::remove_all(root());
+    putDisk("AB1");
+    capture(true);
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "AB12 AB1 AB12");
+}
+
+TEST_F(CaptureUnitTest, DiskWithoutRoomForTheSerialHasNoneToRedact) {
+    put("/fs/mp/etc/airplay.conf", "xxxx");
+    put("/dev/hd0", std::string(1048446, 'x'));
+    capture(true);
+    EXPECT_EQ(disk(), std::string(1048446, 'x'));
+    fs::remove_all(root());
+    put("/dev/hd0", std::string(1048447, 'x')); // the slot is the disk's first 8 bytes
+    capture(true);
+    EXPECT_EQ(disk().substr(0, 16), "XXXXXXXXXXXXXXXX");
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "xxxx");
+    fs::remove_all(root());
+    fs::remove(at("/dev/hd0"));
+    capture(true);
+    EXPECT_FALSE(fs::exists(root() / "dev/hd0"));
+}
+
+TEST_F(CaptureUnitTest, RootThatIsThereIsRefusedAndLeft) {
+    fs::create_directory(root());
+    writeFile(root() / "mine", "kept");
+    EXPECT_THROW(capture(), kit::KitError);
+    EXPECT_EQ(readFile(root() / "mine"), "kept");
+}
+
+} // namespace
+
+} // namespace orvane::test

@@ -1,0 +1,162 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/description/description_text.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_unit.h"
+#include "tests/kit/description/random_unit.h"
+#include "tests/kit/unit/unit_tree.h"
+#include "tests/support/permissions.h"
+#include "tests/support/temporary_folder.h"
+#include "tests/support/unit_test.h"
+
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+using Paths = std::vector<std::string>;
+
+class InspectUnitTest : public ::testing::Test {
+protected:
+    fs::path root() const { return folder_.path() / "unit"; }
+    fs::path other() const { return folder_.path() / "other"; }
+
+    /// What is found in a unit made of `unit`.
+    kit::UnitDescription inspected(const kit::UnitDescription& unit) const {
+        kit::makeUnit(unit, root());
+        return kit::inspectUnit(root());
+    }
+
+    std::string refusal() const {
+        try {
+            kit::inspectUnit(root());
+        } catch (const kit::KitError& error) {
+            return error.what();
+        }
+        return "";
+    }
+
+private:
+    TemporaryFolder folder_;
+};
+
+TEST_F(InspectUnitTest, UnitOfNothingIsFoundAsThat) {
+    EXPECT_TRUE(inspected({}) == kit::UnitDescription());
+}
+
+TEST_F(InspectUnitTest, EachKindOfEntryIsFound) {
+    kit::UnitDescription unit;
+    unit.image.params[22] = 1;
+    unit.disk.slots[9] = "SN004217";
+    unit.files = {{"/tmp/file", "x"}, {"/short", std::string(4095, '\0')}};
+    unit.sparseFiles = {{"/long", {4096, {}}}, {"/longer", {100000, {{99999, "e"}}}}};
+    unit.links = {{"/tmp/link", "nowhere"}, {"/dev/loop", "loop"}};
+    unit.folders = {"/a/b/c", "/fs/mp/etc/mm/iap2.cfg", "/tmp/folder"};
+    EXPECT_TRUE(inspected(unit) == unit);
+}
+
+TEST_F(InspectUnitTest, WhatIsMissingIsAbsentByItsTopmostPath) {
+    kit::UnitDescription unit;
+    unit.absent = {"/dev/hd0", "/fs/mp", "/fs/tmpfs", "/tmp"};
+    EXPECT_EQ(inspected(unit).absent, unit.absent);
+    fs::remove_all(root() / "fs");
+    EXPECT_EQ(kit::inspectUnit(root()).absent, (Paths{"/dev/hd0", "/fs", "/tmp"}));
+    fs::remove_all(root() / "dev");
+    EXPECT_EQ(kit::inspectUnit(root()).absent, (Paths{"/dev", "/fs", "/tmp"}));
+}
+
+TEST_F(InspectUnitTest, WhatGaveWayIsNotAbsent) {
+    kit::UnitDescription unit;
+    unit.links = {{"/fs/mp", "x"}, {"/dev/hd0", "disk0"}};
+    unit.files = {{"/tmp", "no folder"}};
+    unit.folders = {IMAGE_PATH};
+    EXPECT_TRUE(inspected(unit) == unit);
+}
+
+TEST_F(InspectUnitTest, LongImageIsDescribedAsAFile) {
+    kit::makeUnit({}, root());
+    fs::resize_file(root() / std::string(IMAGE_PATH).substr(1), std::uint64_t{5} << 30U);
+    const kit::UnitDescription unit = kit::inspectUnit(root());
+    EXPECT_EQ(unit.sparseFiles.at(IMAGE_PATH), (kit::SparseFile{std::uint64_t{5} << 30U, {}}));
+    kit::makeUnit(unit, other());
+    EXPECT_EQ(fs::file_size(other() / std::string(IMAGE_PATH).substr(1)), std::uint64_t{5} << 30U);
+}
+
+TEST_F(InspectUnitTest, LongDiskTakesNoTime) {
+    kit::UnitDescription unit;
+    unit.disk.size = std::uint64_t{1} << 40U;
+    unit.disk.slots[9] = "SN004217";
+    unit.disk.bytes[5] = "x";
+    EXPECT_TRUE(inspected(unit) == unit);
+}
+
+TEST_F(InspectUnitTest, MarkIsNoPartOfIt) {
+    kit::makeUnit({}, root());
+    writeFile(root() / "tmp/.orvane-unit", "a file like any other");
+    const kit::UnitDescription unit = kit::inspectUnit(root());
+    EXPECT_EQ(unit.files,
+              (std::map<std::string, std::string>{{"/tmp/.orvane-unit", "a file like any other"}}));
+}
+
+TEST_F(InspectUnitTest, WhatIsNoUnitIsRefused) {
+    EXPECT_EQ(refusal(), root().string() + " is not a folder");
+    fs::create_directories(root() / "fs");
+    EXPECT_EQ(refusal(), root().string() +
+                             " is not a unit that orvane-unit made: it has no file .orvane-unit");
+}
+
+TEST_F(InspectUnitTest, WhatCannotBeDescribedIsRefusedByName) {
+    kit::makeUnit({}, root());
+    const fs::path pipe = root() / "tmp/pipe";
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    EXPECT_EQ(refusal(), pipe.string() + " is neither a file, a folder nor a link");
+}
+
+TEST_F(InspectUnitTest, WhatCannotBeReadIsRefusedByName) {
+    kit::makeUnit({}, root());
+    const fs::path locked = root() / "tmp/locked";
+    for (const bool isFolder : {false, true}) {
+        if (isFolder) {
+            fs::remove(locked);
+            fs::create_directory(locked);
+        } else {
+            writeFile(locked, "x");
+        }
+        fs::permissions(locked, fs::perms::none);
+        std::string said;
+        {
+            const PermissionsHold permissions;
+            said = refusal();
+        }
+        EXPECT_EQ(said, "cannot read " + locked.string() + ": Permission denied");
+        fs::permissions(locked, fs::perms::owner_all);
+    }
+}
+
+/// Once more over the text, and made again: the same tree, and the same description of it.
+TEST_F(InspectUnitTest, RandomUnitsAreMadeAgainAsTheyWere) {
+    for (std::uint32_t seed = 0; seed < 200; ++seed) {
+        SCOPED_TRACE(seed);
+        const kit::UnitDescription found = inspected(RandomUnit(seed).unit());
+        const std::string text = kit::descriptionText(found);
+        const kit::UnitDescription again = kit::parseDescription(text, "unit.toml");
+        ASSERT_TRUE(again == found);
+        kit::makeUnit(again, other());
+        ASSERT_EQ(differenceOf(treeOf(root()), treeOf(other())), "");
+        ASSERT_TRUE(kit::inspectUnit(other()) == found);
+        fs::remove_all(root());
+        fs::remove_all(other());
+    }
+}
+
+} // namespace
+
+} // namespace orvane::test

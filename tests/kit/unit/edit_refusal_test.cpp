@@ -1,0 +1,172 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What setValues refuses, and that nothing is changed by then.
+#include "kit/host/kit_error.h"
+#include "tests/kit/unit/edit_fixture.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <string>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+/// An assignment, and what is said behind it and a colon.
+struct Refusal {
+    const char* assignment;
+    const char* message;
+};
+
+constexpr char KNOWN[] = ": it takes param.N, serial, slot.N, aux, tuning.B.FIELD or tuning.B";
+
+const Refusal REFUSALS[] = {
+    {"param.134=70000", "parameter 134 is two bytes: 70000 does not fit"},
+    {"param.134=-1", "parameter 134 is two bytes: -1 does not fit"},
+    {"param.134=99999999999999999999",
+     "parameter 134 is two bytes: 9223372036854775807 does not fit"},
+    {"param.22=256", "parameter 22 is one byte: 256 does not fit"},
+    {"param.22=", "parameter 22 takes a whole number, not \"\""},
+    {"param.22=-", "parameter 22 takes a whole number, not \"-\""},
+    {"param.22=1x", "parameter 22 takes a whole number, not \"1x\""},
+    {"param.22=0x", "parameter 22 takes a whole number, not \"0x\""},
+    {"param.22= 1", "parameter 22 takes a whole number, not \" 1\""},
+    {"param.0=1", "a parameter number must be from 1 to 171, not \"0\""},
+    {"param.172=1", "a parameter number must be from 1 to 171, not \"172\""},
+    {"param.=1", "a parameter number must be from 1 to 171, not \"\""},
+    {"slot.18=x", "a slot number must be from 0 to 17, not \"18\""},
+    {"slot.9=123456789", "slot 9 takes 1 to 8 bytes, not 9"},
+    {"slot.9=", "slot 9 takes 1 to 8 bytes, not 0"},
+    {"serial=123456789", "slot 9 takes 1 to 8 bytes, not 9"},
+    {"slot.9=hex:4", "hex takes two digits a byte: \"4\" has an odd number"},
+    {"aux=", "the auxiliary area takes 1 to 1024 bytes, not 0"},
+    {"aux=hex:zz", "hex takes the digits 0-9 and a-f: \"zz\" is no byte"},
+    {"tuning.10.qwaSendGain=1", "a tuning block must be from 0 to 9, not \"10\""},
+    {"tuning.3.qwaNone=1", "there is no tuning field \"qwaNone\""},
+    {"tuning.3.=1", "there is no tuning field \"\""},
+    {"tuning.3.qwaAECSwitch=on",
+     "qwaAECSwitch has no word \"on\": it takes qwaOff, qwaOn, qwaIdle, or a code 0 to 3"},
+    {"tuning.3.qwaAECSwitch=4", "qwaAECSwitch takes 0 to 3: 4 does not fit"},
+    {"tuning.3.qwaSendGain=qwaOn", "qwaSendGain takes numbers, not the word \"qwaOn\""},
+    {"tuning.3.qwaSendGain=40000", "qwaSendGain takes -32768 to 32767: 40000 does not fit"},
+    {"tuning.3.qwaNCParams=1,2", "qwaNCParams takes 5 numbers, not 2"},
+    {"tuning.3.qwaNCParams=", "qwaNCParams takes 5 numbers, not 0"},
+    {"tuning.3.qwaNCParams=1,2,3,4,x", "qwaNCParams takes a whole number, not \"x\""},
+    {"tuning.3=/missing/file", "cannot read /missing/file: No such file or directory"},
+    {"tuning.3=/", "/ is not a regular file"},
+    {"tuning=x", "unknown key \"tuning\": it takes param.N, serial, slot.N, aux, tuning.B.FIELD or "
+                 "tuning.B"},
+};
+
+TEST_F(EditTest, WrongAssignmentIsNamedWithWhatWouldBeRight) {
+    for (const Refusal& refusal : REFUSALS) {
+        EXPECT_EQ(refusalOf({refusal.assignment}),
+                  std::string(refusal.assignment) + ": " + refusal.message);
+    }
+}
+
+TEST_F(EditTest, UnknownKeyIsNamedWithThoseThatAreKnown) {
+    for (const std::string key :
+         {"", "x", "Serial", "serial ", "params.22", "slot", "param", "disk"}) {
+        const std::string assignment = key + "=1";
+        EXPECT_EQ(refusalOf({assignment}),
+                  std::string(assignment).append(": unknown key \"").append(key) + "\"" + KNOWN);
+    }
+    EXPECT_EQ(refusalOf({"serial"}), "\"serial\" is no assignment: it takes KEY=VALUE");
+}
+
+TEST_F(EditTest, WrongAssignmentBehindGoodOnesLeavesThoseUndone) {
+    EXPECT_NE(refusalOf({"param.22=9", "serial=x", "tuning.3.qwaSendGain=1", "param.22=256"}), "");
+    fs::resize_file(root() / std::string(IMAGE_PATH).substr(1), 100);
+    EXPECT_EQ(refusalOf({"param.22=9", "serial=x", "param.134=1"}),
+              "param.134=1: parameter 134 ends at byte 135 of an image of 100 bytes");
+}
+
+TEST_F(EditTest, ValueThatIsSetTwiceIsRefused) {
+    writeFile(hostFile(), "");
+    EXPECT_EQ(refusalOf({"param.22=1", "param.0x16=1"}),
+              "param.0x16=1: parameter 22 is set by \"param.22=1\" already");
+    EXPECT_EQ(refusalOf({"serial=a", "slot.9=b"}),
+              "slot.9=b: slot 9 is set by \"serial=a\" already");
+    EXPECT_EQ(refusalOf({"slot.15=a", "slot.1=b"}),
+              "slot.1=b: slot 1 is set by \"slot.15=a\" already");
+    EXPECT_EQ(refusalOf({"serial=a", "slot.15=b"}),
+              "slot.15=b: slot 9 is set by \"serial=a\" already");
+    EXPECT_EQ(refusalOf({"aux=a", "aux=a"}),
+              "aux=a: the auxiliary area is set by \"aux=a\" already");
+    EXPECT_EQ(refusalOf({"tuning.3.qwaSendGain=1", "tuning.0x3.qwaSendGain=1"}),
+              "tuning.0x3.qwaSendGain=1: qwaSendGain of tuning block 3 is set by "
+              "\"tuning.3.qwaSendGain=1\" already");
+}
+
+TEST_F(EditTest, FaultsOfATuningFileStandAtTheirPlaces) {
+    writeFile(hostFile(), "qwaAECSwitch on\n");
+    const std::string refusal = refusalOf({"tuning.3=" + hostFile().string()});
+    EXPECT_EQ(refusal.rfind(hostFile().string() + ":1:1: the first line must be", 0), 0U)
+        << refusal;
+    EXPECT_NE(refusal.find("\n" + hostFile().string() + ":1:14: qwaAECSwitch has no word \"on\""),
+              std::string::npos)
+        << refusal;
+}
+
+/// An image and disk that a value can't be set in.
+TEST_F(EditTest, MissingImageAndDiskAreRefused) {
+    kit::UnitDescription unit;
+    unit.absent = {"/dev/hd0", IMAGE_PATH};
+    make(unit);
+    EXPECT_EQ(refusalOf({"param.22=1"}), std::string("param.22=1: cannot change ") + IMAGE_PATH +
+                                             ": No such file or directory");
+    const char* const gone = ": cannot change /dev/hd0: No such file or directory";
+    for (const std::string text : {"serial=x", "aux=x", "tuning.3.qwaSendGain=1"}) {
+        EXPECT_EQ(refusalOf({text}), text + gone);
+    }
+}
+
+TEST_F(EditTest, FoldersInTheirPlaceAreRefused) {
+    kit::UnitDescription unit;
+    unit.folders = {"/dev/hd0", IMAGE_PATH};
+    make(unit);
+    EXPECT_EQ(refusalOf({"param.22=1"}),
+              std::string("param.22=1: cannot change ") + IMAGE_PATH + ": Is a directory");
+    EXPECT_EQ(refusalOf({"serial=x"}), "serial=x: cannot change /dev/hd0: Is a directory");
+}
+
+TEST_F(EditTest, LinkOutOfTheUnitIsNotFollowedThere) {
+    const TemporaryFolder elsewhere;
+    writeFile(elsewhere.path() / "disk", "mine");
+    kit::UnitDescription unit;
+    unit.links = {{"/dev/hd0", elsewhere.path() / "disk"}, {IMAGE_PATH, "/dev/null"}};
+    make(unit);
+    EXPECT_EQ(refusalOf({"serial=x"}),
+              "serial=x: cannot change /dev/hd0: No such file or directory");
+    EXPECT_NE(refusalOf({"param.22=1"}), "");
+    EXPECT_EQ(readFile(elsewhere.path() / "disk"), "mine");
+}
+
+TEST_F(EditTest, DiskThatIsTooShortIsRefused) {
+    kit::UnitDescription unit;
+    unit.disk.size = 1044479;
+    make(unit);
+    EXPECT_EQ(refusalOf({"serial=x"}), "serial=x: slot 9 does not fit on a disk of 1044479 bytes: "
+                                       "it takes 1048447");
+    EXPECT_EQ(refusalOf({"aux=x"}), "aux=x: the auxiliary area does not fit on a disk of 1044479 "
+                                    "bytes: it takes 1045504");
+    EXPECT_EQ(refusalOf({"tuning.3.qwaSendGain=1"}),
+              "tuning.3.qwaSendGain=1: the tuning area does not fit on a disk of 1044479 bytes: it "
+              "takes 1044480");
+}
+
+TEST_F(EditTest, WhatTheKitDidNotMakeIsRefused) {
+    fs::remove(root() / ".orvane-unit");
+    EXPECT_EQ(refusalOf({"serial=x"}),
+              root().string() +
+                  " is not a unit that orvane-unit made: it has no file .orvane-unit");
+    EXPECT_THROW(kit::setValues("/", {"serial=x"}), kit::KitError);
+}
+
+} // namespace
+
+} // namespace orvane::test

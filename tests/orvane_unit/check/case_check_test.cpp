@@ -1,0 +1,197 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/host/kit_error.h"
+#include "orvane_unit/check/case_check.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/folder_names.h"
+#include "tests/support/temporary_folder.h"
+#include "tests/support/unit_test.h"
+
+#include <gtest/gtest.h>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+using unit::CaseResult;
+using unit::CheckReport;
+using Lines = std::vector<std::string>;
+
+/// A folder with one case, whose only output is its stock file.
+class CaseCheckTest : public ::testing::Test {
+protected:
+    CaseCheckTest() {
+        fs::create_directories(expected() / "tmp");
+        writeFile(folder() / "one/unit.toml",
+                  "[files]\n\"/fs/mp/etc/airplay.conf\" = \"stock\\n\"\n");
+        writeFile(folder() / "one/arguments", "-a\n");
+        writeFile(expected() / "tmp.list", "airplay.conf\n");
+        writeFile(expected() / "tmp/airplay.conf", "stock\n");
+    }
+
+    const fs::path& folder() const { return folder_.path(); }
+    fs::path expected() const { return folder() / "one/expected"; }
+
+    CheckReport check(bool updates = false) const {
+        return unit::checkCases(folder(), ORVANE_BINARY, updates);
+    }
+    Lines differences() const { return check().cases.at(0).differences; }
+
+private:
+    TemporaryFolder folder_;
+};
+
+TEST_F(CaseCheckTest, WhatIsAsExpectedHasNoDifference) {
+    const CheckReport report = check();
+    ASSERT_EQ(report.cases.size(), 1U);
+    EXPECT_EQ(report.cases[0].name, "one");
+    EXPECT_EQ(report.cases[0].differences, Lines{});
+    EXPECT_EQ(report.cases[0].surprises, Lines{});
+    EXPECT_EQ(report.cases[0].reasons,
+              (std::set<unit::Reason>{unit::Reason::profileNotGenerated,
+                                      unit::Reason::templateMissing, unit::Reason::fromStock}));
+    EXPECT_EQ(report.unreached.size(), unit::REASON_COUNT - 3);
+}
+
+TEST_F(CaseCheckTest, ChangedContentIsTold) {
+    writeFile(expected() / "tmp/airplay.conf", "other\n");
+    EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
+}
+
+TEST_F(CaseCheckTest, MissingFileOfTheExpectationIsTold) {
+    fs::remove(expected() / "tmp/airplay.conf");
+    EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
+}
+
+TEST_F(CaseCheckTest, MissingAndFurtherEntriesAreTold) {
+    writeFile(expected() / "tmp.list", "other\n");
+    EXPECT_EQ(differences(), (Lines{"/tmp/other is missing", "/tmp/airplay.conf is not expected"}));
+}
+
+TEST_F(CaseCheckTest, MissingListIsNoExpectation) {
+    fs::remove(expected() / "tmp.list");
+    EXPECT_EQ(differences(), Lines{"there is no expectation: no expected/tmp.list"});
+}
+
+TEST_F(CaseCheckTest, StandardErrorIsCompared) {
+    writeFile(expected() / "stderr", "complaint\n");
+    EXPECT_EQ(differences(), Lines{"standard error differs"});
+}
+
+TEST_F(CaseCheckTest, MissingTmpIsAnExpectationToo) {
+    writeFile(folder() / "one/unit.toml", "absent = [\"/tmp\"]\n");
+    writeFile(expected() / "tmp.list", "(absent)\n");
+    EXPECT_EQ(differences(), Lines{});
+}
+
+TEST_F(CaseCheckTest, UpdateWritesWhatThenPasses) {
+    fs::remove_all(expected());
+    fs::create_directories(expected() / "tmp");
+    writeFile(expected() / "tmp/left_over", "of before\n");
+    writeFile(folder() / "one/arguments", "-a\n-x\n");
+    EXPECT_TRUE(check(true).isUpdate);
+    EXPECT_EQ(readFile(expected() / "tmp.list"), "airplay.conf\n");
+    EXPECT_EQ(readFile(expected() / "tmp/airplay.conf"), "stock\n");
+    EXPECT_NE(readFile(expected() / "stderr").find("'x'"), std::string::npos);
+    EXPECT_FALSE(fs::exists(expected() / "tmp/left_over"));
+    EXPECT_EQ(differences(), Lines{});
+}
+
+TEST_F(CaseCheckTest, UpdateLeavesAllElseAsItIs) {
+    writeFile(folder() / "one/notes", "of a person\n");
+    fs::create_directory(folder() / "no_case");
+    const std::string unit = readFile(folder() / "one/unit.toml");
+    check(true);
+    EXPECT_EQ(folderNames(folder()), (std::set<std::string>{"no_case", "one"}));
+    EXPECT_EQ(folderNames(folder() / "one"),
+              (std::set<std::string>{"arguments", "expected", "notes", "unit.toml"}));
+    EXPECT_EQ(folderNames(expected()), (std::set<std::string>{"tmp", "tmp.list"}));
+    EXPECT_EQ(readFile(folder() / "one/unit.toml"), unit);
+    EXPECT_EQ(readFile(folder() / "one/arguments"), "-a\n");
+    EXPECT_EQ(readFile(folder() / "one/notes"), "of a person\n");
+}
+
+TEST_F(CaseCheckTest, FoldersInTmpAreExpectedByTheirNames) {
+    writeFile(folder() / "one/unit.toml", "folders = [\"/tmp/airplay.conf\"]\n");
+    EXPECT_EQ(differences(),
+              (Lines{"/tmp/airplay.conf is missing", "/tmp/airplay.conf/ is not expected"}));
+    check(true);
+    EXPECT_EQ(readFile(expected() / "tmp.list"), "airplay.conf/\n");
+    EXPECT_EQ(differences(), Lines{});
+}
+
+/// A binary that is not the tool: it leaves nothing, and ends with 1.
+TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
+    for (const bool updates : {false, true}) {
+        const CaseResult result = unit::checkCases(folder(), "/bin/false", updates).cases.at(0);
+        EXPECT_EQ(result.surprises, Lines{"/tmp/airplay.conf is not what the explanation says"});
+        ASSERT_FALSE(result.differences.empty());
+        EXPECT_EQ(result.differences[0], "exit status 1");
+        EXPECT_EQ(result.differences.size(), updates ? 1U : 2U);
+    }
+}
+
+TEST_F(CaseCheckTest, NothingIsWrittenUnasked) {
+    fs::remove_all(expected());
+    check();
+    EXPECT_FALSE(fs::exists(expected()));
+}
+
+TEST_F(CaseCheckTest, WithoutArgumentsBothWritersRun) {
+    fs::remove(folder() / "one/arguments");
+    EXPECT_EQ(differences().size(), 3U); // the three iAP files are not expected
+}
+
+TEST_F(CaseCheckTest, BadDescriptionAndMissingBinaryAreBadInput) {
+    EXPECT_THROW(unit::checkCases(folder(), "/none/orvane", false), kit::KitError);
+    writeFile(folder() / "one/unit.toml", "[image]\nsize = \"big\"\n");
+    EXPECT_THROW(check(), kit::KitError);
+}
+
+TEST(CaseCheckFolderTest, FolderWithoutUnitsIsBadInput) {
+    const TemporaryFolder folder;
+    EXPECT_THROW(unit::checkCases(folder.path(), ORVANE_BINARY, false), kit::KitError);
+    EXPECT_THROW(unit::checkCases(folder.path() / "none", ORVANE_BINARY, false), kit::KitError);
+}
+
+TEST(CaseCheckFolderTest, GoldenUnitsAgreeWithTheirExplanations) {
+    const CheckReport report = unit::checkCases(ORVANE_GOLDEN_DIR, ORVANE_BINARY, false);
+    for (const CaseResult& result : report.cases) {
+        EXPECT_EQ(result.differences, Lines{}) << result.name;
+        EXPECT_EQ(result.surprises, Lines{}) << result.name;
+    }
+    EXPECT_TRUE(report.unreached.empty()) << report.unreached.front();
+}
+
+TEST(OptionLettersTest, AreThoseThatGetoptFinds) {
+    EXPECT_EQ(unit::optionLetters({}), "");
+    EXPECT_EQ(unit::optionLetters({"-a", "-i"}), "ai");
+    EXPECT_EQ(unit::optionLetters({"-xia", "-a"}), "iaa");
+    EXPECT_EQ(unit::optionLetters({"-a", "--", "-i"}), "a");
+    EXPECT_EQ(unit::optionLetters({"word", "-a"}), "");
+    EXPECT_EQ(unit::optionLetters({"-i", "-", "-a"}), "i");
+    EXPECT_EQ(unit::optionLetters({"", "-a"}), "");
+    EXPECT_EQ(unit::optionLetters({"--a", "-i"}), "ai");
+    EXPECT_EQ(unit::optionLetters({"-a-i"}), "ai");
+}
+
+/// Each writer is seen by the output that it leaves.
+TEST(OptionLettersTest, AreThoseThatTheRealBinaryFinds) {
+    const Lines rows[] = {
+        {},      {"-xia"}, {"-a", "--", "-i"}, {"word", "-a"}, {"-i", "-"},  {"", "-a"},
+        {"--a"}, {"-a-i"}, {"-", "-ia"},       {"--", "-ia"},  {"-x", "-i"}, {"-a", "word", "-i"}};
+    for (const Lines& arguments : rows) {
+        const DescribedUnit described;
+        ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
+        const std::string letters = unit::optionLetters(arguments);
+        const auto isThere = [&described](const char* name) {
+            return fs::exists(described.root() / "tmp" / name);
+        };
+        EXPECT_EQ(isThere("airplay.conf"), letters.find('a') != std::string::npos) << letters;
+        EXPECT_EQ(isThere("iap1.cfg"), letters.find('i') != std::string::npos) << letters;
+    }
+}
+
+} // namespace
+
+} // namespace orvane::test

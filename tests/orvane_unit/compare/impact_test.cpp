@@ -1,0 +1,97 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_unit.h"
+#include "orvane_unit/compare/impact.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/temporary_folder.h"
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+namespace orvane::test {
+
+namespace {
+
+using unit::Impact;
+using Lines = std::set<std::string>;
+
+std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
+                                        const std::vector<std::string>& beginnings = {}) {
+    std::map<std::string, Impact> impacts;
+    std::size_t last = 0;
+    for (const Impact& impact :
+         unit::findImpacts(root, beginnings, [&last](std::size_t done, std::size_t all) {
+             EXPECT_EQ(done, last + 1);
+             EXPECT_LE(done, all);
+             last = done;
+         })) {
+        EXPECT_TRUE(impacts.emplace(impact.key, impact).second) << impact.key;
+        EXPECT_GE(impact.tried, 3U) << impact.key;
+        EXPECT_EQ(impact.moving == 0, impact.lines.empty()) << impact.key;
+    }
+    EXPECT_EQ(last, impacts.size());
+    return impacts;
+}
+
+TEST(ImpactTest, SampleUnitMovesByFourParametersTheSerialAndTwoBlocks) {
+    const TemporaryFolder folder;
+    const std::filesystem::path root = folder.path() / "unit";
+    kit::makeUnit(kit::parseDescription(kit::sampleDescriptionText(), "sample"), root);
+    const kit::UnitDescription before = kit::inspectUnit(root);
+    // All of them take long where everything is watched; the guide shows a run of all.
+    const std::map<std::string, Impact> impacts =
+        impactsOf(root, {"param.22", "param.36", "param.5", "param.134", "param.139", "param.140",
+                         "slot.0", "slot.8", "slot.9", "slot.16", "tuning.1.qwaN", "tuning.2.qwaN",
+                         "tuning.3.qwaM", "tuning.4.qwaN"});
+    // Parameters 5 and 50 to 59 besides; slots of 1, 16, 8 and 24 bytes; three fields begin with
+    // qwaN, and three with qwaM.
+    EXPECT_EQ(impacts.size(), 16U + (1 + 16 + 8 + 24) + 4 * 3);
+    for (const auto& [key, impact] : impacts) {
+        const bool isRead = key == "param.22" || key == "param.36" || key == "param.134" ||
+                            key == "param.139" || key.compare(0, 7, "slot.9.") == 0 ||
+                            key.compare(0, 9, "tuning.2.") == 0 ||
+                            key.compare(0, 9, "tuning.3.") == 0;
+        EXPECT_EQ(!impact.lines.empty(), isRead) << key;
+    }
+    EXPECT_EQ(impacts.at("param.22").lines, Lines{"/tmp/airplay.conf:23"});
+    EXPECT_EQ(impacts.at("slot.9.0").lines,
+              (Lines{"/tmp/iap1.cfg:6", "/tmp/iap2.cfg:6", "/tmp/iap2_device.cfg:6"}));
+    EXPECT_EQ(impacts.at("tuning.3.qwaMEQEnable").lines, Lines{"/tmp/telephony_FFFF.txt:45"});
+    EXPECT_EQ(
+        impacts.at("param.134").lines,
+        (Lines{"/tmp/airplay.conf:20", "/tmp/speechrec_FFFF.txt", "/tmp/telephony_FFFF.txt"}));
+    EXPECT_EQ(kit::inspectUnit(root), before);
+}
+
+TEST(ImpactTest, BytesBehindTheSerialsEndAndUnaskedBlocksMoveNothing) {
+    const DescribedUnit described(
+        [](kit::UnitDescription& unit) { unit.disk.slots[9] = std::string("AB\0CD", 5); });
+    const std::map<std::string, Impact> impacts =
+        impactsOf(described.root(), {"slot.9", "tuning.3.qwaNRAtten"});
+    EXPECT_FALSE(impacts.at("slot.9.2").lines.empty()); // the zero byte itself
+    EXPECT_TRUE(impacts.at("slot.9.3").lines.empty());
+    EXPECT_TRUE(impacts.at("slot.9.7").lines.empty());
+    EXPECT_TRUE(impacts.at("tuning.3.qwaNRAtten").lines.empty());
+}
+
+TEST(ImpactTest, WithoutImageAndDiskNothingIsTried) {
+    const DescribedUnit described([](kit::UnitDescription& unit) {
+        unit.absent = {"/dev/hd0", "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"};
+    });
+    EXPECT_TRUE(impactsOf(described.root()).empty());
+}
+
+TEST(ImpactTest, KeyThatNoInputBeginsWithIsBadInput) {
+    const DescribedUnit described;
+    EXPECT_THROW(impactsOf(described.root(), {"param.172"}), kit::KitError);
+}
+
+TEST(ImpactTest, MissingRootIsBadInput) {
+    EXPECT_THROW(unit::findImpacts("/none/at/all", {}, [](std::size_t, std::size_t) {}),
+                 kit::KitError);
+}
+
+} // namespace
+
+} // namespace orvane::test

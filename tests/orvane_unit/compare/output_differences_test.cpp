@@ -1,0 +1,197 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "config/boot_disk.h"
+#include "config/config_store.h"
+#include "kit/unit/describe_inputs.h"
+#include "orvane_unit/compare/output_differences.h"
+#include "orvane_unit/explain/explain.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "writers/airplay_writer.h"
+#include "writers/iap_writer.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <map>
+#include <set>
+
+namespace orvane::test {
+
+namespace {
+
+using kit::UnitDescription;
+using unit::Consequence;
+
+/// What comes of the change, by the key of each value that differs.
+std::map<std::string, Consequence>
+consequencesOf(const std::function<void(UnitDescription&)>& change) {
+    const DescribedUnit first;
+    const DescribedUnit second(change);
+    std::map<std::string, Consequence> found;
+    for (const Consequence& consequence : unit::consequences(
+             unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
+                                   unit::unitValues(kit::inspectInputs(second.root()))),
+             unit::movedOutputs(unit::explainUnit(first.root(), "ai"),
+                                unit::explainUnit(second.root(), "ai")))) {
+        found[consequence.change.key] = consequence;
+    }
+    return found;
+}
+
+std::set<std::string> pathsOf(const Consequence& consequence) {
+    std::set<std::string> paths;
+    for (const unit::MovedOutput& output : consequence.moved) {
+        paths.insert(output.path);
+    }
+    return paths;
+}
+
+std::vector<std::string> linesOf(const Consequence& consequence, const std::string& path) {
+    std::vector<std::string> lines;
+    for (const unit::MovedOutput& output : consequence.moved) {
+        for (const unit::MovedLine& line : output.lines) {
+            if (output.path == path) {
+                const bool isRemoved = line.line.kind == unit::DiffLine::Kind::removed;
+                lines.push_back((isRemoved ? "-" : "+") + line.line.text);
+            }
+        }
+    }
+    return lines;
+}
+
+using Lines = std::vector<std::string>;
+using Paths = std::set<std::string>;
+
+const Paths IAP_OUTPUTS = {IAP2_DEVICE_FILE.output, IAP2_FILE.output, IAP1_FILE.output};
+
+TEST(MovesTest, SameUnitsDifferInNothing) {
+    EXPECT_TRUE(consequencesOf([](UnitDescription&) {}).empty());
+}
+
+TEST(MovesTest, ParameterMovesItsLines) {
+    const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[139] = 1; });
+    ASSERT_EQ(found.size(), 1U);
+    const Consequence& consequence = found.at("param.139");
+    EXPECT_EQ(consequence.change.before, "26");
+    EXPECT_EQ(consequence.change.after, "1");
+    EXPECT_EQ(linesOf(consequence, AIRPLAY_FILE.output),
+              (Lines{"-model = Quarion Velmira\n", "+model = Marl Tulvari\n"}));
+    EXPECT_EQ(consequence.moved.size(), 4U);
+}
+
+TEST(MovesTest, ParameterThatIsNotReadMovesNothing) {
+    const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[50] = 3; });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_TRUE(found.at("param.50").moved.empty());
+}
+
+TEST(MovesTest, SlotsAndAuxiliaryAreaAreTold) {
+    const auto found = consequencesOf([](UnitDescription& unit) {
+        unit.disk.slots[9] = "SN9";
+        unit.disk.slots[1] = std::string("\x01\x02", 2);
+        unit.disk.aux = "bench";
+    });
+    EXPECT_EQ(pathsOf(found.at("slot.9")), IAP_OUTPUTS);
+    EXPECT_EQ(linesOf(found.at("slot.9"), IAP1_FILE.output),
+              (Lines{"-serial=SN004217\n", "+serial=SN9\n"}));
+    EXPECT_EQ(found.at("slot.1").change.after, "hex:0102");
+    EXPECT_TRUE(found.at("slot.1").moved.empty());
+    EXPECT_EQ(found.at("aux").change.after, "bench");
+    EXPECT_EQ(found.size(), 3U);
+}
+
+TEST(MovesTest, GeneratedProfileBringsTheTuningFiles) {
+    const auto found = consequencesOf([](UnitDescription& unit) {
+        unit.image.params[134] = 0xFFFF;
+        unit.disk.tuning[3].fields["qwaNRAtten"] = std::int64_t{-40};
+    });
+    const Consequence& profile = found.at("param.134");
+    EXPECT_EQ(linesOf(profile, AIRPLAY_FILE.output),
+              (Lines{"-audioProfile = 3\n", "+audioProfile = 65535\n"}));
+    EXPECT_EQ(linesOf(profile, SPEECHREC_TUNING_FILE).size(), 45U);
+    // A field that differs has its own line to itself.
+    EXPECT_EQ(linesOf(profile, TELEPHONY_TUNING_FILE).size(), 44U);
+    EXPECT_EQ(linesOf(found.at("tuning.3.qwaNRAtten"), TELEPHONY_TUNING_FILE),
+              Lines{"+qwaNRAtten -40\n"});
+}
+
+TEST(MovesTest, VersionFileMovesTheFirmwareVersions) {
+    const std::string path = "/fs/rwdata/.Version/app.inf";
+    const auto found = consequencesOf([&path](UnitDescription& unit) {
+        unit.files[path] = "Type=Application\nVersion Number=4.5.6\n";
+    });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(linesOf(found.at("file." + path), IAP1_FILE.output),
+              (Lines{"-firmware_version=030a02\n", "+firmware_version=040506\n"}));
+}
+
+TEST(MovesTest, VersionFileThatIsGoneIsTheCause) {
+    const std::string path = "/fs/rwdata/.Version/app.inf";
+    const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
+    EXPECT_EQ(pathsOf(found.at("file." + path)), IAP_OUTPUTS);
+    EXPECT_EQ(found.at("file." + path).change.after, "(missing)");
+    EXPECT_EQ(found.size(), 1U);
+}
+
+TEST(MovesTest, TemplateMovesItsOwnLines) {
+    const std::string path = AIRPLAY_FILE.templateFile;
+    const auto found =
+        consequencesOf([&path](UnitDescription& unit) { unit.files[path] = "another template\n"; });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(linesOf(found.at("file." + path), AIRPLAY_FILE.output),
+              (Lines{"-airplay template\n", "+another template\n"}));
+}
+
+TEST(MovesTest, MissingTemplateIsTheCauseOfTheStockFile) {
+    const std::string path = IAP2_FILE.templateFile;
+    const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
+    ASSERT_EQ(found.size(), 1U);
+    const Consequence& consequence = found.at("file." + path);
+    ASSERT_EQ(consequence.moved.size(), 1U);
+    EXPECT_EQ(consequence.moved[0].before, unit::Outcome::generated);
+    EXPECT_EQ(consequence.moved[0].after, unit::Outcome::stock);
+}
+
+TEST(MovesTest, EmptyTemplateOfIap2IsTheCauseOfTheStockFileOfIap1) {
+    const std::string path = IAP2_FILE.templateFile;
+    const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files[path] = ""; });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(pathsOf(found.at("file." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
+}
+
+TEST(MovesTest, StockFileThatIsNotUsedMovesNothing) {
+    const std::string path = AIRPLAY_FILE.stockFile;
+    const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_TRUE(found.at("file." + path).moved.empty());
+}
+
+TEST(MovesTest, MissingImageMovesEveryValueUnderItsOwnKey) {
+    const auto found =
+        consequencesOf([](UnitDescription& unit) { unit.absent.push_back(CONFIG_SHM_NAME); });
+    EXPECT_EQ(found.at("param.139").change.after, "(missing)");
+    EXPECT_EQ(found.at("param.139").moved.size(), 4U);
+    EXPECT_EQ(pathsOf(found.at("param.22")), Paths{AIRPLAY_FILE.output});
+    // The two lines of the value itself, its comment and the empty line behind it.
+    EXPECT_EQ(linesOf(found.at("param.134"), AIRPLAY_FILE.output).size(), 3U);
+    EXPECT_EQ(found.count(""), 0U);
+}
+
+TEST(MovesTest, MissingDiskMovesTheSerial) {
+    const auto found =
+        consequencesOf([](UnitDescription& unit) { unit.absent.push_back(BOOT_DISK); });
+    EXPECT_EQ(linesOf(found.at("slot.9"), IAP2_FILE.output),
+              (Lines{"-serial=SN004217\n", "+serial=ABCD1234abc\n"}));
+    EXPECT_EQ(found.count(""), 0U);
+}
+
+TEST(MovesTest, FolderInThePlaceOfAnOutputIsTheCause) {
+    const std::string path = IAP2_FILE.output;
+    const auto found =
+        consequencesOf([&path](UnitDescription& unit) { unit.folders.push_back(path); });
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(pathsOf(found.at("folder." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
+}
+
+} // namespace
+
+} // namespace orvane::test

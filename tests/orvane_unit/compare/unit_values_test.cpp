@@ -1,0 +1,130 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Kinds of values that no output comes from, and changes that no value accounts for.
+#include "config/boot_disk.h"
+#include "kit/unit/describe_inputs.h"
+#include "orvane_unit/compare/output_differences.h"
+#include "orvane_unit/explain/explain.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "writers/iap_writer.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <map>
+#include <utility>
+
+namespace orvane::test {
+
+namespace {
+
+using kit::UnitDescription;
+using unit::UnitValues;
+using unit::ValueChange;
+
+/// Both sides of each value that differs, by its key.
+using Changes = std::map<std::string, std::pair<std::string, std::string>>;
+
+Changes changesOf(const std::function<void(UnitDescription&)>& change) {
+    const DescribedUnit first;
+    const DescribedUnit second(change);
+    Changes changes;
+    for (const ValueChange& value :
+         unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
+                               unit::unitValues(kit::inspectInputs(second.root())))) {
+        changes[value.key] = {value.before, value.after};
+    }
+    return changes;
+}
+
+TEST(UnitValuesTest, EveryKindHasItsKey) {
+    EXPECT_EQ(
+        changesOf([](UnitDescription& unit) {
+            unit.image.size = 200;
+            unit.image.bytes[190] = "\x07";
+            unit.image.params[9] = 5;
+            unit.disk.slots[0] = "\xff";
+            unit.disk.slots[16] = "hex:";
+            unit.disk.aux = "bench 2";
+            unit.disk.tuning[5].raw = std::string(11, '\0') + '\x7f';
+            unit.disk.tuning[4].fields["qwaMEQEnable"] = std::vector<std::int64_t>{1, 2, 3, 255};
+            unit.disk.tuning[4].fields["qwaAECSwitch"] = std::string("qwaIdle");
+        }),
+        (Changes{{"image.size", {"179", "200"}},
+                 {"image.bytes.190", {"(missing)", "hex:07"}},
+                 {"param.9", {"0", "5"}},
+                 {"slot.0", {"", "hex:ff"}},
+                 {"slot.16", {"", "hex:6865783a"}},
+                 {"aux", {"", "bench 2"}},
+                 {"tuning.5.raw", {"", "hex:00000000000000000000007f"}},
+                 {"tuning.4.qwaMEQEnable", {"0,0,0,0", "1,2,3,255"}},
+                 {"tuning.4.qwaAECSwitch", {"0", "qwaIdle"}}}));
+}
+
+TEST(UnitValuesTest, FilesAreToldBySizeAndChecksum) {
+    // By zlib: "map\n" and "airplay template\n".
+    EXPECT_EQ(
+        changesOf([](UnitDescription& unit) {
+            unit.files["/fs/rwdata/.Version/map.inf"] = "map\n";
+            unit.files.erase("/fs/mp/etc/airplay_static.conf");
+            unit.folders.push_back("/fs/mp/etc/airplay_static.conf");
+        }),
+        (Changes{
+            {"file./fs/rwdata/.Version/map.inf", {"(missing)", "4 bytes, CRC-32 6ef7c13d"}},
+            {"file./fs/mp/etc/airplay_static.conf", {"17 bytes, CRC-32 d057ba0d", "(missing)"}},
+            {"folder./fs/mp/etc/airplay_static.conf", {"(missing)", "a folder"}}}));
+}
+
+TEST(UnitValuesTest, WhatTheToolDoesNotReadIsNoDifference) {
+    EXPECT_EQ(changesOf([](UnitDescription& unit) {
+                  unit.files["/fs/rwdata/notes"] = "not read\n";
+                  unit.files["/fs/rwdata/.Version/readme.txt"] = "no version file\n";
+                  unit.files["/tmp/iap1.cfg"] = "of an earlier run\n";
+                  unit.disk.bytes[5] = "A"; // before the last mebibyte
+              }),
+              Changes{});
+}
+
+TEST(UnitValuesTest, MissingDiskTakesAllItsValuesAlong) {
+    const Changes changes =
+        changesOf([](UnitDescription& unit) { unit.absent.push_back(BOOT_DISK); });
+    // 17 slots, the auxiliary area, ten blocks of 44 fields and the bytes that no field reads.
+    EXPECT_EQ(changes.size(), 17U + 1 + 10 * (44 + 1) + 1);
+    EXPECT_EQ(changes.at("slot.9").second, "(missing)");
+    EXPECT_EQ(changes.at("tuning.0.qwaNRAtten").second, "(missing)");
+    EXPECT_EQ(changes.at(std::string("absent.") + BOOT_DISK).first, "(missing)");
+}
+
+TEST(UnitValuesTest, DifferencesComeInTheOrderOfTheFirstThenTheSecond) {
+    const UnitValues before = {{"c", "1"}, {"a", "1"}, {"b", "1"}};
+    const UnitValues after = {{"d", "2"}, {"b", "2"}, {"c", "1"}};
+    std::vector<std::string> found;
+    for (const ValueChange& change : unit::differingValues(before, after)) {
+        found.push_back(change.key + ": " + change.before + " " + change.after);
+    }
+    EXPECT_EQ(found, (std::vector<std::string>{"a: 1 (missing)", "b: 1 2", "d: (missing) 2"}));
+}
+
+/// An output that is a link to a template of a later one: no single input accounts for that.
+TEST(UnitValuesTest, LinesOfNoValueComeLast) {
+    const DescribedUnit first;
+    const DescribedUnit second([](UnitDescription& unit) {
+        unit.links[IAP2_FILE.output] = IAP1_FILE.templateFile;
+        unit.image.params[50] = 1;
+    });
+    const std::vector<unit::Consequence> found = unit::consequences(
+        unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
+                              unit::unitValues(kit::inspectInputs(second.root()))),
+        unit::movedOutputs(unit::explainUnit(first.root(), "i"),
+                           unit::explainUnit(second.root(), "i")));
+    ASSERT_EQ(found.size(), 2U);
+    EXPECT_EQ(found[0].change.key, "param.50");
+    EXPECT_TRUE(found[0].moved.empty());
+    EXPECT_EQ(found[1].change.key, "");
+    ASSERT_EQ(found[1].moved.size(), 1U);
+    EXPECT_EQ(found[1].moved[0].path, IAP1_FILE.output);
+}
+
+} // namespace
+
+} // namespace orvane::test

@@ -1,0 +1,232 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Every reason by a unit that lays it, and the same unit run by the real binary.
+#include "config/boot_disk.h"
+#include "config/config_store.h"
+#include "orvane_unit/explain/explain.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/unit_test.h"
+#include "writers/airplay_writer.h"
+#include "writers/iap_writer.h"
+
+#include <algorithm>
+#include <functional>
+#include <set>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+using kit::UnitDescription;
+using unit::Outcome;
+using unit::Reason;
+
+constexpr char VERSION_FILE[] = "/fs/rwdata/.Version/app.inf";
+
+struct Row {
+    Reason reason;
+    const char* output; ///< where it is to be found
+    Outcome outcome;
+    std::function<void(UnitDescription&)> change;
+};
+
+std::function<void(UnitDescription&)> without(const std::string& path) {
+    return [path](UnitDescription& unit) {
+        unit.files.erase(path);
+        unit.absent.push_back(path);
+    };
+}
+
+std::function<void(UnitDescription&)> empty(const std::string& path) {
+    return [path](UnitDescription& unit) { unit.files[path].clear(); };
+}
+
+std::function<void(UnitDescription&)> folder(const std::string& path) {
+    return [path](UnitDescription& unit) {
+        unit.files.erase(path);
+        unit.folders.push_back(path);
+    };
+}
+
+std::function<void(UnitDescription&)> version(const std::string& text) {
+    return [text](UnitDescription& unit) {
+        unit.files[VERSION_FILE] = "Type=Application\nVersion Number=" + text + "\n";
+    };
+}
+
+std::function<void(UnitDescription&)> both(const std::function<void(UnitDescription&)>& first,
+                                           const std::function<void(UnitDescription&)>& second) {
+    return [first, second](UnitDescription& unit) {
+        first(unit);
+        second(unit);
+    };
+}
+
+void plain(UnitDescription& /*unit*/) {}
+
+void generatedProfile(UnitDescription& unit) {
+    unit.image.params[134] = 0xFFFF;
+    unit.disk.tuning[3].fields["qwaAECSwitch"] = std::string("qwaOn");
+}
+
+const std::vector<Row>& rows() {
+    constexpr const char* AIRPLAY_OUT = AIRPLAY_FILE.output;
+    constexpr const char* DEVICE_OUT = IAP2_DEVICE_FILE.output;
+    constexpr const char* IAP1_OUT = IAP1_FILE.output;
+    static const std::vector<Row> ROWS = {
+        {Reason::generated, AIRPLAY_OUT, Outcome::generated, plain},
+        {Reason::profileNotGenerated, TELEPHONY_TUNING_FILE, Outcome::notAsked, plain},
+        {Reason::profileUnknown, SPEECHREC_TUNING_FILE, Outcome::notAsked,
+         without(CONFIG_SHM_NAME)},
+        {Reason::outputNotOpenable, DEVICE_OUT, Outcome::kept, folder(DEVICE_OUT)},
+        {Reason::templateMissing, AIRPLAY_OUT, Outcome::stock, without(AIRPLAY_FILE.templateFile)},
+        {Reason::templateMissing, IAP1_OUT, Outcome::generated, without(IAP1_FILE.templateFile)},
+        {Reason::templateEmpty, DEVICE_OUT, Outcome::generated,
+         empty(IAP2_DEVICE_FILE.templateFile)},
+        {Reason::templateEmpty, DEVICE_OUT, Outcome::generated,
+         folder(IAP2_DEVICE_FILE.templateFile)},
+        {Reason::iap2NotOpened, IAP1_OUT, Outcome::stock, folder(IAP2_FILE.output)},
+        {Reason::iap2TemplateEmpty, IAP1_OUT, Outcome::stock, empty(IAP2_FILE.templateFile)},
+        {Reason::stockMissing, AIRPLAY_OUT, Outcome::empty,
+         both(without(AIRPLAY_FILE.templateFile), without(AIRPLAY_FILE.stockFile))},
+        {Reason::stockEmpty, AIRPLAY_OUT, Outcome::empty,
+         both(without(AIRPLAY_FILE.templateFile), empty(AIRPLAY_FILE.stockFile))},
+        {Reason::fixedText, AIRPLAY_OUT, Outcome::generated, plain},
+        {Reason::fromTemplate, AIRPLAY_OUT, Outcome::generated, plain},
+        {Reason::fromStock, AIRPLAY_OUT, Outcome::stock, without(AIRPLAY_FILE.templateFile)},
+        {Reason::fromImage, AIRPLAY_OUT, Outcome::generated, plain},
+        {Reason::imageMissing, AIRPLAY_OUT, Outcome::generated, without(CONFIG_SHM_NAME)},
+        {Reason::imageNotMappable, AIRPLAY_OUT, Outcome::generated, folder(CONFIG_SHM_NAME)},
+        {Reason::imageNotMappable, AIRPLAY_OUT, Outcome::generated,
+         [](UnitDescription& unit) {
+             unit.image = {};
+             unit.image.size = 0;
+         }},
+        {Reason::imageTooShort, AIRPLAY_OUT, Outcome::generated,
+         [](UnitDescription& unit) {
+             unit.image = {};
+             unit.image.size = 134; // half of the audio profile
+         }},
+        {Reason::modelUnknown, DEVICE_OUT, Outcome::generated,
+         [](UnitDescription& unit) { unit.image.params[139] = 48; }},
+        {Reason::fromRecord, DEVICE_OUT, Outcome::generated, plain},
+        {Reason::serialBlank, DEVICE_OUT, Outcome::generated,
+         [](UnitDescription& unit) { unit.disk.slots.clear(); }},
+        {Reason::diskMissing, DEVICE_OUT, Outcome::generated, without(BOOT_DISK)},
+        {Reason::diskTooShort, DEVICE_OUT, Outcome::generated,
+         [](UnitDescription& unit) {
+             unit.disk = {};
+             unit.disk.size = 5000;
+         }},
+        {Reason::diskUnreadable, DEVICE_OUT, Outcome::generated, folder(BOOT_DISK)},
+        {Reason::fromVersionFile, DEVICE_OUT, Outcome::generated, plain},
+        {Reason::versionFolderMissing, DEVICE_OUT, Outcome::generated,
+         both(without(VERSION_FILE), without("/fs/rwdata/.Version"))},
+        {Reason::versionNoApplication, DEVICE_OUT, Outcome::generated, without(VERSION_FILE)},
+        {Reason::versionNumberMissing, IAP1_OUT, Outcome::generated, version("ABC_")},
+        {Reason::versionNotAvailable, IAP1_OUT, Outcome::generated, version("N/A")},
+        {Reason::versionIncomplete, IAP1_OUT, Outcome::generated, version("1.2")},
+        {Reason::versionNotNumeric, IAP1_OUT, Outcome::generated, version("1.b.3")},
+        {Reason::versionOutOfRange, IAP1_OUT, Outcome::generated, version("1.256.3")},
+        {Reason::fromTuningBlock, TELEPHONY_TUNING_FILE, Outcome::generated, generatedProfile},
+        {Reason::wordUnknown, TELEPHONY_TUNING_FILE, Outcome::generated, generatedProfile},
+    };
+    return ROWS;
+}
+
+bool has(const unit::Output& output, Reason reason) {
+    const auto holds = [reason](const std::vector<Reason>& reasons) {
+        return std::find(reasons.begin(), reasons.end(), reason) != reasons.end();
+    };
+    return holds(output.reasons) ||
+           std::any_of(output.lines.begin(), output.lines.end(),
+                       [&holds](const unit::Line& line) { return holds(line.reasons); });
+}
+
+class ExplainReasonsTest : public ::testing::TestWithParam<std::size_t> {
+protected:
+    static const Row& row() { return rows().at(GetParam()); }
+};
+
+TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
+    const DescribedUnit described(row().change);
+    const unit::Explanation explanation = unit::explainUnit(described.root(), "ai");
+    const auto output =
+        std::find_if(explanation.begin(), explanation.end(),
+                     [](const unit::Output& other) { return other.path == row().output; });
+    ASSERT_NE(output, explanation.end());
+    EXPECT_TRUE(has(*output, row().reason)) << reasonInfo(row().reason).code;
+    EXPECT_EQ(output->outcome, row().outcome);
+    EXPECT_EQ(isIntended(*output) || reasonInfo(row().reason).isIntended,
+              reasonInfo(row().reason).isIntended);
+}
+
+TEST_P(ExplainReasonsTest, RunLeavesWhatIsExplained) {
+    const DescribedUnit described(row().change);
+    const unit::Explanation explanation = unit::explainUnit(described.root(), "ai");
+    ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, {"-a", "-i"}}).exitStatus, 0);
+    for (const unit::Output& output : explanation) {
+        const fs::path file = described.root() / output.path.substr(1);
+        std::string written;
+        for (const unit::Line& line : output.lines) {
+            written += line.text;
+        }
+        switch (output.left) {
+        case unit::Left::file:
+            EXPECT_EQ(readFile(file), output.content) << output.path;
+            EXPECT_EQ(written, output.content) << output.path;
+            break;
+        case unit::Left::folder:
+            EXPECT_TRUE(fs::is_directory(file)) << output.path;
+            break;
+        case unit::Left::nothing:
+        case unit::Left::other:
+            EXPECT_FALSE(fs::exists(file)) << output.path;
+            break;
+        }
+    }
+}
+
+std::string rowName(const ::testing::TestParamInfo<std::size_t>& row) {
+    std::string name = reasonInfo(rows()[row.param].reason).code;
+    std::replace(name.begin(), name.end(), '-', '_');
+    return name + "_" + std::to_string(row.param);
+}
+
+INSTANTIATE_TEST_SUITE_P(Rows, ExplainReasonsTest, ::testing::Range<std::size_t>(0, rows().size()),
+                         rowName);
+
+TEST(ReasonsTest, EveryReasonHasARow) {
+    std::set<Reason> laid;
+    for (const Row& row : rows()) {
+        laid.insert(row.reason);
+    }
+    for (const unit::ReasonInfo& info : unit::REASONS) {
+        EXPECT_EQ(laid.count(info.reason), 1U) << info.code;
+    }
+}
+
+TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
+    std::set<std::string> codes;
+    for (const unit::ReasonInfo& info : unit::REASONS) {
+        const std::string code = info.code;
+        EXPECT_TRUE(codes.insert(code).second) << code;
+        EXPECT_EQ(code.find_first_not_of("abcdefghijklmnopqrstuvwxyz0123456789-"),
+                  std::string::npos)
+            << code;
+        EXPECT_NE(std::string(info.sentence).back(), '.') << code;
+    }
+}
+
+TEST(ReasonsTest, EveryCodeIsInTheGuide) {
+    const std::string guide = readFile(std::string(ORVANE_DOCS_DIR) + "/orvane-unit.md");
+    for (const unit::ReasonInfo& info : unit::REASONS) {
+        const std::string row = "| `" + std::string(info.code) + "` |";
+        EXPECT_NE(guide.find(row), std::string::npos) << info.code;
+    }
+}
+
+} // namespace
+
+} // namespace orvane::test

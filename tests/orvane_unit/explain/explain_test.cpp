@@ -1,0 +1,174 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/unit/marker.h"
+#include "orvane_unit/explain/explain.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/orvane_unit/tree_state.h"
+#include "tests/support/unit_test.h"
+#include "writers/airplay_writer.h"
+#include "writers/iap_writer.h"
+
+#include <algorithm>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+using kit::UnitDescription;
+using unit::Explanation;
+using unit::Line;
+using unit::Output;
+
+const Output& outputOf(const Explanation& explanation, const std::string& path) {
+    const auto found = std::find_if(explanation.begin(), explanation.end(),
+                                    [&path](const Output& other) { return other.path == path; });
+    if (found == explanation.end()) {
+        throw std::runtime_error("no output " + path);
+    }
+    return *found;
+}
+
+const Line& lineOf(const Output& output, const std::string& key) {
+    const auto found = std::find_if(output.lines.begin(), output.lines.end(),
+                                    [&key](const Line& line) { return line.key == key; });
+    if (found == output.lines.end()) {
+        throw std::runtime_error("no line of " + key);
+    }
+    return *found;
+}
+
+/// What the real binary leaves at the outputs that the explanation names.
+void expectRunLeaves(const DescribedUnit& described, const Explanation& explanation,
+                     const std::vector<std::string>& arguments) {
+    ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
+    const kit::EnteredRoot entered(described.root());
+    for (const Output& output : explanation) {
+        if (output.left == unit::Left::file) {
+            EXPECT_EQ(readFile(output.path), output.content) << output.path;
+        } else {
+            std::error_code ignored; // of a link to itself
+            EXPECT_FALSE(fs::is_regular_file(output.path, ignored)) << output.path;
+        }
+    }
+}
+
+TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
+    const DescribedUnit described;
+    const Explanation explanation = unit::explainUnit(described.root(), "ai");
+    const Output& airplay = outputOf(explanation, AIRPLAY_FILE.output);
+    EXPECT_EQ(lineOf(airplay, "param.139").text, "model = Quarion Velmira\n");
+    EXPECT_EQ(lineOf(airplay, "param.139").detail, "parameter 139, image byte 139: 1a");
+    EXPECT_EQ(lineOf(airplay, "param.36").text, "oemIconPath = /fs/mp/etc/QUARION/oemIcon.png\n");
+    EXPECT_EQ(lineOf(airplay, "param.134").text, "audioProfile = 3\n");
+    EXPECT_EQ(lineOf(airplay, "param.134").detail, "parameter 134, image bytes from 133: 03 00");
+    EXPECT_EQ(lineOf(airplay, "param.22").text, "rightHandDrive = 1\n");
+    EXPECT_EQ(lineOf(airplay, "file./fs/mp/etc/airplay_static.conf").text, "airplay template\n");
+
+    const Output& iap1 = outputOf(explanation, IAP1_FILE.output);
+    EXPECT_EQ(lineOf(iap1, "slot.9").text, "serial=SN004217\n");
+    // 2 MiB less 1 MiB, and slot 9 at 129 behind it.
+    EXPECT_EQ(lineOf(iap1, "slot.9").detail,
+              "record slot 9, disk bytes from 1048705: 53 4e 30 30 34 32 31 37");
+    EXPECT_EQ(lineOf(iap1, "file./fs/rwdata/.Version/app.inf").text, "firmware_version=030a02\n");
+    EXPECT_EQ(lineOf(iap1, "file./fs/rwdata/.Version/app.inf").detail,
+              "/fs/rwdata/.Version/app.inf:2: Version Number is \"ABC_3.10.2_rc\"");
+    EXPECT_TRUE(isIntended(explanation));
+}
+
+TEST(ExplainTest, VersionLineIsTheLastOneOfItsKey) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        unit.files["/fs/rwdata/.Version/app.inf"] =
+            "Version Number=1.1.1\nno line\nType=Application\nVersion Number = 2.2.2\n";
+    });
+    const Explanation explanation = unit::explainUnit(described.root(), "i");
+    EXPECT_EQ(
+        lineOf(outputOf(explanation, IAP2_FILE.output), "file./fs/rwdata/.Version/app.inf").detail,
+        "/fs/rwdata/.Version/app.inf:4: Version Number is \"2.2.2\"");
+}
+
+TEST(ExplainTest, LettersComeInTheirOrderAndAsOftenAsGiven) {
+    const DescribedUnit described;
+    const auto pathsOf = [&described](const std::string& letters) {
+        std::vector<std::string> paths;
+        for (const Output& output : unit::explainUnit(described.root(), letters)) {
+            paths.push_back(output.path);
+        }
+        return paths;
+    };
+    const std::vector<std::string> airplay = {TELEPHONY_TUNING_FILE, SPEECHREC_TUNING_FILE,
+                                              AIRPLAY_FILE.output};
+    std::vector<std::string> expected = {IAP2_DEVICE_FILE.output, IAP2_FILE.output,
+                                         IAP1_FILE.output};
+    expected.insert(expected.end(), airplay.begin(), airplay.end());
+    EXPECT_EQ(pathsOf("ia"), expected);
+    EXPECT_EQ(pathsOf("aa").size(), 6U);
+    EXPECT_TRUE(pathsOf("").empty());
+}
+
+TEST(ExplainTest, SerialWithLineEndsAndZeroBytesIsOnePiece) {
+    for (const std::string& serial : {std::string("A\nB\n\nC"), std::string("\n"),
+                                      std::string("AB\0CD", 5), std::string("\xff\nserial")}) {
+        const DescribedUnit described(
+            [&serial](UnitDescription& unit) { unit.disk.slots[9] = serial; });
+        const Explanation explanation = unit::explainUnit(described.root(), "i");
+        const std::string text = serial.substr(0, serial.find('\0'));
+        EXPECT_EQ(lineOf(outputOf(explanation, IAP2_FILE.output), "slot.9").text,
+                  "serial=" + text + "\n");
+        expectRunLeaves(described, explanation, {"-i"});
+    }
+}
+
+TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
+    struct Link {
+        const char* from;
+        const char* to;
+    };
+    const Link links[] = {
+        {IAP2_DEVICE_FILE.output, IAP1_FILE.output},       // an output written later
+        {IAP1_FILE.output, IAP2_FILE.output},              // one written before
+        {IAP2_DEVICE_FILE.output, IAP2_FILE.templateFile}, // another file's template
+        {IAP2_FILE.output, IAP1_FILE.stockFile},
+        {AIRPLAY_FILE.output, "fresh"}, // a file that is not there yet
+        {AIRPLAY_FILE.output, "/none/at/all"},
+        {AIRPLAY_FILE.output, AIRPLAY_FILE.output},
+    };
+    for (const Link& link : links) {
+        const DescribedUnit described(
+            [&link](UnitDescription& unit) { unit.links[link.from] = link.to; });
+        const Explanation explanation = unit::explainUnit(described.root(), "ai");
+        SCOPED_TRACE(std::string(link.from) + " -> " + link.to);
+        expectRunLeaves(described, explanation, {"-a", "-i"});
+    }
+}
+
+TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
+    const DescribedUnit described(
+        [](UnitDescription& unit) { unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n"; });
+    const Explanation explanation = unit::explainUnit(described.root(), "a");
+    const Output& output = outputOf(explanation, TELEPHONY_TUNING_FILE);
+    EXPECT_EQ(output.outcome, unit::Outcome::notAsked);
+    EXPECT_EQ(output.left, unit::Left::file);
+    EXPECT_EQ(output.content, "of an earlier run\n");
+    EXPECT_TRUE(output.lines.empty());
+}
+
+TEST(ExplainTest, MissingTmpKeepsAllOutputs) {
+    const DescribedUnit described([](UnitDescription& unit) { unit.absent.push_back("/tmp"); });
+    for (const Output& output : unit::explainUnit(described.root(), "i")) {
+        EXPECT_EQ(output.outcome, unit::Outcome::kept) << output.path;
+        EXPECT_EQ(output.left, unit::Left::nothing) << output.path;
+    }
+}
+
+TEST(ExplainTest, UnitIsOnlyReadAndNeedsNoMark) {
+    const DescribedUnit described([](UnitDescription& unit) { unit.image.params[134] = 0xFFFF; });
+    fs::remove(described.root() / kit::MARKER_NAME);
+    const auto before = treeStates(described.root());
+    letTimePass();
+    EXPECT_EQ(unit::explainUnit(described.root(), "aia").size(), 9U);
+    EXPECT_EQ(treeStates(described.root()), before);
+}
+
+} // namespace
+
+} // namespace orvane::test

@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The lines of an explanation, one behind the other, are the file that the golden units expect.
+#include "orvane_unit/check/case_check.h"
+#include "orvane_unit/explain/explain.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/unit_test.h"
+
+#include <set>
+#include <sstream>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+using unit::Outcome;
+using unit::Output;
+
+std::vector<std::string> argumentsOf(const fs::path& folder) {
+    std::istringstream text(readFile(folder / "arguments"));
+    std::vector<std::string> arguments;
+    for (std::string line; std::getline(text, line);) {
+        arguments.push_back(line);
+    }
+    return arguments;
+}
+
+/// How many lines' texts were compared.
+std::size_t compareLines(const fs::path& folder) {
+    const TemporaryFolder made;
+    kit::makeUnit(kit::readDescription(folder / "unit.toml"), made.path() / "unit");
+    const unit::Explanation explanation =
+        unit::explainUnit(made.path() / "unit", unit::optionLetters(argumentsOf(folder)));
+    std::size_t compared = 0;
+    for (const Output& output : explanation) {
+        if (output.outcome == Outcome::kept || output.outcome == Outcome::notAsked) {
+            EXPECT_TRUE(output.lines.empty()) << output.path;
+            continue;
+        }
+        std::string written;
+        for (const unit::Line& line : output.lines) {
+            written += line.text;
+            EXPECT_FALSE(line.reasons.empty()) << output.path << ": " << line.text;
+            ++compared;
+        }
+        EXPECT_EQ(written, readFile(folder / ("expected" + output.path))) << output.path;
+        EXPECT_EQ(output.outcome == Outcome::empty, written.empty()) << output.path;
+    }
+    return compared;
+}
+
+TEST(GoldenLinesTest, LinesAreTheExpectedFiles) {
+    std::size_t compared = 0;
+    for (const fs::directory_entry& entry : fs::directory_iterator(ORVANE_GOLDEN_DIR)) {
+        SCOPED_TRACE(entry.path().filename().string());
+        compared += compareLines(entry.path());
+    }
+    EXPECT_GT(compared, 1000U);
+}
+
+} // namespace
+
+} // namespace orvane::test

@@ -1,0 +1,294 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The program orvane-unit from its command line to its exit status.
+#include "kit/enter/child_output.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/marker.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/host_command.h"
+#include "tests/support/unit_test.h"
+
+#include <linux/capability.h>
+#include <sched.h>
+#include <sys/prctl.h>
+#include <unistd.h>
+
+#include <algorithm>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+using Words = std::vector<std::string>;
+
+Words commandLine(const Words& words) {
+    Words command = buildCommand(ORVANE_UNIT_BINARY);
+    command.insert(command.end(), words.begin(), words.end());
+    return command;
+}
+
+kit::RunResult start(const Words& words) {
+    return runOnHost(commandLine(words));
+}
+
+void expectRan(const kit::RunResult& result, int status, const std::string& output,
+               const std::string& error = "") {
+    EXPECT_EQ(result.exitStatus, status);
+    EXPECT_EQ(result.standardOutput, output);
+    EXPECT_EQ(result.standardError, error);
+}
+
+void expectRefused(const Words& words, const std::string& complaint) {
+    expectRan(start(words), 2, "", "orvane-unit: " + complaint + "\n");
+}
+
+const Words COMMANDS = {"new", "describe", "set",    "show",    "explain",
+                        "run", "diff",     "impact", "capture", "check"};
+
+TEST(OrvaneUnitTest, EveryCommandHelpsWithAnExample) {
+    const kit::RunResult help = start({"--help"});
+    EXPECT_EQ(help.exitStatus, 0);
+    EXPECT_EQ(help.standardError, "");
+    for (const std::string& command : COMMANDS) {
+        EXPECT_NE(help.standardOutput.find("\n  " + command + " "), std::string::npos) << command;
+        const kit::RunResult result = start({command, "--help"});
+        EXPECT_EQ(result.exitStatus, 0) << command;
+        EXPECT_NE(result.standardOutput.find("Example:\n  orvane-unit " + command),
+                  std::string::npos)
+            << command;
+    }
+}
+
+TEST(OrvaneUnitTest, WrongUseIsRefused) {
+    expectRefused({"wash"}, "there is no command \"wash\": it takes new, describe, set, show, "
+                            "explain, run, diff, impact, capture, check");
+    expectRefused({"run", "a", "-a"},
+                  "The following argument was not expected: -a; orvane's own options follow --");
+    for (const Words& words :
+         {Words{}, Words{"explain", "a", "--content"}, Words{"new"}, Words{"new", "a", "b"},
+          Words{"diff", "a"}, Words{"show", "a", "--only", "engine"}, Words{"run", "a", "--wrong"},
+          Words{"set", "a"}}) {
+        const kit::RunResult result = start(words);
+        EXPECT_EQ(result.exitStatus, 2);
+        EXPECT_EQ(result.standardOutput, "");
+        EXPECT_EQ(result.standardError.compare(0, 13, "orvane-unit: "), 0) << result.standardError;
+    }
+}
+
+TEST(OrvaneUnitTest, NewMakesTheDescribedOrTheSampleUnit) {
+    const TemporaryFolder folder;
+    const std::string description = folder.path() / "unit.toml";
+    writeFile(description, "[files]\n\"/tmp/old\" = \"text\"\n");
+    expectRan(start({"new", folder.path() / "one", "--from", description}), 0, "");
+    EXPECT_EQ(readFile(folder.path() / "one/tmp/old"), "text");
+    expectRan(start({"new", folder.path() / "two"}), 0, "");
+    EXPECT_TRUE(exists(folder.path() / "two/fs/mp/etc/airplay_static.conf"));
+}
+
+TEST(OrvaneUnitTest, NewMakesNothingOfABadDescription) {
+    const TemporaryFolder folder;
+    const std::string description = folder.path() / "unit.toml";
+    const std::string root = folder.path() / "unit";
+    writeFile(description, "[image.params]\n134 = 70000\n");
+    expectRefused({"new", root, "--from", description},
+                  description + ":2:7: parameter 134 is two bytes: 70000 does not fit");
+    EXPECT_FALSE(exists(root));
+}
+
+TEST(OrvaneUnitTest, DescribeMakesTheSameUnitAgain) {
+    const DescribedUnit described;
+    const kit::RunResult result = start({"describe", described.root()});
+    EXPECT_EQ(result.exitStatus, 0);
+    const std::string description = described.folder() / "unit.toml";
+    writeFile(description, result.standardOutput);
+    const std::string again = described.folder() / "again";
+    expectRan(start({"new", again, "--from", description}), 0, "");
+    expectRan(runOnHost({"diff", "-r", described.root(), again}), 0, "");
+}
+
+TEST(OrvaneUnitTest, SetChangesAllOrNothing) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    expectRan(start({"set", root, "param.22=0", "serial=SN9"}), 0, "");
+    expectRefused({"set", root, "param.22=1", "param.139=300"},
+                  "param.139=300: parameter 139 is one byte: 300 does not fit");
+    const kit::RunResult shown = start({"explain", root, "-a", "-i"});
+    EXPECT_NE(shown.standardOutput.find("rightHandDrive = 0"), std::string::npos);
+    EXPECT_NE(shown.standardOutput.find("serial=SN9"), std::string::npos);
+}
+
+TEST(OrvaneUnitTest, ExplainSaysNoWhereADefaultStandsIn) {
+    const DescribedUnit described;
+    EXPECT_EQ(start({"explain", described.root()}).exitStatus, 0);
+    start({"set", described.root(), "param.139=0"});
+    EXPECT_EQ(start({"explain", described.root(), "-i"}).exitStatus, 1);
+    EXPECT_EQ(start({"explain", described.root(), "-i", "--json"}).exitStatus, 1);
+}
+
+TEST(OrvaneUnitTest, DiffSaysNoWhereSomethingDiffers) {
+    const DescribedUnit first;
+    const DescribedUnit second([](kit::UnitDescription& unit) { unit.image.params[50] = 1; });
+    expectRan(start({"diff", first.root(), first.root()}), 0, "");
+    expectRan(start({"diff", first.root(), second.root()}), 1,
+              "param.50: 0 -> 1\n  moves no output\n");
+}
+
+TEST(OrvaneUnitTest, RunShowsADiffOrOnlyNames) {
+    const DescribedUnit described([](kit::UnitDescription& unit) {
+        unit.files.erase("/fs/mp/etc/airplay_static.conf");
+        unit.files["/tmp/airplay.conf"] = "older\n";
+        unit.files["/tmp/other"] = "not written\n";
+    });
+    const std::string root = described.root();
+    expectRan(start({"run", root, "--", "-a"}), 0,
+              "--- /tmp/airplay.conf\n+++ /tmp/airplay.conf\n@@ -1,1 +1,1 @@\n-older\n"
+              "+airplay stock\n");
+    expectRan(start({"run", root, "--", "-a"}), 0, ""); // the same once more
+    expectRan(start({"run", root, "--brief", "--", "-i"}), 0,
+              "made /tmp/iap1.cfg, 254 bytes\nmade /tmp/iap2.cfg, 239 bytes\n"
+              "made /tmp/iap2_device.cfg, 263 bytes\n");
+}
+
+TEST(OrvaneUnitTest, RunPassesOnWhatTheToolSays) {
+    const DescribedUnit described;
+    const kit::RunResult result = start({"run", described.root(), "--", "-x"});
+    EXPECT_EQ(result.exitStatus, 0);
+    EXPECT_EQ(result.standardOutput, "");
+    EXPECT_NE(result.standardError.find("'x'"), std::string::npos);
+}
+
+TEST(OrvaneUnitTest, ToolThatEndsWithAnotherStatusIsANo) {
+    const DescribedUnit described;
+    expectRan(start({"run", described.root(), "--orvane", "/bin/false"}), 1, "",
+              "orvane-unit: orvane ended with exit status 1\n");
+}
+
+TEST(OrvaneUnitTest, RunWantsAToolThatIsThere) {
+    const DescribedUnit described;
+    const kit::RunResult result =
+        start({"run", described.root(), "--orvane", described.folder() / "none"});
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_EQ(result.standardOutput, "");
+    EXPECT_NE(result.standardError, "");
+}
+
+TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramElseOnPath) {
+    const DescribedUnit described;
+    const fs::path alone = described.folder() / "alone/orvane-unit";
+    const fs::path tools = described.folder() / "tools";
+    fs::create_directory(alone.parent_path());
+    fs::create_directory(tools);
+    fs::copy_file(ORVANE_UNIT_BINARY, alone);
+    fs::create_symlink(ORVANE_BINARY, tools / "orvane");
+    const auto startAlone = [&](const std::string& path) {
+        Words command = buildCommand(alone);
+        command.insert(command.begin(), {"env", "-C", alone.parent_path(), "PATH=" + path});
+        command.insert(command.end(), {"run", described.root(), "--brief", "--", "-i"});
+        return runOnHost(command);
+    };
+    expectRan(startAlone(":" + alone.parent_path().string()), 2, "",
+              "orvane-unit: orvane is neither beside orvane-unit nor on PATH: name it by "
+              "--orvane\n");
+    EXPECT_EQ(startAlone(alone.parent_path().string() + ":" + tools.string()).exitStatus, 0);
+    EXPECT_TRUE(exists(described.root() / "tmp/iap2.cfg"));
+}
+
+/// The privilege to change the root is gone for good, so the way leads through a user namespace; or
+/// nowhere, with the remedy told, where the host allows none.
+TEST(OrvaneUnitTest, RunNeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
+    const DescribedUnit described;
+    const bool isAllowed = buildCommand("").size() == 1 && // an emulator has threads of its own
+                           kit::runCaptured([] {
+                               _exit(unshare(CLONE_NEWUSER) == 0 && chroot("/") == 0 ? 0 : 1);
+                           }).exitStatus == 0;
+    Words command = commandLine({"run", described.root(), "--brief", "--", "-a"});
+    const kit::RunResult result = kit::runCaptured([&command] {
+        std::vector<char*> argv;
+        for (std::string& word : command) {
+            argv.push_back(word.data());
+        }
+        argv.push_back(nullptr);
+        if (prctl(PR_CAPBSET_DROP, CAP_SYS_CHROOT) == 0 || geteuid() != 0) {
+            execv(argv[0], argv.data());
+        }
+        throw kit::systemError("cannot start without privilege");
+    });
+    if (isAllowed) {
+        EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+        EXPECT_TRUE(exists(described.root() / "tmp/airplay.conf"));
+        return;
+    }
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_NE(result.standardError.find("allow user namespaces"), std::string::npos);
+}
+
+TEST(OrvaneUnitTest, CommandsThatWriteRefuseWhatIsNoUnitOfOurs) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    fs::remove(described.root() / kit::MARKER_NAME);
+    for (const Words& words :
+         {Words{"run", root, "--", "-a"}, Words{"set", root, "param.1=1"}, Words{"run", "/"},
+          Words{"set", "/", "param.1=1"}, Words{"new", "/"}, Words{"capture", root, "/"}}) {
+        const kit::RunResult result = start(words);
+        EXPECT_EQ(result.exitStatus, 2) << words[0] << ' ' << words[1];
+        EXPECT_EQ(result.standardOutput, "");
+    }
+    EXPECT_FALSE(exists(root + "/tmp/airplay.conf"));
+}
+
+TEST(OrvaneUnitTest, CaptureReplaysAUnit) {
+    const DescribedUnit described;
+    const std::string field = described.folder() / "field";
+    expectRan(start({"capture", described.root(), field, "--redact-serial"}), 0, "");
+    EXPECT_EQ(fs::file_size(field + "/dev/hd0"), MEBIBYTE);
+    expectRan(start({"diff", described.root(), field}), 1,
+              "slot.9: SN004217 -> XXXXXXXX\n"
+              "  /tmp/iap2_device.cfg\n    -serial=SN004217\n    +serial=XXXXXXXX\n"
+              "  /tmp/iap2.cfg\n    -serial=SN004217\n    +serial=XXXXXXXX\n"
+              "  /tmp/iap1.cfg\n    -serial=SN004217\n    +serial=XXXXXXXX\n");
+}
+
+TEST(OrvaneUnitTest, CheckSaysNoWithoutAnExpectation) {
+    const TemporaryFolder folder;
+    fs::create_directory(folder.path() / "one");
+    writeFile(folder.path() / "one/unit.toml", "");
+    EXPECT_EQ(start({"check", folder.path()}).exitStatus, 1);
+    EXPECT_EQ(start({"check", folder.path(), "--update"}).exitStatus, 0);
+    EXPECT_EQ(start({"check", folder.path()}).exitStatus, 0);
+    EXPECT_EQ(start({"check", folder.path() / "one"}).exitStatus, 2);
+}
+
+bool isColoured(const kit::RunResult& result) {
+    EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+    EXPECT_NE(result.standardOutput, "");
+    return result.standardOutput.find('\033') != std::string::npos;
+}
+
+/// Runs the words as if standard output were a terminal: strace makes every ioctl succeed.
+/// `noColour` is NAME to unset, or NAME=VALUE to set.
+kit::RunResult startAsOnATerminal(const std::string& noColour, const Words& words) {
+    Words command = {"strace", "-qq", "-o", "/dev/null", "-e", "inject=ioctl:retval=0",
+                     // LeakSanitizer would trace the process as well
+                     "-E", "ASAN_OPTIONS=detect_leaks=0", "-E", noColour};
+    const Words started = commandLine(words);
+    command.insert(command.end(), started.begin(), started.end());
+    return runOnHost(command);
+}
+
+TEST(OrvaneUnitTest, NothingIsColouredButOnATerminal) {
+    const DescribedUnit described;
+    const Words words = {"explain", described.root()};
+    EXPECT_FALSE(isColoured(start(words)));
+    if (buildCommand(ORVANE_UNIT_BINARY).size() > 1) {
+        return; // through an emulator, which the native builds' tests do not need
+    }
+    EXPECT_TRUE(isColoured(startAsOnATerminal("NO_COLOR", words)));
+    EXPECT_FALSE(isColoured(startAsOnATerminal("NO_COLOR=1", words)));
+    EXPECT_TRUE(isColoured(startAsOnATerminal("NO_COLOR=", words)));
+}
+
+} // namespace
+
+} // namespace orvane::test

@@ -1,0 +1,103 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// Wrong use and bad input: exit status 2, a complaint on standard error, nothing on standard
+// output.
+#include "kit/unit/marker.h"
+#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/support/host_command.h"
+#include "tests/support/unit_test.h"
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+using Words = std::vector<std::string>;
+
+constexpr char PROGRAM[] = "orvane-unit: ";
+
+/// The complaint that the program makes instead of doing anything.
+std::string refusalOf(const Words& words) {
+    Words command = buildCommand(ORVANE_UNIT_BINARY);
+    command.insert(command.end(), words.begin(), words.end());
+    const kit::RunResult result = runOnHost(command);
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_EQ(result.standardOutput, "");
+    EXPECT_EQ(result.standardError.compare(0, sizeof PROGRAM - 1, PROGRAM), 0)
+        << result.standardError;
+    EXPECT_EQ(result.standardError.empty() ? ' ' : result.standardError.back(), '\n');
+    return result.standardError;
+}
+
+/// Below /proc, where nobody can make a folder: nothing of this name is there on any host.
+class MissingRootTest : public ::testing::TestWithParam<Words> {};
+
+TEST_P(MissingRootTest, IsBadInput) {
+    EXPECT_NE(refusalOf(GetParam()).find("/proc/none"), std::string::npos);
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Commands, MissingRootTest,
+    ::testing::Values(
+        Words{"describe", "/proc/none/unit"}, Words{"set", "/proc/none/unit", "param.1=1"},
+        Words{"show", "/proc/none/unit"}, Words{"show", "/proc/none/unit", "--json"},
+        Words{"explain", "/proc/none/unit"}, Words{"explain", "/proc/none/unit", "--json"},
+        Words{"run", "/proc/none/unit"}, Words{"diff", "/proc/none/unit", "/proc/none/unit"},
+        Words{"impact", "/proc/none/unit"}, Words{"capture", "/proc/none/unit", "/proc/none/new"},
+        Words{"check", "/proc/none/cases"}, Words{"new", "/proc/none/at/all"},
+        Words{"new", "/proc/none/unit", "--from", "/proc/none/unit.toml"}),
+    [](const ::testing::TestParamInfo<Words>& words) {
+        return words.param[0] + "_" + std::to_string(words.index);
+    });
+
+TEST(RefusalTest, UnknownWordsAndOptionsAreNamed) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    EXPECT_NE(refusalOf({"show", root, "--only", "engine"})
+                  .find("engine not in {params,records,tuning,versions,files}"),
+              std::string::npos);
+    EXPECT_NE(refusalOf({"explain", root, "-b"}).find("-b"), std::string::npos);
+    EXPECT_NE(refusalOf({"explain", root, "-ab"}).find("-b"), std::string::npos);
+    EXPECT_NE(refusalOf({"impact", root, "engine."}).find("engine."), std::string::npos);
+    EXPECT_NE(refusalOf({"show", root, "--wrong"}).find("--wrong"), std::string::npos);
+    refusalOf({"--wrong"});
+    EXPECT_NE(refusalOf({"Explain", root}).find("there is no command \"Explain\""),
+              std::string::npos);
+}
+
+TEST(RefusalTest, RootThatIsAFileIsBadInput) {
+    const TemporaryFolder folder;
+    const std::string file = folder.path() / "file";
+    writeFile(file, "text");
+    for (const Words& words : {Words{"show", file}, Words{"explain", file}, Words{"run", file},
+                               Words{"new", file}, Words{"check", file}}) {
+        EXPECT_NE(refusalOf(words).find(file), std::string::npos);
+    }
+    EXPECT_EQ(readFile(file), "text");
+}
+
+TEST(RefusalTest, ComplaintsEscapeWhatIsNoText) {
+    EXPECT_NE(refusalOf({"show", "/proc/none/\x1b[2J\xff"}).find("/proc/none/\\x1b[2J\\xff"),
+              std::string::npos);
+}
+
+TEST(RefusalTest, MarkThatSaysSomethingElseIsNoMark) {
+    const DescribedUnit described;
+    writeFile(described.root() / kit::MARKER_NAME, "made by someone else\n");
+    refusalOf({"run", described.root(), "--", "-a"});
+    refusalOf({"set", described.root(), "param.22=0"});
+    EXPECT_TRUE(fs::is_empty(described.root() / "tmp"));
+}
+
+TEST(RefusalTest, BinaryThatIsNoProgramIsBadInput) {
+    const DescribedUnit described;
+    const std::string binary = described.folder() / "orvane";
+    writeFile(binary, "#!/bin/sh\n");
+    EXPECT_NE(refusalOf({"run", described.root(), "--orvane", binary}).find(binary),
+              std::string::npos);
+    EXPECT_TRUE(fs::is_empty(described.root() / "tmp"));
+}
+
+} // namespace
+
+} // namespace orvane::test

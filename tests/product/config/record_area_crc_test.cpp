@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// recordAreaCrc of record_area.h.
+#include "config/record_area.h"
+#include "kit/host/descriptor.h"
+#include "tests/product/config/area_disk.h"
+#include "tests/support/permissions.h"
+#include "tests/support/resource_limit.h"
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cstdint>
+#include <string>
+
+namespace orvane::test {
+
+namespace {
+
+constexpr std::uint32_t FAILED = 0xFFFFFFFF;
+
+/// The usual CRC-32, by the polynomial, a bit at a time and with the final complement.
+std::uint32_t usualCrc(const std::string& bytes) {
+    std::uint32_t crc = 0xFFFFFFFFU;
+    for (const char byte : bytes) {
+        crc ^= static_cast<std::uint8_t>(byte);
+        for (int bit = 0; bit < 8; ++bit) {
+            crc = (crc & 1U) != 0 ? (crc >> 1) ^ 0xEDB88320U : crc >> 1;
+        }
+    }
+    return ~crc;
+}
+
+} // namespace
+
+class RecordAreaCrcTest : public AreaDiskTest {
+protected:
+    static void expectFailure() {
+        const int before = openDescriptors();
+        EXPECT_EQ(FAILED, recordAreaCrc());
+        EXPECT_EQ(before, openDescriptors());
+    }
+};
+
+TEST_F(RecordAreaCrcTest, ReferenceGivesThePublishedCheckValue) {
+    EXPECT_EQ(0xCBF43926U, usualCrc("123456789"));
+}
+
+TEST_F(RecordAreaCrcTest, OfZerosIsTheComplementOfTheirUsualCrc) {
+    resetDisk(2 * MEBIBYTE);
+    EXPECT_EQ(~usualCrc(std::string(136, '\0')), recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcOfSlot15) {
+    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    expectUntouchedDisk();
+}
+
+TEST_F(RecordAreaCrcTest, OfAKnownRecordIsAKnownRegister) {
+    // Both figures are the complement of what zlib's crc32 says of the 136 bytes.
+    resetDisk(2 * MEBIBYTE);
+    EXPECT_EQ(0x88CCCC19U, recordAreaCrc());
+    setDiskFromEnd(BASE_FROM_END - 1, "123456789");
+    EXPECT_EQ(0xC89E2DF9U, recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, EveryByteOfSlot15Counts) {
+    const std::uint32_t before = recordAreaCrc();
+    for (std::size_t offset = 1; offset <= 136; ++offset) {
+        setDiskFromEnd(BASE_FROM_END - offset, std::string(1, '\0'));
+        EXPECT_NE(before, recordAreaCrc()) << offset;
+        setDiskFromEnd(BASE_FROM_END - offset, area().substr(offset, 1));
+    }
+    EXPECT_EQ(before, recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, BytesBesideSlot15DoNotCount) {
+    const std::uint32_t before = recordAreaCrc();
+    setDiskFromEnd(BASE_FROM_END, std::string(1, '\0'));
+    setDiskFromEnd(BASE_FROM_END - 137, std::string(1, '\0'));
+    EXPECT_EQ(before, recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, AbsentDiskIsAllOnes) {
+    remove(DISK_PATH);
+    expectFailure();
+    EXPECT_FALSE(exists(DISK_PATH));
+}
+
+TEST_F(RecordAreaCrcTest, FolderInThePlaceOfTheDiskIsAllOnes) {
+    putFolder(DISK_PATH);
+    expectFailure();
+}
+
+TEST_F(RecordAreaCrcTest, PipeInThePlaceOfTheDiskIsAllOnes) {
+    remove(DISK_PATH);
+    ASSERT_EQ(0, mkfifo(DISK_PATH, 0600));
+    const kit::Descriptor otherEnd(open(DISK_PATH, O_RDWR | O_CLOEXEC));
+    ASSERT_EQ(136, ::write(otherEnd.number(), area().data(), 136));
+    expectFailure();
+}
+
+TEST_F(RecordAreaCrcTest, NoFreeDescriptorIsAllOnes) {
+    const ResourceLimit none(RLIMIT_NOFILE, 0);
+    EXPECT_EQ(FAILED, recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, DiskThatBeginsBehindSlot15IsAllOnes) {
+    writeFile(DISK_PATH, area().substr(2));
+    expectFailure();
+}
+
+TEST_F(RecordAreaCrcTest, DiskThatBeginsWithSlot15HasACrc) {
+    writeFile(DISK_PATH, area().substr(1));
+    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, DiskLongerThan4GiBIsReadFromItsEnd) {
+    resetDisk(5ULL << 30);
+    setDiskFromEnd(BASE_FROM_END, area());
+    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, DiskNeedsNoRightToWrite) {
+    const PermissionsHold hold;
+    ASSERT_EQ(0, chmod(DISK_PATH, 0444));
+    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    ASSERT_EQ(0, chmod(DISK_PATH, 0222));
+    expectFailure();
+}
+
+TEST_F(RecordAreaCrcTest, HoldsNoDescriptorAfterwards) {
+    const int before = openDescriptors();
+    EXPECT_NE(FAILED, recordAreaCrc());
+    EXPECT_EQ(before, openDescriptors());
+}
+
+} // namespace orvane::test

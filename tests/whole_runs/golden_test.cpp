@@ -1,0 +1,151 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// A unit in, its /tmp out: golden/CASE holds the unit, the arguments and what must be left.
+#include "kit/description/unit_description.h"
+#include "kit/enter/root.h"
+#include "main/options.h"
+#include "tests/support/standard_streams.h"
+#include "tests/support/temporary_folder.h"
+#include "tests/support/unit_test.h"
+
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <set>
+#include <sstream>
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::vector<std::string> goldenCases() {
+    std::vector<std::string> names;
+    for (const fs::directory_entry& entry : fs::directory_iterator(ORVANE_GOLDEN_DIR)) {
+        names.push_back(entry.path().filename().string());
+    }
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+std::vector<std::string> readLines(const fs::path& file) {
+    std::istringstream text(readFile(file));
+    std::vector<std::string> lines;
+    for (std::string line; std::getline(text, line);) {
+        lines.push_back(line);
+    }
+    return lines;
+}
+
+/// Every entry of a unit's /tmp, folders with a slash behind, or "(absent)".
+std::set<std::string> listTmp(const fs::path& tmp) {
+    if (!fs::exists(tmp)) {
+        return {"(absent)"};
+    }
+    std::set<std::string> names;
+    for (const fs::directory_entry& entry : fs::recursive_directory_iterator(tmp)) {
+        names.insert(entry.path().lexically_relative(tmp).string() +
+                     (entry.is_directory() ? "/" : ""));
+    }
+    return names;
+}
+
+class GoldenTest : public ::testing::TestWithParam<std::string> {
+protected:
+    GoldenTest() : root_(folder_.path() / "unit") {
+        kit::makeUnit(kit::readDescription(caseFolder() / "unit.toml"), root_);
+    }
+
+    static fs::path caseFolder() { return fs::path(ORVANE_GOLDEN_DIR) / GetParam(); }
+
+    static std::string expectedError() {
+        const fs::path file = caseFolder() / "expected/stderr";
+        return fs::exists(file) ? readFile(file) : "";
+    }
+
+    const fs::path& root() const { return root_; }
+
+    void expectOutputs() const {
+        const std::vector<std::string> list = readLines(caseFolder() / "expected/tmp.list");
+        EXPECT_EQ(listTmp(root_ / "tmp"), std::set<std::string>(list.begin(), list.end()));
+        for (const std::string& name : list) {
+            if (name != "(absent)" && name.back() != '/') {
+                EXPECT_EQ(readFile(root_ / "tmp" / name),
+                          readFile(caseFolder() / "expected/tmp" / name))
+                    << name;
+            }
+        }
+    }
+
+private:
+    TemporaryFolder folder_;
+    fs::path root_;
+};
+
+TEST_P(GoldenTest, BinaryLeavesWhatIsExpected) {
+    const kit::RunResult result =
+        kit::runInside(root(), {ORVANE_BINARY, readLines(caseFolder() / "arguments")});
+    EXPECT_EQ(result.exitStatus, 0);
+    EXPECT_EQ(result.standardOutput, "");
+    EXPECT_EQ(result.standardError, expectedError());
+    expectOutputs();
+}
+
+/// The same without a program of its own, for tools that watch this process.
+TEST_P(GoldenTest, OptionLoopLeavesWhatIsExpected) {
+    std::vector<std::string> words = {"orvane"};
+    for (const std::string& argument : readLines(caseFolder() / "arguments")) {
+        words.push_back(argument);
+    }
+    std::vector<char*> argv;
+    for (std::string& word : words) {
+        argv.push_back(word.data());
+    }
+    argv.push_back(nullptr);
+    std::string said;
+    {
+        const kit::EnteredRoot entered(root());
+        StandardStreams streams;
+        optind = 0; // glibc's getopt begins anew
+        EXPECT_EQ(runOptions(static_cast<int>(words.size()), argv.data()), 0);
+        said = streams.stop();
+    }
+    EXPECT_EQ(said, expectedError());
+    expectOutputs();
+}
+
+/// An expected file that no list names would never be compared.
+TEST(GoldenCases, CompareEveryExpectedFile) {
+    for (const std::string& name : goldenCases()) {
+        SCOPED_TRACE(name);
+        const fs::path expected = fs::path(ORVANE_GOLDEN_DIR) / name / "expected";
+        const std::vector<std::string> list = readLines(expected / "tmp.list");
+        EXPECT_TRUE(std::is_sorted(list.begin(), list.end()));
+        if (fs::exists(expected / "tmp")) {
+            for (const std::string& file : listTmp(expected / "tmp")) {
+                EXPECT_EQ(std::count(list.begin(), list.end(), file), 1) << file;
+            }
+        }
+    }
+}
+
+std::string caseName(const ::testing::TestParamInfo<std::string>& parameter) {
+    std::string name = parameter.param;
+    std::replace(name.begin(), name.end(), '-', '_');
+    return name;
+}
+
+INSTANTIATE_TEST_SUITE_P(Golden, GoldenTest, ::testing::ValuesIn(goldenCases()), caseName);
+
+TEST(GoldenCases, AreThere) {
+    EXPECT_GE(goldenCases().size(), 25U);
+}
+
+} // namespace
+
+} // namespace orvane::test
