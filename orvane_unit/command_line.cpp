@@ -20,7 +20,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -254,4 +254,4 @@ int runCommandLine(int argc, const char* const* argv) {
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -23,7 +23,7 @@
 #include <cstddef>
 #include <iostream>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -110,4 +110,4 @@ int runImpact(const ImpactCommand& command) {
     return EXIT_AS_INTENDED;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// The exit status of every command.
 enum ExitStatus {
@@ -89,4 +89,4 @@ struct CheckCommand {
 };
 int runCheck(const CheckCommand& command);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -2,5 +2,5 @@
 #include "orvane_unit/command_line.h"
 
 int main(int argc, char** argv) {
-    return orvane::unit::runCommandLine(argc, argv);
+    return orvane::desk::runCommandLine(argc, argv);
 }

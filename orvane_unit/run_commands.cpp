@@ -25,7 +25,7 @@
 #include <utility>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -134,4 +134,4 @@ int runCheck(const CheckCommand& command) {
     return failed == 0 ? EXIT_AS_INTENDED : EXIT_ANSWER_IS_NO;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

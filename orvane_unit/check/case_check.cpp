@@ -21,7 +21,7 @@
 #include <system_error>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -219,4 +219,4 @@ CheckReport checkCases(const fs::path& folder, const fs::path& binary, bool upda
     return report;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

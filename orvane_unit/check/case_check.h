@@ -13,7 +13,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct CaseResult {
     std::string name;
@@ -37,4 +37,4 @@ CheckReport checkCases(const std::filesystem::path& folder, const std::filesyste
 /// The option letters of a command line as getopt(3) finds them, those that count.
 std::string optionLetters(const std::vector<std::string>& arguments);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -7,7 +7,7 @@
 #include <string>
 #include <system_error>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace fs = std::filesystem;
 
@@ -24,4 +24,4 @@ ScratchFolder::~ScratchFolder() {
     fs::remove_all(path_, ignored);
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -3,7 +3,7 @@
 
 #include <filesystem>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// A fresh folder among the system's temporary ones, gone with its owner.
 class ScratchFolder {
@@ -20,4 +20,4 @@ private:
     std::filesystem::path path_;
 };
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -6,7 +6,7 @@
 
 #include <system_error>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace fs = std::filesystem;
 
@@ -37,4 +37,4 @@ TmpTree readTmp(const fs::path& root) {
     return tree;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -9,7 +9,7 @@
 #include <string>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct TmpTree {
     bool isThere = false; ///< there is a /tmp
@@ -28,4 +28,4 @@ struct TmpTree {
 /// Throws kit::KitError when the root can't be entered.
 TmpTree readTmp(const std::filesystem::path& root);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -4,7 +4,7 @@
 #include <fstream>
 #include <sstream>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 std::optional<std::string> readWholeFile(const std::filesystem::path& path) {
     std::ifstream file(path, std::ios::binary);
@@ -16,4 +16,4 @@ std::optional<std::string> readWholeFile(const std::filesystem::path& path) {
     return content.str();
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -28,7 +28,7 @@
 #include <system_error>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -241,4 +241,4 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
     return impacts;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -10,7 +10,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct Impact {
     std::string key;        ///< "param.139", "slot.9.0" for a byte of a slot, "tuning.3.qwaNRAtten"
@@ -29,4 +29,4 @@ std::vector<Impact> findImpacts(const std::filesystem::path& root,
                                 const std::vector<std::string>& beginnings,
                                 const Progress& progress);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -7,7 +7,7 @@
 #include <optional>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -159,4 +159,4 @@ std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
     return distribution.take();
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -10,7 +10,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// A line that only one of the two has.
 struct MovedLine {
@@ -42,4 +42,4 @@ struct Consequence {
 std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
                                       const std::vector<MovedOutput>& moved);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -10,7 +10,7 @@
 #include <ostream>
 #include <type_traits>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -142,4 +142,4 @@ void printUnifiedDiff(std::ostream& out, const std::string& name,
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

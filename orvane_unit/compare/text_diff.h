@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct DiffLine {
     enum class Kind { common, removed, added };
@@ -39,4 +39,4 @@ void printUnifiedDiff(std::ostream& out, const std::string& name,
 /// A line without its line end, bytes that are no text escaped.
 std::string lineForEyes(const std::string& line);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -22,7 +22,7 @@
 #include <unordered_map>
 #include <variant>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -169,4 +169,4 @@ std::vector<ValueChange> differingValues(const UnitValues& before, const UnitVal
     return changes;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

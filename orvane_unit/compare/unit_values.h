@@ -11,7 +11,7 @@
 #include <utility>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Key and value, in the order of a description. A value that is not there has no entry.
 using UnitValues = std::vector<std::pair<std::string, std::string>>;
@@ -27,4 +27,4 @@ struct ValueChange {
 
 std::vector<ValueChange> differingValues(const UnitValues& before, const UnitValues& after);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

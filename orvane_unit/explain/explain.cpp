@@ -7,7 +7,7 @@
 
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 Explanation explain(const std::string& letters) {
     Explanation outputs;
@@ -31,4 +31,4 @@ Explanation explainUnit(const std::filesystem::path& root, const std::string& le
     return explain(letters);
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -9,7 +9,7 @@
 #include <filesystem>
 #include <string>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Explains a run with the option letters `letters` ("a", "i", each as often as wanted) in the unit
 /// that this process has as its root.
@@ -19,4 +19,4 @@ Explanation explain(const std::string& letters);
 /// be entered.
 Explanation explainUnit(const std::filesystem::path& root, const std::string& letters);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

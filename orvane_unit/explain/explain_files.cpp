@@ -22,7 +22,7 @@
 #include <utility>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -178,4 +178,4 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -6,7 +6,7 @@
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/planned_files.h"
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Adds the tuning files and the AirPlay file.
 void explainAirplay(PlannedFiles& files, Explanation& outputs);
@@ -14,4 +14,4 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs);
 /// Adds the three iAP files.
 void explainIap(PlannedFiles& files, Explanation& outputs);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -3,7 +3,7 @@
 
 #include <algorithm>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 const char* outcomeName(Outcome outcome) {
     switch (outcome) {
@@ -37,4 +37,4 @@ bool isIntended(const Explanation& explanation) {
                        [](const Output& output) { return isIntended(output); });
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

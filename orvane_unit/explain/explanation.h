@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// A piece of an output: one line with its line end; of a value that holds line ends, or of a
 /// template, all its lines. The pieces of an output, one behind the other, are its content.
@@ -50,4 +50,4 @@ bool isIntended(const std::vector<Reason>& reasons);
 bool isIntended(const Output& output);
 bool isIntended(const Explanation& explanation);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -9,7 +9,7 @@
 
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 bool PlannedFiles::openForWriting(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
@@ -61,4 +61,4 @@ Left PlannedFiles::look(const std::string& path, std::string& content) const {
     return place->kind == 0 ? Left::nothing : Left::other;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -11,7 +11,7 @@
 #include <optional>
 #include <string>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Paths are those of the unit, which the process must have as its root.
 class PlannedFiles {
@@ -32,4 +32,4 @@ private:
     std::map<std::string, std::string> written_; ///< content by place: a path without links
 };
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -98,4 +98,4 @@ Output PlannedMerge::keep() const {
     return output;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -13,7 +13,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// A value in a generated head: the line that begins with `prefix`, and what follows it.
 struct HeadValue {
@@ -53,4 +53,4 @@ private:
     std::optional<std::string> template_; ///< its content, if it can be opened
 };
 
-} // namespace orvane::unit
+} // namespace orvane::desk

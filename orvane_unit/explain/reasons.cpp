@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/reasons.h"
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 // clang-format off
 constexpr std::array<ReasonInfo, REASON_COUNT> REASON_ROWS = {{
@@ -57,4 +57,4 @@ const ReasonInfo& reasonInfo(Reason reason) {
     return REASONS[static_cast<std::size_t>(reason)];
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -7,7 +7,7 @@
 #include <array>
 #include <cstddef>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 enum class Reason {
     // of an output
@@ -61,4 +61,4 @@ extern const std::array<ReasonInfo, REASON_COUNT> REASONS;
 
 const ReasonInfo& reasonInfo(Reason reason);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -16,7 +16,7 @@
 #include <array>
 #include <cstddef>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -178,4 +178,4 @@ Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField&
     return origin;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -12,7 +12,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct Origin {
     std::vector<Reason> reasons;
@@ -55,4 +55,4 @@ TuningArea readTuningBlocks();
 
 Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField& field);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

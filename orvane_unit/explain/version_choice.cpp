@@ -12,7 +12,7 @@
 #include <memory>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -135,4 +135,4 @@ Origin versionDigitsOrigin(const VersionFiles& versions) {
     return origin;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -11,7 +11,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 struct VersionFile {
     std::string path;
@@ -35,4 +35,4 @@ Origin versionTextOrigin(const VersionFiles& versions);
 /// That of the six digits in the iAP1 file.
 Origin versionDigitsOrigin(const VersionFiles& versions);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

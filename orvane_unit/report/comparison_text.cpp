@@ -12,7 +12,7 @@
 #include <string>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -145,4 +145,4 @@ void printProgress(std::ostream& terminal, std::size_t done, std::size_t all) {
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

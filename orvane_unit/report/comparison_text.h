@@ -10,7 +10,7 @@
 #include <iosfwd>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Prints each changed value, and below it the output lines that differ because of it.
 void printConsequences(std::ostream& out, const std::vector<Consequence>& consequences);
@@ -21,4 +21,4 @@ void printImpacts(std::ostream& out, const std::vector<Impact>& impacts);
 /// Draws a bar over the one drawn before, and wipes it out at the end.
 void printProgress(std::ostream& terminal, std::size_t done, std::size_t all);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

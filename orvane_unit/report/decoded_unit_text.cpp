@@ -21,7 +21,7 @@
 #include <sstream>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -194,4 +194,4 @@ void printContents(std::ostream& out, const Contents& contents, const std::strin
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -8,7 +8,7 @@
 #include <iosfwd>
 #include <string>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// The parts that can be asked for alone.
 constexpr const char* CONTENT_PARTS[] = {"params", "records", "tuning", "versions", "files"};
@@ -16,4 +16,4 @@ constexpr const char* CONTENT_PARTS[] = {"params", "records", "tuning", "version
 /// Prints the part `only`, or all of them when it is empty.
 void printContents(std::ostream& out, const Contents& contents, const std::string& only);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -13,7 +13,7 @@
 #include <utility>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -131,4 +131,4 @@ void printExplanation(std::ostream& out, const Explanation& explanation, bool sh
     }
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -7,10 +7,10 @@
 
 #include <iosfwd>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Prints each output with its outcome and reasons, and below it its lines with theirs. The tool's
 /// own text is left out unless `showsAll`.
 void printExplanation(std::ostream& out, const Explanation& explanation, bool showsAll);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

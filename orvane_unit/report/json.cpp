@@ -23,7 +23,7 @@
 #include <set>
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -298,4 +298,4 @@ std::string checkJson(const std::string& folder, const CheckReport& report) {
     return json.dump();
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

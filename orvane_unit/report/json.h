@@ -16,7 +16,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 constexpr int JSON_FORMAT = 1;
 
@@ -37,4 +37,4 @@ std::string impactsJson(const std::string& root, const std::vector<Impact>& impa
 
 std::string checkJson(const std::string& folder, const CheckReport& report);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <cstdlib>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -79,4 +79,4 @@ std::string counted(std::uint64_t count, const std::string& thing) {
     return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

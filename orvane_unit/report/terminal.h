@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <string>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 enum class Colour { plain, good, bad, added, removed, place, faint };
 
@@ -22,4 +22,4 @@ std::string printable(const std::string& bytes);
 /// "1 line", "2 lines".
 std::string counted(std::uint64_t count, const std::string& thing);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

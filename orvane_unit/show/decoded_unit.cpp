@@ -20,7 +20,7 @@
 
 #include <utility>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 namespace {
 
@@ -166,4 +166,4 @@ Contents readContents(const std::filesystem::path& root) {
     return contents;
 }
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -15,7 +15,7 @@
 #include <string>
 #include <vector>
 
-namespace orvane::unit {
+namespace orvane::desk {
 
 /// Slots 1 to 9 once more, as the block that the CRC is taken over.
 constexpr std::uint32_t CRC_SLOT = 15;
@@ -72,4 +72,4 @@ struct Contents {
 /// entered.
 Contents readContents(const std::filesystem::path& root);
 
-} // namespace orvane::unit
+} // namespace orvane::desk

@@ -47,7 +47,8 @@ bool isZero(const DpsBlock& block) {
 }
 
 TEST_F(SampleUnitTest, IsTheFileThatOneMayCopy) {
-    EXPECT_EQ(kit::sampleDescriptionText(), readFile(ORVANE_DOCS_DIR "/../kit/description/sample_unit.toml"));
+    EXPECT_EQ(kit::sampleDescriptionText(),
+              readFile(ORVANE_DOCS_DIR "/../kit/description/sample_unit.toml"));
 }
 
 TEST_F(SampleUnitTest, IsOfTheSecondBrandWithAGeneratedAudioProfile) {

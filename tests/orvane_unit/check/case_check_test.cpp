@@ -13,8 +13,8 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using unit::CaseResult;
-using unit::CheckReport;
+using desk::CaseResult;
+using desk::CheckReport;
 using Lines = std::vector<std::string>;
 
 /// A folder with one case, whose only output is its stock file.
@@ -33,7 +33,7 @@ protected:
     fs::path expected() const { return folder() / "one/expected"; }
 
     CheckReport check(bool updates = false) const {
-        return unit::checkCases(folder(), ORVANE_BINARY, updates);
+        return desk::checkCases(folder(), ORVANE_BINARY, updates);
     }
     Lines differences() const { return check().cases.at(0).differences; }
 
@@ -48,9 +48,9 @@ TEST_F(CaseCheckTest, WhatIsAsExpectedHasNoDifference) {
     EXPECT_EQ(report.cases[0].differences, Lines{});
     EXPECT_EQ(report.cases[0].surprises, Lines{});
     EXPECT_EQ(report.cases[0].reasons,
-              (std::set<unit::Reason>{unit::Reason::profileNotGenerated,
-                                      unit::Reason::templateMissing, unit::Reason::fromStock}));
-    EXPECT_EQ(report.unreached.size(), unit::REASON_COUNT - 3);
+              (std::set<desk::Reason>{desk::Reason::profileNotGenerated,
+                                      desk::Reason::templateMissing, desk::Reason::fromStock}));
+    EXPECT_EQ(report.unreached.size(), desk::REASON_COUNT - 3);
 }
 
 TEST_F(CaseCheckTest, ChangedContentIsTold) {
@@ -123,7 +123,7 @@ TEST_F(CaseCheckTest, FoldersInTmpAreExpectedByTheirNames) {
 /// A binary that is not the tool: it leaves nothing, and ends with 1.
 TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
     for (const bool updates : {false, true}) {
-        const CaseResult result = unit::checkCases(folder(), "/bin/false", updates).cases.at(0);
+        const CaseResult result = desk::checkCases(folder(), "/bin/false", updates).cases.at(0);
         EXPECT_EQ(result.surprises, Lines{"/tmp/airplay.conf is not what the explanation says"});
         ASSERT_FALSE(result.differences.empty());
         EXPECT_EQ(result.differences[0], "exit status 1");
@@ -143,19 +143,19 @@ TEST_F(CaseCheckTest, WithoutArgumentsBothWritersRun) {
 }
 
 TEST_F(CaseCheckTest, BadDescriptionAndMissingBinaryAreBadInput) {
-    EXPECT_THROW(unit::checkCases(folder(), "/none/orvane", false), kit::KitError);
+    EXPECT_THROW(desk::checkCases(folder(), "/none/orvane", false), kit::KitError);
     writeFile(folder() / "one/unit.toml", "[image]\nsize = \"big\"\n");
     EXPECT_THROW(check(), kit::KitError);
 }
 
 TEST(CaseCheckFolderTest, FolderWithoutUnitsIsBadInput) {
     const TemporaryFolder folder;
-    EXPECT_THROW(unit::checkCases(folder.path(), ORVANE_BINARY, false), kit::KitError);
-    EXPECT_THROW(unit::checkCases(folder.path() / "none", ORVANE_BINARY, false), kit::KitError);
+    EXPECT_THROW(desk::checkCases(folder.path(), ORVANE_BINARY, false), kit::KitError);
+    EXPECT_THROW(desk::checkCases(folder.path() / "none", ORVANE_BINARY, false), kit::KitError);
 }
 
 TEST(CaseCheckFolderTest, GoldenUnitsAgreeWithTheirExplanations) {
-    const CheckReport report = unit::checkCases(ORVANE_GOLDEN_DIR, ORVANE_BINARY, false);
+    const CheckReport report = desk::checkCases(ORVANE_GOLDEN_DIR, ORVANE_BINARY, false);
     for (const CaseResult& result : report.cases) {
         EXPECT_EQ(result.differences, Lines{}) << result.name;
         EXPECT_EQ(result.surprises, Lines{}) << result.name;
@@ -164,15 +164,15 @@ TEST(CaseCheckFolderTest, GoldenUnitsAgreeWithTheirExplanations) {
 }
 
 TEST(OptionLettersTest, AreThoseThatGetoptFinds) {
-    EXPECT_EQ(unit::optionLetters({}), "");
-    EXPECT_EQ(unit::optionLetters({"-a", "-i"}), "ai");
-    EXPECT_EQ(unit::optionLetters({"-xia", "-a"}), "iaa");
-    EXPECT_EQ(unit::optionLetters({"-a", "--", "-i"}), "a");
-    EXPECT_EQ(unit::optionLetters({"word", "-a"}), "");
-    EXPECT_EQ(unit::optionLetters({"-i", "-", "-a"}), "i");
-    EXPECT_EQ(unit::optionLetters({"", "-a"}), "");
-    EXPECT_EQ(unit::optionLetters({"--a", "-i"}), "ai");
-    EXPECT_EQ(unit::optionLetters({"-a-i"}), "ai");
+    EXPECT_EQ(desk::optionLetters({}), "");
+    EXPECT_EQ(desk::optionLetters({"-a", "-i"}), "ai");
+    EXPECT_EQ(desk::optionLetters({"-xia", "-a"}), "iaa");
+    EXPECT_EQ(desk::optionLetters({"-a", "--", "-i"}), "a");
+    EXPECT_EQ(desk::optionLetters({"word", "-a"}), "");
+    EXPECT_EQ(desk::optionLetters({"-i", "-", "-a"}), "i");
+    EXPECT_EQ(desk::optionLetters({"", "-a"}), "");
+    EXPECT_EQ(desk::optionLetters({"--a", "-i"}), "ai");
+    EXPECT_EQ(desk::optionLetters({"-a-i"}), "ai");
 }
 
 /// Each writer is seen by the output that it leaves.
@@ -183,7 +183,7 @@ TEST(OptionLettersTest, AreThoseThatTheRealBinaryFinds) {
     for (const Lines& arguments : rows) {
         const DescribedUnit described;
         ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
-        const std::string letters = unit::optionLetters(arguments);
+        const std::string letters = desk::optionLetters(arguments);
         const auto isThere = [&described](const char* name) {
             return fs::exists(described.root() / "tmp" / name);
         };

@@ -13,7 +13,7 @@ namespace orvane::test {
 
 namespace {
 
-using unit::Impact;
+using desk::Impact;
 using Lines = std::set<std::string>;
 
 std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
@@ -21,7 +21,7 @@ std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
     std::map<std::string, Impact> impacts;
     std::size_t last = 0;
     for (const Impact& impact :
-         unit::findImpacts(root, beginnings, [&last](std::size_t done, std::size_t all) {
+         desk::findImpacts(root, beginnings, [&last](std::size_t done, std::size_t all) {
              EXPECT_EQ(done, last + 1);
              EXPECT_LE(done, all);
              last = done;
@@ -88,7 +88,7 @@ TEST(ImpactTest, KeyThatNoInputBeginsWithIsBadInput) {
 }
 
 TEST(ImpactTest, MissingRootIsBadInput) {
-    EXPECT_THROW(unit::findImpacts("/none/at/all", {}, [](std::size_t, std::size_t) {}),
+    EXPECT_THROW(desk::findImpacts("/none/at/all", {}, [](std::size_t, std::size_t) {}),
                  kit::KitError);
 }
 

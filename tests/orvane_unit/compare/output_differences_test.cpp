@@ -18,8 +18,8 @@ namespace orvane::test {
 
 namespace {
 
+using desk::Consequence;
 using kit::UnitDescription;
-using unit::Consequence;
 
 /// What comes of the change, by the key of each value that differs.
 std::map<std::string, Consequence>
@@ -27,11 +27,11 @@ consequencesOf(const std::function<void(UnitDescription&)>& change) {
     const DescribedUnit first;
     const DescribedUnit second(change);
     std::map<std::string, Consequence> found;
-    for (const Consequence& consequence : unit::consequences(
-             unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
-                                   unit::unitValues(kit::inspectInputs(second.root()))),
-             unit::movedOutputs(unit::explainUnit(first.root(), "ai"),
-                                unit::explainUnit(second.root(), "ai")))) {
+    for (const Consequence& consequence : desk::consequences(
+             desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
+                                   desk::unitValues(kit::inspectInputs(second.root()))),
+             desk::movedOutputs(desk::explainUnit(first.root(), "ai"),
+                                desk::explainUnit(second.root(), "ai")))) {
         found[consequence.change.key] = consequence;
     }
     return found;
@@ -39,7 +39,7 @@ consequencesOf(const std::function<void(UnitDescription&)>& change) {
 
 std::set<std::string> pathsOf(const Consequence& consequence) {
     std::set<std::string> paths;
-    for (const unit::MovedOutput& output : consequence.moved) {
+    for (const desk::MovedOutput& output : consequence.moved) {
         paths.insert(output.path);
     }
     return paths;
@@ -47,10 +47,10 @@ std::set<std::string> pathsOf(const Consequence& consequence) {
 
 std::vector<std::string> linesOf(const Consequence& consequence, const std::string& path) {
     std::vector<std::string> lines;
-    for (const unit::MovedOutput& output : consequence.moved) {
-        for (const unit::MovedLine& line : output.lines) {
+    for (const desk::MovedOutput& output : consequence.moved) {
+        for (const desk::MovedLine& line : output.lines) {
             if (output.path == path) {
-                const bool isRemoved = line.line.kind == unit::DiffLine::Kind::removed;
+                const bool isRemoved = line.line.kind == desk::DiffLine::Kind::removed;
                 lines.push_back((isRemoved ? "-" : "+") + line.line.text);
             }
         }
@@ -147,8 +147,8 @@ TEST(MovesTest, MissingTemplateIsTheCauseOfTheStockFile) {
     ASSERT_EQ(found.size(), 1U);
     const Consequence& consequence = found.at("file." + path);
     ASSERT_EQ(consequence.moved.size(), 1U);
-    EXPECT_EQ(consequence.moved[0].before, unit::Outcome::generated);
-    EXPECT_EQ(consequence.moved[0].after, unit::Outcome::stock);
+    EXPECT_EQ(consequence.moved[0].before, desk::Outcome::generated);
+    EXPECT_EQ(consequence.moved[0].after, desk::Outcome::stock);
 }
 
 TEST(MovesTest, EmptyTemplateOfIap2IsTheCauseOfTheStockFileOfIap1) {

@@ -17,7 +17,7 @@ using Text = std::optional<std::string>;
 /// Without colours: the tests' standard output is no terminal, or NO_COLOR is set for them.
 std::string diffOf(const Text& before, const Text& after) {
     std::ostringstream out;
-    unit::printUnifiedDiff(out, "/tmp/x", before, after);
+    desk::printUnifiedDiff(out, "/tmp/x", before, after);
     return out.str();
 }
 
@@ -56,20 +56,20 @@ TEST(TextDiffTest, SixCommonLinesJoinTwoChangesAndSevenPartThem) {
 }
 
 /// The text that the hunks make of `before`, by their numbers alone, as a patch does.
-std::string patched(const std::vector<std::string>& before, const std::vector<unit::Hunk>& hunks) {
+std::string patched(const std::vector<std::string>& before, const std::vector<desk::Hunk>& hunks) {
     std::string text;
     std::size_t next = 1; // the line of `before` that comes next
-    for (const unit::Hunk& hunk : hunks) {
+    for (const desk::Hunk& hunk : hunks) {
         const std::size_t first = hunk.beforeCount == 0 ? hunk.before + 1 : hunk.before;
         while (next < first) {
             text += before.at(next++ - 1);
         }
-        for (const unit::DiffLine& line : hunk.lines) {
-            if (line.kind != unit::DiffLine::Kind::added) {
+        for (const desk::DiffLine& line : hunk.lines) {
+            if (line.kind != desk::DiffLine::Kind::added) {
                 EXPECT_EQ(line.before, next);
                 EXPECT_EQ(line.text, before.at(next++ - 1));
             }
-            text += line.kind == unit::DiffLine::Kind::removed ? "" : line.text;
+            text += line.kind == desk::DiffLine::Kind::removed ? "" : line.text;
         }
         EXPECT_EQ(next, first + hunk.beforeCount);
     }
@@ -99,7 +99,7 @@ TEST(TextDiffTest, HunksMakeTheSecondTextOfTheFirst) {
     for (int i = 0; i < 300; ++i) {
         const std::vector<std::string> before = textOf();
         const std::string after = joined(textOf());
-        EXPECT_EQ(patched(before, unit::differingHunks(joined(before), after)), after);
+        EXPECT_EQ(patched(before, desk::differingHunks(joined(before), after)), after);
     }
 }
 
@@ -122,13 +122,13 @@ TEST(TextDiffTest, BytesThatAreNoTextAreEscaped) {
 }
 
 TEST(TextDiffTest, LinesKnowTheirNumbers) {
-    const std::vector<unit::Hunk> hunks = unit::differingHunks("a\nb\nc\n", "a\nc\nd\n");
+    const std::vector<desk::Hunk> hunks = desk::differingHunks("a\nb\nc\n", "a\nc\nd\n");
     ASSERT_EQ(hunks.size(), 1U);
-    std::vector<std::tuple<unit::DiffLine::Kind, std::size_t, std::size_t>> found;
-    for (const unit::DiffLine& line : hunks[0].lines) {
+    std::vector<std::tuple<desk::DiffLine::Kind, std::size_t, std::size_t>> found;
+    for (const desk::DiffLine& line : hunks[0].lines) {
         found.emplace_back(line.kind, line.before, line.after);
     }
-    using Kind = unit::DiffLine::Kind;
+    using Kind = desk::DiffLine::Kind;
     EXPECT_EQ(found, (decltype(found){{Kind::common, 1, 1},
                                       {Kind::removed, 2, 0},
                                       {Kind::common, 3, 2},
@@ -136,9 +136,9 @@ TEST(TextDiffTest, LinesKnowTheirNumbers) {
 }
 
 TEST(TextDiffTest, LinesKnowTheirNumbersWhenTheSecondTextIsShorter) {
-    const std::vector<unit::Hunk> hunks = unit::differingHunks("a\nb\nc\nd\n", "x\nd\n");
+    const std::vector<desk::Hunk> hunks = desk::differingHunks("a\nb\nc\nd\n", "x\nd\n");
     ASSERT_EQ(hunks.size(), 1U);
-    for (const unit::DiffLine& line : hunks[0].lines) {
+    for (const desk::DiffLine& line : hunks[0].lines) {
         const std::string texts[] = {"", "a\n", "b\n", "c\n", "d\n"};
         const std::string later[] = {"", "x\n", "d\n"};
         EXPECT_TRUE(line.before == 0 || line.text == texts[line.before]);
@@ -155,7 +155,7 @@ TEST(TextDiffTest, LargeTextsWithNothingInCommonTakeNoTime) {
     }
     std::size_t removed = 0;
     std::size_t added = 0;
-    for (const unit::Hunk& hunk : unit::differingHunks(before, after)) {
+    for (const desk::Hunk& hunk : desk::differingHunks(before, after)) {
         removed += hunk.beforeCount;
         added += hunk.afterCount;
     }
@@ -186,14 +186,14 @@ TEST(TerminalTest, PrintableEscapesWhatIsNoText) {
          "ok\\xffok"},
     };
     for (const Row& row : rows) {
-        EXPECT_EQ(unit::printable(row.bytes), row.text);
+        EXPECT_EQ(desk::printable(row.bytes), row.text);
     }
 }
 
 TEST(TerminalTest, CountedTakesTheRightNumber) {
-    EXPECT_EQ(unit::counted(0, "line"), "0 lines");
-    EXPECT_EQ(unit::counted(1, "line"), "1 line");
-    EXPECT_EQ(unit::counted(2, "byte"), "2 bytes");
+    EXPECT_EQ(desk::counted(0, "line"), "0 lines");
+    EXPECT_EQ(desk::counted(1, "line"), "1 line");
+    EXPECT_EQ(desk::counted(2, "byte"), "2 bytes");
 }
 
 } // namespace

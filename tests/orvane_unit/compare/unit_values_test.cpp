@@ -18,9 +18,9 @@ namespace orvane::test {
 
 namespace {
 
+using desk::UnitValues;
+using desk::ValueChange;
 using kit::UnitDescription;
-using unit::UnitValues;
-using unit::ValueChange;
 
 /// Both sides of each value that differs, by its key.
 using Changes = std::map<std::string, std::pair<std::string, std::string>>;
@@ -30,8 +30,8 @@ Changes changesOf(const std::function<void(UnitDescription&)>& change) {
     const DescribedUnit second(change);
     Changes changes;
     for (const ValueChange& value :
-         unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
-                               unit::unitValues(kit::inspectInputs(second.root())))) {
+         desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
+                               desk::unitValues(kit::inspectInputs(second.root())))) {
         changes[value.key] = {value.before, value.after};
     }
     return changes;
@@ -99,7 +99,7 @@ TEST(UnitValuesTest, DifferencesComeInTheOrderOfTheFirstThenTheSecond) {
     const UnitValues before = {{"c", "1"}, {"a", "1"}, {"b", "1"}};
     const UnitValues after = {{"d", "2"}, {"b", "2"}, {"c", "1"}};
     std::vector<std::string> found;
-    for (const ValueChange& change : unit::differingValues(before, after)) {
+    for (const ValueChange& change : desk::differingValues(before, after)) {
         found.push_back(change.key + ": " + change.before + " " + change.after);
     }
     EXPECT_EQ(found, (std::vector<std::string>{"a: 1 (missing)", "b: 1 2", "d: (missing) 2"}));
@@ -112,11 +112,11 @@ TEST(UnitValuesTest, LinesOfNoValueComeLast) {
         unit.links[IAP2_FILE.output] = IAP1_FILE.templateFile;
         unit.image.params[50] = 1;
     });
-    const std::vector<unit::Consequence> found = unit::consequences(
-        unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
-                              unit::unitValues(kit::inspectInputs(second.root()))),
-        unit::movedOutputs(unit::explainUnit(first.root(), "i"),
-                           unit::explainUnit(second.root(), "i")));
+    const std::vector<desk::Consequence> found = desk::consequences(
+        desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
+                              desk::unitValues(kit::inspectInputs(second.root()))),
+        desk::movedOutputs(desk::explainUnit(first.root(), "i"),
+                           desk::explainUnit(second.root(), "i")));
     ASSERT_EQ(found.size(), 2U);
     EXPECT_EQ(found[0].change.key, "param.50");
     EXPECT_TRUE(found[0].moved.empty());

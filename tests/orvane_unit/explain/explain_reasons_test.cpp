@@ -18,9 +18,9 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
+using desk::Outcome;
+using desk::Reason;
 using kit::UnitDescription;
-using unit::Outcome;
-using unit::Reason;
 
 constexpr char VERSION_FILE[] = "/fs/rwdata/.Version/app.inf";
 
@@ -135,13 +135,13 @@ const std::vector<Row>& rows() {
     return ROWS;
 }
 
-bool has(const unit::Output& output, Reason reason) {
+bool has(const desk::Output& output, Reason reason) {
     const auto holds = [reason](const std::vector<Reason>& reasons) {
         return std::find(reasons.begin(), reasons.end(), reason) != reasons.end();
     };
     return holds(output.reasons) ||
            std::any_of(output.lines.begin(), output.lines.end(),
-                       [&holds](const unit::Line& line) { return holds(line.reasons); });
+                       [&holds](const desk::Line& line) { return holds(line.reasons); });
 }
 
 class ExplainReasonsTest : public ::testing::TestWithParam<std::size_t> {
@@ -151,10 +151,10 @@ protected:
 
 TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
     const DescribedUnit described(row().change);
-    const unit::Explanation explanation = unit::explainUnit(described.root(), "ai");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), "ai");
     const auto output =
         std::find_if(explanation.begin(), explanation.end(),
-                     [](const unit::Output& other) { return other.path == row().output; });
+                     [](const desk::Output& other) { return other.path == row().output; });
     ASSERT_NE(output, explanation.end());
     EXPECT_TRUE(has(*output, row().reason)) << reasonInfo(row().reason).code;
     EXPECT_EQ(output->outcome, row().outcome);
@@ -164,24 +164,24 @@ TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
 
 TEST_P(ExplainReasonsTest, RunLeavesWhatIsExplained) {
     const DescribedUnit described(row().change);
-    const unit::Explanation explanation = unit::explainUnit(described.root(), "ai");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), "ai");
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, {"-a", "-i"}}).exitStatus, 0);
-    for (const unit::Output& output : explanation) {
+    for (const desk::Output& output : explanation) {
         const fs::path file = described.root() / output.path.substr(1);
         std::string written;
-        for (const unit::Line& line : output.lines) {
+        for (const desk::Line& line : output.lines) {
             written += line.text;
         }
         switch (output.left) {
-        case unit::Left::file:
+        case desk::Left::file:
             EXPECT_EQ(readFile(file), output.content) << output.path;
             EXPECT_EQ(written, output.content) << output.path;
             break;
-        case unit::Left::folder:
+        case desk::Left::folder:
             EXPECT_TRUE(fs::is_directory(file)) << output.path;
             break;
-        case unit::Left::nothing:
-        case unit::Left::other:
+        case desk::Left::nothing:
+        case desk::Left::other:
             EXPECT_FALSE(fs::exists(file)) << output.path;
             break;
         }
@@ -202,14 +202,14 @@ TEST(ReasonsTest, EveryReasonHasARow) {
     for (const Row& row : rows()) {
         laid.insert(row.reason);
     }
-    for (const unit::ReasonInfo& info : unit::REASONS) {
+    for (const desk::ReasonInfo& info : desk::REASONS) {
         EXPECT_EQ(laid.count(info.reason), 1U) << info.code;
     }
 }
 
 TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
     std::set<std::string> codes;
-    for (const unit::ReasonInfo& info : unit::REASONS) {
+    for (const desk::ReasonInfo& info : desk::REASONS) {
         const std::string code = info.code;
         EXPECT_TRUE(codes.insert(code).second) << code;
         EXPECT_EQ(code.find_first_not_of("abcdefghijklmnopqrstuvwxyz0123456789-"),
@@ -221,7 +221,7 @@ TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
 
 TEST(ReasonsTest, EveryCodeIsInTheGuide) {
     const std::string guide = readFile(std::string(ORVANE_DOCS_DIR) + "/orvane-unit.md");
-    for (const unit::ReasonInfo& info : unit::REASONS) {
+    for (const desk::ReasonInfo& info : desk::REASONS) {
         const std::string row = "| `" + std::string(info.code) + "` |";
         EXPECT_NE(guide.find(row), std::string::npos) << info.code;
     }

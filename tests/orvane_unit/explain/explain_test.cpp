@@ -14,10 +14,10 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
+using desk::Explanation;
+using desk::Line;
+using desk::Output;
 using kit::UnitDescription;
-using unit::Explanation;
-using unit::Line;
-using unit::Output;
 
 const Output& outputOf(const Explanation& explanation, const std::string& path) {
     const auto found = std::find_if(explanation.begin(), explanation.end(),
@@ -43,7 +43,7 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
     const kit::EnteredRoot entered(described.root());
     for (const Output& output : explanation) {
-        if (output.left == unit::Left::file) {
+        if (output.left == desk::Left::file) {
             EXPECT_EQ(readFile(output.path), output.content) << output.path;
         } else {
             std::error_code ignored; // of a link to itself
@@ -54,7 +54,7 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
 
 TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
     const DescribedUnit described;
-    const Explanation explanation = unit::explainUnit(described.root(), "ai");
+    const Explanation explanation = desk::explainUnit(described.root(), "ai");
     const Output& airplay = outputOf(explanation, AIRPLAY_FILE.output);
     EXPECT_EQ(lineOf(airplay, "param.139").text, "model = Quarion Velmira\n");
     EXPECT_EQ(lineOf(airplay, "param.139").detail, "parameter 139, image byte 139: 1a");
@@ -80,7 +80,7 @@ TEST(ExplainTest, VersionLineIsTheLastOneOfItsKey) {
         unit.files["/fs/rwdata/.Version/app.inf"] =
             "Version Number=1.1.1\nno line\nType=Application\nVersion Number = 2.2.2\n";
     });
-    const Explanation explanation = unit::explainUnit(described.root(), "i");
+    const Explanation explanation = desk::explainUnit(described.root(), "i");
     EXPECT_EQ(
         lineOf(outputOf(explanation, IAP2_FILE.output), "file./fs/rwdata/.Version/app.inf").detail,
         "/fs/rwdata/.Version/app.inf:4: Version Number is \"2.2.2\"");
@@ -90,7 +90,7 @@ TEST(ExplainTest, LettersComeInTheirOrderAndAsOftenAsGiven) {
     const DescribedUnit described;
     const auto pathsOf = [&described](const std::string& letters) {
         std::vector<std::string> paths;
-        for (const Output& output : unit::explainUnit(described.root(), letters)) {
+        for (const Output& output : desk::explainUnit(described.root(), letters)) {
             paths.push_back(output.path);
         }
         return paths;
@@ -110,7 +110,7 @@ TEST(ExplainTest, SerialWithLineEndsAndZeroBytesIsOnePiece) {
                                       std::string("AB\0CD", 5), std::string("\xff\nserial")}) {
         const DescribedUnit described(
             [&serial](UnitDescription& unit) { unit.disk.slots[9] = serial; });
-        const Explanation explanation = unit::explainUnit(described.root(), "i");
+        const Explanation explanation = desk::explainUnit(described.root(), "i");
         const std::string text = serial.substr(0, serial.find('\0'));
         EXPECT_EQ(lineOf(outputOf(explanation, IAP2_FILE.output), "slot.9").text,
                   "serial=" + text + "\n");
@@ -135,7 +135,7 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
     for (const Link& link : links) {
         const DescribedUnit described(
             [&link](UnitDescription& unit) { unit.links[link.from] = link.to; });
-        const Explanation explanation = unit::explainUnit(described.root(), "ai");
+        const Explanation explanation = desk::explainUnit(described.root(), "ai");
         SCOPED_TRACE(std::string(link.from) + " -> " + link.to);
         expectRunLeaves(described, explanation, {"-a", "-i"});
     }
@@ -144,19 +144,19 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
 TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
     const DescribedUnit described(
         [](UnitDescription& unit) { unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n"; });
-    const Explanation explanation = unit::explainUnit(described.root(), "a");
+    const Explanation explanation = desk::explainUnit(described.root(), "a");
     const Output& output = outputOf(explanation, TELEPHONY_TUNING_FILE);
-    EXPECT_EQ(output.outcome, unit::Outcome::notAsked);
-    EXPECT_EQ(output.left, unit::Left::file);
+    EXPECT_EQ(output.outcome, desk::Outcome::notAsked);
+    EXPECT_EQ(output.left, desk::Left::file);
     EXPECT_EQ(output.content, "of an earlier run\n");
     EXPECT_TRUE(output.lines.empty());
 }
 
 TEST(ExplainTest, MissingTmpKeepsAllOutputs) {
     const DescribedUnit described([](UnitDescription& unit) { unit.absent.push_back("/tmp"); });
-    for (const Output& output : unit::explainUnit(described.root(), "i")) {
-        EXPECT_EQ(output.outcome, unit::Outcome::kept) << output.path;
-        EXPECT_EQ(output.left, unit::Left::nothing) << output.path;
+    for (const Output& output : desk::explainUnit(described.root(), "i")) {
+        EXPECT_EQ(output.outcome, desk::Outcome::kept) << output.path;
+        EXPECT_EQ(output.left, desk::Left::nothing) << output.path;
     }
 }
 
@@ -165,7 +165,7 @@ TEST(ExplainTest, UnitIsOnlyReadAndNeedsNoMark) {
     fs::remove(described.root() / kit::MARKER_NAME);
     const auto before = treeStates(described.root());
     letTimePass();
-    EXPECT_EQ(unit::explainUnit(described.root(), "aia").size(), 9U);
+    EXPECT_EQ(desk::explainUnit(described.root(), "aia").size(), 9U);
     EXPECT_EQ(treeStates(described.root()), before);
 }
 

@@ -14,8 +14,8 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using unit::Outcome;
-using unit::Output;
+using desk::Outcome;
+using desk::Output;
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
     std::istringstream text(readFile(folder / "arguments"));
@@ -30,8 +30,8 @@ std::vector<std::string> argumentsOf(const fs::path& folder) {
 std::size_t compareLines(const fs::path& folder) {
     const TemporaryFolder made;
     kit::makeUnit(kit::readDescription(folder / "unit.toml"), made.path() / "unit");
-    const unit::Explanation explanation =
-        unit::explainUnit(made.path() / "unit", unit::optionLetters(argumentsOf(folder)));
+    const desk::Explanation explanation =
+        desk::explainUnit(made.path() / "unit", desk::optionLetters(argumentsOf(folder)));
     std::size_t compared = 0;
     for (const Output& output : explanation) {
         if (output.outcome == Outcome::kept || output.outcome == Outcome::notAsked) {
@@ -39,7 +39,7 @@ std::size_t compareLines(const fs::path& folder) {
             continue;
         }
         std::string written;
-        for (const unit::Line& line : output.lines) {
+        for (const desk::Line& line : output.lines) {
             written += line.text;
             EXPECT_FALSE(line.reasons.empty()) << output.path << ": " << line.text;
             ++compared;

@@ -10,26 +10,26 @@ namespace orvane::test {
 
 namespace {
 
-using unit::Consequence;
-using unit::DiffLine;
-using unit::Impact;
-using unit::Outcome;
+using desk::Consequence;
+using desk::DiffLine;
+using desk::Impact;
+using desk::Outcome;
 
 std::string printed(const std::vector<Consequence>& consequences) {
     std::ostringstream out;
-    unit::printConsequences(out, consequences);
+    desk::printConsequences(out, consequences);
     return out.str();
 }
 
 std::string printed(const std::vector<Impact>& impacts) {
     std::ostringstream out;
-    unit::printImpacts(out, impacts);
+    desk::printImpacts(out, impacts);
     return out.str();
 }
 
 TEST(MovesTextTest, ConsequencesStandBelowTheirValues) {
-    const unit::MovedLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, "slot.9"};
-    const unit::MovedLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, "slot.9"};
+    const desk::MovedLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, "slot.9"};
+    const desk::MovedLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, "slot.9"};
     EXPECT_EQ(printed(std::vector<Consequence>{
                   {{"slot.9", "", "B"},
                    {{"/tmp/x", Outcome::generated, Outcome::generated, {}, {removed, added}},
@@ -74,7 +74,7 @@ TEST(MovesTextTest, WholeTuningBlocksAreOneWord) {
 TEST(MovesTextTest, ProgressIsDrawnWhereItGrowsAndWipedOutAtItsEnd) {
     std::ostringstream terminal;
     for (std::size_t done = 1; done <= 80; ++done) {
-        unit::printProgress(terminal, done, 80);
+        desk::printProgress(terminal, done, 80);
     }
     const std::string text = terminal.str();
     EXPECT_EQ(text.substr(0, 53), "\r[#" + std::string(39, ' ') + "] 2 of 80" + "\r[");

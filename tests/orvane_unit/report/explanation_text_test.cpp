@@ -9,15 +9,15 @@ namespace orvane::test {
 
 namespace {
 
-using unit::Left;
-using unit::Line;
-using unit::Outcome;
-using unit::Output;
-using unit::Reason;
+using desk::Left;
+using desk::Line;
+using desk::Outcome;
+using desk::Output;
+using desk::Reason;
 
-std::string printed(const unit::Explanation& explanation, bool showsAll = false) {
+std::string printed(const desk::Explanation& explanation, bool showsAll = false) {
     std::ostringstream out;
-    unit::printExplanation(out, explanation, showsAll);
+    desk::printExplanation(out, explanation, showsAll);
     return out.str();
 }
 
@@ -26,7 +26,7 @@ Output output(Outcome outcome, const std::vector<Reason>& reasons, const std::ve
 }
 
 TEST(ExplanationTextTest, ValuesStandBesideTheirPlaces) {
-    const unit::Explanation explanation = {
+    const desk::Explanation explanation = {
         output(Outcome::generated, {Reason::generated},
                {{"# comment\n", {Reason::fixedText}, "", ""},
                 {"model=Quarion\n", {Reason::fromImage}, "param.139", "parameter 139"},
@@ -77,7 +77,7 @@ TEST(ExplanationTextTest, LineThatIsLeftOutIsTold) {
 }
 
 TEST(ExplanationTextTest, FieldsAsTheyShouldBeAreCountedUnlessAllAreWanted) {
-    const unit::Explanation explanation = {output(
+    const desk::Explanation explanation = {output(
         Outcome::generated, {Reason::generated},
         {{"; head\n", {Reason::fixedText}, "", ""},
          {"qwaA 1\n", {Reason::fromTuningBlock}, "tuning.3.qwaA", "block 3, disk byte 7: 01"},

@@ -28,8 +28,8 @@ json parsed(const std::string& text, const char* command) {
 
 TEST(JsonTest, ExplanationHasItsLinesAndOnlyThenItsContent) {
     const DescribedUnit described([](kit::UnitDescription& unit) { unit.disk.slots[9] = "A\xff"; });
-    const unit::Explanation explanation = unit::explainUnit(described.root(), "i");
-    const json report = parsed(unit::explanationJson("R", "i", explanation, true), "explain");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), "i");
+    const json report = parsed(desk::explanationJson("R", "i", explanation, true), "explain");
     EXPECT_EQ(report.at("root"), "R");
     EXPECT_EQ(report.at("letters"), "i");
     EXPECT_EQ(report.at("isIntended"), true);
@@ -46,17 +46,17 @@ TEST(JsonTest, ExplanationHasItsLinesAndOnlyThenItsContent) {
               {"detail", "record slot 9, disk bytes from 1048705: 41 ff 00 00 00 00 00 00"}}));
     EXPECT_EQ(device.at("lines").at(0).at("key"), nullptr);
     EXPECT_TRUE(device.at("content").contains("hex"));
-    const json brief = parsed(unit::explanationJson("R", "i", explanation, false), "explain");
+    const json brief = parsed(desk::explanationJson("R", "i", explanation, false), "explain");
     EXPECT_FALSE(brief.at("outputs").at(0).contains("content"));
 }
 
 TEST(JsonTest, ContentsHaveThePartsThatAreAskedFor) {
     const DescribedUnit described;
-    const unit::Contents contents = unit::readContents(described.root());
-    const json all = parsed(unit::contentsJson("R", contents, ""), "show");
-    for (const char* part : unit::CONTENT_PARTS) {
+    const desk::Contents contents = desk::readContents(described.root());
+    const json all = parsed(desk::contentsJson("R", contents, ""), "show");
+    for (const char* part : desk::CONTENT_PARTS) {
         EXPECT_TRUE(all.contains(part)) << part;
-        EXPECT_EQ(parsed(unit::contentsJson("R", contents, part), "show").size(), 4U) << part;
+        EXPECT_EQ(parsed(desk::contentsJson("R", contents, part), "show").size(), 4U) << part;
     }
     EXPECT_EQ(all.at("params").at("rows").at(138).at("raw"), 26);
     EXPECT_EQ(all.at("records").at("slots").at(9).at("bytes"), "53 4e 30 30 34 32 31 37");
@@ -69,11 +69,11 @@ TEST(JsonTest, ContentsHaveThePartsThatAreAskedFor) {
 }
 
 TEST(JsonTest, RunTellsWhatWasBefore) {
-    unit::TmpTree before;
-    unit::TmpTree after;
+    desk::TmpTree before;
+    desk::TmpTree after;
     before.entries = {{"old", "1"}};
     after.entries = {{"folder/", std::nullopt}, {"new", "\xff"}, {"old", "2"}};
-    const json report = parsed(unit::runJson("R", {3, "out", "err"}, before, after), "run");
+    const json report = parsed(desk::runJson("R", {3, "out", "err"}, before, after), "run");
     EXPECT_EQ(report.at("exitStatus"), 3);
     EXPECT_EQ(report.at("standardError"), "err");
     EXPECT_EQ(report.at("files"),
@@ -86,13 +86,13 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
     const DescribedUnit first;
     const DescribedUnit second([](kit::UnitDescription& unit) { unit.image.params[22] = 0; });
     const json report =
-        parsed(unit::consequencesJson(
+        parsed(desk::consequencesJson(
                    "A", "B",
-                   unit::consequences(
-                       unit::differingValues(unit::unitValues(kit::inspectInputs(first.root())),
-                                             unit::unitValues(kit::inspectInputs(second.root()))),
-                       unit::movedOutputs(unit::explainUnit(first.root(), "a"),
-                                          unit::explainUnit(second.root(), "a")))),
+                   desk::consequences(
+                       desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
+                                             desk::unitValues(kit::inspectInputs(second.root()))),
+                       desk::movedOutputs(desk::explainUnit(first.root(), "a"),
+                                          desk::explainUnit(second.root(), "a")))),
                "diff");
     EXPECT_EQ(
         report.at("values"),
@@ -113,15 +113,15 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
 
 TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
     const json impacts =
-        parsed(unit::impactsJson("R", {{"param.22", 13, 12, {"/tmp/airplay.conf:23"}}}), "impact");
+        parsed(desk::impactsJson("R", {{"param.22", 13, 12, {"/tmp/airplay.conf:23"}}}), "impact");
     EXPECT_EQ(impacts.at("inputs"), (json::array({{{"key", "param.22"},
                                                    {"tried", 13},
                                                    {"moving", 12},
                                                    {"lines", {"/tmp/airplay.conf:23"}}}})));
-    unit::CheckReport check;
-    check.cases = {{"one", {"differs"}, {}, {unit::Reason::generated}}};
+    desk::CheckReport check;
+    check.cases = {{"one", {"differs"}, {}, {desk::Reason::generated}}};
     check.unreached = {"disk-missing"};
-    const json report = parsed(unit::checkJson("F", check), "check");
+    const json report = parsed(desk::checkJson("F", check), "check");
     EXPECT_EQ(report.at("cases").at(0), (json{{"name", "one"},
                                               {"differences", {"differs"}},
                                               {"surprises", json::array()},
@@ -130,22 +130,22 @@ TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
 }
 
 TEST(JsonTest, TextsThatAreNoUtf8AreHexWhereverTheyStand) {
-    unit::CheckReport check;
+    desk::CheckReport check;
     check.cases = {{"\xff", {"/tmp/\xfe is missing"}, {"\x80"}, {}}};
-    const json report = parsed(unit::checkJson("\xc0", check), "check");
+    const json report = parsed(desk::checkJson("\xc0", check), "check");
     EXPECT_EQ(report.at("folder"), (json{{"hex", "c0"}}));
     EXPECT_EQ(report.at("cases").at(0).at("name"), (json{{"hex", "ff"}}));
     EXPECT_EQ(report.at("cases").at(0).at("differences"),
               (json::array({{{"hex", "2f746d702ffe206973206d697373696e67"}}})));
     EXPECT_EQ(report.at("cases").at(0).at("surprises"), (json::array({{{"hex", "80"}}})));
-    EXPECT_EQ(parsed(unit::impactsJson("\xff", {}), "impact").at("root"), (json{{"hex", "ff"}}));
-    EXPECT_EQ(parsed(unit::consequencesJson("A", "\xff", {}), "diff").at("second"),
+    EXPECT_EQ(parsed(desk::impactsJson("\xff", {}), "impact").at("root"), (json{{"hex", "ff"}}));
+    EXPECT_EQ(parsed(desk::consequencesJson("A", "\xff", {}), "diff").at("second"),
               (json{{"hex", "ff"}}));
     const DescribedUnit described([](kit::UnitDescription& unit) {
         unit.files["/fs/rwdata/.Version/\xff.inf"] = "Type=\xfe\n\xfd=1\n";
     });
     const json shown =
-        parsed(unit::contentsJson("R", unit::readContents(described.root()), "versions"), "show");
+        parsed(desk::contentsJson("R", desk::readContents(described.root()), "versions"), "show");
     EXPECT_NE(shown.dump().find(R"({"key":"Type","value":{"hex":"fe"}})"), std::string::npos);
     EXPECT_NE(shown.dump().find(R"({"key":{"hex":"fd"},"value":"1"})"), std::string::npos);
 }

@@ -14,13 +14,13 @@ namespace orvane::test {
 
 namespace {
 
+using desk::Contents;
+using desk::CrcVerdict;
 using kit::UnitDescription;
-using unit::Contents;
-using unit::CrcVerdict;
 
 std::string printed(const Contents& contents, const std::string& only) {
     std::ostringstream out;
-    unit::printContents(out, contents, only);
+    desk::printContents(out, contents, only);
     return out.str();
 }
 
@@ -30,9 +30,9 @@ TEST(ContentsTest, ParametersAreDecoded) {
         unit.image.params[171] = 255;
         unit.image.params[50] = 2;
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     ASSERT_EQ(contents.params.size(), 171U);
-    const unit::Param& model = contents.params[138];
+    const desk::Param& model = contents.params[138];
     EXPECT_EQ(model.row.number, 139U);
     EXPECT_EQ(model.row.offset, 139U);
     EXPECT_EQ(model.size, 1U);
@@ -56,7 +56,7 @@ TEST(ContentsTest, ParametersPastTheImageHaveNoValue) {
         unit.image = {};
         unit.image.size = 134;
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_EQ(contents.params[132].raw, 0); // 133, at byte 132
     EXPECT_EQ(contents.params[133].raw, std::nullopt);
     EXPECT_EQ(contents.params[138].raw, std::nullopt);
@@ -66,16 +66,16 @@ TEST(ContentsTest, MissingImageAndDiskAreTold) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.absent = {CONFIG_SHM_NAME, BOOT_DISK};
     });
-    const Contents contents = unit::readContents(described.root());
-    EXPECT_EQ(contents.image.reason, unit::Reason::imageMissing);
+    const Contents contents = desk::readContents(described.root());
+    EXPECT_EQ(contents.image.reason, desk::Reason::imageMissing);
     EXPECT_EQ(contents.params[138].raw, std::nullopt);
     EXPECT_EQ(contents.params[138].meaning, "model VOXA");
-    EXPECT_EQ(contents.diskTrouble, unit::Reason::diskMissing);
+    EXPECT_EQ(contents.diskTrouble, desk::Reason::diskMissing);
     EXPECT_EQ(contents.slots[9].bytes, std::nullopt);
     EXPECT_EQ(contents.aux, std::nullopt);
     EXPECT_EQ(contents.crcVerdict, CrcVerdict::unreadable);
     EXPECT_EQ(contents.crc, 0xFFFFFFFFU);
-    EXPECT_EQ(contents.tuning.reason, unit::Reason::diskMissing);
+    EXPECT_EQ(contents.tuning.reason, desk::Reason::diskMissing);
 }
 
 TEST(ContentsTest, RecordsAreRead) {
@@ -83,7 +83,7 @@ TEST(ContentsTest, RecordsAreRead) {
         unit.disk.slots[17] = std::string("\x2a\x00", 2);
         unit.disk.aux = "bench 2";
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     ASSERT_EQ(contents.slots.size(), 18U);
     EXPECT_EQ(contents.slots[9].bytes, "SN004217");
     EXPECT_EQ(contents.slots[9].offset, 129U);
@@ -98,7 +98,7 @@ TEST(ContentsTest, RecordsAreRead) {
 
 TEST(ContentsTest, BlankRecordsHaveABlankCrc) {
     const DescribedUnit described([](UnitDescription& unit) { unit.disk.slots.clear(); });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_EQ(contents.crcVerdict, CrcVerdict::blank);
     // The complement of the usual CRC-32 of 136 zero bytes; that value by zlib.
     EXPECT_EQ(~contents.crc, 0x773333E6U);
@@ -106,7 +106,7 @@ TEST(ContentsTest, BlankRecordsHaveABlankCrc) {
 
 TEST(ContentsTest, CrcIsThatOfSlots1To9) {
     // The complement of zlib's CRC-32 of 128 zero bytes and the serial.
-    EXPECT_EQ(unit::readContents(DescribedUnit().root()).crc, 0xC44C7586U);
+    EXPECT_EQ(desk::readContents(DescribedUnit().root()).crc, 0xC44C7586U);
 }
 
 TEST(ContentsTest, CrcOfAllOnesIsAmbiguous) {
@@ -114,7 +114,7 @@ TEST(ContentsTest, CrcOfAllOnesIsAmbiguous) {
         // Of 128 zero bytes and these, zlib's CRC-32 is 0.
         unit.disk.slots[9] = "SN00\x5a\x89\x73\xf2";
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_EQ(contents.crc, 0xFFFFFFFFU);
     EXPECT_EQ(contents.crcVerdict, CrcVerdict::ambiguous);
     EXPECT_NE(printed(contents, "records").find("CRC over slots 1 to 9: 0xffffffff, ambiguous\n"),
@@ -126,24 +126,24 @@ TEST(ContentsTest, DiskThatIsTooShortIsTold) {
         unit.disk = {};
         unit.disk.size = MEBIBYTE - 1;
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_EQ(contents.diskSize, 1'048'575U);
-    EXPECT_EQ(contents.diskTrouble, unit::Reason::diskTooShort);
+    EXPECT_EQ(contents.diskTrouble, desk::Reason::diskTooShort);
     EXPECT_EQ(contents.slots[0].bytes, std::nullopt);
     // Slot 1 begins one byte behind the base, so it and all others are there.
     EXPECT_EQ(contents.slots[1].bytes, std::string(16, '\0'));
     EXPECT_EQ(contents.crcVerdict, CrcVerdict::blank);
-    EXPECT_EQ(contents.tuning.reason, unit::Reason::fromTuningBlock);
+    EXPECT_EQ(contents.tuning.reason, desk::Reason::fromTuningBlock);
 }
 
 TEST(ContentsTest, EachPartCanBePrintedAlone) {
-    const Contents contents = unit::readContents(DescribedUnit().root());
+    const Contents contents = desk::readContents(DescribedUnit().root());
     const std::string beginnings[] = {
         "image: 179 bytes\n", "disk: 2097152 bytes\n", "tuning block 0",
         "/fs/rwdata/.Version/app.inf: ", "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM "};
     std::string all;
     std::size_t part = 0;
-    for (const char* name : unit::CONTENT_PARTS) {
+    for (const char* name : desk::CONTENT_PARTS) {
         const std::string text = printed(contents, name);
         EXPECT_EQ(text.compare(0, beginnings[part].size(), beginnings[part]), 0) << text;
         all += text;
@@ -157,7 +157,7 @@ TEST(ContentsTest, OfTwoApplicationsOnlyOneIsChosen) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.files["/fs/rwdata/.Version/other.inf"] = "Type=xApplicationx\nVersion Number=7.8.9\n";
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     ASSERT_EQ(contents.versions.files.size(), 2U);
     // Which one is the first is the file system's business.
     EXPECT_EQ(contents.versions.chosen, 0U);
@@ -175,7 +175,7 @@ TEST(ContentsTest, MissingVersionFolderIsTold) {
         unit.files.erase("/fs/rwdata/.Version/app.inf");
         unit.absent = {"/fs/rwdata/.Version"};
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_FALSE(contents.versions.hasFolder);
     EXPECT_FALSE(contents.versions.chosen);
     EXPECT_EQ(printed(contents, "versions"),
@@ -189,7 +189,7 @@ TEST(ContentsTest, VersionFilesAreChosenOrNot) {
         unit.files["/fs/rwdata/.Version/map.inf"] = "Type=Map\nVersion Number=9\n";
         unit.files["/fs/rwdata/.Version/readme.txt"] = "Type=Application\n";
     });
-    const Contents contents = unit::readContents(described.root());
+    const Contents contents = desk::readContents(described.root());
     EXPECT_EQ(contents.versions.files.size(), 2U);
     ASSERT_TRUE(contents.versions.chosen);
     EXPECT_EQ(contents.versions.files[*contents.versions.chosen].path,
@@ -207,7 +207,7 @@ TEST(ContentsTest, TuningBlocksShowTheirWords) {
         unit.disk.tuning[3].fields["qwaAECSwitch"] = std::string("qwaOn");
         unit.disk.tuning[3].fields["qwaNCParams"] = std::vector<std::int64_t>{1, -2, 3, 0, 5};
     });
-    const std::string text = printed(unit::readContents(described.root()), "tuning");
+    const std::string text = printed(desk::readContents(described.root()), "tuning");
     EXPECT_NE(text.find("tuning block 3, telephony\n  qwaAECSwitch            2  qwaOn\n"),
               std::string::npos);
     EXPECT_NE(text.find("  qwaNCParams             1, -2, 3, 0, 5\n"), std::string::npos);
@@ -220,13 +220,13 @@ TEST(ContentsTest, FilesTellTheirKind) {
         unit.folders.push_back("/tmp/airplay.conf");
         unit.files.erase("/fs/mp/etc/mm/iap1.cfg");
     });
-    for (const unit::UnitFile& file : unit::readContents(described.root()).files) {
+    for (const desk::UnitFile& file : desk::readContents(described.root()).files) {
         if (file.path == "/tmp/airplay.conf") {
-            EXPECT_EQ(file.kind, unit::Left::folder);
+            EXPECT_EQ(file.kind, desk::Left::folder);
         } else if (file.path == "/fs/mp/etc/mm/iap1.cfg") {
-            EXPECT_EQ(file.kind, unit::Left::nothing);
+            EXPECT_EQ(file.kind, desk::Left::nothing);
         } else if (file.path == "/fs/mp/etc/airplay.conf") {
-            EXPECT_EQ(file.kind, unit::Left::file);
+            EXPECT_EQ(file.kind, desk::Left::file);
             EXPECT_EQ(file.size, 14U);
             EXPECT_EQ(file.role, "stock file");
         }
