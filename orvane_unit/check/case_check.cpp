@@ -4,9 +4,9 @@
 #include "kit/description/unit_description.h"
 #include "kit/enter/root.h"
 #include "kit/host/kit_error.h"
-#include "orvane_unit/check/scratch_folder.h"
+#include "kit/host/scratch_folder.h"
+#include "kit/host/whole_file.h"
 #include "orvane_unit/check/tmp_tree.h"
-#include "orvane_unit/check/whole_file.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
 
@@ -56,7 +56,7 @@ void writeWhole(const fs::path& file, const std::string& text) {
 }
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
-    const std::optional<std::string> text = readWholeFile(folder / "arguments");
+    const std::optional<std::string> text = kit::readWholeFile(folder / "arguments");
     if (!text) {
         return {"-a", "-i"};
     }
@@ -115,10 +115,10 @@ void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences
 
 void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run,
              std::vector<std::string>& differences) {
-    if (run.standardError != readWholeFile(expected / "stderr").value_or("")) {
+    if (run.standardError != kit::readWholeFile(expected / "stderr").value_or("")) {
         differences.push_back("standard error differs");
     }
-    const std::optional<std::string> list = readWholeFile(expected / "tmp.list");
+    const std::optional<std::string> list = kit::readWholeFile(expected / "tmp.list");
     if (!list) {
         differences.push_back("there is no expectation: no expected/tmp.list");
         return;
@@ -126,7 +126,7 @@ void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult
     compareLists(listOf(tree), *list, differences);
     for (const auto& [path, content] : tree.entries) {
         if (content && list->find(path) != std::string::npos &&
-            *content != readWholeFile(expected / "tmp" / path)) {
+            *content != kit::readWholeFile(expected / "tmp" / path)) {
             differences.push_back("/tmp/" + path + " differs");
         }
     }
@@ -163,7 +163,7 @@ void compareWithRun(const Explanation& explanation, const TmpTree& tree,
 }
 
 CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool updates) {
-    const ScratchFolder scratch;
+    const kit::ScratchFolder scratch;
     const fs::path root = scratch.path() / "unit";
     kit::makeUnit(kit::readDescription(folder / "unit.toml"), root);
     const std::vector<std::string> arguments = argumentsOf(folder);

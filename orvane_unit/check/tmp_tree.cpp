@@ -2,7 +2,7 @@
 #include "orvane_unit/check/tmp_tree.h"
 
 #include "kit/enter/root.h"
-#include "orvane_unit/check/whole_file.h"
+#include "kit/host/whole_file.h"
 
 #include <system_error>
 
@@ -31,7 +31,7 @@ TmpTree readTmp(const fs::path& root) {
             tree.entries[path + "/"];
         } else {
             tree.entries[path] =
-                entry->is_regular_file(error) ? readWholeFile(entry->path()) : std::nullopt;
+                entry->is_regular_file(error) ? kit::readWholeFile(entry->path()) : std::nullopt;
         }
     }
     return tree;

@@ -9,8 +9,8 @@
 #include "kit/enter/root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/scratch_folder.h"
 #include "kit/unit/describe_inputs.h"
-#include "orvane_unit/check/scratch_folder.h"
 #include "orvane_unit/compare/output_differences.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/explain/explain.h"
@@ -210,7 +210,7 @@ void addMoves(Impact& impact, const std::vector<MovedOutput>& moved) {
 
 std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::string>& beginnings,
                                 const Progress& progress) {
-    const ScratchFolder scratch;
+    const kit::ScratchFolder scratch;
     const fs::path copy = scratch.path() / "unit";
     kit::makeUnit(kit::inspectInputs(root), copy);
     const ChangedFile image(copy / (CONFIG_SHM_NAME + 1));

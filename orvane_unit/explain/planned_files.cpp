@@ -2,7 +2,7 @@
 #include "orvane_unit/explain/planned_files.h"
 
 #include "kit/host/output_place.h"
-#include "orvane_unit/check/whole_file.h"
+#include "kit/host/whole_file.h"
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -35,7 +35,7 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
                                                         : std::nullopt;
     }
     // Anything but a file is left alone: looking into a pipe would take from it, or wait for ever.
-    return place->kind == S_IFREG ? readWholeFile(place->path) : std::nullopt;
+    return place->kind == S_IFREG ? kit::readWholeFile(place->path) : std::nullopt;
 }
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {

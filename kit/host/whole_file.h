@@ -5,9 +5,9 @@
 #include <optional>
 #include <string>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 /// All bytes of a file; nothing when it can't be opened.
 std::optional<std::string> readWholeFile(const std::filesystem::path& path);
 
-} // namespace orvane::desk
+} // namespace orvane::kit

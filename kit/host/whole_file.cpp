@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "orvane_unit/check/whole_file.h"
+#include "kit/host/whole_file.h"
 
 #include <fstream>
 #include <sstream>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 std::optional<std::string> readWholeFile(const std::filesystem::path& path) {
     std::ifstream file(path, std::ios::binary);
@@ -16,4 +16,4 @@ std::optional<std::string> readWholeFile(const std::filesystem::path& path) {
     return content.str();
 }
 
-} // namespace orvane::desk
+} // namespace orvane::kit

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "orvane_unit/check/scratch_folder.h"
+#include "kit/host/scratch_folder.h"
 
 #include "kit/host/kit_error.h"
 
@@ -7,14 +7,14 @@
 #include <string>
 #include <system_error>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
 ScratchFolder::ScratchFolder() {
     std::string name = fs::temp_directory_path() / "orvane-unit-XXXXXX";
     if (::mkdtemp(name.data()) == nullptr) {
-        throw kit::systemError("cannot make " + name);
+        throw systemError("cannot make " + name);
     }
     path_ = name;
 }
@@ -24,4 +24,4 @@ ScratchFolder::~ScratchFolder() {
     fs::remove_all(path_, ignored);
 }
 
-} // namespace orvane::desk
+} // namespace orvane::kit

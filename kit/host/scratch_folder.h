@@ -3,12 +3,12 @@
 
 #include <filesystem>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 /// A fresh folder among the system's temporary ones, gone with its owner.
 class ScratchFolder {
 public:
-    /// Throws kit::KitError.
+    /// Throws KitError.
     ScratchFolder();
     ~ScratchFolder();
     ScratchFolder(const ScratchFolder&) = delete;
@@ -20,4 +20,4 @@ private:
     std::filesystem::path path_;
 };
 
-} // namespace orvane::desk
+} // namespace orvane::kit
