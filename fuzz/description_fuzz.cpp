@@ -4,6 +4,7 @@
 // back, to the byte, through the text that is made of it.
 #include "fuzz/support.h"
 #include "kit/description/description_text.h"
+#include "kit/description/parse_description.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
 

@@ -4,7 +4,7 @@
 // what is wrong and what would be right; where, the caller knows.
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 
 #include <cstdint>
 #include <string>

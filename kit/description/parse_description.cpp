@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/description/parse_description.h"
+
 #include "kit/description/conflicts.h"
 #include "kit/description/description_reading.h"
 #include "kit/description/toml_library.h"

@@ -6,6 +6,7 @@
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 

@@ -8,7 +8,9 @@
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 #include "tuning/dps_block.h"
 

@@ -3,9 +3,9 @@
 
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
+#include "kit/description/unit_layout.h"
 #include "kit/host/kit_error.h"
 #include "kit/tuning/tuning_encode.h"
-#include "kit/unit/marker.h"
 #include "tuning/dps_block.h"
 
 #include <filesystem>

@@ -5,6 +5,8 @@
 #pragma once
 
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
+#include "kit/tuning/tuning_description.h"
 
 #include <cstdint>
 #include <string>

@@ -1,35 +1,19 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The description of a simulated unit and the making of one. A description is a TOML file; its keys
-// are listed in docs/unit-description.md.
+// The description of a simulated unit.
 #pragma once
 
 #include "config/param_catalogue.h"
+#include "kit/host/bytes.h"
+#include "kit/tuning/tuning_description.h"
 
 #include <cstdint>
-#include <filesystem>
 #include <map>
 #include <optional>
 #include <string>
-#include <variant>
 #include <vector>
 
 namespace orvane::kit {
-
-using Bytes = std::string; ///< raw bytes, not text
-
-/// A value of one tuning field: a word ("qwaOn"), a number or a list of numbers.
-using TuningValue = std::variant<std::string, std::int64_t, std::vector<std::int64_t>>;
-
-/// One tuning block: raw bytes first (zeros where none are given), then the named fields over them.
-struct TuningDescription {
-    Bytes raw;                                 ///< at most 188 bytes
-    std::map<std::string, TuningValue> fields; ///< by key, as in a tuning file
-
-    bool operator==(const TuningDescription& other) const {
-        return raw == other.raw && fields == other.fields;
-    }
-};
 
 /// The published configuration image.
 struct ImageDescription {
@@ -83,22 +67,5 @@ struct UnitDescription {
                folders == other.folders && absent == other.absent;
     }
 };
-
-/// Reads a description. `name` is that of its file: it stands in the error texts, and the host
-/// files that the text names are relative to its folder. Throws KitError with "name:line:column:"
-/// in front for anything that is not a description: bad TOML, an unknown key, a value that does not
-/// fit.
-UnitDescription parseDescription(const std::string& text, const std::string& name);
-UnitDescription readDescription(const std::filesystem::path& file);
-
-/// The built-in sample unit.
-const char* sampleDescriptionText();
-
-/// Makes the unit at `root`, which must be absent or an empty folder. Image and files are written
-/// through the host's file system, disk records with the product's own operations inside the unit.
-/// All of it happens in a folder beside `root` whose name begins with "." and root's name, and
-/// which takes the place of `root` when it is whole. Throws KitError; `root` is then as it was
-/// before. What ends the process half-way leaves the folder beside, and `root` as it was.
-void makeUnit(const UnitDescription& unit, const std::filesystem::path& root);
 
 } // namespace orvane::kit

@@ -10,6 +10,9 @@
 
 namespace orvane::kit {
 
+/// The kit's own mark at the top of a unit, which is no part of its description.
+constexpr char MARKER_NAME[] = ".orvane-unit";
+
 enum class EntryKind { folder, file, sparseFile, link, image, disk };
 
 /// All entries of a unit by their paths, those above before those below.

@@ -4,7 +4,7 @@
 // KitError, the file's path in its text.
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 
 #include <cstdint>

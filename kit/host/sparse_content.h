@@ -3,7 +3,7 @@
 // What a mostly empty file or device holds, without a look at the zeros one by one.
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 
 #include <cstdint>

@@ -3,7 +3,7 @@
 // From named tuning fields to the bytes of a tuning block: the way back of decodeField.
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
 #include <array>

@@ -2,7 +2,7 @@
 #include "kit/tuning/tuning_line.h"
 
 #include "kit/description/toml_text.h"
-#include "kit/description/unit_description.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 
 #include <array>

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/capture_unit.h"
 
-#include "kit/description/unit_description.h"
+#include "kit/unit/make_unit.h"
 #include "kit/unit/redact_serial.h"
 #include "kit/unit/unit_inputs.h"
 

@@ -5,7 +5,9 @@
 #pragma once
 
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
+#include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
 #include <cstdint>

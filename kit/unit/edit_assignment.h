@@ -3,7 +3,8 @@
 // An assignment to a unit's value, read and checked as far as it can be without the unit.
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
+#include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
 #include <cstdint>

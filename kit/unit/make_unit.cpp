@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/unit/make_unit.h"
+
 #include "config/record_area.h"
 #include "kit/description/conflicts.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
 #include "kit/enter/root.h"
+#include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/finished_folder.h"
 #include "kit/host/host_file.h"

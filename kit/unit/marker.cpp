@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/marker.h"
 
-#include "kit/description/unit_description.h"
+#include "kit/description/unit_layout.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 

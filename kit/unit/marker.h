@@ -8,7 +8,6 @@
 
 namespace orvane::kit {
 
-constexpr char MARKER_NAME[] = ".orvane-unit";
 /// The whole content: who made it, and the version of the layout.
 constexpr char MARKER_TEXT[] = "made by orvane-unit, layout 1\n";
 

@@ -3,6 +3,7 @@
 
 #include "config/record_slots.h"
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 
 #include <cstddef>
 #include <cstdint>

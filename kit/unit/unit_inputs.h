@@ -4,6 +4,7 @@
 #pragma once
 
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 
 #include <filesystem>
 #include <optional>

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/check/case_check.h"
 
-#include "kit/description/unit_description.h"
+#include "kit/description/parse_description.h"
 #include "kit/enter/root.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"
 #include "kit/host/whole_file.h"
+#include "kit/unit/make_unit.h"
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The program orvane-unit from its command line to its exit status.
+#include "kit/description/unit_layout.h"
 #include "kit/enter/child_output.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/marker.h"

@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A unit in, its /tmp out: golden/CASE holds the unit, the arguments and what must be left.
-#include "kit/description/unit_description.h"
+#include "kit/description/parse_description.h"
 #include "kit/enter/root.h"
+#include "kit/unit/make_unit.h"
 #include "main/options.h"
 #include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"

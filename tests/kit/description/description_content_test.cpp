@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The forms in which a description gives paths, contents and links.
+#include "kit/description/parse_description.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
 #include "tests/support/temporary_folder.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/description/unit_description.h"
+#include "kit/description/parse_description.h"
 #include "kit/host/kit_error.h"
 
 #include <gtest/gtest.h>

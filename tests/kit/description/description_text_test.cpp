@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/description_text.h"
+#include "kit/description/parse_description.h"
 #include "kit/description/toml_text.h"
 #include "tests/kit/description/random_unit.h"
 

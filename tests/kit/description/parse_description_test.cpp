@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/description/parse_description.h"
+#include "kit/description/sample.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
+#include "kit/unit/make_unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 

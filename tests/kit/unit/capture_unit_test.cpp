@@ -1,5 +1,4 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/description/unit_description.h"
 #include "kit/enter/root.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/capture_unit.h"

@@ -1,8 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/description_text.h"
+#include "kit/description/parse_description.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_unit.h"
+#include "kit/unit/make_unit.h"
 #include "tests/kit/description/random_unit.h"
 #include "tests/kit/unit/unit_tree.h"
 #include "tests/support/permissions.h"

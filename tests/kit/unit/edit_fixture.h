@@ -5,6 +5,7 @@
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_unit.h"
 #include "kit/unit/edit.h"
+#include "kit/unit/make_unit.h"
 #include "tests/kit/unit/unit_tree.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

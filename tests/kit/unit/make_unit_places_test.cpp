@@ -3,6 +3,7 @@
 // What gives way to what when a unit is made: standard folders, image and disk to files, links,
 // folders and absent paths.
 #include "kit/description/unit_description.h"
+#include "kit/unit/make_unit.h"
 #include "tests/kit/unit/unit_tree.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

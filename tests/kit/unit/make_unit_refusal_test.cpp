@@ -3,6 +3,7 @@
 // What makeUnit refuses, and that nothing is left of it.
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
+#include "kit/unit/make_unit.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/temporary_folder.h"

@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/description/unit_description.h"
 #include "kit/enter/root.h"
+#include "kit/unit/make_unit.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

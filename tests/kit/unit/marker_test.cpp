@@ -2,6 +2,7 @@
 #include "kit/description/unit_description.h"
 #include "kit/enter/root.h"
 #include "kit/host/kit_error.h"
+#include "kit/unit/make_unit.h"
 #include "kit/unit/marker.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/description/parse_description.h"
+#include "kit/description/sample.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_unit.h"
+#include "kit/unit/make_unit.h"
 #include "orvane_unit/compare/impact.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/support/temporary_folder.h"

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "kit/description/parse_description.h"
 #include "kit/description/unit_description.h"
+#include "kit/unit/make_unit.h"
 #include "tests/support/temporary_folder.h"
 
 #include <filesystem>

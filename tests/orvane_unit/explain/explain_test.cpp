@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/description/unit_layout.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
 #include "tests/orvane_unit/explain/described_unit.h"

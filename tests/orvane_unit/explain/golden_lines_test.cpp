@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The lines of an explanation, one behind the other, are the file that the golden units expect.
+#include "kit/description/parse_description.h"
+#include "kit/unit/make_unit.h"
 #include "orvane_unit/check/case_check.h"
 #include "orvane_unit/explain/explain.h"
 #include "tests/orvane_unit/explain/described_unit.h"
