@@ -1,11 +1,10 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """One-byte and two-byte parameters of the vehicle configuration image."""
 
 from __future__ import annotations
 
-from system import System
-from tree import FILE
+from model.system import System
+from model.tree import FILE
 
 IMAGE = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"
 

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Display values of the vehicle and of the unit. Every lookup has a default."""
 
@@ -7,9 +6,11 @@ from __future__ import annotations
 from collections.abc import Sequence
 from pathlib import Path
 
-import configuration
-import records
-from system import System
+from model import configuration, records
+from model.system import System
+
+# The display names of all model codes, one a line.
+MODEL_NAMES = Path(__file__).with_name("model_names.txt")
 
 MODEL_COUNT = 47
 ALIAS = 32
@@ -17,7 +18,7 @@ UNKNOWN_MODEL = b"VOXA"
 DEFAULT_SERIAL = b"ABCD1234abc"
 
 
-def load_names(path: Path) -> list[str]:
+def load_names(path: Path = MODEL_NAMES) -> list[str]:
     """The model display names, that of code 1 on the first line.
 
     Code 32 has no name of its own but that of code 1; all others differ.

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """What a unit is put together from: an image, a disk, version files, product files."""
 
@@ -8,8 +7,7 @@ import os
 from collections.abc import Mapping
 from pathlib import Path
 
-import configuration
-import records
+from model import configuration, records
 
 IMAGE_SIZE = configuration.offset(configuration.PARAMETER_COUNT) + 1
 

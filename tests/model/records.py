@@ -1,11 +1,10 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The reserved area at the end of the boot disk."""
 
 from __future__ import annotations
 
-from system import DISK, System
-from tree import FILE
+from model.system import DISK, System
+from model.tree import FILE
 
 RECORD_AREA = 0x100000
 SERIAL_OFFSET = 129

@@ -1,10 +1,9 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Buffered file streams and their failed state."""
 
 from __future__ import annotations
 
-from system import Fault, Handle, System
+from model.system import Fault, Handle, System
 
 
 class InputStream:

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The unit's system calls: files, their counting, and the faults that hit them."""
 
@@ -8,7 +7,7 @@ from collections import Counter
 from collections.abc import Sequence
 from dataclasses import dataclass
 
-from tree import FILE, FOLDER_PLACE, FREE, Place, Tree
+from model.tree import FILE, FOLDER_PLACE, FREE, Place, Tree
 
 DISK = "/dev/hd0"
 

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The model against outcomes worked out by hand: command line, identity, fallbacks."""
 
@@ -8,10 +7,9 @@ import tempfile
 import unittest
 from pathlib import Path
 
-import parts
-import snapshot
-from model import Outcome, Prediction, predict
-from version import format_version
+from model import parts, snapshot
+from model.prediction import Outcome, Prediction, predict
+from model.version import format_version
 
 NAMES = [f"MARL Model {code}" for code in range(1, 48)]
 STATIC, STOCK = parts.TEMPLATES, parts.STOCK_FILES
@@ -211,7 +209,3 @@ class Version(unittest.TestCase):
                                (b"99999999999.-99999999999.1.2", b"ff0001"),
                                (b"0x1f.1e2.3", b"000103")):
             self.assertEqual(format_version(text), expected, text)
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,15 +1,14 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The model's outcomes of disturbed system calls, against ones worked out by hand."""
 
 from __future__ import annotations
 
-import parts
-from model import predict
-from system import Fault
-from test_model import NAMES, STATIC, STOCK, UnitCase
-from test_model_iap import HARDWARE1, HARDWARE2, VEHICLE, accessory
-from tuning import tuning_text
+from model import parts
+from model.prediction import predict
+from model.system import Fault
+from model.test_model import NAMES, STATIC, STOCK, UnitCase
+from model.test_model_iap import HARDWARE1, HARDWARE2, VEHICLE, accessory
+from model.tuning import tuning_text
 
 IMAGE = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"
 APPLICATION = "/fs/rwdata/.Version/application.inf"
@@ -149,8 +148,3 @@ class Faults(UnitCase):
     def test_unmet_fault_is_told(self) -> None:
         fault = Fault("open", "/nowhere", 1)
         self.assertEqual(predict(self.root, ["-a"], NAMES, [fault]).unmet, (fault,))
-
-
-if __name__ == "__main__":
-    import unittest
-    unittest.main()

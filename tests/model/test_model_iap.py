@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The model against outcomes worked out by hand: the iAP files and what is in them."""
 
@@ -7,8 +6,8 @@ from __future__ import annotations
 import os
 import unittest
 
-import parts
-from test_model import NAMES, STATIC, STOCK, UnitCase
+from model import parts
+from model.test_model import NAMES, STATIC, STOCK, UnitCase
 
 
 def accessory(serial: bytes = b"ABCD1234abc", model: bytes = b"VOXA",
@@ -188,7 +187,3 @@ class SoftwareVersion(UnitCase):
         parts.put_link(self.root, "/fs/rwdata/.Version/b.inf", "/nowhere")
         self.file(b"Type=Application\nVersion Number=1.2.3\n", "c.inf")
         self.check(b"1.2.3", b"010203")
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The model against tuning files worked out by hand."""
 
@@ -6,9 +5,9 @@ from __future__ import annotations
 
 import unittest
 
-import parts
-from test_model import UnitCase
-from tuning import tuning_text
+from model import parts
+from model.test_model import UnitCase
+from model.tuning import tuning_text
 
 ZERO_BLOCK = b"""\
 ; Genereated config from DPS (blockId 2)
@@ -182,7 +181,3 @@ class TuningFiles(UnitCase):
         parts.put_image(self.root, {134: 0xFFFE})
         parts.put(self.root, f"/tmp/{SPEECHREC}", b"old")
         self.assertEqual(self.output("-a", SPEECHREC), b"old")
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """A unit's files below a folder that stands for "/", with what was written kept aside."""
 

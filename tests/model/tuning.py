@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The two tuning files, and the audio profile that asks for them."""
 
@@ -6,10 +5,9 @@ from __future__ import annotations
 
 import struct
 
-import configuration
-import records
-from streams import OutputStream
-from system import System
+from model import configuration, records
+from model.streams import OutputStream
+from model.system import System
 
 GENERATED_PROFILE = 0xFFFF
 BLOCK_SIZE = 188

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The application's software version, from the version description files."""
 
@@ -6,8 +5,8 @@ from __future__ import annotations
 
 import re
 
-from streams import InputStream
-from system import System
+from model.streams import InputStream
+from model.system import System
 
 FOLDER = "/fs/rwdata/.Version/"
 

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The accessory files: a generated head and a template, or a stock file.
 
@@ -11,11 +10,10 @@ from __future__ import annotations
 from collections.abc import Sequence
 from dataclasses import dataclass
 
-import identity
-import version
-from streams import InputStream, OutputStream, install_stock
-from system import System
-from tuning import audio_profile
+from model import identity, version
+from model.streams import InputStream, OutputStream, install_stock
+from model.system import System
+from model.tuning import audio_profile
 
 PRODUCT = "/fs/mp/etc/"
 AIRPLAY = "/tmp/airplay.conf"

@@ -181,12 +181,10 @@ class Job:
                                          "--units", str(DIFFERENTIAL_UNITS)])]
 
     def driver(self, name: str) -> list[str]:
-        """A driver of the model, on this job's tool."""
-        model = self.base.tree / "tests/model"
-        return [sys.executable, str(model / f"{name}.py"), "--jobs", "1",
+        """A driver, on this job's tool."""
+        return [sys.executable, str(self.base.tree / "tests/drivers"), name, "--jobs", "1",
                 "--orvane", str(self.folder / "orvane"),
-                "--enter", str(self.base.build / "orvane-enter"),
-                "--names", str(model / "model_names.txt")]
+                "--enter", str(self.base.build / "orvane-enter")]
 
     def faults(self) -> tuple[str, list[str]]:
         """The stage in which each system call fails once."""

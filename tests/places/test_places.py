@@ -15,7 +15,7 @@ import unittest
 from pathlib import Path
 
 PROJECT = Path(__file__).resolve().parents[2]
-TAKEN = ("tests/model", "tests/documents", "completion", "man", "docs", "CHANGELOG.md",
+TAKEN = ("tests/model", "tests/drivers", "tests/documents", "completion", "man", "docs", "CHANGELOG.md",
          "CMakeLists.txt")
 PROGRAMS = ("ORVANE", "ORVANE_ENTER", "ORVANE_UNIT")
 
@@ -39,8 +39,7 @@ class PlacesTest(unittest.TestCase):
         for name in PROGRAMS:
             shutil.copy(os.environ[name], self.build)
         self.driver_arguments: list[str | Path] = [
-            "--orvane", self.build / "orvane", "--enter", self.build / "orvane-enter",
-            "--names", self.project / "tests/model/model_names.txt"]
+            "--orvane", self.build / "orvane", "--enter", self.build / "orvane-enter"]
 
     def check(self, *words: str | Path, before: list[str] | None = None) -> None:
         done = subprocess.run([*(before or []), sys.executable, *words], text=True, check=False,
@@ -49,12 +48,12 @@ class PlacesTest(unittest.TestCase):
         self.assertEqual(done.returncode, 0, done.stdout)
 
     def check_driver(self, name: str, *more: str | Path, before: list[str] | None = None) -> None:
-        self.check(self.project / f"tests/model/{name}.py", *self.driver_arguments, *more,
+        self.check(self.project / "tests/drivers", name, *self.driver_arguments, *more,
                    before=before)
 
     def test_a_path_with_a_blank_is_one_path_to_the_drivers(self) -> None:
         self.check_driver("differential", "--units", "4")
-        self.check_driver("unit_tool", "--units", "4", "--unit-tool", self.build / "orvane-unit")
+        self.check_driver("explain", "--units", "4", "--unit-tool", self.build / "orvane-unit")
 
     def test_and_to_the_documents(self) -> None:
         self.check("-m", "unittest", "discover", "--start-directory",

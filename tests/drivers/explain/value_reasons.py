@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Why each value of an output is what it is, found in the unit's own files.
 
@@ -10,13 +9,9 @@ from __future__ import annotations
 from collections.abc import Sequence
 from dataclasses import dataclass
 
-import configuration
-import identity
-import records
-import tuning
-import version
-from system import DISK, System
-from tree import FOLDER_PLACE, FREE
+from model import configuration, identity, records, tuning, version
+from model.system import DISK, System
+from model.tree import FOLDER_PLACE, FREE
 
 Codes = tuple[str, ...]
 

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Holds orvane-unit's explain, describe and new against random units and runs of orvane in them.
 
@@ -20,23 +19,20 @@ import multiprocessing
 import os
 import random
 import subprocess
-import sys
 import tempfile
 from collections import Counter
 from collections.abc import Sequence
 from dataclasses import dataclass, field
 from pathlib import Path
 
-import explanation
-import reasons
-import runner
-import same_tree
-import snapshot
-from differential import generator
-from identity import load_names
-from model import parse_options
-from tree import Tree
-from units import make_unit
+from drivers import runner
+from drivers.differential.differential import generator
+from drivers.explain import explanation, reasons, same_tree
+from drivers.units import make_unit
+from model import snapshot
+from model.identity import load_names
+from model.prediction import parse_options
+from model.tree import Tree
 
 MARKER = ".orvane-unit"
 MARKER_TEXT = b"made by orvane-unit, layout 1\n"
@@ -171,12 +167,12 @@ def keep_unit(keep: Path, seed: str, index: int) -> Path:
 
 def print_difference(report: Report, options: argparse.Namespace) -> None:
     keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane kept-"))
-    print(f"unit_tool: unit {report.index} of seed {options.seed}, "
+    print(f"explain: unit {report.index} of seed {options.seed}, "
           f"{' '.join(flags(report.letters))}")
     for line in report.lines:
         print(f"  {line}")
     print(f"  kept, and not run: {keep_unit(keep, options.seed, report.index)}")
-    again = runner.again(options, "--unit-tool", options.unit_tool, "--names", options.names,
+    again = runner.again("explain", options, "--unit-tool", options.unit_tool,
                          "--seed", options.seed, "--only", report.index, "--keep", "DIR")
     print(f"  again: {again}")
 
@@ -188,27 +184,25 @@ def print_coverage(reached: Counter[str]) -> list[str]:
     return [code for code in reasons.CODES if reached[code] == 0]
 
 
-def parse_arguments() -> argparse.Namespace:
-    parser = argparse.ArgumentParser(description=__doc__)
+def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
+    parser = argparse.ArgumentParser("explain", description=__doc__)
     runner.add_arguments(parser)
     parser.add_argument("--unit-tool", required=True, help="orvane-unit")
-    parser.add_argument("--names", type=Path, default=Path(__file__).with_name("model_names.txt"),
-                        help="47 model display names")
     parser.add_argument("--units", type=int, default=1000)
     parser.add_argument("--seed", default="1", help='"random" draws one')
     parser.add_argument("--only", type=int, help="the number of one single unit")
     parser.add_argument("--keep", type=Path, help="where a unit that differs is kept")
     parser.add_argument("--jobs", type=int, default=2)
-    options = parser.parse_args()
+    options = parser.parse_args(arguments)
     if options.seed == "random":
         options.seed = str(random.SystemRandom().randrange(10**9))
-        print(f"unit_tool: seed {options.seed}")
+        print(f"explain: seed {options.seed}")
     return options
 
 
-def main() -> int:
-    options = parse_arguments()
-    names = tuple(load_names(options.names))
+def main(arguments: Sequence[str]) -> int:
+    options = parse_arguments(arguments)
+    names = tuple(load_names())
     enter = runner.launcher(options)
     indices = range(options.units) if options.only is None else [options.only]
     tasks = [Task(index, options.seed, options.orvane, enter, options.unit_tool, names)
@@ -218,24 +212,20 @@ def main() -> int:
     with multiprocessing.Pool(options.jobs) as pool:
         for report in pool.imap(check, tasks, CHUNK):
             if report.broken:
-                print(f"unit_tool: unit {report.index} was not run: {report.lines[0]}")
+                print(f"explain: unit {report.index} was not run: {report.lines[0]}")
                 return 2
             if report.lines:
                 print_difference(report, options)
                 differing += 1
                 if differing == MOST_DIFFERENCES:
-                    print("unit_tool: the other units were left alone")
+                    print("explain: the other units were left alone")
                     return 1
             reached += report.reached
     missing = print_coverage(reached) if options.only is None else []
-    print(f"unit_tool: {len(tasks)} units, {differing} with a difference (seed {options.seed})")
+    print(f"explain: {len(tasks)} units, {differing} with a difference (seed {options.seed})")
     if options.only is not None and options.keep is not None and not differing:
         print(f"  kept, and not run: {keep_unit(options.keep, options.seed, options.only)}")
     if missing and len(tasks) >= ENOUGH_UNITS:
-        print("\n".join(f"unit_tool: never {code}" for code in missing))
+        print("\n".join(f"explain: never {code}" for code in missing))
         return 1
     return 1 if differing else 0
-
-
-if __name__ == "__main__":
-    sys.exit(main())

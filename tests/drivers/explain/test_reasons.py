@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The reason codes of units whose faults were laid by hand."""
 
@@ -6,12 +5,12 @@ from __future__ import annotations
 
 import unittest
 
-import parts
-from configuration import IMAGE
-from reasons import CODES, Stage, is_intended, stages
-from test_model import NAMES, STATIC, STOCK, UnitCase
-from tuning import SPEECHREC, TELEPHONY
-from value_reasons import Codes, version_digits_reasons
+from drivers.explain.reasons import CODES, Stage, is_intended, stages
+from drivers.explain.value_reasons import Codes, version_digits_reasons
+from model import parts
+from model.configuration import IMAGE
+from model.test_model import NAMES, STATIC, STOCK, UnitCase
+from model.tuning import SPEECHREC, TELEPHONY
 
 AIRPLAY, DEVICE, IAP2, IAP1 = parts.OUTPUTS[:4]
 VERSIONS = "/fs/rwdata/.Version/"
@@ -182,7 +181,3 @@ class Intended(UnitCase):
         self.assertFalse(is_intended(("from-image", "word-unknown")))
         self.assertEqual(sum(CODES.values()), 9)
         self.assertEqual(len(CODES), 33)
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Lets each system call of orvane on its own files fail once, in every scenario.
 
@@ -17,20 +16,19 @@ import multiprocessing
 import os
 import shutil
 import subprocess
-import sys
 import tempfile
 from collections import Counter
-from collections.abc import Iterator
+from collections.abc import Iterator, Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
-import runner
-import snapshot
-from identity import load_names
-from model import predict
-from scenarios import SCENARIOS, Scenario
-from system import Fault
-from calls import Call, own_calls
+from drivers import runner
+from drivers.faults.calls import Call, own_calls
+from drivers.faults.scenarios import SCENARIOS, Scenario
+from model import snapshot
+from model.identity import load_names
+from model.prediction import predict
+from model.system import Fault
 
 ERRORS = {
     "open": ("ENOENT", "EACCES", "EMFILE", "EINTR"),
@@ -149,14 +147,13 @@ def print_table(injected: Counter[tuple[int, str]], agreed: Counter[tuple[int, s
         print(f"{scenario.name:24}" + "".join(f"{cell:>12}" for cell in cells))
 
 
-def parse_arguments() -> argparse.Namespace:
-    parser = argparse.ArgumentParser(description=__doc__)
+def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
+    parser = argparse.ArgumentParser("faults", description=__doc__)
     runner.add_arguments(parser)
-    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     parser.add_argument("--short-transfer", help="short_transfer, built anew when not given")
     parser.add_argument("--jobs", type=int, default=2)
     parser.add_argument("--every", type=int, default=1, help="only each N-th fault, such as 5")
-    return parser.parse_args()
+    return parser.parse_args(arguments)
 
 
 def kinds(injections: list[Injection]) -> set[tuple[str, str, str]]:
@@ -188,8 +185,8 @@ def run_all(tools: Tools, jobs: int, every: int) -> int:
     return 0 if injected.total() == agreed.total() > 0 else 1
 
 
-def main() -> int:
-    options = parse_arguments()
+def main(arguments: Sequence[str]) -> int:
+    options = parse_arguments(arguments)
     if shutil.which("strace") is None:
         print("faults: strace is not installed")
         return 2
@@ -197,13 +194,9 @@ def main() -> int:
     with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         helper = options.short_transfer or build_short_transfer(folder)
         tools = Tools(options.orvane, runner.launcher(options), helper,
-                      tuple(load_names(options.names)))
+                      tuple(load_names()))
         try:
             return run_all(tools, options.jobs, options.every)
         except runner.BrokenRun as error:
             print(f"faults: the tool was not run: {error}")
             return 2
-
-
-if __name__ == "__main__":
-    sys.exit(main())

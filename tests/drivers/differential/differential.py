@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Runs orvane in random units and compares each with what the model predicts.
 
@@ -12,18 +11,17 @@ import argparse
 import multiprocessing
 import os
 import random
-import sys
 import tempfile
 from collections import Counter
+from collections.abc import Sequence
 from dataclasses import dataclass, field
 from pathlib import Path
 
-import parts
-import runner
-import snapshot
-from identity import load_names
-from model import predict
-from units import make_unit
+from drivers import runner
+from drivers.units import make_unit
+from model import parts, snapshot
+from model.identity import load_names
+from model.prediction import predict
 
 # From this many units on, an outcome that never came up is an error.
 ENOUGH_UNITS = 200
@@ -115,30 +113,29 @@ def print_difference(report: Report, options: argparse.Namespace) -> None:
     for line in report.lines:
         print(f"  {line}")
     print(f"  kept, and not run: {keep_unit(keep, options.seed, report.index)}")
-    again = runner.again(options, "--names", options.names, "--seed", options.seed,
+    again = runner.again("differential", options, "--seed", options.seed,
                          "--only", report.index, "--keep", "DIR")
     print(f"  again: {again}")
 
 
-def parse_arguments() -> argparse.Namespace:
-    parser = argparse.ArgumentParser(description=__doc__)
+def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
+    parser = argparse.ArgumentParser("differential", description=__doc__)
     runner.add_arguments(parser)
-    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
     parser.add_argument("--units", type=int, default=500)
     parser.add_argument("--seed", default="1", help='"random" draws one')
     parser.add_argument("--only", type=int, help="the number of one single unit")
     parser.add_argument("--keep", type=Path, help="where a unit that differs is kept")
     parser.add_argument("--jobs", type=int, default=2)
-    options = parser.parse_args()
+    options = parser.parse_args(arguments)
     if options.seed == "random":
         options.seed = str(random.SystemRandom().randrange(10**9))
         print(f"differential: seed {options.seed}")
     return options
 
 
-def main() -> int:
-    options = parse_arguments()
-    names = tuple(load_names(options.names))
+def main(arguments: Sequence[str]) -> int:
+    options = parse_arguments(arguments)
+    names = tuple(load_names())
     enter = runner.launcher(options)
     indices = range(options.units) if options.only is None else [options.only]
     tasks = [Task(index, options.seed, options.orvane, enter, names)
@@ -161,7 +158,3 @@ def main() -> int:
         print("\n".join(f"differential: {line}" for line in missing))
         return 1
     return 0
-
-
-if __name__ == "__main__":
-    sys.exit(main())

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The unit tool's driver: reason codes worked out by hand, and every difference shows."""
 
@@ -13,16 +12,14 @@ from collections.abc import Callable
 from pathlib import Path
 from typing import Any
 
-import explanation
-import parts
-import runner
-import same_tree
-import unit_tool
-from explanation import left_faults, own_faults, reason_faults
-from reasons import Stage
-from test_model import UnitCase
-from tree import Tree
-from value_reasons import Line
+from drivers import runner
+from drivers.explain import explain, explanation, same_tree
+from drivers.explain.explanation import left_faults, own_faults, reason_faults
+from drivers.explain.reasons import Stage
+from drivers.explain.value_reasons import Line
+from model import parts
+from model.test_model import UnitCase
+from model.tree import Tree
 
 ASKED = ["profile-not-generated"]
 PRODUCT = "/fs/mp/etc/airplay.conf"
@@ -197,36 +194,32 @@ class SameTree(unittest.TestCase):
 
 
 class Driver(UnitCase):
-    def task(self, script: str) -> unit_tool.Task:
+    def task(self, script: str) -> explain.Task:
         tool = self.root / "tool"
         tool.write_text(f"#!/bin/sh\n{script}\n", encoding="ascii")
         tool.chmod(0o700)
-        return unit_tool.Task(0, "1", "orvane", ("enter",), str(tool), ())
+        return explain.Task(0, "1", "orvane", ("enter",), str(tool), ())
 
     def test_explaining_that_goes_wrong(self) -> None:
         for script in ("exit 1", "exit 2", "echo '{}'; exit 1", "echo x >&2; exit 1"):
-            found, lines = unit_tool.explained(self.task(script), self.root, "a", ())
+            found, lines = explain.explained(self.task(script), self.root, "a", ())
             self.assertEqual((found, len(lines)), (None, 1))
 
     def test_describing_that_goes_wrong(self) -> None:
         with tempfile.TemporaryDirectory() as folder:
             for script in ("exit 2", "echo x >&2", "[ $1 = describe ]", "[ $1 = describe ] || "
                            "mkdir $2"):
-                lines = unit_tool.described(self.task(script), self.root, Path(folder))
+                lines = explain.described(self.task(script), self.root, Path(folder))
                 self.assertGreater(len(lines), 0)
 
     def test_a_tool_that_is_not_there(self) -> None:
         with self.assertRaises(runner.BrokenRun):
-            unit_tool.ask([str(self.root / "none")])
+            explain.ask([str(self.root / "none")])
 
     def test_letters(self) -> None:
         for index in range(50):
             with tempfile.TemporaryDirectory() as folder:
-                letters = unit_tool.make_marked_unit(Path(folder), "test", index)
+                letters = explain.make_marked_unit(Path(folder), "test", index)
                 self.assertRegex(letters, "^[ai]+$")
                 self.assertEqual((Path(folder) / ".orvane-unit").read_bytes(),
                                  b"made by orvane-unit, layout 1\n")
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Says what a run of orvane leaves behind, worked out apart from its program.
 
@@ -14,11 +13,10 @@ from collections.abc import Mapping, Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
-import snapshot
-import writers
-from snapshot import Entry
-from system import Fault, Library, System
-from tree import Tree
+from model import snapshot, writers
+from model.snapshot import Entry
+from model.system import Fault, Library, System
+from model.tree import Tree
 
 OPTION_LETTERS = b"ia"
 

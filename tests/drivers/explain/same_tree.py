@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Whether two folders hold the same: kinds, contents, targets of links; no modes, no times."""
 
@@ -11,8 +10,8 @@ from dataclasses import replace
 from hashlib import sha256
 from pathlib import Path
 
-import snapshot
-from snapshot import Entry
+from model import snapshot
+from model.snapshot import Entry
 
 PAGE = 4096
 

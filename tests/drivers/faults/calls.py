@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Reads a trace of one run: which calls the tool makes on its own files."""
 

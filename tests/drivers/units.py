@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Random units: half of them ordinary, the others with something odd in most places."""
 
@@ -7,11 +6,9 @@ from __future__ import annotations
 import random
 from pathlib import Path
 
-import configuration
-import odd_text
-import parts
-import records
-from tree import Tree
+from drivers import odd_text
+from model import configuration, parts, records
+from model.tree import Tree
 
 IMAGE_SIZES = (0, 1, 21, 22, 35, 36, 100, 133, 134, 135, 138, 139, 140, 178, 179, 180, 4096, 5000)
 

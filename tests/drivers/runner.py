@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Runs the tool inside a unit and holds what it left behind against a prediction."""
 
@@ -13,9 +12,9 @@ from collections.abc import Mapping, Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
-import snapshot
-from model import Prediction
-from snapshot import Entry
+from model import snapshot
+from model.prediction import Prediction
+from model.snapshot import Entry
 
 # The launcher's status when it couldn't get as far as running the tool, which
 # itself has no status but 0.
@@ -42,11 +41,11 @@ def launcher(options: argparse.Namespace) -> tuple[str, ...]:
     return (options.emulator, options.enter) if options.emulator else (options.enter,)
 
 
-def again(options: argparse.Namespace, *more: object) -> str:
-    """This driver's command line with other words behind those of add_arguments, for a shell."""
+def again(driver: str, options: argparse.Namespace, *more: object) -> str:
+    """A driver's command line with other words behind those of add_arguments, for a shell."""
     emulator = ["--emulator", options.emulator] if options.emulator else []
-    return shlex.join([sys.argv[0], "--orvane", options.orvane, "--enter", options.enter, *emulator,
-                       *map(str, more)])
+    return shlex.join(["python3", sys.argv[0], driver, "--orvane", options.orvane,
+                       "--enter", options.enter, *emulator, *map(str, more)])
 
 
 @dataclass(frozen=True)

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Random version texts, description files and command lines, ordinary and odd."""
 

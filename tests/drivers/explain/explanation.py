@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """What orvane-unit says of a run, and what of it is wrong."""
 
@@ -9,10 +8,10 @@ from collections.abc import Sequence
 from dataclasses import dataclass
 from typing import Any
 
-from reasons import CODES, Stage, is_intended
-from snapshot import bytes_difference
-from tree import FILE, FOLDER_PLACE, Tree
-from value_reasons import Codes, Line
+from drivers.explain.reasons import CODES, Stage, is_intended
+from drivers.explain.value_reasons import Codes, Line
+from model.snapshot import bytes_difference
+from model.tree import FILE, FOLDER_PLACE, Tree
 
 FORMAT = 1
 FIXED = ("fixed-text",)

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The runs in which every system call is made to fail once."""
 
@@ -8,7 +7,7 @@ from collections.abc import Callable
 from dataclasses import dataclass
 from pathlib import Path
 
-import parts
+from model import parts
 
 
 @dataclass(frozen=True)

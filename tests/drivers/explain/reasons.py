@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """What orvane-unit must say of a run: how each output comes about, and from what.
 
@@ -12,13 +11,11 @@ from collections.abc import Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
-import parts
-import tuning
-import writers
-from streams import InputStream, OutputStream
-from system import Library, System
-from tree import Tree
-from value_reasons import Codes, Line, Values, tuning_lines, values
+from drivers.explain.value_reasons import Codes, Line, Values, tuning_lines, values
+from model import parts, tuning, writers
+from model.streams import InputStream, OutputStream
+from model.system import Library, System
+from model.tree import Tree
 
 # Every code, and whether it is in order: that no fallback and no default stands in.
 CODES = {

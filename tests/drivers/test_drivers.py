@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """What the drivers stand on: units come again from their seed, differences show."""
 
@@ -10,16 +9,15 @@ import unittest
 from dataclasses import replace
 from pathlib import Path
 
-import parts
-import runner
-import snapshot
-from identity import load_names
-from model import predict
-from runner import Run
-from test_model import NAMES, UnitCase
-from calls import own_calls
-from tree import Tree
-from units import make_unit
+from drivers import runner
+from drivers.faults.calls import own_calls
+from drivers.runner import Run
+from drivers.units import make_unit
+from model import parts, snapshot
+from model.identity import load_names
+from model.prediction import predict
+from model.test_model import NAMES, UnitCase
+from model.tree import Tree
 
 TRACE = """\
 execve("./enter", ["./enter"..., "unit"], 0x7fff /* 37 vars */) = 0
@@ -150,7 +148,3 @@ class Trace(unittest.TestCase):
         found = [(call.offset, call.moved, call.pieces)
                  for call in own_calls(TRACE.splitlines()) if call.operation == "write"]
         self.assertEqual(found, [(0, 120, ()), (120, 8211, (20, 8191)), (0, 5, ())])
-
-
-if __name__ == "__main__":
-    unittest.main()

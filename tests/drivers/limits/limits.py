@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Runs orvane with less and less memory and fewer and fewer descriptors.
 
@@ -12,15 +11,15 @@ from __future__ import annotations
 
 import argparse
 import shutil
-import sys
 import tempfile
+from collections.abc import Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
-import parts
-import runner
-from identity import load_names
-from model import predict
+from drivers import runner
+from model import parts
+from model.identity import load_names
+from model.prediction import predict
 
 OUTPUTS = ("airplay.conf", "iap2_device.cfg", "iap2.cfg", "iap1.cfg",
            "telephony_FFFF.txt", "speechrec_FFFF.txt")
@@ -155,12 +154,11 @@ def check_long_line(tools: Tools) -> bool:
     return good
 
 
-def main() -> int:
-    parser = argparse.ArgumentParser(description=__doc__)
+def main(arguments: Sequence[str]) -> int:
+    parser = argparse.ArgumentParser("limits", description=__doc__)
     runner.add_arguments(parser)
-    parser.add_argument("--names", required=True, type=Path, help="47 model display names")
-    options = parser.parse_args()
-    tools = Tools(options.orvane, runner.launcher(options), tuple(load_names(options.names)))
+    options = parser.parse_args(arguments)
+    tools = Tools(options.orvane, runner.launcher(options), tuple(load_names()))
     texts = accepted(tools)
     try:
         least = least_memory(tools)
@@ -174,7 +172,3 @@ def main() -> int:
         print(f"limits: the tool was not run: {error}")
         return 2
     return 0 if all(results) else 1
-
-
-if __name__ == "__main__":
-    sys.exit(main())
