@@ -7,6 +7,7 @@
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
+#include "kit/description/value_key.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 
@@ -25,9 +26,9 @@ namespace {
 void readTable(const toml::table& table, DescriptionReading& reading) {
     for (const auto& [key, value] : table) {
         if (key == "folders") {
-            reading.unit.folders = readPaths(key, value, reading);
+            reading.unit.folders = readPaths(key, value, folderKey, reading);
         } else if (key == "absent") {
-            reading.unit.absent = readPaths(key, value, reading);
+            reading.unit.absent = readPaths(key, value, absentKey, reading);
         } else if (key == "image") {
             readImage(tableOf(key, value), reading);
         } else if (key == "disk") {
@@ -42,9 +43,9 @@ void readTable(const toml::table& table, DescriptionReading& reading) {
     }
 }
 
-void failIfAny(const std::optional<Misfit>& misfit, const DescriptionReading& reading) {
-    if (misfit) {
-        failAt(reading.places.at(misfit->part), misfit->what);
+void failIfAny(const std::optional<Conflict>& conflict, const DescriptionReading& reading) {
+    if (conflict) {
+        failAt(reading.places.at(conflict->key), conflict->what);
     }
 }
 
@@ -60,8 +61,8 @@ UnitDescription parseDescription(const std::string& text, const std::string& nam
     DescriptionReading reading;
     reading.folder = std::filesystem::path(name).parent_path();
     readTable(table, reading);
-    failIfAny(findPathMisfit(reading.unit), reading);
-    failIfAny(findSizeMisfit(reading.unit, layoutOf(reading.unit)), reading);
+    failIfAny(findPathConflict(reading.unit), reading);
+    failIfAny(findSizeConflict(reading.unit, layoutOf(reading.unit)), reading);
     return std::move(reading.unit);
 }
 

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/description/conflicts.h"
 #include "kit/description/description_reading.h"
 #include "kit/description/description_values.h"
 #include "kit/description/toml_library.h"
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
+#include "kit/description/value_key.h"
 #include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
@@ -73,7 +73,7 @@ SparseFile sparseContent(const toml::table& table, const std::string& path,
                                         " must be a table of hex by offset, not " + shown(*bytes));
         }
         readBytes(*bytes->as_table(), file.bytes, reading,
-                  [&path](std::uint64_t offset) { return fileBytesPart(path, offset); });
+                  [&path](std::uint64_t offset) { return fileBytesKey(path, offset); });
     }
     return file;
 }
@@ -120,7 +120,7 @@ void readFiles(const toml::table& table, DescriptionReading& reading) {
             failAt(value.source(), "the content of " + path + " must be a text, or a table of " +
                                        CONTENT_FORMS + ", not " + shown(value));
         }
-        reading.places[path] = key.source();
+        reading.places[fileKey(path)] = key.source();
     }
 }
 
@@ -135,12 +135,12 @@ void readLinks(const toml::table& table, DescriptionReading& reading) {
             return bytes;
         });
         putOnce(reading.unit.links, key, path, target, path);
-        reading.places[path] = key.source();
+        reading.places[linkKey(path)] = key.source();
     }
 }
 
 std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
-                                   DescriptionReading& reading) {
+                                   ValueKey (*keyOf)(std::string), DescriptionReading& reading) {
     const toml::array* array = node.as_array();
     if (array == nullptr) {
         failAt(node.source(), inQuotes(key.str()) + " must be a list of paths, not " + shown(node));
@@ -149,7 +149,7 @@ std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
     for (const toml::node& element : *array) {
         const std::string& text = textOf(element, "a path in " + inQuotes(key.str()));
         paths.push_back(unitPathOf(element.source(), text));
-        reading.places[paths.back()] = element.source();
+        reading.places[keyOf(paths.back())] = element.source();
     }
     return paths;
 }

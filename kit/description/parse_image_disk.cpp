@@ -1,13 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
-#include "kit/description/conflicts.h"
 #include "kit/description/description_reading.h"
 #include "kit/description/description_values.h"
 #include "kit/description/toml_library.h"
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
+#include "kit/description/value_key.h"
+#include "kit/description/value_places.h"
 #include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
 #include "kit/tuning/tuning_description.h"
@@ -31,11 +32,12 @@ void readParams(const toml::table& table, DescriptionReading& reading) {
     for (const auto& [key, value] : table) {
         const auto number =
             static_cast<std::uint16_t>(numberOf(key, {1, PARAM_COUNT}, "a parameter number"));
-        const std::string what = "parameter " + std::to_string(number);
+        const ValueKey param = paramKey(number);
+        const std::string what = valueName(param);
         const std::int64_t content = numberOf(value, what);
         at(value.source(), [&] { checkParam(number, content); });
         putOnce(reading.unit.image.params, key, number, static_cast<std::uint16_t>(content), what);
-        reading.places[paramPart(number)] = key.source();
+        reading.places[param] = key.source();
     }
 }
 
@@ -43,12 +45,12 @@ void readSlots(const toml::table& table, DescriptionReading& reading) {
     for (const auto& [key, value] : table) {
         const auto slot =
             static_cast<std::uint32_t>(numberOf(key, {0, RECORD_SLOT_COUNT - 1}, "a slot number"));
-        const std::string what = "slot " + std::to_string(slot);
+        const std::string what = valueName(slotKey(slot));
         const std::string& text = textOf(value, what);
         const Bytes bytes = at(value.source(), what, [&text] { return textOrHexBytes(text); });
         at(value.source(), [&] { checkSlot(slot, bytes); });
         putOnce(reading.unit.disk.slots, key, slot, bytes, what);
-        reading.places[slotPart(slot)] = key.source();
+        reading.places[slotKey(slot)] = key.source();
     }
 }
 
@@ -57,7 +59,7 @@ void readAux(const toml::key& key, const toml::node& value, DescriptionReading& 
     const Bytes bytes = at(value.source(), "aux", [&text] { return textOrHexBytes(text); });
     at(value.source(), [&bytes] { checkAux(bytes); });
     reading.unit.disk.aux = bytes;
-    reading.places[AUX_PART] = key.source();
+    reading.places[auxKey()] = key.source();
 }
 
 TuningValue tuningValueOf(const toml::node& node, const std::string& name) {
@@ -88,7 +90,7 @@ TuningDescription readTuningBlock(std::uint64_t id, const toml::table& table) {
             block.raw = hexOf(value, "raw");
             at(value.source(), "raw", [&] { encodeTuningBlock({block.raw, {}}); });
         } else if (!isTuningField(name)) {
-            failUnknown(key, "tuning block " + std::to_string(id),
+            failUnknown(key, valueName(tuningBlockKey(id)),
                         "raw and the 44 keys of a tuning file, such as qwaAECSwitch");
         } else {
             const TuningValue fieldValue = tuningValueOf(value, name);
@@ -102,9 +104,10 @@ TuningDescription readTuningBlock(std::uint64_t id, const toml::table& table) {
 void readTuning(const toml::table& table, DescriptionReading& reading) {
     for (const auto& [key, value] : table) {
         const std::uint64_t id = numberOf(key, {0, DPS_BLOCK_COUNT - 1}, "a tuning block");
+        const ValueKey block = tuningBlockKey(id);
         putOnce(reading.unit.disk.tuning, key, id, readTuningBlock(id, tableOf(key, value)),
-                "tuning block " + std::to_string(id));
-        reading.places[tuningPart(id)] = key.source();
+                valueName(block));
+        reading.places[block] = key.source();
     }
 }
 
@@ -119,7 +122,7 @@ void readImage(const toml::table& table, DescriptionReading& reading) {
         } else if (key == "params") {
             readParams(tableOf(key, value), reading);
         } else if (key == "bytes") {
-            readBytes(tableOf(key, value), image.bytes, reading, imageBytesPart);
+            readBytes(tableOf(key, value), image.bytes, reading, imageBytesKey);
         } else {
             failUnknown(key, "[image]", "size, params, bytes");
         }
@@ -139,7 +142,7 @@ void readDisk(const toml::table& table, DescriptionReading& reading) {
         } else if (key == "tuning") {
             readTuning(tableOf(key, value), reading);
         } else if (key == "bytes") {
-            readBytes(tableOf(key, value), disk.bytes, reading, diskBytesPart);
+            readBytes(tableOf(key, value), disk.bytes, reading, diskBytesKey);
         } else {
             failUnknown(key, "[disk]", "size, slots, aux, tuning, bytes");
         }

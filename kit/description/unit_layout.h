@@ -19,8 +19,8 @@ enum class EntryKind { folder, file, sparseFile, link, image, disk };
 using Layout = std::map<std::string, EntryKind>;
 
 /// The layout that `unit` asks for, the folders above each entry included. Image, disk and standard
-/// folders give way to what `unit` names at their path or, but for a folder, above it. Takes it
-/// that findPathMisfit finds nothing.
+/// folders give way to what `unit` names at their path or, but for a folder, above it. Requires
+/// that findPathConflict finds nothing.
 Layout layoutOf(const UnitDescription& unit);
 
 /// The path without its last name: "/tmp" for "/tmp/x", empty for "/tmp".

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
-#include "kit/description/conflicts.h"
 #include "kit/description/unit_description.h"
+#include "kit/description/value_places.h"
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"

@@ -9,19 +9,23 @@
 
 namespace orvane::kit {
 
-/// Does every assignment, "KEY=VALUE", to the unit at `root`, which must be one that the kit made:
+/// Carries out every assignment, "KEY=VALUE", on the unit at `root`, which must be one that the kit
+/// made. The keys and their values:
 ///
-///     param.N         a parameter of the image: a number
-///     serial, slot.N  a record slot of the disk, padded with zeros: a text, or hex after "hex:"
-///     aux             the auxiliary area, padded with zeros: the same
-///     tuning.B.FIELD  a field of tuning block B: a word, a number, or numbers with commas or
-///     blanks tuning.B        all fields of the block: a tuning file of the host, as the tool
-///     writes it
+///  - `param.N`: a parameter of the image; a number
+///  - `serial`, `slot.N`: a record slot of the disk; a text, or hex after "hex:", which is padded
+///    with zeros
+///  - `aux`: the auxiliary area; the same
+///  - `tuning.B.FIELD`: a field of tuning block B; a word, a number, or numbers with commas or
+///    blanks between them
+///  - `tuning.B`: all fields of the block; the name of a tuning file of the host, as the tool
+///    writes it
 ///
-/// Numbers are decimal or, with 0x, hexadecimal. What no field of a block reads stays as it is. All
-/// assignments are checked before the first one is done. Throws KitError, the assignment in front,
-/// for a key or value that is wrong, a value that two assignments set, and an image or disk that is
-/// missing, not a regular file or too short; for a tuning file the lines of parseTuningText.
+/// Numbers are decimal or, after "0x", hexadecimal. The bits of a block that no field reads stay as
+/// they are. All assignments are checked before the first one is carried out. Throws KitError, the
+/// assignment in front, for a key or value that is wrong, a value that two assignments set, and an
+/// image or disk that is missing, not a regular file or too short; for a faulty tuning file with
+/// the lines of parseTuningText.
 void setValues(const std::filesystem::path& root, const std::vector<std::string>& assignments);
 
 } // namespace orvane::kit

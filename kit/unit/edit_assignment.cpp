@@ -1,19 +1,22 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/edit_assignment.h"
 
-#include "config/param_catalogue.h"
-#include "config/record_slots.h"
+#include "identity/vehicle_identity.h"
 #include "kit/description/description_values.h"
 #include "kit/description/unit_checks.h"
+#include "kit/description/value_places.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/tuning/tuning_text.h"
+#include "tuning/dps_block.h"
 
 #include <algorithm>
 #include <array>
 #include <charconv>
 #include <cstddef>
+#include <cstdint>
 #include <limits>
 #include <map>
 #include <optional>
@@ -25,8 +28,9 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr std::uint32_t SERIAL_SLOT = 9;
-constexpr std::uint32_t SLOT_OF_SLOTS = 15;                            ///< slots 1 to 9 once more
+using Kind = ValueKey::Kind;
+
+constexpr char SERIAL[] = "serial"; ///< another name for its slot
 constexpr std::uint64_t LONGEST_TUNING_FILE = std::uint64_t{1} << 20U; ///< bytes
 
 /// Takes `prefix` from the front of `text`, if it is there.
@@ -63,123 +67,114 @@ std::int64_t requireNumber(const std::string& what, std::string_view text) {
     return *number;
 }
 
-ParamEdit readParam(std::string_view name, std::string_view value) {
-    const auto number =
-        static_cast<std::uint16_t>(keyNumber(name, {1, PARAM_COUNT}, "a parameter number"));
-    const std::int64_t content = requireNumber("parameter " + std::to_string(number), value);
-    checkParam(number, content);
-    return {number, static_cast<std::uint16_t>(content)};
-}
-
-SlotEdit readSlot(std::uint32_t slot, std::string_view value) {
-    SlotEdit edit{slot, textOrHexBytes(value)};
-    checkSlot(slot, edit.bytes);
-    return edit;
-}
-
-AuxEdit readAux(std::string_view value) {
-    AuxEdit edit{textOrHexBytes(value)};
-    checkAux(edit.bytes);
-    return edit;
-}
-
-std::vector<std::int64_t> numbersIn(const std::string& key, std::string_view text) {
+std::vector<std::int64_t> numbersIn(const std::string& what, std::string_view text) {
     std::vector<std::int64_t> numbers;
     std::size_t begin = 0;
     while ((begin = text.find_first_not_of(", ", begin)) != std::string_view::npos) {
         const std::size_t end = std::min(text.find_first_of(", ", begin), text.size());
-        numbers.push_back(requireNumber(key, text.substr(begin, end - begin)));
+        numbers.push_back(requireNumber(what, text.substr(begin, end - begin)));
         begin = end;
     }
     return numbers;
 }
 
-FieldEdit readField(std::uint32_t blockId, const std::string& key, std::string_view value) {
-    const DpsField& field = tuningField(key);
-    FieldEdit edit{blockId, key, std::string(value)};
-    if (field.kind == DpsKind::list) {
-        edit.value = numbersIn(key, value);
-    } else if (const std::optional<std::int64_t> number = numberIn(value)) {
-        edit.value = *number;
-    }
-    DpsBlock scratch{};
-    encodeTuningField(scratch, key, edit.value);
-    return edit;
-}
-
-/// What is wrong with the file itself stands at its own places, without the assignment.
-struct FaultyFile {
-    KitError error;
+/// The bytes for the place of a key, or what is wrong with the file that the value names, at the
+/// places in it.
+struct ReadValue {
+    Bytes bytes;
+    std::string fileFaults;
 };
 
-BlockEdit readBlock(std::uint32_t blockId, const std::string& file) {
+/// Each of the readers throws KitError for a value that its key does not take.
+ReadValue readParam(const ValueKey& key, std::string_view text) {
+    const std::int64_t value = requireNumber(valueName(key), text);
+    checkParam(static_cast<std::uint16_t>(key.number), value);
+    Bytes bytes(valuePlace(key).mask.size(), '\0');
+    for (std::size_t i = 0; i < bytes.size(); ++i) {
+        bytes[i] = static_cast<char>(value >> (8 * i)); // low byte first
+    }
+    return {bytes, ""};
+}
+
+/// `bytes` with zeros behind them to the end of the key's place.
+ReadValue padded(const ValueKey& key, Bytes bytes) {
+    bytes.resize(valuePlace(key).mask.size());
+    return {std::move(bytes), ""};
+}
+
+ReadValue readSlot(const ValueKey& key, std::string_view text) {
+    const Bytes bytes = textOrHexBytes(text);
+    checkSlot(static_cast<std::uint32_t>(key.number), bytes);
+    return padded(key, bytes);
+}
+
+ReadValue readAux(const ValueKey& key, std::string_view text) {
+    const Bytes bytes = textOrHexBytes(text);
+    checkAux(bytes);
+    return padded(key, bytes);
+}
+
+ReadValue readField(const ValueKey& key, std::string_view text) {
+    const DpsField& field = tuningField(key.name);
+    TuningValue value = std::string(text);
+    if (field.kind == DpsKind::list) {
+        value = numbersIn(key.name, text);
+    } else if (const std::optional<std::int64_t> number = numberIn(text)) {
+        value = *number;
+    }
+    DpsBlock block{};
+    encodeTuningField(block, key.name, value);
+    const Bytes bytes(block.bytes.begin(), block.bytes.end());
+    return {bytes.substr(field.offset, valuePlace(key).mask.size()), ""};
+}
+
+ReadValue readBlock(const ValueKey& key, std::string_view fileName) {
+    const std::string file(fileName);
     const std::string text = readRegularFile(file, LONGEST_TUNING_FILE);
     try {
-        return {blockId, parseTuningText(text, file, static_cast<std::int32_t>(blockId))};
+        const DpsBlock block = parseTuningText(text, file, static_cast<std::int32_t>(key.number));
+        return {Bytes(block.bytes.begin(), block.bytes.end()), ""};
     } catch (const KitError& error) {
-        throw FaultyFile{error};
+        return {"", error.what()};
     }
 }
 
-decltype(Assignment::edit) readEdit(std::string_view key, std::string_view value) {
-    std::string_view name = key;
-    if (takePrefix(name, "param.")) {
-        return readParam(name, value);
-    }
-    if (takePrefix(name, "slot.")) {
-        return readSlot(static_cast<std::uint32_t>(
-                            keyNumber(name, {0, RECORD_SLOT_COUNT - 1}, "a slot number")),
-                        value);
-    }
-    if (takePrefix(name, "tuning.")) {
-        const std::size_t dot = name.find('.');
-        const auto blockId = static_cast<std::uint32_t>(
-            keyNumber(name.substr(0, dot), {0, DPS_BLOCK_COUNT - 1}, "a tuning block"));
-        if (dot == std::string_view::npos) {
-            return readBlock(blockId, std::string(value));
-        }
-        return readField(blockId, std::string(name.substr(dot + 1)), value);
-    }
-    if (key == "serial") {
-        return readSlot(SERIAL_SLOT, value);
-    }
-    if (key == "aux") {
-        return readAux(value);
-    }
-    throw KitError("unknown key " + inQuotes(key) +
-                   ": it takes param.N, serial, slot.N, aux, tuning.B.FIELD or tuning.B");
-}
-
-/// Names of everything that an edit sets, in words for an error.
-struct NamesOfSet {
-    std::vector<std::string> operator()(const ParamEdit& edit) const {
-        return {"parameter " + std::to_string(edit.number)};
-    }
-    std::vector<std::string> operator()(const SlotEdit& edit) const {
-        if (edit.slot != SLOT_OF_SLOTS) {
-            return {"slot " + std::to_string(edit.slot)};
-        }
-        std::vector<std::string> names;
-        for (std::uint32_t slot = 1; slot <= SERIAL_SLOT; ++slot) {
-            names.push_back("slot " + std::to_string(slot));
-        }
-        return names;
-    }
-    std::vector<std::string> operator()(const AuxEdit& /*edit*/) const {
-        return {"the auxiliary area"};
-    }
-    std::vector<std::string> operator()(const FieldEdit& edit) const {
-        return {edit.key + " of tuning block " + std::to_string(edit.blockId)};
-    }
-    std::vector<std::string> operator()(const BlockEdit& edit) const {
-        std::vector<std::string> names;
-        for (const DpsField& field : DPS_LAYOUT) {
-            names.push_back(field.key + std::string(" of tuning block ") +
-                            std::to_string(edit.blockId));
-        }
-        return names;
-    }
+/// A kind of value that can be set.
+struct SettableKind {
+    Kind kind;
+    ReadValue (*read)(const ValueKey& key, std::string_view text);
 };
+
+constexpr SettableKind SETTABLE_KINDS[] = {
+    {Kind::param, readParam},       {Kind::slot, readSlot},         {Kind::aux, readAux},
+    {Kind::tuningField, readField}, {Kind::tuningBlock, readBlock},
+};
+
+const SettableKind& settableKind(Kind kind, std::string_view key) {
+    const auto* const found =
+        std::find_if(std::begin(SETTABLE_KINDS), std::end(SETTABLE_KINDS),
+                     [kind](const SettableKind& settable) { return settable.kind == kind; });
+    if (found == std::end(SETTABLE_KINDS)) {
+        throw KitError("unknown key " + inQuotes(key) +
+                       ": it takes param.N, serial, slot.N, aux, tuning.B.FIELD or tuning.B");
+    }
+    return *found;
+}
+
+/// The values that are set with that of `key`: more than itself for what holds other values.
+std::vector<ValueKey> valuesIn(const ValueKey& key) {
+    std::vector<ValueKey> keys;
+    if (key.kind == Kind::slot) {
+        for (const std::uint32_t slot : slotsWithin(static_cast<std::uint32_t>(key.number))) {
+            keys.push_back(slotKey(slot));
+        }
+    } else if (key.kind == Kind::tuningBlock) {
+        for (const DpsField& field : DPS_LAYOUT) {
+            keys.push_back(tuningFieldKey(key.number, field.key));
+        }
+    }
+    return keys.empty() ? std::vector<ValueKey>{key} : keys;
+}
 
 } // namespace
 
@@ -188,23 +183,32 @@ Assignment readAssignment(const std::string& text) {
     if (equals == std::string::npos) {
         throw KitError(inQuotes(text) + " is no assignment: it takes KEY=VALUE");
     }
+    const std::string key = text.substr(0, equals);
+    const ParsedKey parsed =
+        key == SERIAL ? ParsedKey{slotKey(SERIAL_RECORD_SLOT), ""} : parseKey(key);
+    ReadValue value;
     try {
-        return {text, readEdit(std::string_view(text).substr(0, equals),
-                               std::string_view(text).substr(equals + 1))};
+        const SettableKind& kind = settableKind(parsed.key.kind, key);
+        if (!parsed.fault.empty()) {
+            throw KitError(parsed.fault);
+        }
+        value = kind.read(parsed.key, std::string_view(text).substr(equals + 1));
     } catch (const KitError& error) {
         throw KitError(text + ": " + error.what());
-    } catch (const FaultyFile& faulty) {
-        throw faulty.error;
     }
+    if (!value.fileFaults.empty()) {
+        throw KitError(value.fileFaults);
+    }
+    return {text, parsed.key, std::move(value.bytes)};
 }
 
 void requireDistinct(const std::vector<Assignment>& assignments) {
-    std::map<std::string, std::string> setBy;
+    std::map<ValueKey, std::string> setBy;
     for (const Assignment& assignment : assignments) {
-        for (const std::string& name : std::visit(NamesOfSet(), assignment.edit)) {
-            const auto [entry, isNew] = setBy.emplace(name, assignment.text);
+        for (const ValueKey& key : valuesIn(assignment.key)) {
+            const auto [entry, isNew] = setBy.emplace(key, assignment.text);
             if (!isNew) {
-                throw KitError(assignment.text + ": " + name + " is set by " +
+                throw KitError(assignment.text + ": " + valueName(key) + " is set by " +
                                inQuotes(entry->second) + " already");
             }
         }

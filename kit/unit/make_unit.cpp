@@ -6,6 +6,7 @@
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
+#include "kit/description/value_places.h"
 #include "kit/enter/root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
@@ -113,9 +114,9 @@ void makeEntry(const UnitDescription& unit, const std::string& path, EntryKind k
     }
 }
 
-void throwIfAny(const std::optional<Misfit>& misfit) {
-    if (misfit) {
-        throw KitError(misfit->what);
+void throwIfAny(const std::optional<Conflict>& conflict) {
+    if (conflict) {
+        throw KitError(conflict->what);
     }
 }
 
@@ -123,9 +124,9 @@ void throwIfAny(const std::optional<Misfit>& misfit) {
 
 void makeUnit(const UnitDescription& unit, const fs::path& root) {
     checkUnit(unit);
-    throwIfAny(findPathMisfit(unit));
+    throwIfAny(findPathConflict(unit));
     const Layout layout = layoutOf(unit);
-    throwIfAny(findSizeMisfit(unit, layout));
+    throwIfAny(findSizeConflict(unit, layout));
     makeFinishedFolder(root, [&](const fs::path& folder) {
         for (const auto& [path, kind] : layout) {
             makeEntry(unit, path, kind, folder);

@@ -122,7 +122,7 @@ inline kit::UnitDescription RandomUnit::unit() {
             next.files[place] = bytes(any(std::vector<std::size_t>{0, 1, 63, 64, 300, 4096, 9000}));
             break;
         }
-        if (!kit::findPathMisfit(next)) {
+        if (!kit::findPathConflict(next)) {
             unit = next;
         }
     }

@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/host/changed_file.h"
+
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <string>
+#include <utility>
+
+namespace orvane::kit {
+
+ChangedFile::ChangedFile(std::filesystem::path path)
+    : path_(std::move(path)), descriptor_(::open(path_.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC)) {
+    if (!descriptor_.isOpen()) {
+        throw systemError("cannot change " + path_.string());
+    }
+    struct stat state {};
+    if (::fstat(descriptor_.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
+        throw KitError(path_.string() + " is not a regular file");
+    }
+}
+
+std::uint64_t ChangedFile::size() const {
+    return sizeOf(descriptor_, path_);
+}
+
+Bytes ChangedFile::read(std::uint64_t offset, std::uint64_t length) const {
+    return readAt(descriptor_, path_, offset, length);
+}
+
+void ChangedFile::write(std::uint64_t offset, const Bytes& bytes) const {
+    writeAt(descriptor_, path_, offset, bytes);
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "kit/host/bytes.h"
+#include "kit/host/descriptor.h"
+
+#include <cstdint>
+#include <filesystem>
+
+namespace orvane::kit {
+
+/// A regular file that is open to be changed in its place, at the length that it has.
+class ChangedFile {
+public:
+    /// Opens `path`, links followed. Throws KitError where it is no regular file or can't be
+    /// opened.
+    explicit ChangedFile(std::filesystem::path path);
+
+    std::uint64_t size() const;
+    /// `length` bytes from `offset` on, which must lie in the file.
+    Bytes read(std::uint64_t offset, std::uint64_t length) const;
+    void write(std::uint64_t offset, const Bytes& bytes) const;
+
+private:
+    std::filesystem::path path_;
+    Descriptor descriptor_;
+};
+
+} // namespace orvane::kit
