@@ -2,9 +2,9 @@
 #include "orvane_unit/command_line.h"
 
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "orvane_unit/commands.h"
 #include "orvane_unit/report/decoded_unit_text.h"
-#include "orvane_unit/report/terminal.h"
 
 #include <CLI/CLI.hpp>
 
@@ -239,7 +239,7 @@ int chooseAndRun(int argc, const char* const* argv) {
 void complain(const std::string& what) {
     std::istringstream lines(what);
     for (std::string line; std::getline(lines, line);) {
-        std::cerr << "orvane-unit: " << printable(line) << '\n';
+        std::cerr << "orvane-unit: " << kit::printable(line) << '\n';
     }
 }
 

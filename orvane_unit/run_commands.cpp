@@ -3,14 +3,15 @@
 // The commands that run orvane itself.
 #include "kit/enter/root.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/check/case_check.h"
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/commands.h"
-#include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/json.h"
 #include "orvane_unit/report/terminal.h"
+#include "orvane_unit/report/unified_diff.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -59,8 +60,8 @@ void printChanges(const TmpTree& before, const TmpTree& after, bool isBrief) {
             continue;
         }
         if (isBrief) {
-            std::cout << (old ? "changed " : "made ") << "/tmp/" << printable(path) << ", "
-                      << counted(content->size(), "byte") << '\n';
+            std::cout << (old ? "changed " : "made ") << "/tmp/" << kit::printable(path) << ", "
+                      << kit::counted(content->size(), "byte") << '\n';
         } else {
             printUnifiedDiff(std::cout, "/tmp/" + path, old, content);
         }
@@ -74,7 +75,7 @@ void printCase(const CaseResult& result, std::size_t width) {
               << '\n';
     for (const std::vector<std::string>* lines : {&result.differences, &result.surprises}) {
         for (const std::string& line : *lines) {
-            std::cout << "    " << printable(line) << '\n';
+            std::cout << "    " << kit::printable(line) << '\n';
         }
     }
 }
@@ -87,7 +88,7 @@ void printCheck(const CheckReport& report, std::size_t failed) {
     for (const CaseResult& result : report.cases) {
         printCase(result, width);
     }
-    std::cout << counted(report.cases.size(), "unit") << ", " << failed << " not as expected"
+    std::cout << kit::counted(report.cases.size(), "unit") << ", " << failed << " not as expected"
               << (report.isUpdate ? "; expectations written anew" : "") << '\n';
     std::cout << "reasons reached: " << REASON_COUNT - report.unreached.size() << " of "
               << REASON_COUNT;

@@ -2,6 +2,7 @@
 #include "kit/description/description_values.h"
 
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 
 #include <charconv>
 #include <cstddef>
@@ -15,10 +16,6 @@ namespace {
 constexpr std::size_t SHOWN = 40;
 
 } // namespace
-
-std::string inQuotes(std::string_view text) {
-    return "\"" + std::string(text) + "\"";
-}
 
 Bytes hexBytes(std::string_view text) {
     std::string digits;

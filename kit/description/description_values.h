@@ -31,7 +31,4 @@ struct KeyRange {
 /// error.
 std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what);
 
-/// `text` in quotes, for an error.
-std::string inQuotes(std::string_view text);
-
 } // namespace orvane::kit

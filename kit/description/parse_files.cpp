@@ -9,6 +9,7 @@
 #include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 
 #include <algorithm>
 #include <cstddef>

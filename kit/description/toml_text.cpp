@@ -2,7 +2,7 @@
 #include "kit/description/toml_text.h"
 
 #include "kit/description/description_values.h"
-#include "kit/host/utf8.h"
+#include "kit/host/text.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -36,26 +36,14 @@ std::string escaped(char c) {
     return std::string("\\u00") + DIGITS[byte >> 4U] + DIGITS[byte & 0xFU];
 }
 
-/// On one line, however long: a key can't have more.
-std::string hexPairs(std::string_view bytes) {
-    std::string line;
-    for (const char c : bytes) {
-        const auto byte = static_cast<unsigned char>(c);
-        line += line.empty() ? "" : " ";
-        line += DIGITS[byte >> 4U];
-        line += DIGITS[byte & 0xFU];
-    }
-    return line;
-}
-
-/// What stands between the quotes, whichever they are.
-std::string hexText(std::string_view bytes) {
+/// `bytes` in hex, on one line or several.
+std::string hexLines(std::string_view bytes) {
     if (bytes.size() <= HEX_LINE) {
-        return hexPairs(bytes);
+        return hexText(bytes);
     }
     std::string text = "\n";
     for (std::size_t begin = 0; begin < bytes.size(); begin += HEX_LINE) {
-        text += hexPairs(bytes.substr(begin, HEX_LINE)) + '\n';
+        text += hexText(bytes.substr(begin, HEX_LINE)) + '\n';
     }
     return text;
 }
@@ -104,19 +92,19 @@ std::string tomlLines(std::string_view text) {
 }
 
 std::string tomlHex(std::string_view bytes) {
-    return betweenQuotes(hexText(bytes));
+    return betweenQuotes(hexLines(bytes));
 }
 
 std::string tomlTextOrHex(std::string_view bytes) {
     return isReadable(bytes) && !beginsWithHexPrefix(bytes)
                ? tomlText(bytes)
-               : betweenQuotes(std::string(HEX_PREFIX) + hexText(bytes));
+               : betweenQuotes(std::string(HEX_PREFIX) + hexLines(bytes));
 }
 
 std::string tomlPath(std::string_view path) {
     return isUtf8(path) && !beginsWithHexPrefix(path)
                ? tomlText(path)
-               : tomlText(std::string(HEX_PREFIX) + hexPairs(path));
+               : tomlText(std::string(HEX_PREFIX) + hexText(path));
 }
 
 } // namespace orvane::kit

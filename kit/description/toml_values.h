@@ -7,6 +7,7 @@
 #include "kit/description/description_values.h"
 #include "kit/description/toml_library.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 
 #include <algorithm>
 #include <cstdint>

@@ -1,26 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/tree_entries.h"
 
-#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
-#include "kit/host/sparse_content.h"
 
 #include <algorithm>
-#include <cstddef>
-#include <map>
 #include <system_error>
-#include <utility>
 
 namespace orvane::kit {
 
 namespace {
 
 namespace fs = std::filesystem;
-
-/// A shorter file is not worth a table of its own. In bytes.
-constexpr std::uint64_t LEAST_SPARSE = 4096;
-/// What an entry of such a table takes besides its bytes, in bytes.
-constexpr std::uint64_t RUN_COST = 32;
 
 /// Throws what the system says of `path`.
 void check(const std::error_code& error, const fs::path& path) {
@@ -56,25 +46,6 @@ std::string targetOf(const fs::path& link) {
     std::string target = fs::read_symlink(link, error).string();
     check(error, link);
     return target;
-}
-
-void describeFile(const Descriptor& descriptor, const fs::path& file, const std::string& path,
-                  UnitDescription& unit) {
-    const std::uint64_t size = sizeOf(descriptor, file);
-    Runs runs = nonZeroRuns(descriptor, file, size);
-    std::uint64_t cost = 0;
-    for (const auto& [offset, bytes] : runs) {
-        cost += RUN_COST + bytes.size();
-    }
-    if (size >= LEAST_SPARSE && cost <= size / 2) {
-        unit.sparseFiles[path] = {size, std::move(runs)};
-        return;
-    }
-    Bytes content(static_cast<std::size_t>(size), '\0');
-    for (const auto& [offset, bytes] : runs) {
-        content.replace(static_cast<std::size_t>(offset), bytes.size(), bytes);
-    }
-    unit.files[path] = std::move(content);
 }
 
 } // namespace orvane::kit

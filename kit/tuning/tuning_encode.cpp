@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/tuning/tuning_encode.h"
 
+#include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/sparse_content.h"
 
 #include <algorithm>
 #include <cstddef>
 #include <map>
+#include <utility>
 #include <variant>
 #include <vector>
 
@@ -71,6 +74,11 @@ void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std:
         block.bytes[at] = static_cast<std::uint8_t>(bits);
         break;
     }
+}
+
+/// The word of `field` for `code`; empty where it has none, and for a field without words.
+std::string tuningWord(const DpsField& field, std::int64_t code) {
+    return hasWords(field) ? qwaWord(wordsOf(field), static_cast<std::int32_t>(code)) : "";
 }
 
 } // namespace
@@ -140,10 +148,6 @@ const std::array<QwaWord, 3>& wordsOf(const DpsField& field) {
     return field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords;
 }
 
-std::string tuningWord(const DpsField& field, std::int64_t code) {
-    return hasWords(field) ? qwaWord(wordsOf(field), static_cast<std::int32_t>(code)) : "";
-}
-
 DpsBlock withoutFields(DpsBlock block) {
     for (const DpsField& field : DPS_LAYOUT) {
         for (std::size_t element = 0; element < field.count; ++element) {
@@ -151,6 +155,26 @@ DpsBlock withoutFields(DpsBlock block) {
         }
     }
     return block;
+}
+
+TuningDescription describeTuningBlock(const DpsBlock& block) {
+    TuningDescription description;
+    for (const DpsField& field : DPS_LAYOUT) {
+        std::vector<std::int64_t> numbers;
+        for (std::size_t element = 0; element < field.count; ++element) {
+            numbers.push_back(decodeField(block, field, element));
+        }
+        TuningValue& value = description.fields[field.key];
+        if (field.kind == DpsKind::list) {
+            value = std::move(numbers);
+            continue;
+        }
+        const std::string word = tuningWord(field, numbers.front());
+        value = word.empty() ? TuningValue(numbers.front()) : TuningValue(word);
+    }
+    const DpsBlock rest = withoutFields(block);
+    description.raw = withoutEndZeros(Bytes(rest.bytes.begin(), rest.bytes.end()));
+    return description;
 }
 
 } // namespace orvane::kit

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// From named tuning fields to the bytes of a tuning block: the way back of decodeField.
+// From named tuning fields to the bytes of a tuning block and back.
 #pragma once
 
 #include "kit/tuning/tuning_description.h"
@@ -28,15 +28,16 @@ void encodeTuningField(DpsBlock& block, const std::string& key, const TuningValu
 /// more raw bytes than a block has.
 DpsBlock encodeTuningBlock(const TuningDescription& description);
 
+/// The block: all fields, a word where the code has one, and as raw bytes the bits that no field
+/// reads, without the zeros at their end.
+TuningDescription describeTuningBlock(const DpsBlock& block);
+
 /// The numbers that an element of `field` can hold.
 std::int64_t leastOf(const DpsField& field);
 std::int64_t greatestOf(const DpsField& field);
 
 /// The words of `field`, which is a switch or a mode.
 const std::array<QwaWord, 3>& wordsOf(const DpsField& field);
-
-/// The word of `field` for `code`; empty where it has none, and for a field without words.
-std::string tuningWord(const DpsField& field, std::int64_t code);
 
 /// The block with all bits that a field has set to zero: what no field reads.
 DpsBlock withoutFields(DpsBlock block);

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/tuning/tuning_line.h"
 
-#include "kit/description/toml_text.h"
+#include "kit/host/text.h"
 #include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 
@@ -30,7 +30,8 @@ std::int64_t numberAt(std::string_view text, std::size_t column, const DpsField&
     const auto [end, error] = std::from_chars(text.data(), last, number);
     const bool isNumber = !text.empty() && end == last && error != std::errc::invalid_argument;
     if (!isNumber || (error == std::errc{} && std::to_string(number) != text)) {
-        fail(column, std::string(field.key) + " takes a decimal number, not " + tomlText(text));
+        fail(column,
+             std::string(field.key) + " takes a decimal number, not " + inQuotes(printable(text)));
     }
     if (error != std::errc{} || number < leastOf(field) || number > greatestOf(field)) {
         fail(column, std::string(field.key) + " takes " + std::to_string(leastOf(field)) + " to " +
@@ -51,8 +52,8 @@ TuningValue wordAt(std::string_view text, std::size_t column, const DpsField& fi
         }
         known += std::string(row.word) + ", ";
     }
-    fail(column, std::string(field.key) + " has no word " + tomlText(text) + ": it takes " + known +
-                     "or nothing");
+    fail(column, std::string(field.key) + " has no word " + inQuotes(printable(text)) +
+                     ": it takes " + known + "or nothing");
 }
 
 TuningValue listAt(std::string_view text, std::size_t column, const DpsField& field) {

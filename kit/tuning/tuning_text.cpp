@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/tuning/tuning_text.h"
 
-#include "kit/description/toml_text.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/tuning/tuning_line.h"
 
@@ -75,7 +75,7 @@ private:
             key.erase(key.find('\r'));
         }
         if (!isTuningField(key)) {
-            fail(0, "unknown key " + tomlText(key));
+            fail(0, "unknown key " + inQuotes(printable(key)));
             return;
         }
         const DpsField& field = tuningField(key);

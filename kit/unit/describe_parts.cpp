@@ -7,7 +7,6 @@
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
 #include "kit/host/sparse_content.h"
-#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
 #include "tuning/dps_block.h"
@@ -23,8 +22,6 @@
 #include <string>
 #include <string_view>
 #include <utility>
-#include <variant>
-#include <vector>
 
 namespace orvane::kit {
 
@@ -32,6 +29,11 @@ namespace {
 
 constexpr std::uint32_t SLOT_OF_SLOTS = 15; ///< slots 1 to 9 once more
 constexpr std::uint32_t FIRST_SLOT_BEHIND_GAP = 10;
+
+/// A shorter file is not worth a table of its own. In bytes.
+constexpr std::uint64_t LEAST_SPARSE = 4096;
+/// What an entry of such a table takes besides its bytes, in bytes.
+constexpr std::uint64_t RUN_COST = 32;
 
 /// Gives a part of `area` and leaves zeros in its place.
 Bytes takePart(Bytes& area, std::int64_t begin, std::size_t length) {
@@ -160,24 +162,23 @@ DiskDescription describeDisk(const Bytes& content) {
     return disk;
 }
 
-TuningDescription describeTuningBlock(const DpsBlock& block) {
-    TuningDescription description;
-    for (const DpsField& field : DPS_LAYOUT) {
-        std::vector<std::int64_t> numbers;
-        for (std::size_t element = 0; element < field.count; ++element) {
-            numbers.push_back(decodeField(block, field, element));
-        }
-        TuningValue& value = description.fields[field.key];
-        if (field.kind == DpsKind::list) {
-            value = std::move(numbers);
-            continue;
-        }
-        const std::string word = tuningWord(field, numbers.front());
-        value = word.empty() ? TuningValue(numbers.front()) : TuningValue(word);
+void describeFile(const Descriptor& descriptor, const std::filesystem::path& file,
+                  const std::string& path, UnitDescription& unit) {
+    const std::uint64_t size = sizeOf(descriptor, file);
+    Runs runs = nonZeroRuns(descriptor, file, size);
+    std::uint64_t cost = 0;
+    for (const auto& [offset, bytes] : runs) {
+        cost += RUN_COST + bytes.size();
     }
-    const DpsBlock rest = withoutFields(block);
-    description.raw = withoutEndZeros(Bytes(rest.bytes.begin(), rest.bytes.end()));
-    return description;
+    if (size >= LEAST_SPARSE && cost <= size / 2) {
+        unit.sparseFiles[path] = {size, std::move(runs)};
+        return;
+    }
+    Bytes content(static_cast<std::size_t>(size), '\0');
+    for (const auto& [offset, bytes] : runs) {
+        content.replace(static_cast<std::size_t>(offset), bytes.size(), bytes);
+    }
+    unit.files[path] = std::move(content);
 }
 
 } // namespace orvane::kit

@@ -7,13 +7,15 @@
 #include "kit/description/unit_description.h"
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
-#include "kit/tuning/tuning_description.h"
-#include "tuning/dps_block.h"
 
 #include <cstdint>
 #include <filesystem>
+#include <string>
 
 namespace orvane::kit {
+
+/// A longer image is described as a file, whose zeros take no room. In bytes.
+constexpr std::uint64_t LONGEST_IMAGE = std::uint64_t{1} << 20U;
 
 /// The image: its size, the parameters that lie wholly inside and are not zero, and as raw bytes
 /// what else is not zero: behind the catalogue's end, or the first byte of a two-byte parameter
@@ -28,9 +30,10 @@ DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem
                              std::uint64_t size);
 DiskDescription describeDisk(const Bytes& content);
 
-/// The block: all 44 fields, a word where the code has one, and as raw bytes the bits that no field
-/// reads, without the zeros at their end.
-TuningDescription describeTuningBlock(const DpsBlock& block);
+/// Enters the open file as `path` of `unit`: among the sparse files when it is long and mostly
+/// zeros, else among the others.
+void describeFile(const Descriptor& descriptor, const std::filesystem::path& file,
+                  const std::string& path, UnitDescription& unit);
 
 /// Everything below `root`, which must be a unit that the kit made: makeUnit of it gives the same
 /// folders, files, contents and links. Modes, times and owners are not part of a description, nor

@@ -7,6 +7,7 @@
 #include "kit/description/value_places.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/tuning/tuning_text.h"

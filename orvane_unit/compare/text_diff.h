@@ -4,8 +4,6 @@
 #pragma once
 
 #include <cstddef>
-#include <iosfwd>
-#include <optional>
 #include <string>
 #include <vector>
 
@@ -29,14 +27,5 @@ struct Hunk {
 };
 
 std::vector<Hunk> differingHunks(const std::string& before, const std::string& after);
-
-/// Prints a unified diff of the file `name`; nothing on a side where there is no file. Prints
-/// nothing when both sides are the same. Bytes that are no text are escaped.
-void printUnifiedDiff(std::ostream& out, const std::string& name,
-                      const std::optional<std::string>& before,
-                      const std::optional<std::string>& after);
-
-/// A line without its line end, bytes that are no text escaped.
-std::string lineForEyes(const std::string& line);
 
 } // namespace orvane::desk

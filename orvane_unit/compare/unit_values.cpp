@@ -6,9 +6,10 @@
 #include "config/crc32.h"
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
+#include "kit/host/text.h"
+#include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
 #include "orvane_unit/explain/value_origins.h"
-#include "orvane_unit/report/terminal.h"
 #include "orvane_unit/show/decoded_unit.h"
 #include "tuning/dps_block.h"
 
@@ -42,15 +43,15 @@ std::string crcText(const std::string& bytes) {
 }
 
 std::string fileText(const std::string& bytes) {
-    return counted(bytes.size(), "byte") + ", CRC-32 " + crcText(bytes);
+    return kit::counted(bytes.size(), "byte") + ", CRC-32 " + crcText(bytes);
 }
 
 /// As `orvane-unit set` takes it.
 std::string textOrHex(const std::string& bytes) {
-    if (printable(bytes) == bytes && bytes.compare(0, 4, "hex:") != 0) {
+    if (kit::printable(bytes) == bytes && bytes.compare(0, 4, "hex:") != 0) {
         return bytes;
     }
-    std::string hex = hexText(bytes);
+    std::string hex = kit::hexText(bytes);
     hex.erase(std::remove(hex.begin(), hex.end(), ' '), hex.end());
     return hex.size() <= LONGEST_SHOWN ? "hex:" + hex : fileText(bytes);
 }
@@ -133,7 +134,7 @@ UnitValues unitValues(const kit::UnitDescription& unit) {
         values.emplace_back("file." + path, fileText(content));
     }
     for (const auto& [path, content] : unit.sparseFiles) {
-        values.emplace_back("file." + path, counted(content.size, "byte"));
+        values.emplace_back("file." + path, kit::counted(content.size, "byte"));
         addRuns(values, "file." + path + ".", content.bytes);
     }
     for (const auto& [path, target] : unit.links) {

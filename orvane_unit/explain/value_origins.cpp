@@ -8,6 +8,7 @@
 #include "config/record_slots.h"
 #include "identity/model_names.h"
 #include "identity/vehicle_identity.h"
+#include "kit/host/text.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -26,7 +27,7 @@ std::uint64_t diskOffset(std::int64_t bytesBeforeEnd) {
 
 std::string bytesFrom(const char* what, std::uint64_t offset, const std::string& bytes) {
     return std::string(what) + (bytes.size() == 1 ? " byte " : " bytes from ") +
-           std::to_string(offset) + ": " + hexText(bytes);
+           std::to_string(offset) + ": " + kit::hexText(bytes);
 }
 
 } // namespace
@@ -54,21 +55,6 @@ std::uint64_t diskSize() {
     const off_t size = ::lseek(descriptor, 0, SEEK_END); // also of a device
     ::close(descriptor);
     return size < 0 ? 0 : static_cast<std::uint64_t>(size);
-}
-
-std::string hexText(const std::string& bytes) {
-    constexpr char DIGITS[] = "0123456789abcdef";
-    std::string text;
-    text.reserve(bytes.size() * 3);
-    for (const char byte : bytes) {
-        const auto value = static_cast<unsigned char>(byte);
-        if (!text.empty()) {
-            text += ' ';
-        }
-        text += DIGITS[value >> 4U];
-        text += DIGITS[value & 0xFU];
-    }
-    return text;
 }
 
 Image readImage() {

@@ -20,9 +20,6 @@ struct Origin {
     std::string detail; ///< the raw value and its place
 };
 
-/// Bytes in hex, two digits each, with blanks between them.
-std::string hexText(const std::string& bytes);
-
 /// Why the disk can't be read at a place; nothing when it can.
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
 

@@ -1,10 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/report/comparison_text.h"
 
+#include "kit/host/text.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/report/terminal.h"
+#include "orvane_unit/report/unified_diff.h"
 
 #include <map>
 #include <ostream>
@@ -24,7 +26,7 @@ void printMoved(std::ostream& out, const MovedOutput& output) {
     out << '\n';
     for (const MovedLine& line : output.lines) {
         const bool isRemoved = line.line.kind == DiffLine::Kind::removed;
-        const std::string text = (isRemoved ? "-" : "+") + lineForEyes(line.line.text);
+        const std::string text = (isRemoved ? "-" : "+") + printableLine(line.line.text);
         out << "    " << painted(isRemoved ? Colour::removed : Colour::added, text) << '\n';
     }
 }
@@ -102,7 +104,7 @@ void printConsequences(std::ostream& out, const std::vector<Consequence>& conseq
         if (change.key.empty()) {
             out << "of no value that differs:\n";
         } else {
-            out << printable(change.key) << ": "
+            out << kit::printable(change.key) << ": "
                 << painted(Colour::removed, valueForEyes(change.before)) << " -> "
                 << painted(Colour::added, valueForEyes(change.after)) << '\n';
         }
@@ -123,12 +125,12 @@ void printImpacts(std::ostream& out, const std::vector<Impact>& impacts) {
             continue;
         }
         out << painted(Colour::place, impact.key) << ": " << impact.moving << " of "
-            << counted(impact.tried, "value") << " moved\n";
+            << kit::counted(impact.tried, "value") << " moved\n";
         for (const std::string& line : impact.lines) {
             out << "  " << line << '\n';
         }
     }
-    out << counted(still.size(), "input") << " moved nothing:\n";
+    out << kit::counted(still.size(), "input") << " moved nothing:\n";
     for (const std::string& range : inRanges(withWholeBlocks(still))) {
         out << "  " << range << '\n';
     }

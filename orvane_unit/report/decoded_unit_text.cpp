@@ -5,6 +5,7 @@
 #include "identity/inf_file.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/sparse_content.h"
+#include "kit/host/text.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/value_origins.h"
@@ -32,7 +33,7 @@ std::string hexNumber(std::uint32_t number, int digits) {
 }
 
 void printParams(std::ostream& out, const Contents& contents) {
-    out << "image: " << counted(contents.image.bytes.size(), "byte");
+    out << "image: " << kit::counted(contents.image.bytes.size(), "byte");
     if (contents.image.reason != Reason::fromImage) {
         out << ", " << painted(Colour::bad, reasonInfo(contents.image.reason).sentence);
     }
@@ -49,7 +50,7 @@ void printParams(std::ostream& out, const Contents& contents) {
         out << std::setw(8) << param.row.defaultValue << ' ' << hexNumber(param.row.mask, 8)
             << std::setw(5) << (param.row.id >> 16U);
         if (!param.meaning.empty()) {
-            out << "  " << painted(Colour::good, printable(param.meaning));
+            out << "  " << painted(Colour::good, kit::printable(param.meaning));
         }
         out << '\n';
     }
@@ -60,15 +61,15 @@ void printBytes(std::ostream& out, const std::string& bytes) {
     if (text.empty()) {
         out << painted(Colour::faint, "zeros");
     } else {
-        out << '"' << printable(text) << '"';
-        if (printable(text) != text) {
-            out << "  " << painted(Colour::faint, hexText(text));
+        out << '"' << kit::printable(text) << '"';
+        if (kit::printable(text) != text) {
+            out << "  " << painted(Colour::faint, kit::hexText(text));
         }
     }
 }
 
 void printRecords(std::ostream& out, const Contents& contents) {
-    out << "disk: " << counted(contents.diskSize, "byte");
+    out << "disk: " << kit::counted(contents.diskSize, "byte");
     if (contents.diskTrouble) {
         out << ", " << painted(Colour::bad, reasonInfo(*contents.diskTrouble).sentence);
     }
@@ -134,7 +135,7 @@ void printVersions(std::ostream& out, const Contents& contents) {
     const VersionFiles& versions = contents.versions;
     for (std::size_t i = 0; i < versions.files.size(); ++i) {
         const VersionFile& file = versions.files[i];
-        out << printable(file.path) << ": ";
+        out << kit::printable(file.path) << ": ";
         if (versions.chosen == i) {
             out << painted(Colour::good,
                            "chosen: the first application in the order of the listing");
@@ -145,13 +146,13 @@ void printVersions(std::ostream& out, const Contents& contents) {
         }
         out << '\n';
         for (const auto& [key, value] : file.record) {
-            out << "  " << printable(key) << " = " << printable(value) << '\n';
+            out << "  " << kit::printable(key) << " = " << kit::printable(value) << '\n';
         }
     }
     if (!versions.hasFolder) {
         out << painted(Colour::bad, reasonInfo(Reason::versionFolderMissing).sentence) << '\n';
     }
-    out << "version: \"" << printable(contents.version) << "\", as digits "
+    out << "version: \"" << kit::printable(contents.version) << "\", as digits "
         << contents.versionDigits << '\n';
 }
 
@@ -174,7 +175,7 @@ void printFiles(std::ostream& out, const Contents& contents) {
         out << std::left << std::setw(52) << file.path << ' ' << std::setw(26) << file.role
             << std::right << ' ' << kindName(file.kind);
         if (file.kind == Left::file) {
-            out << ", " << counted(file.size, "byte");
+            out << ", " << kit::counted(file.size, "byte");
         }
         out << '\n';
     }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/report/explanation_text.h"
 
+#include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/terminal.h"
 
@@ -30,13 +31,13 @@ std::string lineText(const Line& line) {
         const auto ends =
             static_cast<std::size_t>(std::count(line.text.begin(), line.text.end(), '\n'));
         const bool isOpen = !line.text.empty() && line.text.back() != '\n';
-        return "... " + counted(ends + (isOpen ? 1 : 0), "line") + ", " +
-               counted(line.text.size(), "byte");
+        return "... " + kit::counted(ends + (isOpen ? 1 : 0), "line") + ", " +
+               kit::counted(line.text.size(), "byte");
     }
     if (line.text.empty()) {
         return "(left out)";
     }
-    return printable(line.text.substr(0, line.text.size() - 1)); // without its line end
+    return kit::printable(line.text.substr(0, line.text.size() - 1)); // without its line end
 }
 
 /// A line's origin: the value's place, and a code where it is not as intended. What the code means
@@ -50,7 +51,7 @@ std::string originText(const Line& line, std::set<Reason>& said) {
             text += said.insert(reason).second ? std::string(": ") + info.sentence : "";
         }
     }
-    return printable(text);
+    return kit::printable(text);
 }
 
 /// Lines that say the same of themselves, such as a block of zeros, need saying it once.
@@ -71,7 +72,7 @@ Line tuningSummary(const std::vector<Line>& lines) {
     }
     const auto count = static_cast<std::size_t>(std::count_if(lines.begin(), lines.end(), isField));
     const std::string block = first->key.substr(0, first->key.rfind('.'));
-    return {"... " + counted(count, "value") + "\n", first->reasons, block,
+    return {"... " + kit::counted(count, "value") + "\n", first->reasons, block,
             first->detail.substr(0, first->detail.find(',')) + " of the boot disk"};
 }
 

@@ -3,7 +3,7 @@
 
 #include "config/param_catalogue.h"
 #include "identity/inf_file.h"
-#include "kit/host/utf8.h"
+#include "kit/host/text.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/reasons.h"
@@ -37,7 +37,7 @@ Json bytesJson(const std::string& bytes) {
     if (kit::isUtf8(bytes)) {
         return bytes;
     }
-    std::string hex = hexText(bytes);
+    std::string hex = kit::hexText(bytes);
     hex.erase(std::remove(hex.begin(), hex.end(), ' '), hex.end());
     return {{"hex", hex}};
 }
@@ -107,13 +107,13 @@ Json recordsJson(const Contents& contents) {
         slots.push_back({{"number", slot.number},
                          {"size", slot.size},
                          {"offset", slot.offset},
-                         {"bytes", slot.bytes ? Json(hexText(*slot.bytes)) : Json()}});
+                         {"bytes", slot.bytes ? Json(kit::hexText(*slot.bytes)) : Json()}});
     }
     return {{"disk", contents.diskTrouble ? reasonInfo(*contents.diskTrouble).code
                                           : reasonInfo(Reason::fromRecord).code},
             {"size", contents.diskSize},
             {"slots", slots},
-            {"aux", contents.aux ? Json(hexText(*contents.aux)) : Json()},
+            {"aux", contents.aux ? Json(kit::hexText(*contents.aux)) : Json()},
             {"crc", contents.crc},
             {"crcVerdict", crcVerdictName(contents.crcVerdict)}};
 }

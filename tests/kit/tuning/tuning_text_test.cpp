@@ -179,7 +179,7 @@ const Refusal REFUSALS[] = {
     {"qwaNRAtten 0\n", "qwaNRAtten 0\n\n", "a.txt:25:1: unknown key \"\""},
     {"qwaNRAtten 0\n", "qwaNRAtten 0\nqwaNone 1\n", "a.txt:25:1: unknown key \"qwaNone\""},
     {"qwaNRAtten 0\n", "qwaNRAtten 0\n; a comment\n", "a.txt:25:1: unknown key \";\""},
-    {"qwaNRAtten 0\n", "qwaNRAtten 0\n\x01\x7F 1\n", "a.txt:25:1: unknown key \"\\u0001\\u007f\""},
+    {"qwaNRAtten 0\n", "qwaNRAtten 0\n\x01\x7F 1\n", "a.txt:25:1: unknown key \"\\x01\\x7f\""},
     {"qwaNRAtten 0\n", "qwaNRAtten 0\nqwaNRAtten 0\n", "a.txt:25:1: qwaNRAtten is there already"},
     {"qwaNRAtten 0\nqwaRECSuppress 0\n", "qwaRECSuppress 0\nqwaNRAtten 0\n",
      "a.txt:25:1: qwaNRAtten must stand before qwaRECSuppress"},

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/compare/text_diff.h"
-#include "orvane_unit/report/terminal.h"
+#include "orvane_unit/report/unified_diff.h"
 
 #include <gtest/gtest.h>
 
@@ -161,39 +161,6 @@ TEST(TextDiffTest, LargeTextsWithNothingInCommonTakeNoTime) {
     }
     EXPECT_EQ(removed, 3000U);
     EXPECT_EQ(added, 3000U);
-}
-
-TEST(TerminalTest, PrintableEscapesWhatIsNoText) {
-    struct Row {
-        std::string bytes;
-        std::string text;
-    };
-    const Row rows[] = {
-        {"", ""},
-        {"plain = text", "plain = text"},
-        {"a\nb\tc\r", "a\\nb\\x09c\\x0d"},
-        {"back\\slash", "back\\\\slash"},
-        {std::string("\0", 1), "\\x00"},
-        {"\x7f", "\\x7f"},
-        {"M\xc3\xbcller", "M\xc3\xbcller"},
-        {"\xc3", "\\xc3"},                   // cut short
-        {"\xc0\xaf", "\\xc0\\xaf"},          // longer than needed
-        {"\xed\xa0\x80", "\\xed\\xa0\\x80"}, // a surrogate
-        {"\xc2\x85", "\\xc2\\x85"},          // a control character
-        {"\xf0\x9f\x9a\x97", "\xf0\x9f\x9a\x97"},
-        {"ok\xff"
-         "ok",
-         "ok\\xffok"},
-    };
-    for (const Row& row : rows) {
-        EXPECT_EQ(desk::printable(row.bytes), row.text);
-    }
-}
-
-TEST(TerminalTest, CountedTakesTheRightNumber) {
-    EXPECT_EQ(desk::counted(0, "line"), "0 lines");
-    EXPECT_EQ(desk::counted(1, "line"), "1 line");
-    EXPECT_EQ(desk::counted(2, "byte"), "2 bytes");
 }
 
 } // namespace

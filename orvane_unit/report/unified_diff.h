@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <iosfwd>
+#include <optional>
+#include <string>
+
+namespace orvane::desk {
+
+/// Prints a unified diff of the file `name`; nothing on a side where there is no file. Prints
+/// nothing when both sides are the same. Bytes that are no text are escaped.
+void printUnifiedDiff(std::ostream& out, const std::string& name,
+                      const std::optional<std::string>& before,
+                      const std::optional<std::string>& after);
+
+/// A line without its line end, bytes that are no text escaped.
+std::string printableLine(const std::string& line);
+
+} // namespace orvane::desk
