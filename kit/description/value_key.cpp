@@ -5,6 +5,7 @@
 #include "config/record_slots.h"
 #include "kit/description/description_values.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "kit/tuning/tuning_encode.h"
 #include "tuning/dps_block.h"
 
