@@ -154,9 +154,9 @@ void compareWithRun(const Explanation& explanation, const TmpTree& tree,
     for (const Output& output : explanation) {
         const std::string name = output.path.substr(sizeof TMP - 1);
         const std::optional<std::string> file = tree.file(name);
-        const bool agrees = output.left == Left::file     ? file == output.content
-                            : output.left == Left::folder ? tree.hasFolder(name)
-                                                          : !file && !tree.hasFolder(name);
+        const bool agrees = output.kindAfter == PathKind::file     ? file == output.contentAfter
+                            : output.kindAfter == PathKind::folder ? tree.hasFolder(name)
+                                                                   : !file && !tree.hasFolder(name);
         if (!agrees) {
             surprises.push_back(output.path + " is not what the explanation says");
         }
@@ -175,7 +175,7 @@ CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool update
     for (const Output& output : explanation) {
         result.reasons.insert(output.reasons.begin(), output.reasons.end());
         for (const Line& line : output.lines) {
-            result.reasons.insert(line.reasons.begin(), line.reasons.end());
+            result.reasons.insert(line.origin.reasons.begin(), line.origin.reasons.end());
         }
     }
     const kit::RunResult run = kit::runInside(root, {binary, arguments});
@@ -212,7 +212,7 @@ CheckReport checkCases(const fs::path& folder, const fs::path& binary, bool upda
         report.cases.push_back(checkCase(path, binary, updates));
         reached.insert(report.cases.back().reasons.begin(), report.cases.back().reasons.end());
     }
-    for (const ReasonInfo& info : REASONS) {
+    for (const ReasonInfo& info : reasons()) {
         if (reached.count(info.reason) == 0) {
             report.unreached.push_back(info.code);
         }

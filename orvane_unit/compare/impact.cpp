@@ -131,7 +131,7 @@ void addSlots(std::vector<Input>& inputs, const ChangedFile& disk) {
         std::uint32_t size = 0;
         std::uint64_t offset = 0;
         recordSlotLayout(slot, size, offset);
-        if (slot == CRC_SLOT || disk.size() < RECORD_AREA_SIZE) {
+        if (slot == CRC_RECORD_SLOT || disk.size() < RECORD_AREA_SIZE) {
             continue;
         }
         offset += disk.size() - RECORD_AREA_SIZE;

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <iterator>
 #include <memory>
 #include <optional>
 #include <utility>
@@ -26,23 +27,25 @@ std::vector<std::string> keysByLine(const Output& output) {
         const auto ends =
             static_cast<std::size_t>(std::count(line.text.begin(), line.text.end(), '\n'));
         const bool isOpen = !line.text.empty() && line.text.back() != '\n';
-        keys.insert(keys.end(), ends + (isOpen ? 1 : 0), line.key);
+        keys.insert(keys.end(), ends + (isOpen ? 1 : 0), keyText(line.origin.key));
     }
     return keys;
 }
 
 MovedOutput movedOutput(const Output& before, const Output& after) {
-    MovedOutput moved{before.path, before.outcome, after.outcome, before.keys, {}};
-    moved.keys.insert(moved.keys.end(), after.keys.begin(), after.keys.end());
+    MovedOutput moved{before.path, before.outcome, after.outcome, {}, {}};
+    for (const std::vector<kit::ValueKey>* keys : {&before.keys, &after.keys}) {
+        std::transform(keys->begin(), keys->end(), std::back_inserter(moved.keys), kit::keyText);
+    }
     // A line that is left out for want of its value has nothing but its key.
     for (const Line& line : before.lines) {
         if (line.text.empty()) {
-            moved.keys.push_back(line.key);
+            moved.keys.push_back(keyText(line.origin.key));
         }
     }
     for (const Line& line : after.lines) {
         if (line.text.empty()) {
-            moved.keys.push_back(line.key);
+            moved.keys.push_back(keyText(line.origin.key));
         }
     }
     const std::vector<std::string> keysBefore = keysByLine(before);

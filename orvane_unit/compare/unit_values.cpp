@@ -101,7 +101,7 @@ void addImage(UnitValues& values, const kit::ImageDescription& image) {
 void addDisk(UnitValues& values, const kit::DiskDescription& disk) {
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
         const auto content = disk.slots.find(slot);
-        if (slot != CRC_SLOT) {
+        if (slot != CRC_RECORD_SLOT) {
             values.emplace_back("slot." + std::to_string(slot),
                                 content == disk.slots.end() ? "" : textOrHex(content->second));
         }

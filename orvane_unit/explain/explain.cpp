@@ -1,27 +1,149 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/explain.h"
 
+#include "identity/vehicle_identity.h"
 #include "kit/enter/root.h"
-#include "orvane_unit/explain/explain_files.h"
+#include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
+#include "orvane_unit/explain/planned_merge.h"
+#include "orvane_unit/explain/value_lines.h"
+#include "orvane_unit/explain/value_origins.h"
+#include "orvane_unit/explain/version_choice.h"
+#include "tuning/audio_profile.h"
+#include "tuning/dps_block.h"
+#include "tuning/tuning_file.h"
+#include "writers/airplay_writer.h"
+#include "writers/iap_writer.h"
 
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <sstream>
+#include <stdexcept>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {
+
+namespace {
+
+Output tuningNotAsked(const TuningOutput& tuning, std::int32_t profile) {
+    Output output;
+    output.path = tuning.path;
+    output.outcome = Outcome::notAsked;
+    output.reasons = {profile == NO_AUDIO_PROFILE ? Reason::profileUnknown
+                                                  : Reason::profileNotGenerated};
+    output.keys = {kit::paramKey(AUDIO_PROFILE_PARAM)};
+    return output;
+}
+
+/// The lines of a tuning file, each with the field that it renders.
+std::vector<Line> tuningLines(const std::string& text, const TuningArea& area,
+                              std::int32_t blockId) {
+    const DpsBlock& block = area.blocks.at(static_cast<std::size_t>(blockId));
+    std::vector<ValueRegion> regions;
+    std::size_t done = 0;
+    for (const DpsField& field : DPS_LAYOUT) {
+        std::ostringstream line;
+        writeTuningLine(line, field, block);
+        const std::size_t begin = text.find(line.str(), done);
+        if (begin == std::string::npos) {
+            throw std::logic_error(std::string("error in orvane-unit: no line carries ") +
+                                   field.key);
+        }
+        done = begin + line.str().size();
+        regions.push_back({begin, done, fieldOrigin(area, blockId, field)});
+    }
+    return cutIntoLines(text, std::move(regions));
+}
+
+Output generatedTuning(PlannedFiles& files, const TuningOutput& tuning) {
+    Output output;
+    output.path = tuning.path;
+    output.keys = {kit::paramKey(AUDIO_PROFILE_PARAM), kit::fileKey(tuning.path)};
+    const TuningArea area = readUnitTuning(); // before the file is opened, as the tool does
+    if (!files.openForWriting(tuning.path)) {
+        output.outcome = Outcome::kept;
+        output.reasons = {Reason::outputNotOpenable};
+        return output;
+    }
+    output.reasons = {Reason::generated};
+    std::ostringstream text;
+    writeTuningText(text, tuning.blockId, area.blocks.at(static_cast<std::size_t>(tuning.blockId)));
+    files.write(tuning.path, text.str());
+    output.lines = tuningLines(text.str(), area, tuning.blockId);
+    return output;
+}
+
+void explainAirplay(PlannedFiles& files, Explanation& outputs) {
+    AirplayValues values;
+    readVehicleValues(values);
+    values.audioProfile = readAudioProfile();
+    for (const TuningOutput& tuning : TUNING_OUTPUTS) {
+        outputs.push_back(asksForTuning(values.audioProfile)
+                              ? generatedTuning(files, tuning)
+                              : tuningNotAsked(tuning, values.audioProfile));
+    }
+    const Image image = readImage();
+    const std::vector<MergedValue<AirplayValues>> sources = {
+        {[](AirplayValues& v) { v.model = otherText(v.model); }, modelOrigin(image)},
+        {[](AirplayValues& v) { v.brand = otherText(v.brand); }, paramOrigin(image, BRAND_PARAM)},
+        {[](AirplayValues& v) {
+             v.audioProfile = v.audioProfile == NO_AUDIO_PROFILE ? 0 : v.audioProfile ^ 1;
+         },
+         paramOrigin(image, AUDIO_PROFILE_PARAM)},
+        {[](AirplayValues& v) { v.rightHandDrive ^= 1U; },
+         paramOrigin(image, RIGHT_HAND_DRIVE_PARAM)},
+    };
+    PlannedMerge merge;
+    merge.open(files, AIRPLAY_FILE);
+    outputs.push_back(merge.finish(values, sources, generateAirplayFile));
+}
+
+void explainIap(PlannedFiles& files, Explanation& outputs) {
+    IapValues values;
+    readIapValues(values);
+    const VersionFiles versions = readVersionFiles();
+    std::vector<MergedValue<IapValues>> sources = {
+        {[](IapValues& v) { v.model = otherText(v.model); }, modelOrigin(readImage())},
+        {[](IapValues& v) { v.serial = otherText(v.serial); }, serialOrigin()},
+        {[](IapValues& v) { v.firmwareVersion = otherText(v.firmwareVersion); },
+         versionTextOrigin(versions)},
+    };
+    std::array<PlannedMerge, IAP_STAGE_COUNT> merges;
+    for (std::size_t i = 0; i < merges.size(); ++i) {
+        const IapStage& stage = IAP_STAGES.at(i);
+        changeIapValues(stage, values);
+        if (stage.hasVersionDigits) {
+            sources.back().origin = versionDigitsOrigin(versions);
+        }
+        const PlannedMerge& iap2 = merges.at(IAP2_STAGE);
+        merges.at(i).iap2 = &iap2;
+        merges.at(i).open(files, stage.file);
+        outputs.push_back(merges.at(i).finish(
+            values, sources,
+            [&stage, &iap2](std::istream& templateFile, std::ostream& output, const IapValues& v) {
+                return stage.generate(templateFile, output, iap2.output, v);
+            }));
+    }
+}
+
+} // namespace
 
 Explanation explain(const std::string& letters) {
     Explanation outputs;
     PlannedFiles files;
     for (const char letter : letters) {
-        if (letter == 'a') {
+        const Writer writer = writerOf(letter);
+        if (writer == updateAirplayConfigFile) {
             explainAirplay(files, outputs);
-        } else if (letter == 'i') {
+        } else if (writer == updateIapConfigFiles) {
             explainIap(files, outputs);
         }
     }
     // Last, since a later output may be the same file by way of a link.
     for (Output& output : outputs) {
-        output.left = files.look(output.path, output.content);
+        output.kindAfter = files.look(output.path, output.contentAfter);
     }
     return outputs;
 }

@@ -21,6 +21,10 @@ const char* outcomeName(Outcome outcome) {
     return "";
 }
 
+Origin fixedText() {
+    return {{Reason::fixedText}, {}, {}};
+}
+
 bool isIntended(const std::vector<Reason>& reasons) {
     return std::all_of(reasons.begin(), reasons.end(),
                        [](Reason reason) { return reasonInfo(reason).isIntended; });
@@ -29,7 +33,7 @@ bool isIntended(const std::vector<Reason>& reasons) {
 bool isIntended(const Output& output) {
     return isIntended(output.reasons) &&
            std::all_of(output.lines.begin(), output.lines.end(),
-                       [](const Line& line) { return isIntended(line.reasons); });
+                       [](const Line& line) { return isIntended(line.origin.reasons); });
 }
 
 bool isIntended(const Explanation& explanation) {

@@ -3,6 +3,8 @@
 // What a run of orvane would leave, and why: the answer of explain.h, without any input in it.
 #pragma once
 
+#include "kit/description/value_key.h"
+#include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
 
 #include <string>
@@ -10,13 +12,18 @@
 
 namespace orvane::desk {
 
+/// Where a piece of an output comes from.
+struct Origin {
+    std::vector<Reason> reasons; ///< why it is what it is
+    kit::ValueKey key;           ///< of its value; empty for the tool's own text
+    Place place;
+};
+
 /// A piece of an output: one line with its line end; of a value that holds line ends, or of a
 /// template, all its lines. The pieces of an output, one behind the other, are its content.
 struct Line {
     std::string text; ///< empty for a line that was left out
-    std::vector<Reason> reasons;
-    std::string key; ///< of the value it comes from, as in `orvane-unit set`; empty for fixed text
-    std::string detail; ///< the raw value and its place, or what stands in; may be empty
+    Origin origin;
 };
 
 enum class Outcome {
@@ -29,21 +36,24 @@ enum class Outcome {
 
 const char* outcomeName(Outcome outcome);
 
-/// What is at a path in the end.
-enum class Left { nothing, file, folder, other };
+/// What is at a path.
+enum class PathKind { nothing, file, folder, other };
 
 struct Output {
     std::string path;
     Outcome outcome = Outcome::generated;
-    std::vector<Reason> reasons;   ///< what decided the outcome, in the order of the decisions
-    std::vector<std::string> keys; ///< of the values that decided it
-    std::vector<Line> lines;       ///< none when kept or not asked
-    Left left = Left::nothing;     ///< after the whole run, links followed
-    std::string content;           ///< of a file, after the whole run
+    std::vector<Reason> reasons;     ///< what decided the outcome, in the order of the decisions
+    std::vector<kit::ValueKey> keys; ///< of the values that decided it
+    std::vector<Line> lines;         ///< none when kept or not asked
+    PathKind kindAfter = PathKind::nothing; ///< after the whole run, links followed
+    std::string contentAfter;               ///< of a file, after the whole run
 };
 
 /// The outputs in the order in which the run comes to them: one entry for each time.
 using Explanation = std::vector<Output>;
+
+/// The tool's own text.
+Origin fixedText();
 
 /// Whether neither a fallback nor a default stands in anywhere.
 bool isIntended(const std::vector<Reason>& reasons);

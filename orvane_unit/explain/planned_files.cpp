@@ -44,21 +44,21 @@ void PlannedFiles::write(const std::string& path, const std::string& text) {
     }
 }
 
-Left PlannedFiles::look(const std::string& path, std::string& content) const {
+PathKind PlannedFiles::look(const std::string& path, std::string& content) const {
     content.clear();
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
     if (!place) {
-        return Left::nothing;
+        return PathKind::nothing;
     }
     if (place->kind == S_IFDIR) {
-        return Left::folder;
+        return PathKind::folder;
     }
     const std::optional<std::string> text = read(path);
     if (text) {
         content = *text;
-        return Left::file;
+        return PathKind::file;
     }
-    return place->kind == 0 ? Left::nothing : Left::other;
+    return place->kind == 0 ? PathKind::nothing : PathKind::other;
 }
 
 } // namespace orvane::desk

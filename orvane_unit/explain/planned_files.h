@@ -26,7 +26,7 @@ public:
     void write(const std::string& path, const std::string& text);
 
     /// Tells what is at `path` now, links followed.
-    Left look(const std::string& path, std::string& content) const;
+    PathKind look(const std::string& path, std::string& content) const;
 
 private:
     std::map<std::string, std::string> written_; ///< content by place: a path without links

@@ -1,55 +1,84 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The template merge and its fallback, on planned files.
+// A merge of an accessory file on planned files. The product's own functions do it, on streams that
+// hold what the opened files would give and take.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/planned_files.h"
-#include "orvane_unit/explain/reasons.h"
-#include "orvane_unit/explain/value_origins.h"
+#include "orvane_unit/explain/value_lines.h"
 #include "writers/template_merge.h"
 
+#include <functional>
 #include <optional>
+#include <sstream>
 #include <string>
 #include <vector>
 
 namespace orvane::desk {
 
-/// A value in a generated head: the line that begins with `prefix`, and what follows it.
-struct HeadValue {
-    std::string prefix;
-    std::string text;
+/// A value that the generated lines carry.
+template <class Values>
+struct MergedValue {
+    std::function<void(Values&)> change; ///< makes it another one, as changedBytes requires
     Origin origin;
 };
 
-/// Takes a generated text apart: the lines of `values`, which stand in it in their order, and the
-/// tool's own lines.
-std::vector<Line> headLines(const std::string& text, const std::vector<HeadValue>& values);
-
-/// One accessory file on its way. Opening it truncates the output, as the merge does.
+/// The streams of a TemplateMerge, and what stands behind them.
 class PlannedMerge {
 public:
-    PlannedMerge(PlannedFiles& files, const AccessoryFile& file);
+    std::ostringstream output;
+    std::istringstream templateFile;
+    const PlannedMerge* iap2 = nullptr; ///< the merge of IAP2_FILE, where the file depends on it
 
-    bool outputIsOpen() const { return outputIsOpen_; }
-    bool templateIsOpen() const { return template_.has_value(); }
-    bool templateIsEmpty() const { return template_ && template_->empty(); }
+    /// Opens the output, which truncates it, then the template.
+    void open(PlannedFiles& files, const AccessoryFile& file);
 
-    /// Writes the generated lines, the template, and `end` if the template yields anything.
-    Output generate(std::vector<Line> lines, const std::string& end);
-
-    /// Puts the stock file in place, for the reason `cause`. `key` names the file behind it.
-    Output installStock(Reason cause, const std::string& key);
-
-    /// The output that can't be opened.
-    Output keep() const;
+    /// Has `generate` decide, and do it. `values` are what it renders, `sources` where they come
+    /// from.
+    template <class Values, class Generate>
+    Output finish(const Values& values, const std::vector<MergedValue<Values>>& sources,
+                  const Generate& generate) {
+        const MergeDecision decision = generate(templateFile, output, values);
+        if (decision != MergeDecision::generate) {
+            return installStock(decision);
+        }
+        if (!isOutputOpen_) {
+            return keep();
+        }
+        const auto render = [&generate](const Values& other,
+                                        const std::optional<std::string>& content) {
+            std::ostringstream text;
+            std::istringstream stream = templateStream(content);
+            generate(stream, text, other);
+            return text.str();
+        };
+        const std::string text = output.str();
+        std::vector<ValueRegion> regions;
+        for (const MergedValue<Values>& source : sources) {
+            Values other = values;
+            source.change(other);
+            regions.push_back(changedLines(text, render(other, template_), source.origin));
+        }
+        if (template_ && !template_->empty()) {
+            regions.push_back(
+                changedBytes(text, render(values, otherText(*template_)), templateOrigin()));
+        }
+        return writeGenerated(text, std::move(regions));
+    }
 
 private:
-    Output begin() const;
+    static std::istringstream templateStream(const std::optional<std::string>& content);
 
-    PlannedFiles& files_;
-    AccessoryFile file_;
-    bool outputIsOpen_;
+    Origin templateOrigin() const;
+    Output begin() const;
+    Output keep() const;
+    Output writeGenerated(const std::string& text, std::vector<ValueRegion> regions);
+    Output installStock(MergeDecision decision);
+
+    PlannedFiles* files_ = nullptr;
+    AccessoryFile file_{};
+    bool isOutputOpen_ = false;
     std::optional<std::string> template_; ///< its content, if it can be opened
 };
 

@@ -6,6 +6,7 @@
 
 #include <array>
 #include <cstddef>
+#include <string>
 
 namespace orvane::desk {
 
@@ -52,12 +53,12 @@ constexpr std::size_t REASON_COUNT = static_cast<std::size_t>(Reason::wordUnknow
 struct ReasonInfo {
     Reason reason;
     const char* code;     ///< stable, for programs
-    const char* sentence; ///< for people, without a full stop
+    std::string sentence; ///< for people, without a full stop
     bool isIntended;      ///< no fallback or default stands in
 };
 
 /// All reasons, in the order of the enumeration.
-extern const std::array<ReasonInfo, REASON_COUNT> REASONS;
+const std::array<ReasonInfo, REASON_COUNT>& reasons();
 
 const ReasonInfo& reasonInfo(Reason reason);
 

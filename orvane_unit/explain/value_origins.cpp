@@ -8,7 +8,7 @@
 #include "config/record_slots.h"
 #include "identity/model_names.h"
 #include "identity/vehicle_identity.h"
-#include "kit/host/text.h"
+#include "tuning/tuning_file.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -25,9 +25,20 @@ std::uint64_t diskOffset(std::int64_t bytesBeforeEnd) {
     return diskSize() - static_cast<std::uint64_t>(bytesBeforeEnd);
 }
 
-std::string bytesFrom(const char* what, std::uint64_t offset, const std::string& bytes) {
-    return std::string(what) + (bytes.size() == 1 ? " byte " : " bytes from ") +
-           std::to_string(offset) + ": " + kit::hexText(bytes);
+/// The bytes of a value in an image; none when the image ends before them.
+std::optional<std::string> imageBytes(const Image& image, const ParamDescriptor& row) {
+    const std::uint32_t size = paramTypeSize(row.type);
+    return row.offset + size <= image.bytes.size()
+               ? std::optional<std::string>(image.bytes.substr(row.offset, size))
+               : std::nullopt;
+}
+
+/// An existing parameter.
+ParamDescriptor rowOf(std::uint16_t number) {
+    ParamDescriptor row{};
+    std::int32_t index = 0;
+    lookupParam(number, index, row);
+    return row;
 }
 
 } // namespace
@@ -62,54 +73,42 @@ Image readImage() {
     ConfigStore store;
     store.init();
     const std::int32_t opened = store.open();
-    if (opened == 0) {
+    if (opened == STORE_OPENED) {
         image.bytes.assign(reinterpret_cast<const char*>(store.data), store.length);
     } else {
         // What opens and can't be measured, such as a folder, is no memory object either.
-        const bool isThere = opened == -1 || store.descriptor != -1;
+        const bool isThere = opened == STORE_NOT_MAPPED || store.descriptor != -1;
         image.reason = isThere ? Reason::imageNotMappable : Reason::imageMissing;
     }
     return image;
 }
 
 Origin paramOrigin(const Image& image, std::uint16_t number) {
-    ParamDescriptor row{};
-    std::int32_t index = 0;
-    lookupParam(number, index, row);
-    const std::uint32_t size = paramTypeSize(row.type);
-    const std::string name = "parameter " + std::to_string(number);
-    Origin origin{{image.reason}, "param." + std::to_string(number), name};
+    Origin origin{{image.reason}, kit::paramKey(number), DefaultStandsIn()};
     if (image.reason != Reason::fromImage) {
-        origin.detail += " counts as missing";
         return origin;
     }
-    if (row.offset + size > image.bytes.size()) {
+    const ParamDescriptor row = rowOf(number);
+    if (const std::optional<std::string> bytes = imageBytes(image, row)) {
+        origin.place = ImagePlace{row.offset, *bytes};
+    } else {
         origin.reasons = {Reason::imageTooShort};
-        origin.detail += ", image byte " + std::to_string(row.offset) + " of " +
-                         std::to_string(image.bytes.size());
-        return origin;
+        origin.place = BehindImage{row.offset, image.bytes.size()};
     }
-    origin.detail += bytesFrom(", image", row.offset, image.bytes.substr(row.offset, size));
     return origin;
 }
 
 Origin modelOrigin(const Image& image) {
     Origin origin = paramOrigin(image, MODEL_PARAM);
-    if (origin.reasons.front() == Reason::fromImage) {
-        ParamDescriptor row{};
-        std::int32_t index = 0;
-        lookupParam(MODEL_PARAM, index, row);
-        const auto code = static_cast<unsigned char>(image.bytes[row.offset]);
-        if (code == 0 || code > MODEL_CODE_COUNT) {
-            origin.reasons = {Reason::modelUnknown};
-        }
+    const auto* place = std::get_if<ImagePlace>(&origin.place);
+    if (place != nullptr && !hasModelName(static_cast<std::uint8_t>(place->bytes.front()))) {
+        origin.reasons = {Reason::modelUnknown};
     }
     return origin;
 }
 
 Origin serialOrigin() {
-    const std::string name = "record slot " + std::to_string(SERIAL_RECORD_SLOT);
-    Origin origin{{Reason::fromRecord}, "slot." + std::to_string(SERIAL_RECORD_SLOT), name};
+    Origin origin{{Reason::fromRecord}, kit::slotKey(SERIAL_RECORD_SLOT), NoPlace()};
     std::uint32_t size = 0;
     std::uint64_t offset = 0;
     recordSlotLayout(SERIAL_RECORD_SLOT, size, offset);
@@ -120,47 +119,46 @@ Origin serialOrigin() {
     }
     std::string record(size, '\0');
     readRecordSlot(SERIAL_RECORD_SLOT, record.data(), size);
-    if (record.front() == '\0') {
+    std::string serial;
+    getUnitSerial(serial);
+    if (serial.empty()) {
         origin.reasons = {Reason::serialBlank};
     }
-    origin.detail += bytesFrom(", disk", diskOffset(bytesBeforeEnd), record);
+    origin.place = DiskPlace{diskOffset(bytesBeforeEnd), record, {}};
     return origin;
 }
 
-TuningArea readTuningBlocks() {
+TuningArea readUnitTuning() {
     TuningArea area;
+    area.blocks = readTuningBlocks();
     if (const std::optional<Reason> trouble = diskTrouble(TUNING_AREA_START)) {
         area.reason = *trouble;
-        return area;
+    } else {
+        area.offset = diskOffset(TUNING_AREA_START);
     }
-    area.offset = diskOffset(TUNING_AREA_START);
-    readTuningArea(area.blocks.data(), DPS_AREA_SIZE);
     return area;
 }
 
 Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField& field) {
-    const std::string block = std::to_string(blockId);
-    Origin origin{{area.reason}, "tuning." + block + "." + field.key, "block " + block};
+    const auto id = static_cast<std::size_t>(blockId);
+    Origin origin{{area.reason}, kit::tuningFieldKey(id, field.key), DefaultStandsIn()};
     if (area.reason != Reason::fromTuningBlock) {
-        origin.detail += " counts as zeros";
         return origin;
     }
-    const DpsBlock& bytes = area.blocks.at(static_cast<std::size_t>(blockId));
-    if ((field.kind == DpsKind::switchWord &&
-         *qwaWord(qwaSwitchWords, decodeField(bytes, field, 0)) == '\0') ||
-        (field.kind == DpsKind::modeWord &&
-         *qwaWord(qwaModeWords, decodeField(bytes, field, 0)) == '\0')) {
+    const DpsBlock& block = area.blocks.at(id);
+    const bool isWord = field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord;
+    if (isWord && *fieldWord(field, decodeField(block, field, 0)) == '\0') {
         origin.reasons = {Reason::wordUnknown};
     }
     const std::size_t length = dpsElementSize(field.encoding) * field.count;
-    const std::string raw(reinterpret_cast<const char*>(bytes.bytes.data()) + field.offset, length);
-    const std::uint64_t start =
-        area.offset + static_cast<std::uint64_t>(blockId) * DPS_BLOCK_SIZE + field.offset;
-    origin.detail += bytesFrom(", disk", start, raw);
+    DiskPlace place;
+    place.offset = area.offset + id * DPS_BLOCK_SIZE + field.offset;
+    place.bytes.assign(block.bytes.begin() + field.offset,
+                       block.bytes.begin() + field.offset + static_cast<std::ptrdiff_t>(length));
     if (field.encoding == DpsEncoding::code2) {
-        origin.detail +=
-            ", bits " + std::to_string(field.bit) + " and " + std::to_string(field.bit + 1);
+        place.lowerBit = field.bit;
     }
+    origin.place = place;
     return origin;
 }
 

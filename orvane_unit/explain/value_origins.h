@@ -4,6 +4,7 @@
 // it is, and its raw form. All read the unit that the process has as its root.
 #pragma once
 
+#include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/reasons.h"
 #include "tuning/dps_block.h"
 
@@ -13,12 +14,6 @@
 #include <vector>
 
 namespace orvane::desk {
-
-struct Origin {
-    std::vector<Reason> reasons;
-    std::string key;    ///< as in `orvane-unit set`
-    std::string detail; ///< the raw value and its place
-};
 
 /// Why the disk can't be read at a place; nothing when it can.
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
@@ -36,19 +31,19 @@ Image readImage();
 
 Origin paramOrigin(const Image& image, std::uint16_t number);
 
-/// That of the model's name: an unknown code is a reason of its own.
+/// The origin of the model's name: an unknown code is a reason of its own.
 Origin modelOrigin(const Image& image);
 
 Origin serialOrigin();
 
-/// All tuning blocks, zeros where the disk can't be read.
+/// All tuning blocks as a run finds them.
 struct TuningArea {
     Reason reason = Reason::fromTuningBlock; ///< or why all is zero
     std::uint64_t offset = 0;                ///< on the disk, in bytes
     DpsArea blocks{};
 };
 
-TuningArea readTuningBlocks();
+TuningArea readUnitTuning();
 
 Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField& field);
 

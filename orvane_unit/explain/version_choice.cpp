@@ -4,129 +4,108 @@
 #include "identity/software_version.h"
 #include "orvane_unit/explain/reasons.h"
 
-#include <dirent.h>
-
 #include <algorithm>
 #include <cstdlib>
 #include <fstream>
-#include <memory>
-#include <utility>
 
 namespace orvane::desk {
 
 namespace {
 
-struct CloseFolder {
-    void operator()(DIR* folder) const { closedir(folder); }
-};
-
-/// The line that gives `key` its value: the last one, since later lines replace earlier ones.
-std::size_t lineOf(const std::string& path, const std::string& wanted) {
+/// The number of the line, from 1, that gives `key` the value that it has in the end; 0 when none
+/// does.
+std::size_t lineOf(const std::string& path, const std::string& key) {
     std::ifstream file(path);
-    std::string line;
-    std::string key;
-    std::string value;
+    Inf_Data record;
     std::size_t found = 0;
+    std::string line;
     for (std::size_t number = 1; std::getline(file, line); ++number) {
-        if (parseInfLine(line, key, value) && key == wanted) {
+        Inf_Data alone;
+        addInfLine(line, alone);
+        addInfLine(line, record);
+        if (alone.count(key) != 0 && infValue(alone, key) == infValue(record, key)) {
             found = number;
         }
     }
     return found;
 }
 
-Origin originOf(const VersionFiles& versions) {
-    if (!versions.hasFolder) {
-        return {{Reason::versionFolderMissing}, std::string("file.") + VERSION_DIR, VERSION_DIR};
-    }
-    if (!versions.chosen) {
-        return {{Reason::versionNoApplication},
-                std::string("file.") + VERSION_DIR,
-                std::to_string(versions.files.size()) + " version description files in " +
-                    VERSION_DIR};
-    }
-    const VersionFile& file = versions.files[*versions.chosen];
-    const std::size_t line = lineOf(file.path, VERSION_KEY);
-    Origin origin{{Reason::fromVersionFile}, "file." + file.path, file.path};
-    if (line != 0) {
-        origin.detail += ":" + std::to_string(line) + ": " + VERSION_KEY + " is \"" +
-                         infValue(file.record, VERSION_KEY) + "\"";
-    }
-    const std::string text = versionText(file.record);
-    if (text.empty()) {
-        origin.reasons = {Reason::versionNumberMissing};
-    } else if (text == "N/A") {
-        origin.reasons = {Reason::versionNotAvailable};
-    }
-    return origin;
+bool isNumeric(const std::string& component) {
+    char* end = nullptr;
+    std::strtol(component.c_str(), &end, 10);
+    return end != component.c_str();
 }
 
-/// The three texts of which the digits are made; fewer when the version has fewer.
-std::vector<std::string> components(const std::string& version) {
-    std::vector<std::string> parts;
-    std::string rest = version;
-    while (parts.size() < 3) {
-        const std::size_t end = rest.find(parts.size() < 2 ? '.' : '_');
-        parts.push_back(rest.substr(0, end));
-        if (end == std::string::npos) {
-            break;
-        }
-        rest.erase(0, end + 1);
-    }
-    return parts;
+bool fitsOneByte(const std::string& component) {
+    const std::int32_t number = componentNumber(component);
+    return number >= 0 && number <= 0xFF;
+}
+
+/// Whether a component that is put behind `version` would count.
+bool isIncomplete(const std::string& version) {
+    return formatVersion(version + COMPONENT_SEPARATOR + "1") !=
+           formatVersion(version + COMPONENT_SEPARATOR + "2");
 }
 
 } // namespace
 
 VersionFiles readVersionFiles() {
     VersionFiles versions;
-    const std::unique_ptr<DIR, CloseFolder> folder(opendir(VERSION_DIR));
-    if (folder == nullptr) {
-        return versions;
+    VersionFileListing listing;
+    versions.hasFolder = listing.isOpen();
+    std::vector<Inf_Data> records;
+    for (std::string path; listing.next(path);) {
+        records.emplace_back();
+        readInfFile(path, records.back());
+        versions.files.push_back({path, records.back(), isApplication(records.back())});
     }
-    versions.hasFolder = true;
-    while (const dirent* entry = readdir(folder.get())) {
-        VersionFile file{std::string(VERSION_DIR) + entry->d_name, {}, false};
-        if (isVersionFile(file.path)) {
-            readInfFile(file.path, file.record);
-            file.isApplication = isApplication(file.record);
-            if (file.isApplication && !versions.chosen) {
-                versions.chosen = versions.files.size();
-            }
-            versions.files.push_back(std::move(file));
-        }
+    const std::size_t chosen = chooseApplication(records);
+    if (chosen != records.size()) {
+        versions.chosen = chosen;
     }
     return versions;
 }
 
 Origin versionTextOrigin(const VersionFiles& versions) {
-    return originOf(versions);
+    if (!versions.hasFolder) {
+        return {{Reason::versionFolderMissing},
+                kit::fileKey(VERSION_DIR),
+                VersionFolderPlace{VERSION_DIR, {}}};
+    }
+    if (!versions.chosen) {
+        return {{Reason::versionNoApplication},
+                kit::fileKey(VERSION_DIR),
+                VersionFolderPlace{VERSION_DIR, versions.files.size()}};
+    }
+    const VersionFile& file = versions.files[*versions.chosen];
+    Origin origin{{Reason::fromVersionFile},
+                  kit::fileKey(file.path),
+                  VersionPlace{file.path, lineOf(file.path, VERSION_KEY), VERSION_KEY,
+                               infValue(file.record, VERSION_KEY)}};
+    const std::string text = versionText(file.record);
+    if (text.empty()) {
+        origin.reasons = {Reason::versionNumberMissing};
+    } else if (text == NO_VERSION) {
+        origin.reasons = {Reason::versionNotAvailable};
+    }
+    return origin;
 }
 
 Origin versionDigitsOrigin(const VersionFiles& versions) {
-    Origin origin = originOf(versions);
+    Origin origin = versionTextOrigin(versions);
     if (origin.reasons.front() != Reason::fromVersionFile) {
         return origin;
     }
-    const std::vector<std::string> parts =
-        components(versionText(versions.files[*versions.chosen].record));
-    const auto is = [&parts](const auto& test) {
-        return std::any_of(parts.begin(), parts.end(), test);
-    };
+    const std::string version = versionText(versions.files[*versions.chosen].record);
+    const VersionComponents components = versionComponents(version);
     std::vector<Reason> reasons;
-    if (parts.size() < 3) {
+    if (isIncomplete(version)) {
         reasons.push_back(Reason::versionIncomplete);
     }
-    if (is([](const std::string& part) {
-            char* end = nullptr;
-            return std::strtol(part.c_str(), &end, 10) == 0 && end == part.c_str();
-        })) {
+    if (!std::all_of(components.begin(), components.end(), isNumeric)) {
         reasons.push_back(Reason::versionNotNumeric);
     }
-    if (is([](const std::string& part) {
-            const long number = std::strtol(part.c_str(), nullptr, 10);
-            return number < 0 || number > 0xFF;
-        })) {
+    if (!std::all_of(components.begin(), components.end(), fitsOneByte)) {
         reasons.push_back(Reason::versionOutOfRange);
     }
     if (!reasons.empty()) {

@@ -4,7 +4,7 @@
 #pragma once
 
 #include "identity/inf_file.h"
-#include "orvane_unit/explain/value_origins.h"
+#include "orvane_unit/explain/explanation.h"
 
 #include <cstddef>
 #include <optional>
@@ -29,10 +29,10 @@ struct VersionFiles {
 
 VersionFiles readVersionFiles();
 
-/// That of the version as a text, in the two iAP2 files.
+/// The origin of the version as a text, in the two iAP2 files.
 Origin versionTextOrigin(const VersionFiles& versions);
 
-/// That of the six digits in the iAP1 file.
+/// The origin of the six digits in the iAP1 file.
 Origin versionDigitsOrigin(const VersionFiles& versions);
 
 } // namespace orvane::desk

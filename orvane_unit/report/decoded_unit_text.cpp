@@ -2,6 +2,7 @@
 #include "orvane_unit/report/decoded_unit_text.h"
 
 #include "config/param_catalogue.h"
+#include "config/record_slots.h"
 #include "identity/inf_file.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/sparse_content.h"
@@ -77,7 +78,7 @@ void printRecords(std::ostream& out, const Contents& contents) {
     for (const Slot& slot : contents.slots) {
         out << std::setw(4) << slot.number << std::setw(7) << slot.offset << std::setw(5)
             << slot.size << "  ";
-        if (slot.number == CRC_SLOT) {
+        if (slot.number == CRC_RECORD_SLOT) {
             out << "slots 1 to 9 once more";
         } else if (slot.bytes) {
             printBytes(out, *slot.bytes);
@@ -120,8 +121,7 @@ void printTuning(std::ostream& out, const Contents& contents) {
                 out << (element == 0 ? "" : ", ") << decodeField(block, field, element);
             }
             if (field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord) {
-                const auto& words = field.kind == DpsKind::modeWord ? qwaModeWords : qwaSwitchWords;
-                const std::string word = qwaWord(words, decodeField(block, field, 0));
+                const std::string word = fieldWord(field, decodeField(block, field, 0));
                 out << "  "
                     << painted(word.empty() ? Colour::bad : Colour::good,
                                word.empty() ? "no word" : word);
@@ -156,15 +156,15 @@ void printVersions(std::ostream& out, const Contents& contents) {
         << contents.versionDigits << '\n';
 }
 
-const char* kindName(Left kind) {
+const char* kindName(PathKind kind) {
     switch (kind) {
-    case Left::nothing:
+    case PathKind::nothing:
         return "missing";
-    case Left::file:
+    case PathKind::file:
         return "file";
-    case Left::folder:
+    case PathKind::folder:
         return "folder";
-    case Left::other:
+    case PathKind::other:
         return "device";
     }
     return "";
@@ -174,7 +174,7 @@ void printFiles(std::ostream& out, const Contents& contents) {
     for (const UnitFile& file : contents.files) {
         out << std::left << std::setw(52) << file.path << ' ' << std::setw(26) << file.role
             << std::right << ' ' << kindName(file.kind);
-        if (file.kind == Left::file) {
+        if (file.kind == PathKind::file) {
             out << ", " << kit::counted(file.size, "byte");
         }
         out << '\n';

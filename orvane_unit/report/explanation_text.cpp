@@ -3,15 +3,15 @@
 
 #include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/report/place_text.h"
 #include "orvane_unit/report/terminal.h"
 
 #include <algorithm>
 #include <cstddef>
-#include <iterator>
 #include <ostream>
 #include <set>
 #include <string>
-#include <utility>
+#include <variant>
 #include <vector>
 
 namespace orvane::desk {
@@ -21,13 +21,16 @@ namespace {
 /// Where the column of origins begins, at most.
 constexpr std::size_t WIDEST_LINE = 44;
 
-bool isBlock(const Line& line) {
-    return line.reasons.front() == Reason::fromTemplate ||
-           line.reasons.front() == Reason::fromStock;
+Reason firstReason(const Line& line) {
+    return line.origin.reasons.front();
+}
+
+bool isWholeFile(const Line& line) {
+    return std::holds_alternative<FilePlace>(line.origin.place);
 }
 
 std::string lineText(const Line& line) {
-    if (isBlock(line)) {
+    if (isWholeFile(line)) {
         const auto ends =
             static_cast<std::size_t>(std::count(line.text.begin(), line.text.end(), '\n'));
         const bool isOpen = !line.text.empty() && line.text.back() != '\n';
@@ -40,78 +43,75 @@ std::string lineText(const Line& line) {
     return kit::printable(line.text.substr(0, line.text.size() - 1)); // without its line end
 }
 
-/// A line's origin: the value's place, and a code where it is not as intended. What the code means
-/// is said once, and kept in `said`.
-std::string originText(const Line& line, std::set<Reason>& said) {
-    std::string text = line.detail;
-    for (const Reason reason : line.reasons) {
+/// What is printed beside a line: where its value stands, and the code of what is not as intended.
+/// What a code means is said once; `said` keeps which were.
+std::string originText(const Origin& origin, std::set<Reason>& said) {
+    std::string text = placeText(origin);
+    for (const Reason reason : origin.reasons) {
         const ReasonInfo& info = reasonInfo(reason);
         if (!info.isIntended) {
             text += (text.empty() ? "" : "; ") + std::string(info.code);
-            text += said.insert(reason).second ? std::string(": ") + info.sentence : "";
+            text += said.insert(reason).second ? ": " + info.sentence : "";
         }
     }
     return kit::printable(text);
 }
 
-/// Lines that say the same of themselves, such as a block of zeros, need saying it once.
-bool repeats(const Line& line, const Line& before) {
-    return line.reasons == before.reasons && line.detail == before.detail &&
-           !isIntended(line.reasons);
+bool saysTheSame(const Origin& one, const Origin& other) {
+    return one.reasons == other.reasons && placeText(one) == placeText(other);
 }
 
-/// Stands for the lines of a tuning block that are as they should be: 44 lines that all say the
-/// same.
-Line tuningSummary(const std::vector<Line>& lines) {
+/// A line of the report: the text of one or more lines of the output, and what is said of them.
+struct Row {
+    std::string text;
+    std::string origin;
+    bool isIntended = true;
+};
+
+/// The fields of a tuning block that are as they should be: 44 lines that all say the same.
+Row tuningRow(const kit::ValueKey& key, std::size_t count) {
+    return {"... " + kit::counted(count, "value"), holderText(key) + " of the boot disk", true};
+}
+
+/// The rows of all lines, or of those that have more to say than most.
+std::vector<Row> rowsOf(const std::vector<Line>& lines, bool showsAll) {
     const auto isField = [](const Line& line) {
-        return line.reasons.front() == Reason::fromTuningBlock;
+        return firstReason(line) == Reason::fromTuningBlock;
     };
-    const auto first = std::find_if(lines.begin(), lines.end(), isField);
-    if (first == lines.end()) {
-        return {"", {Reason::fixedText}, "", ""};
+    std::vector<Row> rows;
+    const auto field = std::find_if(lines.begin(), lines.end(), isField);
+    if (!showsAll && field != lines.end()) {
+        const auto count = std::count_if(lines.begin(), lines.end(), isField);
+        rows.push_back(tuningRow(field->origin.key, static_cast<std::size_t>(count)));
     }
-    const auto count = static_cast<std::size_t>(std::count_if(lines.begin(), lines.end(), isField));
-    const std::string block = first->key.substr(0, first->key.rfind('.'));
-    return {"... " + kit::counted(count, "value") + "\n", first->reasons, block,
-            first->detail.substr(0, first->detail.find(',')) + " of the boot disk"};
-}
-
-/// The lines to print: all, or those that have more to say than most.
-std::vector<Line> chosenLines(const std::vector<Line>& lines, bool showsAll) {
-    if (showsAll) {
-        return lines;
-    }
-    std::vector<Line> chosen;
-    const Line summary = tuningSummary(lines);
-    if (summary.reasons.front() == Reason::fromTuningBlock) {
-        chosen.push_back(summary);
-    }
-    std::copy_if(lines.begin(), lines.end(), std::back_inserter(chosen), [](const Line& line) {
-        return line.reasons.front() != Reason::fixedText &&
-               line.reasons.front() != Reason::fromTuningBlock;
-    });
-    return chosen;
-}
-
-void printLines(std::ostream& out, const std::vector<Line>& lines) {
-    std::size_t width = 0;
+    std::set<Reason> said;
+    const Origin* before = nullptr;
     for (const Line& line : lines) {
-        width = std::max(width, lineText(line).size());
+        if (!showsAll && (firstReason(line) == Reason::fixedText || isField(line))) {
+            continue;
+        }
+        const bool isGood = isIntended(line.origin.reasons);
+        // Lines that say the same of themselves, such as a block of zeros, need saying it once.
+        const bool isRepeated = !isGood && before != nullptr && saysTheSame(*before, line.origin);
+        rows.push_back({lineText(line), isRepeated ? "\"" : originText(line.origin, said), isGood});
+        before = &line.origin;
+    }
+    return rows;
+}
+
+void printRows(std::ostream& out, const std::vector<Row>& rows) {
+    std::size_t width = 0;
+    for (const Row& row : rows) {
+        width = std::max(width, row.text.size());
     }
     width = std::min(width, WIDEST_LINE);
-    const Line* before = nullptr;
-    std::set<Reason> said;
-    for (const Line& line : lines) {
-        const std::string text = lineText(line);
-        const std::string origin =
-            before != nullptr && repeats(line, *before) ? "\"" : originText(line, said);
-        out << "  " << text;
-        if (!origin.empty()) {
-            out << std::string(width > text.size() ? width - text.size() : 0, ' ') << "  "
-                << painted(isIntended(line.reasons) ? Colour::faint : Colour::bad, origin);
+    for (const Row& row : rows) {
+        out << "  " << row.text;
+        if (!row.origin.empty()) {
+            out << std::string(width > row.text.size() ? width - row.text.size() : 0, ' ') << "  "
+                << painted(row.isIntended ? Colour::faint : Colour::bad, row.origin);
         }
         out << '\n';
-        before = &line;
     }
 }
 
@@ -128,7 +128,7 @@ void printExplanation(std::ostream& out, const Explanation& explanation, bool sh
                     << reasonInfo(reason).sentence << '\n';
             }
         }
-        printLines(out, chosenLines(output.lines, showsAll));
+        printRows(out, rowsOf(output.lines, showsAll));
     }
 }
 

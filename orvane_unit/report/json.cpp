@@ -10,6 +10,7 @@
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
 #include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/report/place_text.h"
 #include "tuning/dps_block.h"
 
 #include <nlohmann/json.hpp>
@@ -62,15 +63,15 @@ Json codesJson(const std::vector<Reason>& reasons) {
     return codes;
 }
 
-const char* leftName(Left left) {
-    switch (left) {
-    case Left::nothing:
+const char* pathKindName(PathKind kind) {
+    switch (kind) {
+    case PathKind::nothing:
         return "nothing";
-    case Left::file:
+    case PathKind::file:
         return "file";
-    case Left::folder:
+    case PathKind::folder:
         return "folder";
-    case Left::other:
+    case PathKind::other:
         return "other";
     }
     return "";
@@ -78,9 +79,9 @@ const char* leftName(Left left) {
 
 Json lineJson(const Line& line) {
     return {{"text", bytesJson(line.text)},
-            {"reasons", codesJson(line.reasons)},
-            {"key", line.key.empty() ? Json() : bytesJson(line.key)},
-            {"detail", bytesJson(line.detail)}};
+            {"reasons", codesJson(line.origin.reasons)},
+            {"key", line.origin.key.isEmpty() ? Json() : bytesJson(keyText(line.origin.key))},
+            {"detail", bytesJson(placeText(line.origin))}};
 }
 
 Json paramsJson(const Contents& contents) {
@@ -130,8 +131,7 @@ Json fieldJson(const DpsBlock& block, const DpsField& field) {
     if (field.kind == DpsKind::number) {
         return value;
     }
-    const auto& words = field.kind == DpsKind::modeWord ? qwaModeWords : qwaSwitchWords;
-    return {{"code", value}, {"word", qwaWord(words, value)}};
+    return {{"code", value}, {"word", fieldWord(field, value)}};
 }
 
 Json tuningJson(const Contents& contents) {
@@ -170,7 +170,7 @@ Json filesJson(const Contents& contents) {
     for (const UnitFile& file : contents.files) {
         files.push_back({{"path", file.path},
                          {"role", file.role},
-                         {"kind", leftName(file.kind)},
+                         {"kind", pathKindName(file.kind)},
                          {"size", file.size}});
     }
     return files;
@@ -209,9 +209,10 @@ std::string explanationJson(const std::string& root, const std::string& letters,
                       {"isIntended", isIntended(output)},
                       {"reasons", codesJson(output.reasons)},
                       {"lines", lines},
-                      {"left", leftName(output.left)}};
+                      {"left", pathKindName(output.kindAfter)}};
         if (hasContent) {
-            entry["content"] = output.left == Left::file ? bytesJson(output.content) : Json();
+            entry["content"] =
+                output.kindAfter == PathKind::file ? bytesJson(output.contentAfter) : Json();
         }
         json["outputs"].push_back(entry);
     }

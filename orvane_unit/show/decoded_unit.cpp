@@ -11,10 +11,8 @@
 #include "kit/description/unit_description.h"
 #include "kit/enter/root.h"
 #include "kit/host/sparse_content.h"
+#include "main/unit_files.h"
 #include "tuning/audio_profile.h"
-#include "writers/airplay_writer.h"
-#include "writers/iap_writer.h"
-#include "writers/template_merge.h"
 
 #include <sys/stat.h>
 
@@ -30,9 +28,24 @@ std::string textBy(void (*lookup)(std::string&)) {
     return text;
 }
 
+std::string profileMeaning(std::int32_t profile) {
+    if (profile == NO_AUDIO_PROFILE) {
+        return "no audio profile";
+    }
+    std::string meaning = "audio profile " + std::to_string(profile);
+    if (asksForTuning(profile)) {
+        meaning += ", generated from tuning blocks ";
+        const char* separator = "";
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            meaning += separator + std::to_string(output.blockId);
+            separator = " and ";
+        }
+    }
+    return meaning;
+}
+
 /// What the tool makes of parameter `number` of this unit.
 std::string meaningOf(std::uint16_t number) {
-    std::uint16_t profile = 0;
     switch (number) {
     case RIGHT_HAND_DRIVE_PARAM:
         return "rightHandDrive " + std::to_string(getRightHandDrive());
@@ -41,11 +54,7 @@ std::string meaningOf(std::uint16_t number) {
     case FUEL_TYPE_PARAM:
         return "fuel type " + textBy(getFuelType) + ", which is written nowhere";
     case AUDIO_PROFILE_PARAM:
-        if (!readAudioProfile(profile)) {
-            return "no audio profile";
-        }
-        return "audio profile " + std::to_string(profile) +
-               (profile == AUDIO_PROFILE_GENERATED ? ", generated from tuning blocks 3 and 2" : "");
+        return profileMeaning(readAudioProfile());
     case MODEL_PARAM:
         return "model " + textBy(getModelName);
     default:
@@ -85,7 +94,7 @@ void readRecords(Contents& contents) {
         std::string bytes(slot.size, '\0');
         if (readRecordSlot(number, bytes.data(), slot.size) == 0) {
             slot.bytes = bytes;
-            isBlank = number == CRC_SLOT ? kit::withoutEndZeros(bytes).empty() : isBlank;
+            isBlank = number == CRC_RECORD_SLOT ? kit::withoutEndZeros(bytes).empty() : isBlank;
         }
         contents.slots.push_back(std::move(slot));
     }
@@ -105,15 +114,15 @@ void readRecords(Contents& contents) {
 }
 
 UnitFile look(const std::string& path, const char* role) {
-    UnitFile file{path, role, Left::nothing, 0};
+    UnitFile file{path, role, PathKind::nothing, 0};
     struct stat state {};
     if (::stat(path.c_str(), &state) != 0) {
         return file;
     }
-    file.kind = S_ISREG(state.st_mode)   ? Left::file
-                : S_ISDIR(state.st_mode) ? Left::folder
-                                         : Left::other;
-    file.size = file.kind == Left::file ? static_cast<std::uint64_t>(state.st_size) : 0;
+    file.kind = S_ISREG(state.st_mode)   ? PathKind::file
+                : S_ISDIR(state.st_mode) ? PathKind::folder
+                                         : PathKind::other;
+    file.size = file.kind == PathKind::file ? static_cast<std::uint64_t>(state.st_size) : 0;
     return file;
 }
 
@@ -121,16 +130,16 @@ std::vector<UnitFile> lookAtFiles() {
     std::vector<UnitFile> files = {look(CONFIG_SHM_NAME, "configuration image"),
                                    look(BOOT_DISK, "boot disk"),
                                    look(VERSION_DIR, "version description files")};
-    const AccessoryFile accessoryFiles[] = {AIRPLAY_FILE, IAP2_DEVICE_FILE, IAP2_FILE, IAP1_FILE};
-    for (const AccessoryFile& file : accessoryFiles) {
+    for (const AccessoryFile& file : ACCESSORY_FILES) {
         files.push_back(look(file.templateFile, "template"));
         files.push_back(look(file.stockFile, "stock file"));
     }
-    for (const AccessoryFile& file : accessoryFiles) {
+    for (const AccessoryFile& file : ACCESSORY_FILES) {
         files.push_back(look(file.output, "output"));
     }
-    files.push_back(look(TELEPHONY_TUNING_FILE, "output"));
-    files.push_back(look(SPEECHREC_TUNING_FILE, "output"));
+    for (const TuningOutput& output : TUNING_OUTPUTS) {
+        files.push_back(look(output.path, "output"));
+    }
     return files;
 }
 
@@ -158,7 +167,7 @@ Contents readContents(const std::filesystem::path& root) {
     contents.diskSize = diskSize();
     contents.diskTrouble = diskTrouble(RECORD_AREA_SIZE);
     readRecords(contents);
-    contents.tuning = readTuningBlocks();
+    contents.tuning = readUnitTuning();
     contents.versions = readVersionFiles();
     contents.version = findApplicationVersion();
     contents.versionDigits = softwareVersion();

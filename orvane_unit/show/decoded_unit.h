@@ -17,9 +17,6 @@
 
 namespace orvane::desk {
 
-/// Slots 1 to 9 once more, as the block that the CRC is taken over.
-constexpr std::uint32_t CRC_SLOT = 15;
-
 struct Param {
     ParamDescriptor row{};
     std::uint32_t size = 0;           ///< bytes
@@ -48,7 +45,7 @@ const char* crcVerdictName(CrcVerdict verdict);
 struct UnitFile {
     std::string path;
     std::string role; ///< "template", "stock", "output", ...
-    Left kind = Left::nothing;
+    PathKind kind = PathKind::nothing;
     std::uint64_t size = 0; ///< bytes, of a file
 };
 

@@ -44,7 +44,7 @@ std::int32_t ConfigStore::open() {
 
     const int opened = platform::openSharedMemory(CONFIG_SHM_NAME, O_RDONLY, SHM_MODE);
     if (opened == -1) {
-        return -2;
+        return STORE_NOT_FOUND;
     }
     lseek(opened, 0, SEEK_SET);
     const off_t size = lseek(opened, 0, SEEK_END);
@@ -52,7 +52,7 @@ std::int32_t ConfigStore::open() {
     // Before the size is tested, so that an object that can't be measured is still closed by close.
     descriptor = opened;
     if (size < 0) {
-        return -2;
+        return STORE_NOT_FOUND;
     }
     const auto bytes = static_cast<std::size_t>(size);
     void* const mapped = mmap(nullptr, bytes, PROT_READ, MAP_PRIVATE, descriptor, 0);
@@ -62,10 +62,10 @@ std::int32_t ConfigStore::open() {
     // to read, so a length of 0 counts as one that can't be mapped, whatever mmap says.
     if (bytes == 0 || mapped == MAP_FAILED) {
         close();
-        return -1;
+        return STORE_NOT_MAPPED;
     }
     length = static_cast<std::uint32_t>(size);
-    return 0;
+    return STORE_OPENED;
 }
 
 void ConfigStore::close() {

@@ -22,6 +22,13 @@ constexpr char CAL_FILE_NAME[] = "cal_active.bin";
 using CalibrationPath = std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME>;
 CalibrationPath composeCalibrationPath();
 
+/// What ConfigStore::open answers.
+enum ConfigStoreResult : std::int32_t {
+    STORE_OPENED = 0,
+    STORE_NOT_MAPPED = -1, ///< the object is there, and can't be mapped
+    STORE_NOT_FOUND = -2,  ///< the object can't be opened, or not measured
+};
+
 /// The handle on the mapped image: init, open, one getter, close. It owns descriptor and mapping.
 struct ConfigStore {
     std::int32_t descriptor = -1;       ///< of the shared-memory object; -1 when closed
@@ -37,9 +44,10 @@ struct ConfigStore {
     void init();
 
     /// Maps the object as it stands; nothing in it is validated.
-    /// 0: open. -2: the object can't be opened (handle untouched) or not measured (the descriptor
-    /// stays in the handle until close). -1: it can't be mapped, an empty object included; the
-    /// handle is closed. An open handle must not be opened again: what it held would leak.
+    /// Returns a ConfigStoreResult. STORE_NOT_FOUND: the object can't be opened (handle untouched)
+    /// or not measured (the descriptor stays in the handle until close). STORE_NOT_MAPPED, for an
+    /// empty object, too: the handle is closed. An open handle must not be opened again: what it
+    /// held would leak.
     std::int32_t open();
 
     /// Releases what is held. Safe on a closed handle and safe to repeat. `length` keeps its value.

@@ -61,7 +61,7 @@ ParamStatus getParamU16(const ConfigStore& store, std::uint16_t number, std::uin
 
 std::int32_t readAllParams(ConfigStore& store, std::uint16_t* values, std::uint32_t count) {
     const std::int32_t opened = store.open();
-    if (opened != 0) {
+    if (opened != STORE_OPENED) {
         return opened;
     }
     ParamStatus status = PARAM_OK;

@@ -19,11 +19,13 @@ constexpr std::uint32_t TUNING_AREA_SIZE = 4096;
 static_assert(RECORD_AREA_SIZE - AUX_AREA_START == 3072, "begins 3072 bytes past the base");
 static_assert(RECORD_AREA_SIZE - TUNING_AREA_START == 4096, "begins 4096 bytes past the base");
 
-/// The CRC is taken over slot 15, which begins one byte past the base.
+/// The CRC is taken over CRC_RECORD_SLOT, which begins one byte past the base.
 constexpr std::int64_t CRC_RANGE_START = 0xFFFFF;
 static_assert(RECORD_AREA_SIZE - CRC_RANGE_START == 1, "begins one byte past the base");
 
 constexpr std::uint32_t RECORD_SLOT_COUNT = 18;
+/// Slots 1 to 9 once more as one block, which the CRC is taken over.
+constexpr std::uint32_t CRC_RECORD_SLOT = 15;
 /// The longest slot, slot 15, in bytes.
 constexpr std::uint32_t RECORD_SLOT_MAX_SIZE = 136;
 /// What stands for "no offset" in the output of recordSlotLayout.

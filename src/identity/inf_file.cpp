@@ -18,15 +18,19 @@ bool parseInfLine(const std::string& line, std::string& key, std::string& value)
     return true;
 }
 
+void addInfLine(const std::string& line, Inf_Data& record) {
+    std::string key;
+    std::string value;
+    if (parseInfLine(line, key, value)) {
+        record[key] = value;
+    }
+}
+
 void readInfFile(const std::string& path, Inf_Data& record) {
     std::ifstream file(path);
     std::string line;
-    std::string key;
-    std::string value;
     while (std::getline(file, line)) {
-        if (parseInfLine(line, key, value)) {
-            record[key] = value;
-        }
+        addInfLine(line, record);
     }
 }
 

@@ -15,9 +15,12 @@ using Inf_Data = std::map<std::string, std::string>;
 /// without "=" or with nothing behind it. A carriage return at its end belongs to the value.
 bool parseInfLine(const std::string& line, std::string& key, std::string& value);
 
-/// Adds the lines of the file at `path` to `record`; a later line replaces an earlier one of the
-/// same key. A line that parseInfLine refuses is skipped. A file that can't be opened or read
-/// adds nothing.
+/// Adds a line to `record`; it replaces an earlier one of the same key. A line that parseInfLine
+/// refuses is skipped.
+void addInfLine(const std::string& line, Inf_Data& record);
+
+/// Adds the lines of the file at `path` to `record`, one after the other. A file that can't be
+/// opened or read adds nothing.
 void readInfFile(const std::string& path, Inf_Data& record);
 
 /// The value of `key` in `record`, or the empty string.

@@ -55,4 +55,8 @@ constexpr std::array<const char*, MODEL_CODE_COUNT> ModelNameTable = {{
 }};
 // clang-format on
 
+bool hasModelName(std::uint8_t code) {
+    return code >= 1 && code <= MODEL_CODE_COUNT;
+}
+
 } // namespace orvane

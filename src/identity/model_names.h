@@ -5,6 +5,7 @@
 
 #include <array>
 #include <cstddef>
+#include <cstdint>
 
 namespace orvane {
 
@@ -13,5 +14,8 @@ constexpr std::size_t MODEL_CODE_COUNT = 47;
 
 /// By model code - 1: the brand word, a blank, the model; 7 to 20 characters of ASCII.
 extern const std::array<const char*, MODEL_CODE_COUNT> ModelNameTable;
+
+/// Whether `code` is one of the codes that have a name.
+bool hasModelName(std::uint8_t code);
 
 } // namespace orvane

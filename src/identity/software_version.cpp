@@ -1,47 +1,30 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/software_version.h"
 
-#include <dirent.h>
-
 #include <algorithm>
-#include <cstdint>
 #include <cstdlib>
 #include <limits>
-#include <memory>
 #include <utility>
-#include <vector>
 
 namespace orvane {
 
 namespace {
 
 constexpr char INF_MARKER[] = ".inf";
-constexpr char APPLICATION_TYPE[] = "Application";
-constexpr char NO_VERSION[] = "N/A";
-constexpr char COMPONENT_SEPARATOR = '.';
 constexpr char AFFIX_SEPARATOR = '_';
 
 /// The records of the last scan, in listing order. They live as long as the process; each scan
 /// empties them first.
 std::vector<Inf_Data> InfRecords; // NOLINT(*-non-const-global-variables)
 
-struct CloseFolder {
-    void operator()(DIR* folder) const { closedir(folder); }
-};
-
 void scanVersionFiles() {
     InfRecords.clear();
-    const std::unique_ptr<DIR, CloseFolder> folder(opendir(VERSION_DIR));
-    if (folder == nullptr) {
-        return;
-    }
-    while (const dirent* entry = readdir(folder.get())) {
-        const std::string path = std::string(VERSION_DIR) + entry->d_name;
-        if (isVersionFile(path)) {
-            Inf_Data record;
-            readInfFile(path, record);
-            InfRecords.push_back(std::move(record));
-        }
+    VersionFileListing files;
+    std::string path;
+    while (files.next(path)) {
+        Inf_Data record;
+        readInfFile(path, record);
+        InfRecords.push_back(std::move(record));
     }
 }
 
@@ -63,9 +46,33 @@ bool isVersionFile(const std::string& path) {
     return path.find(INF_MARKER) != std::string::npos;
 }
 
+VersionFileListing::VersionFileListing() : folder_(opendir(VERSION_DIR)) {}
+
+VersionFileListing::~VersionFileListing() {
+    if (isOpen()) {
+        closedir(folder_);
+    }
+}
+
+bool VersionFileListing::next(std::string& path) {
+    const dirent* entry = nullptr;
+    while (isOpen() && (entry = readdir(folder_)) != nullptr) {
+        path = std::string(VERSION_DIR) + entry->d_name;
+        if (isVersionFile(path)) {
+            return true;
+        }
+    }
+    return false;
+}
+
 bool isApplication(const Inf_Data& record) {
     // A substring test, on purpose: a type of MainApplication is taken, too.
     return infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos;
+}
+
+std::size_t chooseApplication(const std::vector<Inf_Data>& records) {
+    const auto application = std::find_if(records.begin(), records.end(), isApplication);
+    return static_cast<std::size_t>(application - records.begin());
 }
 
 std::string versionText(const Inf_Data& record) {
@@ -83,8 +90,9 @@ std::string softwareVersion() {
 std::string findApplicationVersion() {
     try {
         scanVersionFiles();
-        const auto application = std::find_if(InfRecords.begin(), InfRecords.end(), isApplication);
-        return application == InfRecords.end() ? std::string() : versionText(*application);
+        const std::size_t application = chooseApplication(InfRecords);
+        return application == InfRecords.size() ? std::string()
+                                                : versionText(InfRecords[application]);
     } catch (...) {
         return {}; // files that memory can't hold are files that can't be read
     }
@@ -94,22 +102,32 @@ std::string formatVersion(const std::string& text) {
     if (text.empty() || text == NO_VERSION) {
         return DEFAULT_SOFTWARE_VERSION;
     }
+    const VersionComponents components = versionComponents(text);
+    return formatVersionByte(components[0]) + formatVersionByte(components[1]) +
+           formatVersionByte(components[2]);
+}
+
+VersionComponents versionComponents(const std::string& text) {
     // `after` gives the whole text again when there is no separator left: so a missing component
     // repeats the one before it, on purpose.
     const std::string fromSecond = after(text, COMPONENT_SEPARATOR);
     const std::string fromThird = after(fromSecond, COMPONENT_SEPARATOR);
-    return formatVersionByte(before(text, COMPONENT_SEPARATOR)) +
-           formatVersionByte(before(fromSecond, COMPONENT_SEPARATOR)) +
-           formatVersionByte(before(fromThird, AFFIX_SEPARATOR));
+    return {{before(text, COMPONENT_SEPARATOR), before(fromSecond, COMPONENT_SEPARATOR),
+             before(fromThird, AFFIX_SEPARATOR)}};
+}
+
+std::int32_t componentNumber(const std::string& component) {
+    using Limits = std::numeric_limits<std::int32_t>;
+    // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
+    const long nearest = std::strtol(component.c_str(), nullptr, 10);
+    return static_cast<std::int32_t>(
+        std::min<long>(std::max<long>(nearest, Limits::min()), Limits::max()));
 }
 
 std::string formatVersionByte(const std::string& component) {
-    using Limits = std::numeric_limits<std::int32_t>;
     constexpr char HEX_DIGITS[] = "0123456789abcdef";
-    // strtol reads what a formatted extraction reads, and gives the nearest long when out of range.
-    const long nearest = std::strtol(component.c_str(), nullptr, 10);
-    const long number = std::min<long>(std::max<long>(nearest, Limits::min()), Limits::max());
-    auto value = static_cast<std::uint32_t>(number % 256); // keeps the dividend's sign
+    // The remainder keeps the dividend's sign.
+    auto value = static_cast<std::uint32_t>(componentNumber(component) % 256);
     std::string hex;
     do {
         hex.insert(hex.begin(), HEX_DIGITS[value % 16]);

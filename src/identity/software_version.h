@@ -5,7 +5,13 @@
 
 #include "identity/inf_file.h"
 
+#include <dirent.h>
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
 #include <string>
+#include <vector>
 
 namespace orvane {
 
@@ -16,14 +22,43 @@ constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 constexpr char TYPE_KEY[] = "Type";
 constexpr char VERSION_KEY[] = "Version Number";
 
+/// What stands in the "Type" of the application, and for a version that there is none of.
+constexpr char APPLICATION_TYPE[] = "Application";
+constexpr char NO_VERSION[] = "N/A";
+
+/// Between the components of a version.
+constexpr char COMPONENT_SEPARATOR = '.';
+
 /// What softwareVersion gives when there is no usable version.
 constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 
 /// Whether the file at `path` is a version description file: ".inf" may stand anywhere in it.
 bool isVersionFile(const std::string& path);
 
+/// The version description files of VERSION_DIR, one by one in the order of the directory listing.
+class VersionFileListing {
+public:
+    VersionFileListing();
+    ~VersionFileListing();
+    VersionFileListing(const VersionFileListing&) = delete;
+    VersionFileListing& operator=(const VersionFileListing&) = delete;
+
+    /// Whether there is such a folder.
+    bool isOpen() const { return folder_ != nullptr; }
+
+    /// Sets `path` to the next file. False at the end, and at once without a folder; `path` is then
+    /// unspecified.
+    bool next(std::string& path);
+
+private:
+    DIR* folder_;
+};
+
 /// Whether `record` describes the application: its "Type" contains "Application".
 bool isApplication(const Inf_Data& record);
+
+/// The place in `records` of the application: the first; records.size() when there is none.
+std::size_t chooseApplication(const std::vector<Inf_Data>& records);
 
 /// The "Version Number" of `record` behind its first "_", or all of it when it has none; the empty
 /// string when there is none.
@@ -38,13 +73,20 @@ std::string softwareVersion();
 /// memory runs out.
 std::string findApplicationVersion();
 
-/// The first three components of a version text, two hexadecimal digits each; "000000" for an empty
-/// text and for "N/A". A missing component repeats the one before it: "1.2" gives "010202".
+/// The versionComponents of a version text, two hexadecimal digits each; "000000" for an empty text
+/// and for "N/A". "1.2" gives "010202".
 std::string formatVersion(const std::string& text);
 
-/// The decimal number at the start of `component`, 0 if there is none, modulo 256 in lower-case
-/// hexadecimal of at least two digits. The remainder keeps the sign: "-1" gives "ffffffff". A
-/// number past the range of a 32-bit integer counts as the nearest one in it.
+/// The first three components of a version text. A missing one repeats the one before it.
+using VersionComponents = std::array<std::string, 3>;
+VersionComponents versionComponents(const std::string& text);
+
+/// The decimal number at the start of `component`; 0 if there is none. A number past the range of a
+/// 32-bit integer counts as the nearest one in it.
+std::int32_t componentNumber(const std::string& component);
+
+/// The number of `component` modulo 256 in lower-case hexadecimal of at least two digits. The
+/// remainder keeps the sign: "-1" gives "ffffffff".
 std::string formatVersionByte(const std::string& component);
 
 } // namespace orvane

@@ -19,7 +19,7 @@ std::uint8_t paramOrZero(std::uint16_t number) {
     std::uint8_t value = 0;
     ConfigStore store;
     store.init();
-    if (store.open() == 0) {
+    if (store.open() == STORE_OPENED) {
         getParamU8(store, number, &value); // leaves 0 when it fails
         store.close();
     }
@@ -56,9 +56,8 @@ void getFuelType(std::string& fuelType) {
 
 void getModelName(std::string& model) {
     const std::uint8_t code = paramOrZero(MODEL_PARAM);
-    const bool hasName = code >= 1 && code <= MODEL_CODE_COUNT;
     try {
-        model = hasName ? ModelNameTable[code - 1U] : MODEL_NAME_FALLBACK;
+        model = hasModelName(code) ? ModelNameTable[code - 1U] : MODEL_NAME_FALLBACK;
     } catch (...) {
         model = MODEL_NAME_FALLBACK; // so short that most libraries need no memory
     }

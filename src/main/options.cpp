@@ -11,7 +11,7 @@ namespace {
 
 /// Runs one writer. All that can come out of one is that memory ran out where no default stands in:
 /// the writer ends there, as silently as after any other failure, and the next option runs.
-void run(int (*writer)()) {
+void run(Writer writer) {
     try {
         writer();
     } catch (...) { // NOLINT(bugprone-empty-catch) GCOVR_EXCL_LINE
@@ -22,15 +22,19 @@ void run(int (*writer)()) {
 
 } // namespace
 
+Writer writerOf(int letter) {
+    if (letter == AIRPLAY_OPTION) {
+        return updateAirplayConfigFile;
+    }
+    return letter == IAP_OPTION ? updateIapConfigFiles : nullptr;
+}
+
 int runOptions(int argc, char* const argv[]) {
-    constexpr char OPTION_LETTERS[] = "ia";
     constexpr int END_OF_OPTIONS = -1;
     int letter = END_OF_OPTIONS;
     while ((letter = platform::nextOption(argc, argv, OPTION_LETTERS)) != END_OF_OPTIONS) {
-        if (letter == 'a') {
-            run(updateAirplayConfigFile);
-        } else if (letter == 'i') {
-            run(updateIapConfigFiles);
+        if (const Writer writer = writerOf(letter)) {
+            run(writer);
         }
     }
     return 0;

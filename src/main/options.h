@@ -3,9 +3,18 @@
 
 namespace orvane {
 
-/// Runs a writer for every option letter, in command-line order: 'a' the AirPlay writer, 'i' the
-/// iAP writer. Other letters are left to the C library's own diagnostic. Always returns 0, whatever
-/// the writers do.
+constexpr char IAP_OPTION = 'i';
+constexpr char AIRPLAY_OPTION = 'a';
+constexpr char OPTION_LETTERS[] = {IAP_OPTION, AIRPLAY_OPTION, '\0'};
+
+/// Writes the files of one option.
+using Writer = int (*)();
+
+/// The writer of an option letter; null for any other letter.
+Writer writerOf(int letter);
+
+/// Runs the writer of every option letter, in command-line order. Other letters are left to the C
+/// library's own diagnostic. Always returns 0, whatever the writers do.
 int runOptions(int argc, char* const argv[]);
 
 } // namespace orvane

@@ -92,4 +92,12 @@ const char* qwaWord(const std::array<QwaWord, 3>& words, std::int32_t code) {
     return "";
 }
 
+const std::array<QwaWord, 3>& fieldWords(const DpsField& field) {
+    return field.kind == DpsKind::modeWord ? qwaModeWords : qwaSwitchWords;
+}
+
+const char* fieldWord(const DpsField& field, std::int32_t code) {
+    return qwaWord(fieldWords(field), code);
+}
+
 } // namespace orvane

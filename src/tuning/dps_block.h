@@ -80,4 +80,10 @@ extern const std::array<QwaWord, 3> qwaModeWords;
 /// The word for `code`, or the empty text when there is none.
 const char* qwaWord(const std::array<QwaWord, 3>& words, std::int32_t code);
 
+/// The words of `field`, a switch or a mode.
+const std::array<QwaWord, 3>& fieldWords(const DpsField& field);
+
+/// The word that a tuning file has for `code` in `field`, a switch or a mode; empty as above.
+const char* fieldWord(const DpsField& field, std::int32_t code);
+
 } // namespace orvane

@@ -56,34 +56,46 @@ void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {
     if (field.kind == DpsKind::number) {
         append(line, value);
     } else {
-        const bool isMode = field.kind == DpsKind::modeWord;
-        append(line, qwaWord(isMode ? qwaModeWords : qwaSwitchWords, value));
+        append(line, fieldWord(field, value));
     }
 }
 
 } // namespace
 
+bool isTuningBlock(std::int32_t blockId) {
+    return blockId >= 0 && blockId < DPS_BLOCK_COUNT;
+}
+
+DpsArea readTuningBlocks() {
+    DpsArea area{};
+    readTuningArea(area.data(),
+                   sizeof area); // the result is not looked at: what can't be read stays zero
+    return area;
+}
+
+void writeTuningLine(std::ostream& file, const DpsField& field, const DpsBlock& block) {
+    Line line; // NOLINT(*-member-init): written before it is read
+    line.length = 0;
+    append(line, field.key);
+    append(line, ' ');
+    appendValue(line, block, field);
+    append(line, '\n');
+    file.write(line.text.data(), static_cast<std::streamsize>(line.length)).flush();
+}
+
 void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block) {
     // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
     file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
-    Line line{};
     for (const DpsField& field : DPS_LAYOUT) {
-        line.length = 0;
-        append(line, field.key);
-        append(line, ' ');
-        appendValue(line, block, field);
-        append(line, '\n');
-        file.write(line.text.data(), static_cast<std::streamsize>(line.length)).flush();
+        writeTuningLine(file, field, block);
     }
 }
 
 void generateTuningFile(std::int32_t blockId, const std::string& path) {
-    if (blockId < 0 || blockId >= DPS_BLOCK_COUNT) {
+    if (!isTuningBlock(blockId)) {
         return;
     }
-    // Read before the file is opened, and the result not looked at: what can't be read stays zero.
-    DpsArea area{};
-    readTuningArea(area.data(), sizeof area);
+    const DpsArea area = readTuningBlocks(); // before the file is opened
 
     // Longer than any line. A library that takes it needs no memory to open the file.
     constexpr std::streamsize BUFFER_SIZE = 512; // bytes

@@ -7,6 +7,12 @@
 
 namespace orvane {
 
+void readVehicleValues(AirplayValues& values) {
+    getModelName(values.model);
+    getBrandName(values.brand);
+    values.rightHandDrive = getRightHandDrive();
+}
+
 void writeAirplayHead(std::ostream& file, const AirplayValues& values) {
     file << "# Default name of the accessory if a name is not specified in the user prefs.\n";
     file << "name = CarPlay\n\n";
@@ -32,21 +38,24 @@ void writeAirplayHead(std::ostream& file, const AirplayValues& values) {
          << std::endl;
 }
 
+MergeDecision generateAirplayFile(std::istream& templateFile, std::ostream& output,
+                                  const AirplayValues& values) {
+    const MergeDecision decision = decideMerge(templateFile, output);
+    if (decision == MergeDecision::generate) {
+        writeAirplayHead(output, values);
+        copyBytes(templateFile, output);
+    }
+    return decision;
+}
+
 int updateAirplayConfigFile() {
     AirplayValues values;
-    getModelName(values.model);
-    getBrandName(values.brand);
-    values.rightHandDrive = getRightHandDrive();
+    readVehicleValues(values);
     values.audioProfile = getAudioProfile();
 
-    TemplateMerge merge(AIRPLAY_FILE);
-    if (!merge.canGenerate()) {
-        installStockFile(AIRPLAY_FILE);
-        return 0;
-    }
-    writeAirplayHead(merge.output, values);
-    merge.copyTemplate();
-    merge.close();
+    TemplateMerge merge;
+    merge.open(AIRPLAY_FILE);
+    merge.finish(AIRPLAY_FILE, generateAirplayFile(merge.templateFile, merge.output, values));
     return 0;
 }
 

@@ -24,8 +24,15 @@ struct AirplayValues {
     std::int32_t audioProfile = NO_AUDIO_PROFILE; ///< NO_AUDIO_PROFILE leaves its lines out
 };
 
+/// Reads everything but the audio profile, whose reading may write files of its own.
+void readVehicleValues(AirplayValues& values);
+
 /// Writes the generated head, which comes before the template.
 void writeAirplayHead(std::ostream& file, const AirplayValues& values);
+
+/// Writes the head and the template to `output`, if that is the decision; else nothing.
+MergeDecision generateAirplayFile(std::istream& templateFile, std::ostream& output,
+                                  const AirplayValues& values);
 
 /// Writes AIRPLAY_FILE: a generated head, then the template; or the stock file. With a generated
 /// audio profile the two tuning files come first (tuning/audio_profile.h). Always returns 0.

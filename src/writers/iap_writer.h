@@ -3,6 +3,8 @@
 
 #include "writers/template_merge.h"
 
+#include <array>
+#include <cstddef>
 #include <iosfwd>
 #include <string>
 
@@ -34,15 +36,34 @@ struct IapValues {
     std::string firmwareVersion; ///< a text in the two iAP2 files, six digits in the iAP1 file
 };
 
-/// Writes the generated head of IAP2_DEVICE_FILE and IAP2_FILE, and that of IAP1_FILE.
-void writeIap2Head(std::ostream& file, const IapValues& values);
-void writeIap1Head(std::ostream& file, const IapValues& values);
+/// One of the three files on its way.
+struct IapStage {
+    AccessoryFile file;
 
-/// What follows the template in IAP2_DEVICE_FILE.
-constexpr char IAP2_DEVICE_END[] = "\n[vehicle]\nenable=no\n\n";
+    /// Whether the values carry the six digits of the version from this stage on.
+    bool hasVersionDigits;
 
-/// Writes IAP2_DEVICE_FILE, IAP2_FILE and IAP1_FILE, in this order, each generated or replaced by
-/// its stock file. A stage that fails stops no later one. Always returns 0.
+    /// Writes the generated lines and the template to `output`, if that is the decision; else
+    /// nothing. `iap2Output` is the output of IAP2_FILE.
+    MergeDecision (*generate)(std::istream& templateFile, std::ostream& output,
+                              const std::ios& iap2Output, const IapValues& values);
+};
+
+constexpr std::size_t IAP_STAGE_COUNT = 3;
+/// The place of IAP2_FILE among the stages.
+constexpr std::size_t IAP2_STAGE = 1;
+
+/// The stages in their order.
+extern const std::array<IapStage, IAP_STAGE_COUNT> IAP_STAGES;
+
+/// Reads the values of the first stage.
+void readIapValues(IapValues& values);
+
+/// Makes the values of `stage` out of those of the stage before.
+void changeIapValues(const IapStage& stage, IapValues& values);
+
+/// Takes IAP_STAGES in their order: opens each file, and generates it or puts its stock file in its
+/// place. A stage that fails stops no later one. Always returns 0.
 int updateIapConfigFiles();
 
 } // namespace orvane

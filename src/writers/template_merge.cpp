@@ -14,21 +14,27 @@ std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-v
 
 /// The buffer comes first: a file stream takes one only before its first use, if at all.
 template <typename FileStream, std::size_t SIZE>
-void open(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
+void openFile(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
     stream.rdbuf()->pubsetbuf(buffer.data(), SIZE);
     stream.open(path);
 }
 
 } // namespace
 
-// The buffer stays as it is: a stream writes it before it reads it. NOLINTNEXTLINE(*-member-init)
-TemplateMerge::TemplateMerge(const AccessoryFile& file) {
-    open(output, outputBuffer, file.output);
-    open(templateFile, InputBuffer, file.templateFile);
+MergeDecision decideMerge(const std::ios& templateFile, const std::ios& output) {
+    if (templateFile.fail()) {
+        return MergeDecision::templateFailed;
+    }
+    return output.fail() ? MergeDecision::outputFailed : MergeDecision::generate;
 }
 
-void TemplateMerge::copyTemplate() {
-    output << templateFile.rdbuf();
+void copyBytes(std::istream& source, std::ostream& output) {
+    output << source.rdbuf();
+}
+
+void TemplateMerge::open(const AccessoryFile& file) {
+    openFile(output, outputBuffer, file.output);
+    openFile(templateFile, InputBuffer, file.templateFile);
 }
 
 void TemplateMerge::close() {
@@ -36,13 +42,21 @@ void TemplateMerge::close() {
     output.close();
 }
 
+void TemplateMerge::finish(const AccessoryFile& file, MergeDecision decision) {
+    if (decision == MergeDecision::generate) {
+        close();
+    } else {
+        installStockFile(file);
+    }
+}
+
 void installStockFile(const AccessoryFile& file) {
     OutputBuffer outputBuffer;
     std::ifstream stock;
     std::ofstream output;
-    open(stock, InputBuffer, file.stockFile);
-    open(output, outputBuffer, file.output);
-    output << stock.rdbuf();
+    openFile(stock, InputBuffer, file.stockFile);
+    openFile(output, outputBuffer, file.output);
+    copyBytes(stock, output);
     stock.close();
     output.close();
 }

@@ -23,21 +23,37 @@ struct AccessoryFile {
 constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
 using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 
+/// What becomes of an accessory file: it is generated, or its stock file takes its place, since a
+/// stream that counts for it is failed.
+enum class MergeDecision {
+    generate,
+    templateFailed,
+    outputFailed,
+    iap2Failed, ///< the output of IAP2_FILE, on which IAP1_FILE depends
+};
+
+/// The decision for a file that needs both its streams. The template is tested first.
+MergeDecision decideMerge(const std::ios& templateFile, const std::ios& output);
+
+/// Appends all bytes of `source` to `output`. A source that yields none, being empty, absent or a
+/// folder, leaves the output failed: what is written afterwards is dropped.
+void copyBytes(std::istream& source, std::ostream& output);
+
 /// The streams of one merge. A stream that could not be opened is failed, and what is written to it
 /// is dropped.
 struct TemplateMerge {
+    /// Opens nothing.
+    TemplateMerge() = default;
+
     /// Opens the output for writing (created, or truncated at once), then the template for reading.
-    explicit TemplateMerge(const AccessoryFile& file);
-
-    /// Whether both streams are open. The template is tested first.
-    bool canGenerate() const { return !templateFile.fail() && !output.fail(); }
-
-    /// Appends all bytes of the template to the output. A template that yields none, being empty,
-    /// absent or a folder, leaves the output failed: what is written afterwards is dropped.
-    void copyTemplate();
+    void open(const AccessoryFile& file);
 
     /// Closes the template, then the output. A close that fails leaves its stream failed.
     void close();
+
+    /// Ends the merge of `file` as decided: closes it, or puts the stock file in its place. The
+    /// streams of a file that was not generated stay open.
+    void finish(const AccessoryFile& file, MergeDecision decision);
 
     OutputBuffer outputBuffer;
     std::ofstream output;

@@ -141,7 +141,7 @@ bool has(const desk::Output& output, Reason reason) {
     };
     return holds(output.reasons) ||
            std::any_of(output.lines.begin(), output.lines.end(),
-                       [&holds](const desk::Line& line) { return holds(line.reasons); });
+                       [&holds](const desk::Line& line) { return holds(line.origin.reasons); });
 }
 
 class ExplainReasonsTest : public ::testing::TestWithParam<std::size_t> {
@@ -172,16 +172,16 @@ TEST_P(ExplainReasonsTest, RunLeavesWhatIsExplained) {
         for (const desk::Line& line : output.lines) {
             written += line.text;
         }
-        switch (output.left) {
-        case desk::Left::file:
-            EXPECT_EQ(readFile(file), output.content) << output.path;
-            EXPECT_EQ(written, output.content) << output.path;
+        switch (output.kindAfter) {
+        case desk::PathKind::file:
+            EXPECT_EQ(readFile(file), output.contentAfter) << output.path;
+            EXPECT_EQ(written, output.contentAfter) << output.path;
             break;
-        case desk::Left::folder:
+        case desk::PathKind::folder:
             EXPECT_TRUE(fs::is_directory(file)) << output.path;
             break;
-        case desk::Left::nothing:
-        case desk::Left::other:
+        case desk::PathKind::nothing:
+        case desk::PathKind::other:
             EXPECT_FALSE(fs::exists(file)) << output.path;
             break;
         }
@@ -202,14 +202,14 @@ TEST(ReasonsTest, EveryReasonHasARow) {
     for (const Row& row : rows()) {
         laid.insert(row.reason);
     }
-    for (const desk::ReasonInfo& info : desk::REASONS) {
+    for (const desk::ReasonInfo& info : desk::reasons()) {
         EXPECT_EQ(laid.count(info.reason), 1U) << info.code;
     }
 }
 
 TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
     std::set<std::string> codes;
-    for (const desk::ReasonInfo& info : desk::REASONS) {
+    for (const desk::ReasonInfo& info : desk::reasons()) {
         const std::string code = info.code;
         EXPECT_TRUE(codes.insert(code).second) << code;
         EXPECT_EQ(code.find_first_not_of("abcdefghijklmnopqrstuvwxyz0123456789-"),
@@ -221,7 +221,7 @@ TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
 
 TEST(ReasonsTest, EveryCodeIsInTheGuide) {
     const std::string guide = readFile(std::string(ORVANE_DOCS_DIR) + "/orvane-unit.md");
-    for (const desk::ReasonInfo& info : desk::REASONS) {
+    for (const desk::ReasonInfo& info : desk::reasons()) {
         const std::string row = "| `" + std::string(info.code) + "` |";
         EXPECT_NE(guide.find(row), std::string::npos) << info.code;
     }

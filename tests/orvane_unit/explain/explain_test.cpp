@@ -2,6 +2,7 @@
 #include "kit/description/unit_layout.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
+#include "orvane_unit/report/place_text.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/orvane_unit/tree_state.h"
 #include "tests/support/unit_test.h"
@@ -30,12 +31,17 @@ const Output& outputOf(const Explanation& explanation, const std::string& path) 
 }
 
 const Line& lineOf(const Output& output, const std::string& key) {
-    const auto found = std::find_if(output.lines.begin(), output.lines.end(),
-                                    [&key](const Line& line) { return line.key == key; });
+    const auto found =
+        std::find_if(output.lines.begin(), output.lines.end(),
+                     [&key](const Line& line) { return keyText(line.origin.key) == key; });
     if (found == output.lines.end()) {
         throw std::runtime_error("no line of " + key);
     }
     return *found;
+}
+
+std::string placeOf(const Output& output, const std::string& key) {
+    return desk::placeText(lineOf(output, key).origin);
 }
 
 /// What the real binary leaves at the outputs that the explanation names.
@@ -44,8 +50,8 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
     const kit::EnteredRoot entered(described.root());
     for (const Output& output : explanation) {
-        if (output.left == desk::Left::file) {
-            EXPECT_EQ(readFile(output.path), output.content) << output.path;
+        if (output.kindAfter == desk::PathKind::file) {
+            EXPECT_EQ(readFile(output.path), output.contentAfter) << output.path;
         } else {
             std::error_code ignored; // of a link to itself
             EXPECT_FALSE(fs::is_regular_file(output.path, ignored)) << output.path;
@@ -58,20 +64,20 @@ TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
     const Explanation explanation = desk::explainUnit(described.root(), "ai");
     const Output& airplay = outputOf(explanation, AIRPLAY_FILE.output);
     EXPECT_EQ(lineOf(airplay, "param.139").text, "model = Quarion Velmira\n");
-    EXPECT_EQ(lineOf(airplay, "param.139").detail, "parameter 139, image byte 139: 1a");
+    EXPECT_EQ(placeOf(airplay, "param.139"), "parameter 139, image byte 139: 1a");
     EXPECT_EQ(lineOf(airplay, "param.36").text, "oemIconPath = /fs/mp/etc/QUARION/oemIcon.png\n");
     EXPECT_EQ(lineOf(airplay, "param.134").text, "audioProfile = 3\n");
-    EXPECT_EQ(lineOf(airplay, "param.134").detail, "parameter 134, image bytes from 133: 03 00");
+    EXPECT_EQ(placeOf(airplay, "param.134"), "parameter 134, image bytes from 133: 03 00");
     EXPECT_EQ(lineOf(airplay, "param.22").text, "rightHandDrive = 1\n");
     EXPECT_EQ(lineOf(airplay, "file./fs/mp/etc/airplay_static.conf").text, "airplay template\n");
 
     const Output& iap1 = outputOf(explanation, IAP1_FILE.output);
     EXPECT_EQ(lineOf(iap1, "slot.9").text, "serial=SN004217\n");
     // 2 MiB less 1 MiB, and slot 9 at 129 behind it.
-    EXPECT_EQ(lineOf(iap1, "slot.9").detail,
+    EXPECT_EQ(placeOf(iap1, "slot.9"),
               "record slot 9, disk bytes from 1048705: 53 4e 30 30 34 32 31 37");
     EXPECT_EQ(lineOf(iap1, "file./fs/rwdata/.Version/app.inf").text, "firmware_version=030a02\n");
-    EXPECT_EQ(lineOf(iap1, "file./fs/rwdata/.Version/app.inf").detail,
+    EXPECT_EQ(placeOf(iap1, "file./fs/rwdata/.Version/app.inf"),
               "/fs/rwdata/.Version/app.inf:2: Version Number is \"ABC_3.10.2_rc\"");
     EXPECT_TRUE(isIntended(explanation));
 }
@@ -82,9 +88,8 @@ TEST(ExplainTest, VersionLineIsTheLastOneOfItsKey) {
             "Version Number=1.1.1\nno line\nType=Application\nVersion Number = 2.2.2\n";
     });
     const Explanation explanation = desk::explainUnit(described.root(), "i");
-    EXPECT_EQ(
-        lineOf(outputOf(explanation, IAP2_FILE.output), "file./fs/rwdata/.Version/app.inf").detail,
-        "/fs/rwdata/.Version/app.inf:4: Version Number is \"2.2.2\"");
+    EXPECT_EQ(placeOf(outputOf(explanation, IAP2_FILE.output), "file./fs/rwdata/.Version/app.inf"),
+              "/fs/rwdata/.Version/app.inf:4: Version Number is \"2.2.2\"");
 }
 
 TEST(ExplainTest, LettersComeInTheirOrderAndAsOftenAsGiven) {
@@ -148,8 +153,8 @@ TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
     const Explanation explanation = desk::explainUnit(described.root(), "a");
     const Output& output = outputOf(explanation, TELEPHONY_TUNING_FILE);
     EXPECT_EQ(output.outcome, desk::Outcome::notAsked);
-    EXPECT_EQ(output.left, desk::Left::file);
-    EXPECT_EQ(output.content, "of an earlier run\n");
+    EXPECT_EQ(output.kindAfter, desk::PathKind::file);
+    EXPECT_EQ(output.contentAfter, "of an earlier run\n");
     EXPECT_TRUE(output.lines.empty());
 }
 
@@ -157,7 +162,7 @@ TEST(ExplainTest, MissingTmpKeepsAllOutputs) {
     const DescribedUnit described([](UnitDescription& unit) { unit.absent.push_back("/tmp"); });
     for (const Output& output : desk::explainUnit(described.root(), "i")) {
         EXPECT_EQ(output.outcome, desk::Outcome::kept) << output.path;
-        EXPECT_EQ(output.left, desk::Left::nothing) << output.path;
+        EXPECT_EQ(output.kindAfter, desk::PathKind::nothing) << output.path;
     }
 }
 

@@ -43,7 +43,7 @@ std::size_t compareLines(const fs::path& folder) {
         std::string written;
         for (const desk::Line& line : output.lines) {
             written += line.text;
-            EXPECT_FALSE(line.reasons.empty()) << output.path << ": " << line.text;
+            EXPECT_FALSE(line.origin.reasons.empty()) << output.path << ": " << line.text;
             ++compared;
         }
         EXPECT_EQ(written, readFile(folder / ("expected" + output.path))) << output.path;

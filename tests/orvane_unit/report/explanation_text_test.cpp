@@ -9,10 +9,10 @@ namespace orvane::test {
 
 namespace {
 
-using desk::Left;
 using desk::Line;
 using desk::Outcome;
 using desk::Output;
+using desk::PathKind;
 using desk::Reason;
 
 std::string printed(const desk::Explanation& explanation, bool showsAll = false) {
@@ -22,16 +22,21 @@ std::string printed(const desk::Explanation& explanation, bool showsAll = false)
 }
 
 Output output(Outcome outcome, const std::vector<Reason>& reasons, const std::vector<Line>& lines) {
-    return {"/tmp/x", outcome, reasons, {}, lines, Left::file, ""};
+    return {"/tmp/x", outcome, reasons, {}, lines, PathKind::file, ""};
+}
+
+Line fieldLine(const std::string& text, const std::string& field, Reason reason,
+               const desk::DiskPlace& place) {
+    return {text, {{reason}, kit::tuningFieldKey(3, field), place}};
 }
 
 TEST(ExplanationTextTest, ValuesStandBesideTheirPlaces) {
-    const desk::Explanation explanation = {
-        output(Outcome::generated, {Reason::generated},
-               {{"# comment\n", {Reason::fixedText}, "", ""},
-                {"model=Quarion\n", {Reason::fromImage}, "param.139", "parameter 139"},
-                {"serial=A\nB\n", {Reason::fromRecord}, "slot.9", "record slot 9"},
-                {"one\ntwo", {Reason::fromTemplate}, "file./t", "/t"}})};
+    const desk::Explanation explanation = {output(
+        Outcome::generated, {Reason::generated},
+        {{"# comment\n", desk::fixedText()},
+         {"model=Quarion\n", {{Reason::fromImage}, kit::paramKey(139), desk::NoPlace()}},
+         {"serial=A\nB\n", {{Reason::fromRecord}, kit::slotKey(9), desk::NoPlace()}},
+         {"one\ntwo", {{Reason::fromTemplate}, kit::fileKey("/t"), desk::FilePlace{"/t"}}}})};
     EXPECT_EQ(printed(explanation), "/tmp/x: generated\n"
                                     "  model=Quarion         parameter 139\n"
                                     "  serial=A\\nB           record slot 9\n"
@@ -44,17 +49,22 @@ TEST(ExplanationTextTest, ValuesStandBesideTheirPlaces) {
 }
 
 TEST(ExplanationTextTest, WhatIsNotIntendedIsSaidOnceForEachOutput) {
-    const Line line = {
-        "v=1\n", {Reason::versionIncomplete, Reason::versionOutOfRange}, "file./v", "/v:1"};
-    const Line other = {"w=0\n", {Reason::versionIncomplete}, "file./v", "/v:2"};
+    const Line line = {"v=1\n",
+                       {{Reason::versionIncomplete, Reason::versionOutOfRange},
+                        kit::fileKey("/v"),
+                        desk::VersionPlace{"/v", 1, "N", "1.999"}}};
+    const Line other = {
+        "w=0\n",
+        {{Reason::versionIncomplete}, kit::fileKey("/v"), desk::VersionPlace{"/v", 0, "N", ""}}};
     EXPECT_EQ(
         printed({output(Outcome::generated, {Reason::generated}, {line, line, other})}),
         "/tmp/x: generated\n"
-        "  v=1  /v:1; version-incomplete: the version has fewer than three components, and the "
+        "  v=1  /v:1: N is \"1.999\"; version-incomplete: the version has fewer than three "
+        "components, and the "
         "last one is repeated; version-out-of-range: a component of the version is not from 0 to "
         "255, and its remainder by 256 stands in\n"
         "  v=1  \"\n"
-        "  w=0  /v:2; version-incomplete\n");
+        "  w=0  /v; version-incomplete\n");
 }
 
 TEST(ExplanationTextTest, OutcomeTellsItsReasons) {
@@ -69,20 +79,22 @@ TEST(ExplanationTextTest, OutcomeTellsItsReasons) {
 }
 
 TEST(ExplanationTextTest, LineThatIsLeftOutIsTold) {
-    EXPECT_EQ(printed({output(Outcome::generated, {Reason::generated},
-                              {{"", {Reason::imageMissing}, "param.134", "parameter 134"}})}),
+    EXPECT_EQ(printed({output(
+                  Outcome::generated, {Reason::generated},
+                  {{"", {{Reason::imageMissing}, kit::paramKey(134), desk::DefaultStandsIn()}}})}),
               "/tmp/x: generated\n"
-              "  (left out)  parameter 134; image-missing: the configuration image can't be "
+              "  (left out)  parameter 134 counts as missing; image-missing: the configuration "
+              "image can't be "
               "opened\n");
 }
 
 TEST(ExplanationTextTest, FieldsAsTheyShouldBeAreCountedUnlessAllAreWanted) {
-    const desk::Explanation explanation = {output(
-        Outcome::generated, {Reason::generated},
-        {{"; head\n", {Reason::fixedText}, "", ""},
-         {"qwaA 1\n", {Reason::fromTuningBlock}, "tuning.3.qwaA", "block 3, disk byte 7: 01"},
-         {"qwaB \n", {Reason::wordUnknown}, "tuning.3.qwaB", "block 3, disk byte 8: 00"},
-         {"qwaC 2\n", {Reason::fromTuningBlock}, "tuning.3.qwaC", "block 3, disk byte 9: 02"}})};
+    const desk::Explanation explanation = {
+        output(Outcome::generated, {Reason::generated},
+               {{"; head\n", desk::fixedText()},
+                fieldLine("qwaA 1\n", "qwaA", Reason::fromTuningBlock, {7, "\x01", {}}),
+                fieldLine("qwaB \n", "qwaB", Reason::wordUnknown, {8, std::string(1, '\0'), {}}),
+                fieldLine("qwaC 2\n", "qwaC", Reason::fromTuningBlock, {9, "\x02", {}})})};
     EXPECT_EQ(
         printed(explanation),
         "/tmp/x: generated\n"

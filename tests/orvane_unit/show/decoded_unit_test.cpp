@@ -222,11 +222,11 @@ TEST(ContentsTest, FilesTellTheirKind) {
     });
     for (const desk::UnitFile& file : desk::readContents(described.root()).files) {
         if (file.path == "/tmp/airplay.conf") {
-            EXPECT_EQ(file.kind, desk::Left::folder);
+            EXPECT_EQ(file.kind, desk::PathKind::folder);
         } else if (file.path == "/fs/mp/etc/mm/iap1.cfg") {
-            EXPECT_EQ(file.kind, desk::Left::nothing);
+            EXPECT_EQ(file.kind, desk::PathKind::nothing);
         } else if (file.path == "/fs/mp/etc/airplay.conf") {
-            EXPECT_EQ(file.kind, desk::Left::file);
+            EXPECT_EQ(file.kind, desk::PathKind::file);
             EXPECT_EQ(file.size, 14U);
             EXPECT_EQ(file.role, "stock file");
         }

@@ -30,11 +30,17 @@ protected:
     }
 };
 
+/// A merge of ACCESSORY_FILE whose streams are open.
+struct OpenMerge : TemplateMerge {
+    OpenMerge() { open(ACCESSORY_FILE); }
+    MergeDecision decision() const { return decideMerge(templateFile, output); }
+};
+
 /// What a whole merge makes of the template.
 void mergeBetween(const std::string& before, const std::string& after) {
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output << before;
-    merge.copyTemplate();
+    copyBytes(merge.templateFile, merge.output);
     merge.output << after;
     merge.close();
 }
@@ -47,24 +53,24 @@ TEST_F(TemplateMergeTest, PutsTheTemplateBehindWhatWasWritten) {
 }
 
 TEST_F(TemplateMergeTest, CanGenerateWhenBothAreOpen) {
-    const TemplateMerge merge(ACCESSORY_FILE);
-    EXPECT_TRUE(merge.canGenerate());
+    const OpenMerge merge;
+    EXPECT_EQ(merge.decision(), MergeDecision::generate);
     EXPECT_TRUE(merge.output.is_open());
     EXPECT_TRUE(merge.templateFile.is_open());
 }
 
 TEST_F(TemplateMergeTest, CannotGenerateWithoutATemplate) {
     remove(TEMPLATE);
-    const TemplateMerge merge(ACCESSORY_FILE);
-    EXPECT_FALSE(merge.canGenerate());
+    const OpenMerge merge;
+    EXPECT_EQ(merge.decision(), MergeDecision::templateFailed);
     EXPECT_TRUE(merge.templateFile.fail());
     EXPECT_FALSE(merge.output.fail());
 }
 
 TEST_F(TemplateMergeTest, CannotGenerateWithoutAnOutput) {
     putFolder(OUTPUT);
-    const TemplateMerge merge(ACCESSORY_FILE);
-    EXPECT_FALSE(merge.canGenerate());
+    const OpenMerge merge;
+    EXPECT_EQ(merge.decision(), MergeDecision::outputFailed);
     EXPECT_FALSE(merge.templateFile.fail());
     EXPECT_TRUE(merge.output.fail());
 }
@@ -72,37 +78,37 @@ TEST_F(TemplateMergeTest, CannotGenerateWithoutAnOutput) {
 TEST_F(TemplateMergeTest, CannotGenerateWithoutEither) {
     remove(TEMPLATE);
     putFolder(OUTPUT);
-    const TemplateMerge merge(ACCESSORY_FILE);
-    EXPECT_FALSE(merge.canGenerate());
+    const OpenMerge merge;
+    EXPECT_EQ(merge.decision(), MergeDecision::templateFailed);
 }
 
 TEST_F(TemplateMergeTest, CanGenerateFromATemplateThatIsAFolder) {
     putFolder(TEMPLATE);
-    const TemplateMerge merge(ACCESSORY_FILE);
-    EXPECT_TRUE(merge.canGenerate());
+    const OpenMerge merge;
+    EXPECT_EQ(merge.decision(), MergeDecision::generate);
 }
 
 TEST_F(TemplateMergeTest, CannotGenerateOnceAStreamHasFailed) {
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output.setstate(std::ios::badbit);
-    EXPECT_FALSE(merge.canGenerate());
+    EXPECT_EQ(merge.decision(), MergeDecision::outputFailed);
     merge.output.clear();
     merge.templateFile.setstate(std::ios::badbit);
-    EXPECT_FALSE(merge.canGenerate());
+    EXPECT_EQ(merge.decision(), MergeDecision::templateFailed);
     merge.templateFile.clear();
-    EXPECT_TRUE(merge.canGenerate());
+    EXPECT_EQ(merge.decision(), MergeDecision::generate);
 }
 
 TEST_F(TemplateMergeTest, TemplateReadToItsEndStillCounts) {
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.templateFile.setstate(std::ios::eofbit);
-    EXPECT_TRUE(merge.canGenerate());
+    EXPECT_EQ(merge.decision(), MergeDecision::generate);
 }
 
 TEST_F(TemplateMergeTest, OutputIsOpenedFirst) {
     const rlim_t roomForOne = roomForDescriptors(1);
     const ResourceLimit limit(RLIMIT_NOFILE, roomForOne);
-    const TemplateMerge merge(ACCESSORY_FILE);
+    const OpenMerge merge;
     EXPECT_TRUE(merge.output.is_open());
     EXPECT_FALSE(merge.templateFile.is_open());
 }
@@ -111,7 +117,7 @@ TEST_F(TemplateMergeTest, TemplateIsOpenedLastAndClosedFirst) {
     writeFile(OUTPUT, "older");
     FileEventLog opens(IN_OPEN, {OUTPUT, TEMPLATE});
     FileEventLog closes(IN_CLOSE, {OUTPUT, TEMPLATE});
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.close();
     EXPECT_EQ(opens.take(), (std::vector<std::string>{OUTPUT, TEMPLATE}));
     EXPECT_EQ(closes.take(), (std::vector<std::string>{TEMPLATE, OUTPUT}));
@@ -119,14 +125,14 @@ TEST_F(TemplateMergeTest, TemplateIsOpenedLastAndClosedFirst) {
 
 TEST_F(TemplateMergeTest, OutputIsTruncatedAtOnce) {
     writeFile(OUTPUT, "older");
-    const TemplateMerge merge(ACCESSORY_FILE);
+    const OpenMerge merge;
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
 TEST_F(TemplateMergeTest, OutputIsTruncatedWithoutATemplateToo) {
     remove(TEMPLATE);
     writeFile(OUTPUT, "older");
-    { const TemplateMerge merge(ACCESSORY_FILE); }
+    { const OpenMerge merge; }
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
@@ -140,7 +146,7 @@ TEST_F(TemplateMergeTest, NewOutputIsForEveryoneButTheMask) {
     for (const auto& [mask, mode] : {std::pair<mode_t, mode_t>{0, 0666}, {027, 0640}}) {
         remove(OUTPUT);
         const mode_t former = umask(mask);
-        { const TemplateMerge merge(ACCESSORY_FILE); }
+        { const OpenMerge merge; }
         umask(former);
         EXPECT_EQ(modeOf(OUTPUT), mode) << mask;
     }
@@ -193,16 +199,16 @@ TEST_F(TemplateMergeTest, CopiesTemplatesOfAnyLength) {
 }
 
 TEST_F(TemplateMergeTest, CopiesOnlyWhatRemainsOfTheTemplate) {
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     ASSERT_EQ(merge.templateFile.get(), 't');
-    merge.copyTemplate();
+    copyBytes(merge.templateFile, merge.output);
     merge.close();
     EXPECT_EQ(readFile(OUTPUT), "emplate\n");
 }
 
 TEST_F(TemplateMergeTest, CopyOfSomethingLeavesTheOutputGood) {
-    TemplateMerge merge(ACCESSORY_FILE);
-    merge.copyTemplate();
+    OpenMerge merge;
+    copyBytes(merge.templateFile, merge.output);
     EXPECT_FALSE(merge.output.fail());
     merge.close();
     EXPECT_FALSE(merge.output.fail());
@@ -211,9 +217,9 @@ TEST_F(TemplateMergeTest, CopyOfSomethingLeavesTheOutputGood) {
 
 TEST_F(TemplateMergeTest, EmptyTemplateEndsTheOutput) {
     writeFile(TEMPLATE, "");
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output << "before\n";
-    merge.copyTemplate();
+    copyBytes(merge.templateFile, merge.output);
     EXPECT_TRUE(merge.output.fail());
     merge.output << "after\n";
     merge.close();
@@ -223,9 +229,9 @@ TEST_F(TemplateMergeTest, EmptyTemplateEndsTheOutput) {
 
 TEST_F(TemplateMergeTest, AbsentTemplateEndsTheOutput) {
     remove(TEMPLATE);
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output << "before\n";
-    merge.copyTemplate();
+    copyBytes(merge.templateFile, merge.output);
     EXPECT_TRUE(merge.output.fail());
     merge.output << "after\n";
     merge.close();
@@ -235,9 +241,9 @@ TEST_F(TemplateMergeTest, AbsentTemplateEndsTheOutput) {
 TEST_F(TemplateMergeTest, FolderAsATemplateEndsTheOutput) {
     putFolder(TEMPLATE);
     writeFile(std::string(TEMPLATE) + "/inner", "inner");
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output << "before\n";
-    merge.copyTemplate();
+    copyBytes(merge.templateFile, merge.output);
     EXPECT_TRUE(merge.output.fail());
     merge.output << "after\n";
     merge.close();
@@ -253,7 +259,7 @@ TEST_F(TemplateMergeTest, CopyIntoAnOutputThatIsNotOpenWritesNowhere) {
 
 TEST_F(TemplateMergeTest, CloseClosesBoth) {
     const int before = openDescriptors();
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     EXPECT_EQ(openDescriptors(), before + 2);
     merge.close();
     EXPECT_FALSE(merge.output.is_open());
@@ -262,7 +268,7 @@ TEST_F(TemplateMergeTest, CloseClosesBoth) {
 }
 
 TEST_F(TemplateMergeTest, CloseFailsTheOutputThatCannotBeWrittenWhole) {
-    TemplateMerge merge(ACCESSORY_FILE);
+    OpenMerge merge;
     merge.output << std::string(1000, 'x');
     EXPECT_FALSE(merge.output.fail());
     {
@@ -276,7 +282,7 @@ TEST_F(TemplateMergeTest, CloseFailsTheOutputThatCannotBeWrittenWhole) {
 
 TEST_F(TemplateMergeTest, EndOfTheMergeClosesBoth) {
     const int before = openDescriptors();
-    { const TemplateMerge merge(ACCESSORY_FILE); }
+    { const OpenMerge merge; }
     EXPECT_EQ(openDescriptors(), before);
 }
 

@@ -1,0 +1,17 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "orvane_unit/explain/explanation.h"
+
+#include <string>
+
+namespace orvane::desk {
+
+/// What holds the value of `key`: "parameter 139", "record slot 9", "block 3"; empty for others.
+std::string holderText(const kit::ValueKey& key);
+
+/// Where a value stands, with its raw bytes, or what was found there instead; empty for the tool's
+/// own text. Bytes of the unit stand in it as they are.
+std::string placeText(const Origin& origin);
+
+} // namespace orvane::desk
