@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "fuzz/support.h"
 
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/kit_error.h"
 
 #include <fcntl.h>

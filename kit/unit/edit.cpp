@@ -4,7 +4,7 @@
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "kit/description/value_places.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/changed_file.h"
 #include "kit/host/kit_error.h"

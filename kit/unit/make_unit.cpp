@@ -7,7 +7,7 @@
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
 #include "kit/description/value_places.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/finished_folder.h"

@@ -5,7 +5,7 @@
 #include "config/config_store.h"
 #include "config/record_slots.h"
 #include "identity/software_version.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/check/tmp_tree.h"
 
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/whole_file.h"
 
 #include <system_error>

@@ -5,7 +5,7 @@
 #include "config/config_store.h"
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"

@@ -2,7 +2,7 @@
 #include "orvane_unit/explain/explain.h"
 
 #include "identity/vehicle_identity.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
 #include "orvane_unit/explain/planned_merge.h"

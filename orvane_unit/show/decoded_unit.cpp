@@ -9,7 +9,7 @@
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
 #include "kit/description/unit_description.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/sparse_content.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"

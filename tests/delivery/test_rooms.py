@@ -56,7 +56,7 @@ class RoomsTest(unittest.TestCase):
                 self.assertEqual([name for name in included if name.startswith(("kit/", "orvane_unit/"))], [])
 
     def test_include_from_behind_is_seen(self) -> None:
-        for path, included in (("kit/host/text.h", "kit/enter/root.h"),
+        for path, included in (("kit/host/text.h", "kit/enter/entered_root.h"),
                                ("kit/tuning/a.cpp", "kit/description/toml_text.h"),
                                ("kit/unit/marker.cpp", "orvane_unit/commands.h"),
                                ("orvane_unit/compare/text_diff.cpp", "orvane_unit/report/terminal.h"),
@@ -66,8 +66,8 @@ class RoomsTest(unittest.TestCase):
                     self.assertEqual(list(included_from_behind(path, f"#pragma once\n{line}\n")), [included])
 
     def test_include_from_before_is_not_seen(self) -> None:
-        for path, line in (("kit/enter/root.h", '#include "kit/host/descriptor.h"'),
-                           ("kit/enter/root.cpp", '#include "kit/enter/root.h"'),
+        for path, line in (("kit/enter/entered_root.h", '#include "kit/host/descriptor.h"'),
+                           ("kit/enter/entered_root.cpp", '#include "kit/enter/entered_root.h"'),
                            ("kit/host/text.h", "#include <kit/unit/edit.h>"),
                            ("kit/host/text.h", '// #include "kit/unit/edit.h"'),
                            ("kit/tuning/a.cpp", '#include "tuning/dps_block.h"'),

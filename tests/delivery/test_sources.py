@@ -67,7 +67,7 @@ class SourcesTest(unittest.TestCase):
 
     def test_header_that_is_not_on_the_list_is_seen(self) -> None:
         for line, name in (("#include <charconv>", "<charconv>"), ("# include <string_view>", "<string_view>"),
-                           ('  #include "kit/enter/root.h"', '"kit/enter/root.h"'), ("#include <stdio.h>", "<stdio.h>")):
+                           ('  #include "kit/enter/entered_root.h"', '"kit/enter/entered_root.h"'), ("#include <stdio.h>", "<stdio.h>")):
             with self.subTest(line=line):
                 self.assertEqual(list(refused_headers(f"#include <array>\n{line}\n")), [name])
 

@@ -3,7 +3,7 @@
 // orvane-enter [--memory=BYTES] [--files=COUNT] ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with
 // "/" = ROOT, in this very process, so that a tracer of this process sees the program and no other.
 // The limits are those of the program (RLIMIT_AS, RLIMIT_NOFILE). Exits with 125 when it can't.
-#include "kit/enter/start_plan.h"
+#include "kit/enter/program_start.h"
 #include "kit/host/kit_error.h"
 
 #include <sys/resource.h>

@@ -2,7 +2,7 @@
 //
 // The program orvane-unit from its command line to its exit status.
 #include "kit/description/unit_layout.h"
-#include "kit/enter/child_output.h"
+#include "kit/enter/captured_run.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/marker.h"
 #include "tests/orvane_unit/explain/described_unit.h"

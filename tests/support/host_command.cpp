@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/support/host_command.h"
 
-#include "kit/enter/child_output.h"
+#include "kit/enter/captured_run.h"
 #include "kit/host/kit_error.h"
 
 #include <unistd.h>

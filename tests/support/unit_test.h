@@ -4,7 +4,7 @@
 // absolute paths are the unit's, for the product and for the test alike.
 #pragma once
 
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "tests/support/temporary_folder.h"
 
 #include <gtest/gtest.h>

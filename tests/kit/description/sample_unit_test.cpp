@@ -6,7 +6,7 @@
 #include "config/record_area.h"
 #include "kit/description/parse_description.h"
 #include "kit/description/sample.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/unit/make_unit.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"

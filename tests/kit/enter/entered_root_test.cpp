@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/child_output.h"
-#include "kit/enter/root.h"
+#include "kit/enter/captured_run.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/kit_error.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/support/permissions.h"

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/capture_unit.h"
 #include "kit/unit/describe_inputs.h"

@@ -3,7 +3,7 @@
 #include "config/param_access.h"
 #include "config/record_area.h"
 #include "kit/description/unit_description.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/unit/make_unit.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/support/temporary_folder.h"

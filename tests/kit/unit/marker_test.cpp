@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/unit_description.h"
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/make_unit.h"
 #include "kit/unit/marker.h"

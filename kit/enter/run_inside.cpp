@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/child_output.h"
-#include "kit/enter/root.h"
-#include "kit/enter/start_plan.h"
+#include "kit/enter/captured_run.h"
+#include "kit/enter/entered_root.h"
+#include "kit/enter/program_start.h"
 
 #include <sys/mount.h>
 

@@ -5,7 +5,7 @@
 // "/".
 #pragma once
 
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 
 #include <filesystem>

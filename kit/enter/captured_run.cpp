@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/child_output.h"
+#include "kit/enter/captured_run.h"
 
 #include "kit/host/descriptor.h"
 #include "kit/host/kit_error.h"

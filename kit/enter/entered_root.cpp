@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 
 #include "kit/enter/change_root.h"
 #include "kit/host/host_file.h"

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/start_plan.h"
+#include "kit/enter/program_start.h"
 
+#include "kit/enter/captured_run.h"
 #include "kit/enter/change_root.h"
-#include "kit/enter/child_output.h"
 #include "kit/enter/elf_header.h"
 #include "kit/host/kit_error.h"
 

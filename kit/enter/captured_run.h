@@ -3,7 +3,7 @@
 // Running a child process and keeping what it says.
 #pragma once
 
-#include "kit/enter/root.h"
+#include "kit/enter/entered_root.h"
 
 #include <functional>
 
