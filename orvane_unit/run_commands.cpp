@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The commands that run orvane itself.
-#include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 #include "kit/unit/marker.h"

@@ -2,41 +2,69 @@
 #include "kit/enter/captured_run.h"
 
 #include "kit/host/descriptor.h"
+#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 
 #include <fcntl.h>
-#include <poll.h>
+#include <sys/file.h>
+#include <sys/mman.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <array>
 #include <cerrno>
 #include <cstdlib>
 #include <exception>
 #include <string>
-#include <utility>
 
 namespace orvane::kit {
 
 namespace {
 
-/// Status of a child that could not become the program; its reason comes through a pipe.
+/// Status of a child that could not become the program.
 constexpr int NOT_STARTED = 127;
 
-struct Pipe {
-    Descriptor readEnd;
-    Descriptor writeEnd;
-    std::string text; ///< what came through it
-};
-
-/// Both ends vanish from the child when it executes the program.
-Pipe makePipe() {
-    int ends[2];
-    if (::pipe2(ends, O_CLOEXEC) != 0) {
-        throw systemError("cannot make a pipe");
+/// Does `call`, a system call that returns a negative number on failure, until no signal interrupts
+/// it.
+template <class Call>
+auto uninterrupted(const Call& call) {
+    auto result = call();
+    while (result < 0 && errno == EINTR) {
+        result = call();
     }
-    return {Descriptor(ends[0]), Descriptor(ends[1]), {}};
+    return result;
 }
+
+/// What a child writes, kept in memory.
+class MemoryFile {
+public:
+    /// The lock is the writing end's and lasts as long as any process holds that. Writes append, so
+    /// that none leaves a hole where a program has cut its output off ("> /dev/stderr").
+    MemoryFile() : forWriting_(::memfd_create("output", MFD_CLOEXEC)) {
+        if (forWriting_.isOpen()) {
+            const std::string name = "/proc/self/fd/" + std::to_string(forWriting_.number());
+            forReading_ = Descriptor(::open(name.c_str(), O_RDONLY | O_CLOEXEC));
+        }
+        if (!forReading_.isOpen() || ::fcntl(forWriting_.number(), F_SETFL, O_APPEND) != 0 ||
+            ::flock(forWriting_.number(), LOCK_EX) != 0) {
+            throw systemError("cannot make a file for the program's output");
+        }
+    }
+
+    const Descriptor& forWriting() const { return forWriting_; }
+
+    /// All of it, when the last holder of the writing end has let go.
+    std::string waitForAll() {
+        forWriting_.close();
+        if (uninterrupted([this] { return ::flock(forReading_.number(), LOCK_SH); }) != 0) {
+            throw systemError("cannot wait for the program's output");
+        }
+        return readWhole(forReading_, "the program's output");
+    }
+
+private:
+    Descriptor forWriting_;
+    Descriptor forReading_;
+};
 
 /// In the child: `from` as descriptor `to`, kept across the execution.
 void putDescriptor(const Descriptor& from, int to) {
@@ -45,51 +73,25 @@ void putDescriptor(const Descriptor& from, int to) {
     }
 }
 
-/// Takes what `pipe` has to give, and closes its read end at the end of the stream.
-void readSome(Pipe& pipe) {
-    std::array<char, 4096> buffer{};
-    const ssize_t count = ::read(pipe.readEnd.number(), buffer.data(), buffer.size());
-    if (count > 0) {
-        pipe.text.append(buffer.data(), static_cast<std::size_t>(count));
-    } else if (count == 0 || errno != EINTR) {
-        pipe.readEnd.close();
-    }
-}
+struct Outputs {
+    MemoryFile standardOutput;
+    MemoryFile standardError;
+    MemoryFile failedStart; ///< why the child could not become the program; empty when it could
+};
 
-/// Reads all pipes side by side, so that the child is never kept waiting by a full one.
-void drain(std::array<Pipe, 3>& pipes) {
-    std::array<pollfd, 3> waiting{};
-    bool isAnyOpen = true;
-    while (isAnyOpen) {
-        isAnyOpen = false;
-        for (std::size_t i = 0; i < pipes.size(); ++i) {
-            waiting[i] = {pipes[i].readEnd.number(), POLLIN, 0}; // poll skips a descriptor of -1
-            isAnyOpen = isAnyOpen || pipes[i].readEnd.isOpen();
-        }
-        if (!isAnyOpen || (::poll(waiting.data(), waiting.size(), -1) < 0 && errno != EINTR)) {
-            return;
-        }
-        for (std::size_t i = 0; i < pipes.size(); ++i) {
-            if (waiting[i].revents != 0) {
-                readSome(pipes[i]);
-            }
-        }
-    }
-}
-
-[[noreturn]] void runChild(const std::function<void()>& becomeProgram,
-                           const std::array<Pipe, 3>& pipes) {
+[[noreturn]] void runChild(const std::function<void()>& becomeProgram, const Outputs& outputs) {
     std::string reason = "the program was not started";
     try {
         putDescriptor(Descriptor(::open("/dev/null", O_RDONLY | O_CLOEXEC)), STDIN_FILENO);
-        putDescriptor(pipes[0].writeEnd, STDOUT_FILENO);
-        putDescriptor(pipes[1].writeEnd, STDERR_FILENO);
+        putDescriptor(outputs.standardOutput.forWriting(), STDOUT_FILENO);
+        putDescriptor(outputs.standardError.forWriting(), STDERR_FILENO);
         becomeProgram();
     } catch (const std::exception& error) {
         reason = error.what();
     }
     // Should even this write fail, the status still tells.
-    const ssize_t written = ::write(pipes[2].writeEnd.number(), reason.data(), reason.size());
+    const ssize_t written =
+        ::write(outputs.failedStart.forWriting().number(), reason.data(), reason.size());
     static_cast<void>(written);
     ::_exit(NOT_STARTED);
 }
@@ -97,31 +99,26 @@ void drain(std::array<Pipe, 3>& pipes) {
 } // namespace
 
 RunResult runCaptured(const std::function<void()>& becomeProgram) {
-    std::array<Pipe, 3> pipes = {makePipe(), makePipe(), makePipe()}; // out, error, failed start
+    Outputs outputs;
     const pid_t child = ::fork();
     if (child < 0) {
         throw systemError("cannot fork");
     }
     if (child == 0) {
-        runChild(becomeProgram, pipes);
+        runChild(becomeProgram, outputs);
     }
-    for (Pipe& pipe : pipes) {
-        pipe.writeEnd.close();
-    }
-    drain(pipes);
     int status = 0;
-    while (::waitpid(child, &status, 0) < 0) {
-        if (errno != EINTR) {
-            throw systemError("cannot wait for the program");
-        }
-    }
-    if (!pipes[2].text.empty()) {
-        throw KitError(pipes[2].text);
+    if (uninterrupted([&] { return ::waitpid(child, &status, 0); }) < 0) {
+        throw systemError("cannot wait for the program");
     }
     RunResult result;
     result.exitStatus = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-    result.standardOutput = std::move(pipes[0].text);
-    result.standardError = std::move(pipes[1].text);
+    result.standardOutput = outputs.standardOutput.waitForAll();
+    result.standardError = outputs.standardError.waitForAll();
+    const std::string reason = outputs.failedStart.waitForAll();
+    if (!reason.empty()) {
+        throw KitError(reason);
+    }
     return result;
 }
 

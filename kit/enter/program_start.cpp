@@ -79,46 +79,46 @@ std::string libraryPath(const std::string& interpreter, const fs::path& binary) 
     return path;
 }
 
-StartPlan planEmulated(const Program& program, const std::string& name) {
+ProgramStart emulatedStart(const Program& program, const std::string& name) {
     const fs::path emulator = OWN_EMULATOR[0] != '\0' ? OWN_EMULATOR : DEFAULT_EMULATOR;
     std::error_code error;
     if (!fs::exists(emulator, error)) {
         throw KitError(program.path.string() + " is a 32-bit ARM program and there is no " +
                        emulator.string() + " to run it (Debian: qemu-user-static)");
     }
-    StartPlan plan;
-    plan.file = relativeToHost(emulator);
-    plan.argv = {emulator.filename().string(), "-0", name, relativeToHost(program.path)};
-    return plan;
+    ProgramStart start;
+    start.file = relativeToHost(emulator);
+    start.argv = {emulator.filename().string(), "-0", name, relativeToHost(program.path)};
+    return start;
 }
 
-StartPlan planDynamic(const Program& program, const std::string& name,
-                      const std::string& interpreter) {
-    StartPlan plan;
-    plan.isDynamic = true;
-    plan.file = relativeToHost(interpreter);
-    plan.argv = {plan.file,
-                 "--argv0",
-                 name,
-                 "--library-path",
-                 libraryPath(interpreter, program.path),
-                 relativeToHost(program.path)};
-    return plan;
+ProgramStart dynamicStart(const Program& program, const std::string& name,
+                          const std::string& interpreter) {
+    ProgramStart start;
+    start.isDynamic = true;
+    start.file = relativeToHost(interpreter);
+    start.argv = {start.file,
+                  "--argv0",
+                  name,
+                  "--library-path",
+                  libraryPath(interpreter, program.path),
+                  relativeToHost(program.path)};
+    return start;
 }
 
-StartPlan planStatic(const Program& program, const std::string& name) {
-    StartPlan plan;
-    plan.binary = Descriptor(::open(program.path.c_str(), O_RDONLY | O_CLOEXEC));
-    if (!plan.binary.isOpen()) {
+ProgramStart staticStart(const Program& program, const std::string& name) {
+    ProgramStart start;
+    start.binary = Descriptor(::open(program.path.c_str(), O_RDONLY | O_CLOEXEC));
+    if (!start.binary.isOpen()) {
         throw systemError("cannot open " + program.path.string());
     }
-    plan.argv = {name};
-    return plan;
+    start.argv = {name};
+    return start;
 }
 
 } // namespace
 
-StartPlan planStart(const Program& program) {
+ProgramStart findProgramStart(const Program& program) {
     const ElfHeader header = readElfHeader(program.path);
     const std::string name = program.path.filename().string();
     const bool isEmulated =
@@ -127,19 +127,20 @@ StartPlan planStart(const Program& program) {
         throw KitError(program.path.string() +
                        " is a dynamic 32-bit ARM program: link it with -static to run it here");
     }
-    StartPlan plan = isEmulated                   ? planEmulated(program, name)
-                     : header.interpreter.empty() ? planStatic(program, name)
-                                                  : planDynamic(program, name, header.interpreter);
-    append(plan.argv, program.arguments);
-    return plan;
+    ProgramStart start = isEmulated ? emulatedStart(program, name)
+                         : header.interpreter.empty()
+                             ? staticStart(program, name)
+                             : dynamicStart(program, name, header.interpreter);
+    append(start.argv, program.arguments);
+    return start;
 }
 
-void enterForPlan(const StartPlan& plan, const std::filesystem::path& root) {
-    const bool isByDescriptor = plan.binary.isOpen();
+void enterRootFor(const ProgramStart& start, const std::filesystem::path& root) {
+    const bool isByDescriptor = start.binary.isOpen();
     if (!isByDescriptor && ::chdir("/") != 0) {
         throw systemError("cannot enter the host's root directory");
     }
-    if (plan.isDynamic) {
+    if (start.isDynamic) {
         showProc(root);
     }
     changeRoot(root);
@@ -148,14 +149,14 @@ void enterForPlan(const StartPlan& plan, const std::filesystem::path& root) {
     }
 }
 
-void executePlan(const StartPlan& plan) {
-    const std::vector<char*> argv = pointers(plan.argv);
-    if (plan.binary.isOpen()) {
-        ::fexecve(plan.binary.number(), argv.data(), environ);
+void becomeProgram(const ProgramStart& start) {
+    const std::vector<char*> argv = pointers(start.argv);
+    if (start.binary.isOpen()) {
+        ::fexecve(start.binary.number(), argv.data(), environ);
     } else {
-        ::execv(plan.file.c_str(), argv.data());
+        ::execv(start.file.c_str(), argv.data());
     }
-    throw systemError("cannot start " + plan.argv.front());
+    throw systemError("cannot start " + start.argv.front());
 }
 
 } // namespace orvane::kit

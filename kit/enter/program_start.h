@@ -5,7 +5,6 @@
 // "/".
 #pragma once
 
-#include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 
 #include <filesystem>
@@ -14,7 +13,13 @@
 
 namespace orvane::kit {
 
-struct StartPlan {
+/// A program and its arguments.
+struct Program {
+    std::filesystem::path path;         ///< the binary, on the host
+    std::vector<std::string> arguments; ///< without argv[0], which is the binary's file name
+};
+
+struct ProgramStart {
     Descriptor binary;             ///< open: execute this, from the unit's "/"; closed: use `file`
     std::string file;              ///< the file to execute, relative to the host's "/"
     std::vector<std::string> argv; ///< the whole command line
@@ -23,14 +28,14 @@ struct StartPlan {
 
 /// Looks at the program and decides. Runs the loader of a dynamic one to learn where its libraries
 /// lie. Throws KitError when there is no such program or no way to start it.
-StartPlan planStart(const Program& program);
+ProgramStart findProgramStart(const Program& program);
 
 /// Makes `root`, an absolute path, the "/" of this process, with the working directory from which
-/// the plan can be executed. Throws KitError when it can't.
-void enterForPlan(const StartPlan& plan, const std::filesystem::path& root);
+/// the program can be started. Throws KitError when it can't.
+void enterRootFor(const ProgramStart& start, const std::filesystem::path& root);
 
-/// Executes the plan once enterForPlan has prepared its process. Opens no file, so that limits of
-/// the program can be set in between. Does not return; throws KitError on failure.
-void executePlan(const StartPlan& plan);
+/// Executes the program once enterRootFor has prepared its process. Opens no file, so that limits
+/// of the program can be set in between. Does not return; throws KitError on failure.
+void becomeProgram(const ProgramStart& start);
 
 } // namespace orvane::kit

@@ -1,7 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/captured_run.h"
-#include "kit/enter/entered_root.h"
-#include "kit/enter/program_start.h"
+#include "kit/enter/run_inside.h"
 
 #include <sys/mount.h>
 
@@ -38,15 +36,15 @@ private:
 } // namespace
 
 RunResult runInside(const std::filesystem::path& root, const Program& program) {
-    const StartPlan plan = planStart(program);
+    const ProgramStart start = findProgramStart(program);
     const std::filesystem::path absoluteRoot = std::filesystem::absolute(root);
     std::optional<ProcFolder> proc;
-    if (plan.isDynamic) {
+    if (start.isDynamic) {
         proc.emplace(absoluteRoot);
     }
     return runCaptured([&] {
-        enterForPlan(plan, absoluteRoot);
-        executePlan(plan);
+        enterRootFor(start, absoluteRoot);
+        becomeProgram(start);
     });
 }
 

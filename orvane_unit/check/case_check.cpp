@@ -2,7 +2,7 @@
 #include "orvane_unit/check/case_check.h"
 
 #include "kit/description/parse_description.h"
-#include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"
 #include "kit/host/whole_file.h"

@@ -5,7 +5,7 @@
 // rest. Bytes are a text where they are UTF-8, else {"hex": "..."}.
 #pragma once
 
-#include "kit/enter/entered_root.h"
+#include "kit/enter/captured_run.h"
 #include "orvane_unit/check/case_check.h"
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/compare/impact.h"

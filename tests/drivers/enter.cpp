@@ -62,13 +62,13 @@ void enter(std::vector<std::string> words) {
         throw KitError("wants ROOT PROGRAM [ARGUMENT...]");
     }
     const std::filesystem::path root = std::filesystem::absolute(words[0]);
-    const orvane::kit::StartPlan plan =
-        orvane::kit::planStart({words[1], {words.begin() + 2, words.end()}});
-    orvane::kit::enterForPlan(plan, root);
+    const orvane::kit::ProgramStart start =
+        orvane::kit::findProgramStart({words[1], {words.begin() + 2, words.end()}});
+    orvane::kit::enterRootFor(start, root);
     // After entering, because that opens files.
     limit(RLIMIT_AS, limits.memory);
     limit(RLIMIT_NOFILE, limits.files);
-    orvane::kit::executePlan(plan);
+    orvane::kit::becomeProgram(start);
 }
 
 } // namespace

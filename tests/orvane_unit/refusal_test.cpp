@@ -3,6 +3,7 @@
 // Wrong use and bad input: exit status 2, a complaint on standard error, nothing on standard
 // output.
 #include "kit/description/unit_layout.h"
+#include "kit/enter/captured_run.h"
 #include "kit/unit/marker.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/support/host_command.h"

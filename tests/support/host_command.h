@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/enter/entered_root.h"
+#include "kit/enter/captured_run.h"
 
 #include <string>
 #include <vector>

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/support/trace.h"
 
+#include "kit/enter/captured_run.h"
 #include "tests/support/host_command.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

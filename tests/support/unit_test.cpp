@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/support/unit_test.h"
 
+#include "kit/enter/entered_root.h"
+
 #include <fcntl.h>
 
 #include <cerrno>

@@ -3,6 +3,7 @@
 // A unit in, its /tmp out: golden/CASE holds the unit, the arguments and what must be left.
 #include "kit/description/parse_description.h"
 #include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/unit/make_unit.h"
 #include "main/options.h"
 #include "tests/support/standard_streams.h"

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A system that lets a process map nothing: Linux does not, so strace answers for it.
+#include "kit/enter/captured_run.h"
 #include "tests/support/host_command.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

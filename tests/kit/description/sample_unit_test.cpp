@@ -7,6 +7,7 @@
 #include "kit/description/parse_description.h"
 #include "kit/description/sample.h"
 #include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/unit/make_unit.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/support/temporary_folder.h"

@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "orvane_unit/check/case_check.h"
 #include "tests/orvane_unit/explain/described_unit.h"

@@ -3,6 +3,7 @@
 // Every reason by a unit that lays it, and the same unit run by the real binary.
 #include "config/boot_disk.h"
 #include "config/config_store.h"
+#include "kit/enter/run_inside.h"
 #include "orvane_unit/explain/explain.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/support/unit_test.h"

@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/unit_layout.h"
+#include "kit/enter/entered_root.h"
+#include "kit/enter/run_inside.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/place_text.h"

@@ -2,6 +2,7 @@
 //
 // The commands that only read, on a unit that orvane-unit has not made: a real one.
 #include "kit/description/unit_layout.h"
+#include "kit/enter/captured_run.h"
 #include "kit/unit/marker.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/orvane_unit/tree_state.h"

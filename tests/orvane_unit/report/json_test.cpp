@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The one place that parses the reports again.
+#include "kit/enter/captured_run.h"
 #include "kit/unit/describe_inputs.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/decoded_unit_text.h"
