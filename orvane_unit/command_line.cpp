@@ -151,7 +151,7 @@ Action addImpact(CLI::App& app) {
         "orvane-unit impact bench param. slot.9");
     command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
         ->required();
-    command->add_option("KEY", options->beginnings,
+    command->add_option("KEY", options->prefixes,
                         "Only the inputs whose key begins so; all without any");
     command->add_flag("--json", options->isJson, "Print JSON");
     return [options] { return runImpact(*options); };

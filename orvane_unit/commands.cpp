@@ -86,9 +86,9 @@ int runDiff(const DiffCommand& command) {
     const std::vector<ValueChange> changes =
         differingValues(unitValues(kit::inspectInputs(command.first)),
                         unitValues(kit::inspectInputs(command.second)));
-    const std::vector<MovedOutput> moved =
-        movedOutputs(explainUnit(command.first, letters), explainUnit(command.second, letters));
-    const std::vector<Consequence> found = consequences(changes, moved);
+    const std::vector<OutputDifference> differences = outputDifferences(
+        explainUnit(command.first, letters), explainUnit(command.second, letters));
+    const std::vector<Consequence> found = consequences(changes, differences);
     if (command.isJson) {
         std::cout << consequencesJson(command.first, command.second, found) << '\n';
     } else {
@@ -100,7 +100,7 @@ int runDiff(const DiffCommand& command) {
 int runImpact(const ImpactCommand& command) {
     const bool showsProgress = ::isatty(STDERR_FILENO) == 1;
     const std::vector<Impact> impacts = findImpacts(
-        command.root, command.beginnings, [showsProgress](std::size_t done, std::size_t all) {
+        command.root, command.prefixes, [showsProgress](std::size_t done, std::size_t all) {
             if (showsProgress) {
                 printProgress(std::cerr, done, all);
             }

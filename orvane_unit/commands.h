@@ -69,7 +69,7 @@ int runDiff(const DiffCommand& command);
 
 struct ImpactCommand {
     std::string root;
-    std::vector<std::string> beginnings; ///< of the keys to try; all without any
+    std::vector<std::string> prefixes; ///< of the keys to try; all without any
     bool isJson = false;
 };
 int runImpact(const ImpactCommand& command);

@@ -22,7 +22,7 @@ ValuePlace imagePlace(const ParamPlace& param) {
             std::uint64_t{param.offset} + param.size};
 }
 
-/// A place whose own beginning must lie on the disk.
+/// A place whose beginning must lie on the disk.
 ValuePlace recordPlace(std::uint64_t offset, std::uint32_t size) {
     return {true, offset, Bytes(size, ALL_BITS), AREA_SIZE - offset};
 }
@@ -96,9 +96,12 @@ ValuePlace valuePlace(const ValueKey& key) {
         const SlotPlace slot = slotPlace(static_cast<std::uint32_t>(key.number));
         return recordPlace(slot.offset, slot.size);
     }
-    case Kind::slotByte:
-        return recordPlace(slotPlace(static_cast<std::uint32_t>(key.number)).offset + key.offset,
-                           1);
+    case Kind::slotByte: {
+        const SlotPlace slot = slotPlace(static_cast<std::uint32_t>(key.number));
+        ValuePlace place = recordPlace(slot.offset, 1);
+        place.offset += key.offset;
+        return place;
+    }
     case Kind::aux:
         return recordPlace(AREA_SIZE - AUX_AREA_START, AUX_AREA_SIZE);
     case Kind::tuningBlock:

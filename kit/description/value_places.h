@@ -39,8 +39,8 @@ struct ValuePlace {
     bool isOnDisk = false;
     std::uint64_t offset = 0; ///< in the image, or in the record area of the disk
     Bytes mask;               ///< the bits that are the value's; as long as the place
-    /// The bytes that the image or disk must have at least. Of the tuning area it is the beginning
-    /// that counts, since the tool reads and writes it as a whole.
+    /// The bytes that the image or disk must have at least. What counts is the beginning of a whole
+    /// slot, or of the tuning area, since the tool reads and writes no part of them.
     std::uint64_t leastSize = 0;
 
     /// The offset in an image or disk of `size` bytes.

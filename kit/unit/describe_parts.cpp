@@ -6,6 +6,7 @@
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
+#include "kit/host/little_endian.h"
 #include "kit/host/sparse_content.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
@@ -121,11 +122,7 @@ ImageDescription describeImage(const Bytes& image) {
         if (place.offset + place.size > image.size()) {
             continue;
         }
-        const Bytes bytes = takePart(rest, place.offset, place.size);
-        unsigned value = 0;
-        for (std::size_t i = 0; i < bytes.size(); ++i) {
-            value |= unsigned{static_cast<unsigned char>(bytes[i])} << (8 * i);
-        }
+        const std::uint64_t value = fromLittleEndian(takePart(rest, place.offset, place.size));
         if (value != 0) {
             description.params.emplace(number, static_cast<std::uint16_t>(value));
         }

@@ -7,6 +7,7 @@
 #include "kit/description/value_places.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/little_endian.h"
 #include "kit/host/text.h"
 #include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
@@ -90,11 +91,7 @@ struct ReadValue {
 ReadValue readParam(const ValueKey& key, std::string_view text) {
     const std::int64_t value = requireNumber(valueName(key), text);
     checkParam(static_cast<std::uint16_t>(key.number), value);
-    Bytes bytes(valuePlace(key).mask.size(), '\0');
-    for (std::size_t i = 0; i < bytes.size(); ++i) {
-        bytes[i] = static_cast<char>(value >> (8 * i)); // low byte first
-    }
-    return {bytes, ""};
+    return {littleEndian(static_cast<std::uint64_t>(value), valuePlace(key).mask.size()), ""};
 }
 
 /// `bytes` with zeros behind them to the end of the key's place.

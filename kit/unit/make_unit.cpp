@@ -13,6 +13,7 @@
 #include "kit/host/finished_folder.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/little_endian.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/marker.h"
 #include "tuning/dps_block.h"
@@ -30,11 +31,7 @@ void makeImage(const ImageDescription& image, const fs::path& file) {
     const Descriptor descriptor = makeSparseFile(file, image.size);
     for (const auto& [number, value] : image.params) {
         const ParamPlace place = paramPlace(number);
-        Bytes bytes(1, static_cast<char>(value & 0xFFU));
-        if (place.size == 2) {
-            bytes += static_cast<char>(value >> 8U);
-        }
-        writeAt(descriptor, file, place.offset, bytes);
+        writeAt(descriptor, file, place.offset, littleEndian(value, place.size));
     }
     for (const auto& [offset, bytes] : image.bytes) {
         writeAt(descriptor, file, offset, bytes);

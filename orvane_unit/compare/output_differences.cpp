@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/compare/output_differences.h"
 
+#include "kit/description/unit_layout.h"
+
 #include <algorithm>
 #include <cstddef>
-#include <iterator>
 #include <memory>
 #include <optional>
 #include <utility>
@@ -11,6 +12,9 @@
 namespace orvane::desk {
 
 namespace {
+
+using kit::ValueKey;
+using Kind = ValueKey::Kind;
 
 std::string textOf(const Output& output) {
     std::string text;
@@ -21,47 +25,84 @@ std::string textOf(const Output& output) {
 }
 
 /// The key of each line of an output's text, by its number less one.
-std::vector<std::string> keysByLine(const Output& output) {
-    std::vector<std::string> keys;
+std::vector<ValueKey> keysByLine(const Output& output) {
+    std::vector<ValueKey> keys;
     for (const Line& line : output.lines) {
         const auto ends =
             static_cast<std::size_t>(std::count(line.text.begin(), line.text.end(), '\n'));
         const bool isOpen = !line.text.empty() && line.text.back() != '\n';
-        keys.insert(keys.end(), ends + (isOpen ? 1 : 0), keyText(line.origin.key));
+        keys.insert(keys.end(), ends + (isOpen ? 1 : 0), line.origin.key);
     }
     return keys;
 }
 
-MovedOutput movedOutput(const Output& before, const Output& after) {
-    MovedOutput moved{before.path, before.outcome, after.outcome, {}, {}};
-    for (const std::vector<kit::ValueKey>* keys : {&before.keys, &after.keys}) {
-        std::transform(keys->begin(), keys->end(), std::back_inserter(moved.keys), kit::keyText);
-    }
-    // A line that is left out for want of its value has nothing but its key.
-    for (const Line& line : before.lines) {
+/// The keys of the lines that are left out for want of their values.
+std::vector<ValueKey> keysOfMissingLines(const Output& output) {
+    std::vector<ValueKey> keys;
+    for (const Line& line : output.lines) {
         if (line.text.empty()) {
-            moved.keys.push_back(keyText(line.origin.key));
+            keys.push_back(line.origin.key);
         }
     }
-    for (const Line& line : after.lines) {
-        if (line.text.empty()) {
-            moved.keys.push_back(keyText(line.origin.key));
-        }
+    return keys;
+}
+
+OutputDifference differenceOf(const Output& before, const Output& after) {
+    OutputDifference difference{before.path, before.outcome, after.outcome, {}, {}};
+    for (const auto& keys :
+         {before.keys, after.keys, keysOfMissingLines(before), keysOfMissingLines(after)}) {
+        difference.keys.insert(difference.keys.end(), keys.begin(), keys.end());
     }
-    const std::vector<std::string> keysBefore = keysByLine(before);
-    const std::vector<std::string> keysAfter = keysByLine(after);
+    const std::vector<ValueKey> keysBefore = keysByLine(before);
+    const std::vector<ValueKey> keysAfter = keysByLine(after);
     for (const Hunk& hunk : differingHunks(textOf(before), textOf(after))) {
         for (const DiffLine& line : hunk.lines) {
             if (line.kind == DiffLine::Kind::removed) {
-                moved.lines.push_back({line, keysBefore.at(line.before - 1)});
+                difference.lines.push_back({line, keysBefore.at(line.before - 1)});
             } else if (line.kind == DiffLine::Kind::added) {
-                moved.lines.push_back({line, keysAfter.at(line.after - 1)});
+                difference.lines.push_back({line, keysAfter.at(line.after - 1)});
             }
         }
     }
-    return moved;
+    return difference;
 }
 
+/// Whether `changed` is the value of `key`, or something at or above the path of that file.
+bool isAbout(const ValueKey& changed, const ValueKey& key) {
+    if (changed == key) {
+        return true;
+    }
+    if (key.kind != Kind::file) {
+        return false;
+    }
+    const std::string& path = key.name;
+    switch (changed.kind) {
+    case Kind::file:
+    case Kind::fileBytes:
+    case Kind::link:
+    case Kind::folder:
+        // The key of a folder ends with a slash: any file in it counts.
+        return path == changed.name ||
+               (path.back() == '/' && changed.name.compare(0, path.size(), path) == 0);
+    case Kind::absent:
+        return kit::isAtOrBelow(path, changed.name);
+    case Kind::none:
+    case Kind::imageSize:
+    case Kind::param:
+    case Kind::imageBytes:
+    case Kind::slot:
+    case Kind::slotByte:
+    case Kind::aux:
+    case Kind::tuningBlock:
+    case Kind::tuningField:
+    case Kind::tuningRaw:
+    case Kind::diskBytes:
+        break;
+    }
+    return false;
+}
+
+/// Collects the outputs and lines of each change.
 class Distribution {
 public:
     explicit Distribution(const std::vector<ValueChange>& changes) {
@@ -70,19 +111,20 @@ public:
         }
     }
 
-    /// The place of the entry for `key`; none when that value has not changed.
-    std::optional<std::size_t> find(const std::string& key) const {
-        for (std::size_t i = 0; i < consequences_.size(); ++i) {
-            // "folder./tmp/x" and "absent./tmp" change the file of "file./tmp/x".
-            if (consequences_[i].change.key == key || isAbout(consequences_[i].change.key, key)) {
-                return i;
-            }
+    /// The index of the change that is about `key`; none when nothing of that has changed.
+    std::optional<std::size_t> find(const ValueKey& key) const {
+        const auto found = std::find_if(consequences_.begin(), consequences_.end(),
+                                        [&key](const Consequence& consequence) {
+                                            return isAbout(consequence.change.key, key);
+                                        });
+        if (found == consequences_.end()) {
+            return std::nullopt;
         }
-        return std::nullopt;
+        return static_cast<std::size_t>(found - consequences_.begin());
     }
 
-    std::optional<std::size_t> findAny(const std::vector<std::string>& keys) const {
-        for (const std::string& key : keys) {
+    std::optional<std::size_t> findAny(const std::vector<ValueKey>& keys) const {
+        for (const ValueKey& key : keys) {
             if (const std::optional<std::size_t> found = find(key)) {
                 return found;
             }
@@ -90,73 +132,59 @@ public:
         return std::nullopt;
     }
 
-    void give(std::optional<std::size_t> place, const MovedOutput& output, const MovedLine* line) {
-        if (!place) {
-            if (consequences_.empty() || !consequences_.back().change.key.empty()) {
+    /// Gives `output`, and `line` of it unless that is null, to the change at `index`; to the entry
+    /// with the empty key where there is none.
+    void assign(std::optional<std::size_t> index, const OutputDifference& output,
+                const DifferingLine* line) {
+        if (!index) {
+            if (consequences_.empty() || !consequences_.back().change.key.isEmpty()) {
                 consequences_.emplace_back();
             }
-            place = consequences_.size() - 1;
+            index = consequences_.size() - 1;
         }
-        std::vector<MovedOutput>& moved = consequences_[*place].moved;
-        if (moved.empty() || moved.back().path != output.path) {
-            moved.push_back({output.path, output.before, output.after, output.keys, {}});
+        std::vector<OutputDifference>& outputs = consequences_[*index].outputs;
+        if (outputs.empty() || outputs.back().path != output.path) {
+            outputs.push_back({output.path, output.before, output.after, output.keys, {}});
         }
         if (line != nullptr) {
-            moved.back().lines.push_back(*line);
+            outputs.back().lines.push_back(*line);
         }
     }
 
     std::vector<Consequence> take() { return std::move(consequences_); }
 
 private:
-    static bool isAbout(const std::string& changed, const std::string& key) {
-        constexpr char FILE[] = "file.";
-        const std::size_t dot = changed.find('.');
-        if (dot == std::string::npos || key.compare(0, sizeof FILE - 1, FILE) != 0) {
-            return false;
-        }
-        const std::string kind = changed.substr(0, dot);
-        const std::string changedPath = changed.substr(dot + 1);
-        const std::string path = key.substr(sizeof FILE - 1);
-        if (kind == "file" || kind == "folder" || kind == "link") {
-            // The key of a folder ends with a slash: any file in it counts.
-            return path == changedPath ||
-                   (path.back() == '/' && changedPath.compare(0, path.size(), path) == 0);
-        }
-        return kind == "absent" &&
-               (path + "/").compare(0, changedPath.size() + 1, changedPath + "/") == 0;
-    }
-
     std::vector<Consequence> consequences_;
 };
 
 } // namespace
 
-std::vector<MovedOutput> movedOutputs(const Explanation& before, const Explanation& after) {
-    std::vector<MovedOutput> moved;
+std::vector<OutputDifference> outputDifferences(const Explanation& before,
+                                                const Explanation& after) {
+    std::vector<OutputDifference> differences;
     for (std::size_t i = 0; i < before.size(); ++i) {
-        MovedOutput output = movedOutput(before[i], after.at(i));
-        if (!output.lines.empty() || output.before != output.after) {
-            moved.push_back(std::move(output));
+        OutputDifference difference = differenceOf(before[i], after.at(i));
+        if (!difference.lines.empty() || difference.before != difference.after) {
+            differences.push_back(std::move(difference));
         }
     }
-    return moved;
+    return differences;
 }
 
 std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
-                                      const std::vector<MovedOutput>& moved) {
+                                      const std::vector<OutputDifference>& differences) {
     Distribution distribution(changes);
-    for (const MovedOutput& output : moved) {
+    for (const OutputDifference& output : differences) {
         std::optional<std::size_t> whole = distribution.findAny(output.keys);
         if (output.lines.empty()) {
-            distribution.give(whole, output, nullptr);
+            distribution.assign(whole, output, nullptr);
         }
-        for (const MovedLine& line : output.lines) {
+        for (const DifferingLine& line : output.lines) {
             const std::optional<std::size_t> own = distribution.find(line.key);
             if (own && !whole) {
                 whole = own; // for the lines beside it, such as the comment above a value
             }
-            distribution.give(own ? own : whole, output, &line);
+            distribution.assign(own ? own : whole, output, &line);
         }
     }
     return distribution.take();

@@ -3,6 +3,7 @@
 // In what two explanations differ, and which values that comes from.
 #pragma once
 
+#include "kit/description/value_key.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explanation.h"
@@ -13,33 +14,34 @@
 namespace orvane::desk {
 
 /// A line that only one of the two has.
-struct MovedLine {
+struct DifferingLine {
     DiffLine line;
-    std::string key; ///< of the value it comes from; empty for the tool's own text
+    kit::ValueKey key; ///< of the value it comes from; empty for the tool's own text
 };
 
 /// An output that differs.
-struct MovedOutput {
+struct OutputDifference {
     std::string path;
     Outcome before = Outcome::generated;
     Outcome after = Outcome::generated;
-    std::vector<std::string> keys; ///< of the values that decided either outcome
-    std::vector<MovedLine> lines;
+    std::vector<kit::ValueKey> keys; ///< of the values that decided either outcome
+    std::vector<DifferingLine> lines;
 };
 
 /// The outputs that differ; both explanations are of the same option letters.
-std::vector<MovedOutput> movedOutputs(const Explanation& before, const Explanation& after);
+std::vector<OutputDifference> outputDifferences(const Explanation& before,
+                                                const Explanation& after);
 
-/// A value that differs, and the lines that differ because of it.
+/// A value that differs, and the outputs that differ because of it.
 struct Consequence {
     ValueChange change;
-    std::vector<MovedOutput> moved;
+    std::vector<OutputDifference> outputs;
 };
 
-/// Gives every moved line to the changed value that it comes from; where its own value has not
-/// changed, to one that decided its output's outcome. What can't be given to any value goes to a
-/// last entry with an empty key.
+/// Assigns every differing line to the changed value that it comes from; where its own value has
+/// not changed, to one that decided its output's outcome. What no value accounts for goes to a last
+/// entry with an empty key.
 std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
-                                      const std::vector<MovedOutput>& moved);
+                                      const std::vector<OutputDifference>& differences);
 
 } // namespace orvane::desk

@@ -6,11 +6,11 @@
 #include "config/crc32.h"
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
+#include "kit/description/unit_layout.h"
+#include "kit/description/value_places.h"
 #include "kit/host/text.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
-#include "orvane_unit/explain/value_origins.h"
-#include "orvane_unit/show/decoded_unit.h"
 #include "tuning/dps_block.h"
 
 #include <algorithm>
@@ -20,7 +20,6 @@
 #include <map>
 #include <optional>
 #include <sstream>
-#include <unordered_map>
 #include <variant>
 
 namespace orvane::desk {
@@ -70,54 +69,54 @@ std::string tuningText(const kit::TuningValue& value) {
     return text;
 }
 
-template <class Runs>
-void addRuns(UnitValues& values, const std::string& prefix, const Runs& runs) {
+/// `keyOf` gives the key of the bytes at an offset.
+template <class Runs, class KeyOf>
+void addRuns(UnitValues& values, const Runs& runs, const KeyOf& keyOf) {
     for (const auto& [offset, bytes] : runs) {
-        values.emplace_back(prefix + std::to_string(offset), textOrHex(bytes));
+        values.emplace_back(keyOf(offset), textOrHex(bytes));
     }
 }
 
 bool isNamed(const kit::UnitDescription& unit, const std::string& path) {
-    const auto names = [&path](const std::string& other) {
-        return path == other || path.compare(0, other.size() + 1, other + "/") == 0;
+    const auto isAbsent = [&path](const std::string& absent) {
+        return kit::isAtOrBelow(path, absent);
     };
     return unit.files.count(path) != 0 || unit.sparseFiles.count(path) != 0 ||
            unit.links.count(path) != 0 ||
-           std::any_of(unit.folders.begin(), unit.folders.end(),
-                       [&path](const std::string& other) { return path == other; }) ||
-           std::any_of(unit.absent.begin(), unit.absent.end(), names);
+           std::find(unit.folders.begin(), unit.folders.end(), path) != unit.folders.end() ||
+           std::any_of(unit.absent.begin(), unit.absent.end(), isAbsent);
 }
 
 void addImage(UnitValues& values, const kit::ImageDescription& image) {
-    values.emplace_back("image.size", std::to_string(image.size));
+    values.emplace_back(kit::imageSizeKey(), std::to_string(image.size));
     for (std::uint16_t number = 1; number <= PARAM_COUNT; ++number) {
         const auto param = image.params.find(number);
-        values.emplace_back("param." + std::to_string(number),
+        values.emplace_back(kit::paramKey(number),
                             std::to_string(param == image.params.end() ? 0 : param->second));
     }
-    addRuns(values, "image.bytes.", image.bytes);
+    addRuns(values, image.bytes, kit::imageBytesKey);
 }
 
 void addDisk(UnitValues& values, const kit::DiskDescription& disk) {
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
         const auto content = disk.slots.find(slot);
-        if (slot != CRC_RECORD_SLOT) {
-            values.emplace_back("slot." + std::to_string(slot),
+        if (kit::slotsWithin(slot).empty()) { // or its bytes have keys already
+            values.emplace_back(kit::slotKey(slot),
                                 content == disk.slots.end() ? "" : textOrHex(content->second));
         }
     }
-    values.emplace_back("aux", textOrHex(disk.aux.value_or("")));
+    values.emplace_back(kit::auxKey(), textOrHex(disk.aux.value_or("")));
     for (std::uint32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
         const auto block = disk.tuning.find(id);
-        const std::string prefix = "tuning." + std::to_string(id) + ".";
         const kit::TuningDescription zeros = kit::describeTuningBlock(DpsBlock{});
         const kit::TuningDescription& content = block == disk.tuning.end() ? zeros : block->second;
         for (const DpsField& field : DPS_LAYOUT) {
-            values.emplace_back(prefix + field.key, tuningText(content.fields.at(field.key)));
+            values.emplace_back(kit::tuningFieldKey(id, field.key),
+                                tuningText(content.fields.at(field.key)));
         }
-        values.emplace_back(prefix + "raw", textOrHex(content.raw));
+        values.emplace_back(kit::tuningRawKey(id), textOrHex(content.raw));
     }
-    addRuns(values, "disk.bytes.", disk.bytes);
+    addRuns(values, disk.bytes, kit::diskBytesKey);
 }
 
 } // namespace
@@ -131,26 +130,27 @@ UnitValues unitValues(const kit::UnitDescription& unit) {
         addDisk(values, unit.disk);
     }
     for (const auto& [path, content] : unit.files) {
-        values.emplace_back("file." + path, fileText(content));
+        values.emplace_back(kit::fileKey(path), fileText(content));
     }
     for (const auto& [path, content] : unit.sparseFiles) {
-        values.emplace_back("file." + path, kit::counted(content.size, "byte"));
-        addRuns(values, "file." + path + ".", content.bytes);
+        values.emplace_back(kit::fileKey(path), kit::counted(content.size, "byte"));
+        addRuns(values, content.bytes,
+                [&p = path](std::uint64_t offset) { return kit::fileBytesKey(p, offset); });
     }
     for (const auto& [path, target] : unit.links) {
-        values.emplace_back("link." + path, textOrHex(target));
+        values.emplace_back(kit::linkKey(path), textOrHex(target));
     }
     for (const std::string& path : unit.folders) {
-        values.emplace_back("folder." + path, "a folder");
+        values.emplace_back(kit::folderKey(path), "a folder");
     }
     for (const std::string& path : unit.absent) {
-        values.emplace_back("absent." + path, "removed");
+        values.emplace_back(kit::absentKey(path), "removed");
     }
     return values;
 }
 
 std::vector<ValueChange> differingValues(const UnitValues& before, const UnitValues& after) {
-    std::unordered_map<std::string, std::string> later(after.begin(), after.end());
+    std::map<kit::ValueKey, std::string> later(after.begin(), after.end());
     std::vector<ValueChange> changes;
     for (const auto& [key, value] : before) {
         const auto found = later.find(key);

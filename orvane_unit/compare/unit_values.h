@@ -1,12 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The values of a unit by their keys: those that `orvane-unit set` takes, and "file.", "folder."
-// and such with a path for all else that a run can meet.
+// The values of a unit by their keys: image, disk, and all else that a run can meet.
 #pragma once
 
 #include "kit/description/unit_description.h"
+#include "kit/description/value_key.h"
 
-#include <algorithm>
 #include <string>
 #include <utility>
 #include <vector>
@@ -14,13 +13,13 @@
 namespace orvane::desk {
 
 /// Key and value, in the order of a description. A value that is not there has no entry.
-using UnitValues = std::vector<std::pair<std::string, std::string>>;
+using UnitValues = std::vector<std::pair<kit::ValueKey, std::string>>;
 
 UnitValues unitValues(const kit::UnitDescription& unit);
 
 /// A value that differs between two units. "(missing)" stands for one that is not there.
 struct ValueChange {
-    std::string key;
+    kit::ValueKey key;
     std::string before;
     std::string after;
 };

@@ -1,13 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/report/comparison_text.h"
 
+#include "kit/description/value_key.h"
 #include "kit/host/text.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"
+#include "tuning/dps_block.h"
 
+#include <cstdint>
 #include <map>
 #include <ostream>
 #include <set>
@@ -18,13 +21,15 @@ namespace orvane::desk {
 
 namespace {
 
-void printMoved(std::ostream& out, const MovedOutput& output) {
+using kit::ValueKey;
+
+void printDifference(std::ostream& out, const OutputDifference& output) {
     out << "  " << painted(Colour::place, output.path);
     if (output.before != output.after) {
         out << ": " << outcomeName(output.before) << " -> " << outcomeName(output.after);
     }
     out << '\n';
-    for (const MovedLine& line : output.lines) {
+    for (const DifferingLine& line : output.lines) {
         const bool isRemoved = line.line.kind == DiffLine::Kind::removed;
         const std::string text = (isRemoved ? "-" : "+") + printableLine(line.line.text);
         out << "    " << painted(isRemoved ? Colour::removed : Colour::added, text) << '\n';
@@ -35,62 +40,53 @@ std::string valueForEyes(const std::string& value) {
     return value.empty() ? "(empty)" : value;
 }
 
-/// A key with a number at its end, taken apart.
-struct NumberedKey {
-    std::string stem;
-    unsigned long number = 0;
-    bool isNumbered = false;
+bool isByteOfSlot(const ValueKey& key) {
+    return key.kind == ValueKey::Kind::slotByte;
+}
 
-    explicit NumberedKey(const std::string& key) : stem(key) {
-        const std::size_t dot = key.rfind('.');
-        const std::string end = key.substr(dot + 1);
-        isNumbered = dot != std::string::npos && !end.empty() &&
-                     end.find_first_not_of("0123456789") == std::string::npos;
-        if (isNumbered) {
-            stem = key.substr(0, dot + 1);
-            number = std::stoul(end);
-        }
+/// The key of the next parameter, byte of the slot or tuning block; empty for other keys.
+ValueKey nextKey(ValueKey key) {
+    if (isByteOfSlot(key)) {
+        ++key.offset;
+    } else if (key.kind == ValueKey::Kind::param || key.kind == ValueKey::Kind::tuningBlock) {
+        ++key.number;
+    } else {
+        return {};
     }
-};
+    return key;
+}
 
-/// "param.1-21", "tuning.0: 44 fields": neighbours in one word.
-std::vector<std::string> inRanges(const std::vector<std::string>& keys) {
+/// The keys as texts, those with consecutive numbers as one: "param.1-21".
+std::vector<std::string> inRanges(const std::vector<ValueKey>& keys) {
     std::vector<std::string> ranges;
-    for (std::size_t i = 0; i < keys.size();) {
-        const NumberedKey first(keys[i]);
-        std::size_t next = i + 1;
-        for (; first.isNumbered && next < keys.size(); ++next) {
-            const NumberedKey key(keys[next]);
-            if (!key.isNumbered || key.stem != first.stem ||
-                key.number != first.number + (next - i)) {
-                break;
-            }
+    for (std::size_t first = 0, end = 0; first < keys.size(); first = end) {
+        for (end = first + 1; end < keys.size() && keys[end] == nextKey(keys[end - 1]);) {
+            ++end;
         }
-        ranges.push_back(next - i == 1
-                             ? keys[i]
-                             : keys[i] + "-" + std::to_string(NumberedKey(keys[next - 1]).number));
-        i = next;
+        const ValueKey& last = keys[end - 1];
+        const std::uint64_t number = isByteOfSlot(last) ? last.offset : last.number;
+        ranges.push_back(keyText(keys[first]) +
+                         (end - first == 1 ? "" : "-" + std::to_string(number)));
     }
     return ranges;
 }
 
-/// "tuning.0: 44 fields" for a whole block that moves nothing.
-std::vector<std::string> withWholeBlocks(const std::vector<std::string>& keys) {
-    constexpr std::size_t BLOCK_PREFIX = sizeof "tuning.0" - 1;
-    constexpr std::size_t FIELDS = 44;
-    std::map<std::string, std::size_t> fields;
-    for (const std::string& key : keys) {
-        if (key.compare(0, 7, "tuning.") == 0) {
-            ++fields[key.substr(0, BLOCK_PREFIX)];
+/// The keys, with that of a block in place of those of its fields where they are all there.
+std::vector<ValueKey> withWholeBlocks(const std::vector<ValueKey>& keys) {
+    std::map<std::uint64_t, std::size_t> fieldsOfBlocks;
+    for (const ValueKey& key : keys) {
+        if (key.kind == ValueKey::Kind::tuningField) {
+            ++fieldsOfBlocks[key.number];
         }
     }
-    std::vector<std::string> merged;
-    for (const std::string& key : keys) {
-        const auto block = fields.find(key.substr(0, BLOCK_PREFIX));
-        if (block == fields.end() || block->second != FIELDS) {
+    std::vector<ValueKey> merged;
+    for (const ValueKey& key : keys) {
+        const ValueKey block = kit::tuningBlockKey(key.number);
+        if (key.kind != ValueKey::Kind::tuningField ||
+            fieldsOfBlocks[key.number] != DPS_FIELD_COUNT) {
             merged.push_back(key);
-        } else if (merged.empty() || merged.back() != block->first) {
-            merged.push_back(block->first);
+        } else if (merged.empty() || merged.back() != block) {
+            merged.push_back(block);
         }
     }
     return merged;
@@ -101,37 +97,37 @@ std::vector<std::string> withWholeBlocks(const std::vector<std::string>& keys) {
 void printConsequences(std::ostream& out, const std::vector<Consequence>& consequences) {
     for (const Consequence& consequence : consequences) {
         const ValueChange& change = consequence.change;
-        if (change.key.empty()) {
+        if (change.key.isEmpty()) {
             out << "of no value that differs:\n";
         } else {
-            out << kit::printable(change.key) << ": "
+            out << kit::printable(keyText(change.key)) << ": "
                 << painted(Colour::removed, valueForEyes(change.before)) << " -> "
                 << painted(Colour::added, valueForEyes(change.after)) << '\n';
         }
-        if (consequence.moved.empty()) {
+        if (consequence.outputs.empty()) {
             out << "  " << painted(Colour::faint, "moves no output") << '\n';
         }
-        for (const MovedOutput& output : consequence.moved) {
-            printMoved(out, output);
+        for (const OutputDifference& output : consequence.outputs) {
+            printDifference(out, output);
         }
     }
 }
 
 void printImpacts(std::ostream& out, const std::vector<Impact>& impacts) {
-    std::vector<std::string> still;
+    std::vector<ValueKey> inert;
     for (const Impact& impact : impacts) {
         if (impact.lines.empty()) {
-            still.push_back(impact.key);
+            inert.push_back(impact.key);
             continue;
         }
-        out << painted(Colour::place, impact.key) << ": " << impact.moving << " of "
+        out << painted(Colour::place, keyText(impact.key)) << ": " << impact.changing << " of "
             << kit::counted(impact.tried, "value") << " moved\n";
         for (const std::string& line : impact.lines) {
             out << "  " << line << '\n';
         }
     }
-    out << kit::counted(still.size(), "input") << " moved nothing:\n";
-    for (const std::string& range : inRanges(withWholeBlocks(still))) {
+    out << kit::counted(inert.size(), "input") << " moved nothing:\n";
+    for (const std::string& range : inRanges(withWholeBlocks(inert))) {
         out << "  " << range << '\n';
     }
 }

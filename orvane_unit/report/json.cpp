@@ -177,9 +177,9 @@ Json filesJson(const Contents& contents) {
     return files;
 }
 
-Json movedJson(const MovedOutput& output) {
+Json differenceJson(const OutputDifference& output) {
     Json lines = Json::array();
-    for (const MovedLine& line : output.lines) {
+    for (const DifferingLine& line : output.lines) {
         const bool isRemoved = line.line.kind == DiffLine::Kind::removed;
         lines.push_back({{"side", isRemoved ? "first" : "second"},
                          {"line", isRemoved ? line.line.before : line.line.after},
@@ -260,10 +260,10 @@ std::string consequencesJson(const std::string& first, const std::string& second
     json["values"] = Json::array();
     for (const Consequence& consequence : consequences) {
         Json outputs = Json::array();
-        for (const MovedOutput& output : consequence.moved) {
-            outputs.push_back(movedJson(output));
+        for (const OutputDifference& output : consequence.outputs) {
+            outputs.push_back(differenceJson(output));
         }
-        json["values"].push_back({{"key", bytesJson(consequence.change.key)},
+        json["values"].push_back({{"key", bytesJson(keyText(consequence.change.key))},
                                   {"first", bytesJson(consequence.change.before)},
                                   {"second", bytesJson(consequence.change.after)},
                                   {"outputs", outputs}});
@@ -276,9 +276,9 @@ std::string impactsJson(const std::string& root, const std::vector<Impact>& impa
     json["root"] = bytesJson(root);
     json["inputs"] = Json::array();
     for (const Impact& impact : impacts) {
-        json["inputs"].push_back({{"key", impact.key},
+        json["inputs"].push_back({{"key", keyText(impact.key)},
                                   {"tried", impact.tried},
-                                  {"moving", impact.moving},
+                                  {"moving", impact.changing},
                                   {"lines", impact.lines}});
     }
     return json.dump();

@@ -27,7 +27,7 @@ TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
         {kit::paramKey(134), 133, "\xFF\xFF", 135},
         {kit::slotKey(9), BASE + 129, std::string(8, '\xFF'), BASE - 129},
         {kit::slotKey(16), BASE + 2190, std::string(24, '\xFF'), BASE - 2190},
-        {kit::slotByteKey(9, 7), BASE + 136, "\xFF", BASE - 136},
+        {kit::slotByteKey(9, 7), BASE + 136, "\xFF", BASE - 129},
         {kit::auxKey(), BASE + 3072, std::string(1024, '\xFF'), BASE - 3072},
         {kit::tuningFieldKey(0, "qwaHFESwitch"), BASE + 4096, "\xC0", BASE - 4096},
         {kit::tuningFieldKey(3, "qwaNRAtten"), BASE + 4096 + 3 * 188 + 23, "\xFF\xFF", BASE - 4096},

@@ -20,18 +20,18 @@ using desk::Impact;
 using Lines = std::set<std::string>;
 
 std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
-                                        const std::vector<std::string>& beginnings = {}) {
+                                        const std::vector<std::string>& prefixes = {}) {
     std::map<std::string, Impact> impacts;
     std::size_t last = 0;
     for (const Impact& impact :
-         desk::findImpacts(root, beginnings, [&last](std::size_t done, std::size_t all) {
+         desk::findImpacts(root, prefixes, [&last](std::size_t done, std::size_t all) {
              EXPECT_EQ(done, last + 1);
              EXPECT_LE(done, all);
              last = done;
          })) {
-        EXPECT_TRUE(impacts.emplace(impact.key, impact).second) << impact.key;
-        EXPECT_GE(impact.tried, 3U) << impact.key;
-        EXPECT_EQ(impact.moving == 0, impact.lines.empty()) << impact.key;
+        EXPECT_TRUE(impacts.emplace(keyText(impact.key), impact).second);
+        EXPECT_GE(impact.tried, 3U) << keyText(impact.key);
+        EXPECT_EQ(impact.changing == 0, impact.lines.empty()) << keyText(impact.key);
     }
     EXPECT_EQ(last, impacts.size());
     return impacts;

@@ -21,25 +21,30 @@ namespace {
 using desk::Consequence;
 using kit::UnitDescription;
 
-/// What comes of the change, by the key of each value that differs.
-std::map<std::string, Consequence>
-consequencesOf(const std::function<void(UnitDescription&)>& change) {
-    const DescribedUnit first;
-    const DescribedUnit second(change);
+using Change = std::function<void(UnitDescription&)>;
+
+/// What comes of the change, by the key of each value that differs. Both units begin with `common`.
+std::map<std::string, Consequence> consequencesOf(
+    const Change& change, const Change& common = [](UnitDescription&) {}) {
+    const DescribedUnit first(common);
+    const DescribedUnit second([&](UnitDescription& unit) {
+        common(unit);
+        change(unit);
+    });
     std::map<std::string, Consequence> found;
     for (const Consequence& consequence : desk::consequences(
              desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
                                    desk::unitValues(kit::inspectInputs(second.root()))),
-             desk::movedOutputs(desk::explainUnit(first.root(), "ai"),
-                                desk::explainUnit(second.root(), "ai")))) {
-        found[consequence.change.key] = consequence;
+             desk::outputDifferences(desk::explainUnit(first.root(), "ai"),
+                                     desk::explainUnit(second.root(), "ai")))) {
+        found[keyText(consequence.change.key)] = consequence;
     }
     return found;
 }
 
 std::set<std::string> pathsOf(const Consequence& consequence) {
     std::set<std::string> paths;
-    for (const desk::MovedOutput& output : consequence.moved) {
+    for (const desk::OutputDifference& output : consequence.outputs) {
         paths.insert(output.path);
     }
     return paths;
@@ -47,8 +52,8 @@ std::set<std::string> pathsOf(const Consequence& consequence) {
 
 std::vector<std::string> linesOf(const Consequence& consequence, const std::string& path) {
     std::vector<std::string> lines;
-    for (const desk::MovedOutput& output : consequence.moved) {
-        for (const desk::MovedLine& line : output.lines) {
+    for (const desk::OutputDifference& output : consequence.outputs) {
+        for (const desk::DifferingLine& line : output.lines) {
             if (output.path == path) {
                 const bool isRemoved = line.line.kind == desk::DiffLine::Kind::removed;
                 lines.push_back((isRemoved ? "-" : "+") + line.line.text);
@@ -63,11 +68,11 @@ using Paths = std::set<std::string>;
 
 const Paths IAP_OUTPUTS = {IAP2_DEVICE_FILE.output, IAP2_FILE.output, IAP1_FILE.output};
 
-TEST(MovesTest, SameUnitsDifferInNothing) {
+TEST(OutputDifferencesTest, SameUnitsDifferInNothing) {
     EXPECT_TRUE(consequencesOf([](UnitDescription&) {}).empty());
 }
 
-TEST(MovesTest, ParameterMovesItsLines) {
+TEST(OutputDifferencesTest, ParameterMovesItsLines) {
     const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[139] = 1; });
     ASSERT_EQ(found.size(), 1U);
     const Consequence& consequence = found.at("param.139");
@@ -75,16 +80,16 @@ TEST(MovesTest, ParameterMovesItsLines) {
     EXPECT_EQ(consequence.change.after, "1");
     EXPECT_EQ(linesOf(consequence, AIRPLAY_FILE.output),
               (Lines{"-model = Quarion Velmira\n", "+model = Marl Tulvari\n"}));
-    EXPECT_EQ(consequence.moved.size(), 4U);
+    EXPECT_EQ(consequence.outputs.size(), 4U);
 }
 
-TEST(MovesTest, ParameterThatIsNotReadMovesNothing) {
+TEST(OutputDifferencesTest, ParameterThatIsNotReadMovesNothing) {
     const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[50] = 3; });
     ASSERT_EQ(found.size(), 1U);
-    EXPECT_TRUE(found.at("param.50").moved.empty());
+    EXPECT_TRUE(found.at("param.50").outputs.empty());
 }
 
-TEST(MovesTest, SlotsAndAuxiliaryAreaAreTold) {
+TEST(OutputDifferencesTest, SlotsAndAuxiliaryAreaAreTold) {
     const auto found = consequencesOf([](UnitDescription& unit) {
         unit.disk.slots[9] = "SN9";
         unit.disk.slots[1] = std::string("\x01\x02", 2);
@@ -94,12 +99,12 @@ TEST(MovesTest, SlotsAndAuxiliaryAreaAreTold) {
     EXPECT_EQ(linesOf(found.at("slot.9"), IAP1_FILE.output),
               (Lines{"-serial=SN004217\n", "+serial=SN9\n"}));
     EXPECT_EQ(found.at("slot.1").change.after, "hex:0102");
-    EXPECT_TRUE(found.at("slot.1").moved.empty());
+    EXPECT_TRUE(found.at("slot.1").outputs.empty());
     EXPECT_EQ(found.at("aux").change.after, "bench");
     EXPECT_EQ(found.size(), 3U);
 }
 
-TEST(MovesTest, GeneratedProfileBringsTheTuningFiles) {
+TEST(OutputDifferencesTest, GeneratedProfileBringsTheTuningFiles) {
     const auto found = consequencesOf([](UnitDescription& unit) {
         unit.image.params[134] = 0xFFFF;
         unit.disk.tuning[3].fields["qwaNRAtten"] = std::int64_t{-40};
@@ -114,7 +119,7 @@ TEST(MovesTest, GeneratedProfileBringsTheTuningFiles) {
               Lines{"+qwaNRAtten -40\n"});
 }
 
-TEST(MovesTest, VersionFileMovesTheFirmwareVersions) {
+TEST(OutputDifferencesTest, VersionFileMovesTheFirmwareVersions) {
     const std::string path = "/fs/rwdata/.Version/app.inf";
     const auto found = consequencesOf([&path](UnitDescription& unit) {
         unit.files[path] = "Type=Application\nVersion Number=4.5.6\n";
@@ -124,7 +129,7 @@ TEST(MovesTest, VersionFileMovesTheFirmwareVersions) {
               (Lines{"-firmware_version=030a02\n", "+firmware_version=040506\n"}));
 }
 
-TEST(MovesTest, VersionFileThatIsGoneIsTheCause) {
+TEST(OutputDifferencesTest, VersionFileThatIsGoneIsTheCause) {
     const std::string path = "/fs/rwdata/.Version/app.inf";
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
     EXPECT_EQ(pathsOf(found.at("file." + path)), IAP_OUTPUTS);
@@ -132,7 +137,7 @@ TEST(MovesTest, VersionFileThatIsGoneIsTheCause) {
     EXPECT_EQ(found.size(), 1U);
 }
 
-TEST(MovesTest, TemplateMovesItsOwnLines) {
+TEST(OutputDifferencesTest, TemplateMovesItsOwnLines) {
     const std::string path = AIRPLAY_FILE.templateFile;
     const auto found =
         consequencesOf([&path](UnitDescription& unit) { unit.files[path] = "another template\n"; });
@@ -141,42 +146,56 @@ TEST(MovesTest, TemplateMovesItsOwnLines) {
               (Lines{"-airplay template\n", "+another template\n"}));
 }
 
-TEST(MovesTest, MissingTemplateIsTheCauseOfTheStockFile) {
+TEST(OutputDifferencesTest, MissingTemplateIsTheCauseOfTheStockFile) {
     const std::string path = IAP2_FILE.templateFile;
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
     ASSERT_EQ(found.size(), 1U);
     const Consequence& consequence = found.at("file." + path);
-    ASSERT_EQ(consequence.moved.size(), 1U);
-    EXPECT_EQ(consequence.moved[0].before, desk::Outcome::generated);
-    EXPECT_EQ(consequence.moved[0].after, desk::Outcome::stock);
+    ASSERT_EQ(consequence.outputs.size(), 1U);
+    EXPECT_EQ(consequence.outputs[0].before, desk::Outcome::generated);
+    EXPECT_EQ(consequence.outputs[0].after, desk::Outcome::stock);
 }
 
-TEST(MovesTest, EmptyTemplateOfIap2IsTheCauseOfTheStockFileOfIap1) {
+TEST(OutputDifferencesTest, EmptyTemplateOfIap2IsTheCauseOfTheStockFileOfIap1) {
     const std::string path = IAP2_FILE.templateFile;
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files[path] = ""; });
     ASSERT_EQ(found.size(), 1U);
     EXPECT_EQ(pathsOf(found.at("file." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
 }
 
-TEST(MovesTest, StockFileThatIsNotUsedMovesNothing) {
+TEST(OutputDifferencesTest, BytesOfASparseTemplateMoveItsLine) {
+    const std::string path = AIRPLAY_FILE.templateFile;
+    const auto found = consequencesOf(
+        [&path](UnitDescription& unit) { unit.sparseFiles[path].bytes[4998] = "B\n"; },
+        [&path](UnitDescription& unit) {
+            unit.files.erase(path);
+            unit.sparseFiles[path] = {5000, {{4998, "A\n"}}};
+        });
+    ASSERT_EQ(found.size(), 1U);
+    const Consequence& consequence = found.at("file.bytes.4998." + path);
+    EXPECT_EQ(pathsOf(consequence), Paths{AIRPLAY_FILE.output});
+    EXPECT_EQ(linesOf(consequence, AIRPLAY_FILE.output).size(), 2U);
+}
+
+TEST(OutputDifferencesTest, StockFileThatIsNotUsedMovesNothing) {
     const std::string path = AIRPLAY_FILE.stockFile;
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
     ASSERT_EQ(found.size(), 1U);
-    EXPECT_TRUE(found.at("file." + path).moved.empty());
+    EXPECT_TRUE(found.at("file." + path).outputs.empty());
 }
 
-TEST(MovesTest, MissingImageMovesEveryValueUnderItsOwnKey) {
+TEST(OutputDifferencesTest, MissingImageMovesEveryValueUnderItsOwnKey) {
     const auto found =
         consequencesOf([](UnitDescription& unit) { unit.absent.push_back(CONFIG_SHM_NAME); });
     EXPECT_EQ(found.at("param.139").change.after, "(missing)");
-    EXPECT_EQ(found.at("param.139").moved.size(), 4U);
+    EXPECT_EQ(found.at("param.139").outputs.size(), 4U);
     EXPECT_EQ(pathsOf(found.at("param.22")), Paths{AIRPLAY_FILE.output});
     // The two lines of the value itself, its comment and the empty line behind it.
     EXPECT_EQ(linesOf(found.at("param.134"), AIRPLAY_FILE.output).size(), 3U);
     EXPECT_EQ(found.count(""), 0U);
 }
 
-TEST(MovesTest, MissingDiskMovesTheSerial) {
+TEST(OutputDifferencesTest, MissingDiskMovesTheSerial) {
     const auto found =
         consequencesOf([](UnitDescription& unit) { unit.absent.push_back(BOOT_DISK); });
     EXPECT_EQ(linesOf(found.at("slot.9"), IAP2_FILE.output),
@@ -184,7 +203,7 @@ TEST(MovesTest, MissingDiskMovesTheSerial) {
     EXPECT_EQ(found.count(""), 0U);
 }
 
-TEST(MovesTest, FolderInThePlaceOfAnOutputIsTheCause) {
+TEST(OutputDifferencesTest, FolderInThePlaceOfAnOutputIsTheCause) {
     const std::string path = IAP2_FILE.output;
     const auto found =
         consequencesOf([&path](UnitDescription& unit) { unit.folders.push_back(path); });

@@ -32,7 +32,7 @@ Changes changesOf(const std::function<void(UnitDescription&)>& change) {
     for (const ValueChange& value :
          desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
                                desk::unitValues(kit::inspectInputs(second.root())))) {
-        changes[value.key] = {value.before, value.after};
+        changes[keyText(value.key)] = {value.before, value.after};
     }
     return changes;
 }
@@ -75,6 +75,19 @@ TEST(UnitValuesTest, FilesAreToldBySizeAndChecksum) {
             {"folder./fs/mp/etc/airplay_static.conf", {"(missing)", "a folder"}}}));
 }
 
+TEST(UnitValuesTest, BytesOfASparseFileAreNotThoseOfAFileWithANumberAtItsEnd) {
+    UnitDescription first;
+    first.sparseFiles["/fs/x"] = {5000, {{5, "x"}}};
+    UnitDescription second = first;
+    second.files["/fs/x.5"] = "map\n";
+    const std::vector<ValueChange> changes =
+        desk::differingValues(desk::unitValues(first), desk::unitValues(second));
+    ASSERT_EQ(changes.size(), 1U);
+    EXPECT_TRUE(changes[0].key == kit::fileKey("/fs/x.5"));
+    EXPECT_EQ(changes[0].before, "(missing)");
+    EXPECT_EQ(changes[0].after, "4 bytes, CRC-32 6ef7c13d");
+}
+
 TEST(UnitValuesTest, WhatTheToolDoesNotReadIsNoDifference) {
     EXPECT_EQ(changesOf([](UnitDescription& unit) {
                   unit.files["/fs/rwdata/notes"] = "not read\n";
@@ -96,13 +109,15 @@ TEST(UnitValuesTest, MissingDiskTakesAllItsValuesAlong) {
 }
 
 TEST(UnitValuesTest, DifferencesComeInTheOrderOfTheFirstThenTheSecond) {
-    const UnitValues before = {{"c", "1"}, {"a", "1"}, {"b", "1"}};
-    const UnitValues after = {{"d", "2"}, {"b", "2"}, {"c", "1"}};
+    const auto key = kit::paramKey;
+    const UnitValues before = {{key(3), "1"}, {key(1), "1"}, {key(2), "1"}};
+    const UnitValues after = {{key(4), "2"}, {key(2), "2"}, {key(3), "1"}};
     std::vector<std::string> found;
     for (const ValueChange& change : desk::differingValues(before, after)) {
-        found.push_back(change.key + ": " + change.before + " " + change.after);
+        found.push_back(keyText(change.key) + ": " + change.before + " " + change.after);
     }
-    EXPECT_EQ(found, (std::vector<std::string>{"a: 1 (missing)", "b: 1 2", "d: (missing) 2"}));
+    EXPECT_EQ(found, (std::vector<std::string>{"param.1: 1 (missing)", "param.2: 1 2",
+                                               "param.4: (missing) 2"}));
 }
 
 /// An output that is a link to a template of a later one: no single input accounts for that.
@@ -115,14 +130,14 @@ TEST(UnitValuesTest, LinesOfNoValueComeLast) {
     const std::vector<desk::Consequence> found = desk::consequences(
         desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
                               desk::unitValues(kit::inspectInputs(second.root()))),
-        desk::movedOutputs(desk::explainUnit(first.root(), "i"),
-                           desk::explainUnit(second.root(), "i")));
+        desk::outputDifferences(desk::explainUnit(first.root(), "i"),
+                                desk::explainUnit(second.root(), "i")));
     ASSERT_EQ(found.size(), 2U);
-    EXPECT_EQ(found[0].change.key, "param.50");
-    EXPECT_TRUE(found[0].moved.empty());
-    EXPECT_EQ(found[1].change.key, "");
-    ASSERT_EQ(found[1].moved.size(), 1U);
-    EXPECT_EQ(found[1].moved[0].path, IAP1_FILE.output);
+    EXPECT_TRUE(found[0].change.key == kit::paramKey(50));
+    EXPECT_TRUE(found[0].outputs.empty());
+    EXPECT_TRUE(found[1].change.key.isEmpty());
+    ASSERT_EQ(found[1].outputs.size(), 1U);
+    EXPECT_EQ(found[1].outputs[0].path, IAP1_FILE.output);
 }
 
 } // namespace

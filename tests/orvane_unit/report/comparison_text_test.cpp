@@ -27,15 +27,15 @@ std::string printed(const std::vector<Impact>& impacts) {
     return out.str();
 }
 
-TEST(MovesTextTest, ConsequencesStandBelowTheirValues) {
-    const desk::MovedLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, "slot.9"};
-    const desk::MovedLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, "slot.9"};
+TEST(ComparisonTextTest, ConsequencesStandBelowTheirValues) {
+    const desk::DifferingLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, kit::slotKey(9)};
+    const desk::DifferingLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, kit::slotKey(9)};
     EXPECT_EQ(printed(std::vector<Consequence>{
-                  {{"slot.9", "", "B"},
+                  {{kit::slotKey(9), "", "B"},
                    {{"/tmp/x", Outcome::generated, Outcome::generated, {}, {removed, added}},
                     {"/tmp/y", Outcome::generated, Outcome::stock, {}, {}}}},
-                  {{"param.1", "0", "1"}, {}},
-                  {{"", "", ""}, {{"/tmp/z", Outcome::kept, Outcome::empty, {}, {}}}}}),
+                  {{kit::paramKey(1), "0", "1"}, {}},
+                  {{{}, "", ""}, {{"/tmp/z", Outcome::kept, Outcome::empty, {}, {}}}}}),
               "slot.9: (empty) -> B\n"
               "  /tmp/x\n    -a\n    +\\xff\n"
               "  /tmp/y: generated -> stock\n"
@@ -43,35 +43,36 @@ TEST(MovesTextTest, ConsequencesStandBelowTheirValues) {
               "of no value that differs:\n  /tmp/z: kept -> empty\n");
 }
 
-TEST(MovesTextTest, ImpactsThatMoveNothingAreGatheredInRanges) {
-    EXPECT_EQ(printed(std::vector<Impact>{{"param.1", 3, 0, {}},
-                                          {"param.2", 3, 0, {}},
-                                          {"param.3", 13, 12, {"/tmp/x:1", "/tmp/y"}},
-                                          {"param.4", 1, 1, {"/tmp/x:2"}},
-                                          {"param.5", 3, 0, {}},
-                                          {"slot.0.0", 3, 0, {}},
-                                          {"slot.1.0", 3, 0, {}},
-                                          {"slot.1.1", 3, 0, {}},
-                                          {"tuning.1.qwaA", 3, 0, {}}}),
+TEST(ComparisonTextTest, ImpactsThatMoveNothingAreGatheredInRanges) {
+    EXPECT_EQ(printed(std::vector<Impact>{{kit::paramKey(1), 3, 0, {}},
+                                          {kit::paramKey(2), 3, 0, {}},
+                                          {kit::paramKey(3), 13, 12, {"/tmp/x:1", "/tmp/y"}},
+                                          {kit::paramKey(4), 1, 1, {"/tmp/x:2"}},
+                                          {kit::paramKey(5), 3, 0, {}},
+                                          {kit::slotByteKey(0, 0), 3, 0, {}},
+                                          {kit::slotByteKey(1, 0), 3, 0, {}},
+                                          {kit::slotByteKey(1, 1), 3, 0, {}},
+                                          {kit::tuningFieldKey(1, "qwaA"), 3, 0, {}}}),
               "param.3: 12 of 13 values moved\n  /tmp/x:1\n  /tmp/y\n"
               "param.4: 1 of 1 value moved\n  /tmp/x:2\n"
               "7 inputs moved nothing:\n"
               "  param.1-2\n  param.5\n  slot.0.0\n  slot.1.0-1\n  tuning.1.qwaA\n");
 }
 
-TEST(MovesTextTest, WholeTuningBlocksAreOneWord) {
+TEST(ComparisonTextTest, WholeTuningBlocksAreOneWord) {
     std::vector<Impact> impacts;
-    for (const char* block : {"tuning.4", "tuning.5", "tuning.7"}) {
+    for (const std::uint64_t block : {4U, 5U, 7U}) {
         for (int field = 0; field < 44; ++field) {
-            impacts.push_back({std::string(block) + ".qwa" + std::to_string(field), 3, 0, {}});
+            impacts.push_back(
+                {kit::tuningFieldKey(block, "qwa" + std::to_string(field)), 3, 0, {}});
         }
     }
-    impacts.push_back({"tuning.8.qwa0", 3, 0, {}});
+    impacts.push_back({kit::tuningFieldKey(8, "qwa0"), 3, 0, {}});
     EXPECT_EQ(printed(impacts), "133 inputs moved nothing:\n"
                                 "  tuning.4-5\n  tuning.7\n  tuning.8.qwa0\n");
 }
 
-TEST(MovesTextTest, ProgressIsDrawnWhereItGrowsAndWipedOutAtItsEnd) {
+TEST(ComparisonTextTest, ProgressIsDrawnWhereItGrowsAndWipedOutAtItsEnd) {
     std::ostringstream terminal;
     for (std::size_t done = 1; done <= 80; ++done) {
         desk::printProgress(terminal, done, 80);

@@ -92,8 +92,8 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
                    desk::consequences(
                        desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
                                              desk::unitValues(kit::inspectInputs(second.root()))),
-                       desk::movedOutputs(desk::explainUnit(first.root(), "a"),
-                                          desk::explainUnit(second.root(), "a")))),
+                       desk::outputDifferences(desk::explainUnit(first.root(), "a"),
+                                               desk::explainUnit(second.root(), "a")))),
                "diff");
     EXPECT_EQ(
         report.at("values"),
@@ -113,8 +113,8 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
 }
 
 TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
-    const json impacts =
-        parsed(desk::impactsJson("R", {{"param.22", 13, 12, {"/tmp/airplay.conf:23"}}}), "impact");
+    const json impacts = parsed(
+        desk::impactsJson("R", {{kit::paramKey(22), 13, 12, {"/tmp/airplay.conf:23"}}}), "impact");
     EXPECT_EQ(impacts.at("inputs"), (json::array({{{"key", "param.22"},
                                                    {"tried", 13},
                                                    {"moving", 12},
