@@ -17,6 +17,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <iomanip>
 #include <map>
 #include <optional>
 #include <sstream>
@@ -37,7 +38,7 @@ std::string crcText(const std::string& bytes) {
         crc = crc32Step(crc, static_cast<std::uint8_t>(byte));
     }
     std::ostringstream text;
-    text << std::hex << ~crc;
+    text << std::hex << std::setw(8) << std::setfill('0') << ~crc;
     return text.str();
 }
 

@@ -62,15 +62,17 @@ TEST(UnitValuesTest, EveryKindHasItsKey) {
 }
 
 TEST(UnitValuesTest, FilesAreToldBySizeAndChecksum) {
-    // By zlib: "map\n" and "airplay template\n".
+    // By zlib: "map\n", "map 3743\n" and "airplay template\n".
     EXPECT_EQ(
         changesOf([](UnitDescription& unit) {
             unit.files["/fs/rwdata/.Version/map.inf"] = "map\n";
+            unit.files["/fs/rwdata/.Version/maps.inf"] = "map 3743\n";
             unit.files.erase("/fs/mp/etc/airplay_static.conf");
             unit.folders.push_back("/fs/mp/etc/airplay_static.conf");
         }),
         (Changes{
             {"file./fs/rwdata/.Version/map.inf", {"(missing)", "4 bytes, CRC-32 6ef7c13d"}},
+            {"file./fs/rwdata/.Version/maps.inf", {"(missing)", "9 bytes, CRC-32 0001c449"}},
             {"file./fs/mp/etc/airplay_static.conf", {"17 bytes, CRC-32 d057ba0d", "(missing)"}},
             {"folder./fs/mp/etc/airplay_static.conf", {"(missing)", "a folder"}}}));
 }
