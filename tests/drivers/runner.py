@@ -13,6 +13,7 @@ from dataclasses import dataclass
 from pathlib import Path
 
 from model import snapshot
+from model.identity import load_names
 from model.prediction import Prediction
 from model.snapshot import Entry
 
@@ -36,9 +37,22 @@ def add_arguments(parser: argparse.ArgumentParser) -> None:
     parser.add_argument("--emulator", help="runs the launcher, where it is for another processor")
 
 
-def launcher(options: argparse.Namespace) -> tuple[str, ...]:
-    """The words that go before ROOT ORVANE ARGUMENTS..."""
-    return (options.emulator, options.enter) if options.emulator else (options.enter,)
+@dataclass(frozen=True)
+class Tools:
+    """`enter` are the words that go before ROOT ORVANE ARGUMENTS..., `names` those of the models."""
+
+    orvane: str
+    enter: tuple[str, ...]
+    names: tuple[str, ...]
+
+    def command(self, root: Path, arguments: Sequence[str], *limits: str) -> list[str]:
+        """Runs the tool in a unit. `limits` are words for the launcher."""
+        return [*self.enter, *limits, str(root), self.orvane, *arguments]
+
+
+def tools(options: argparse.Namespace) -> Tools:
+    emulator = (options.emulator,) if options.emulator else ()
+    return Tools(options.orvane, (*emulator, options.enter), tuple(load_names()))
 
 
 def again(driver: str, options: argparse.Namespace, *more: object) -> str:

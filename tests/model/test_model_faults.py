@@ -6,7 +6,7 @@ from __future__ import annotations
 from model import parts
 from model.prediction import predict
 from model.system import Fault
-from model.test_model import NAMES, STATIC, STOCK, UnitCase
+from model.unit_case import NAMES, STATIC, STOCK, UnitCase
 from model.test_model_iap import HARDWARE1, HARDWARE2, VEHICLE, accessory
 from model.tuning import tuning_text
 

@@ -7,7 +7,7 @@ import os
 import unittest
 
 from model import parts
-from model.test_model import NAMES, STATIC, STOCK, UnitCase
+from model.unit_case import NAMES, STATIC, STOCK, UnitCase
 
 
 def accessory(serial: bytes = b"ABCD1234abc", model: bytes = b"VOXA",

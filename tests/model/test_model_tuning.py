@@ -6,7 +6,7 @@ from __future__ import annotations
 import unittest
 
 from model import parts
-from model.test_model import UnitCase
+from model.unit_case import UnitCase
 from model.tuning import tuning_text
 
 ZERO_BLOCK = b"""\

@@ -17,8 +17,9 @@ from drivers.explain import explain, explanation, same_tree
 from drivers.explain.explanation import left_faults, own_faults, reason_faults
 from drivers.explain.reasons import Stage
 from drivers.explain.value_reasons import Line
+from drivers.random_units import generator
 from model import parts
-from model.test_model import UnitCase
+from model.unit_case import UnitCase
 from model.tree import Tree
 
 ASKED = ["profile-not-generated"]
@@ -194,32 +195,32 @@ class SameTree(unittest.TestCase):
 
 
 class Driver(UnitCase):
-    def task(self, script: str) -> explain.Task:
+    def tool(self, script: str) -> str:
         tool = self.root / "tool"
         tool.write_text(f"#!/bin/sh\n{script}\n", encoding="ascii")
         tool.chmod(0o700)
-        return explain.Task(0, "1", "orvane", ("enter",), str(tool), ())
+        return str(tool)
 
     def test_explaining_that_goes_wrong(self) -> None:
         for script in ("exit 1", "exit 2", "echo '{}'; exit 1", "echo x >&2; exit 1"):
-            found, lines = explain.explained(self.task(script), self.root, "a", ())
+            found, lines = explain.explained(self.tool(script), self.root, ["-a"], ())
             self.assertEqual((found, len(lines)), (None, 1))
 
     def test_describing_that_goes_wrong(self) -> None:
         with tempfile.TemporaryDirectory() as folder:
             for script in ("exit 2", "echo x >&2", "[ $1 = describe ]", "[ $1 = describe ] || "
                            "mkdir $2"):
-                lines = explain.described(self.task(script), self.root, Path(folder))
+                lines = explain.described(self.tool(script), self.root, Path(folder))
                 self.assertGreater(len(lines), 0)
 
     def test_a_tool_that_is_not_there(self) -> None:
         with self.assertRaises(runner.BrokenRun):
             explain.ask([str(self.root / "none")])
 
-    def test_letters(self) -> None:
+    def test_units_have_options_and_a_mark(self) -> None:
         for index in range(50):
             with tempfile.TemporaryDirectory() as folder:
-                letters = explain.make_marked_unit(Path(folder), "test", index)
-                self.assertRegex(letters, "^[ai]+$")
+                options = explain.make_marked_unit(Path(folder), generator("test", index))
+                self.assertRegex(" ".join(options), "^-[ai]( -[ai])*$")
                 self.assertEqual((Path(folder) / ".orvane-unit").read_bytes(),
                                  b"made by orvane-unit, layout 1\n")

@@ -9,7 +9,7 @@ from drivers.explain.reasons import CODES, Stage, is_intended, stages
 from drivers.explain.value_reasons import Codes, version_digits_reasons
 from model import parts
 from model.configuration import IMAGE
-from model.test_model import NAMES, STATIC, STOCK, UnitCase
+from model.unit_case import NAMES, STATIC, STOCK, UnitCase
 from model.tuning import SPEECHREC, TELEPHONY
 
 AIRPLAY, DEVICE, IAP2, IAP1 = parts.OUTPUTS[:4]

@@ -26,7 +26,6 @@ from drivers import runner
 from drivers.faults.calls import Call, own_calls
 from drivers.faults.scenarios import SCENARIOS, Scenario
 from model import snapshot
-from model.identity import load_names
 from model.prediction import predict
 from model.system import Fault
 
@@ -49,14 +48,8 @@ MASK = 0o022
 
 
 @dataclass(frozen=True)
-class Tools:
-    orvane: str
-    enter: tuple[str, ...]
+class Tools(runner.Tools):
     short_transfer: str
-    names: tuple[str, ...]
-
-    def command(self, root: Path, scenario: Scenario) -> list[str]:
-        return [*self.enter, str(root), self.orvane, *scenario.arguments]
 
 
 @dataclass(frozen=True)
@@ -85,7 +78,7 @@ def faults_of(call: Call) -> Iterator[Fault]:
 def inject(injection: Injection, root: Path, report: Path) -> tuple[runner.Run, int]:
     """The run, and how many times the call was disturbed."""
     fault, call, tools = injection.fault, injection.call, injection.tools
-    command = tools.command(root, SCENARIOS[injection.scenario])
+    command = tools.command(root, SCENARIOS[injection.scenario].arguments)
     if fault.kind == "short":
         result = runner.run([tools.short_transfer, str(report), call.name, str(call.number),
                              str(fault.length), *command], root)
@@ -123,7 +116,7 @@ def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
         prediction = predict(root, scenario.arguments, tools.names)
         before = snapshot.take(root)
         result = runner.run(["strace", "-o", str(report), "-s", "32", "-e", "trace=all",
-                             *tools.command(root, scenario)], root)
+                             *tools.command(root, scenario.arguments)], root)
         lines = runner.differences(before, prediction, result, MASK)
         if lines:
             raise SystemExit(f"faults: {scenario.name}, undisturbed:\n  " + "\n  ".join(lines))
@@ -193,8 +186,8 @@ def main(arguments: Sequence[str]) -> int:
     os.umask(MASK)
     with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         helper = options.short_transfer or build_short_transfer(folder)
-        tools = Tools(options.orvane, runner.launcher(options), helper,
-                      tuple(load_names()))
+        common = runner.tools(options)
+        tools = Tools(common.orvane, common.enter, common.names, helper)
         try:
             return run_all(tools, options.jobs, options.every)
         except runner.BrokenRun as error:

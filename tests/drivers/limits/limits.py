@@ -13,12 +13,10 @@ import argparse
 import shutil
 import tempfile
 from collections.abc import Sequence
-from dataclasses import dataclass
 from pathlib import Path
 
 from drivers import runner
 from model import parts
-from model.identity import load_names
 from model.prediction import predict
 
 OUTPUTS = ("airplay.conf", "iap2_device.cfg", "iap2.cfg", "iap1.cfg",
@@ -39,13 +37,6 @@ LONG_LINE = 64 * MEBIBYTE
 SHOWN = 1000
 
 
-@dataclass(frozen=True)
-class Tools:
-    orvane: str
-    enter: tuple[str, ...]
-    names: tuple[str, ...]
-
-
 def make_unit(root: Path) -> None:
     """Values that are too long for a string's own buffer, and nothing missing."""
     parts.put_base(root)
@@ -62,7 +53,7 @@ def texts_after(root: Path, names: tuple[str, ...], command: list[str]) -> dict[
     return {name: tmp[name].content if name in tmp else None for name in OUTPUTS}
 
 
-def accepted(tools: Tools) -> dict[str, set[bytes | None]]:
+def accepted(tools: runner.Tools) -> dict[str, set[bytes | None]]:
     """Every text that a run may leave: with each of its values true, or its default."""
     result: dict[str, set[bytes | None]] = {name: set() for name in OUTPUTS}
     for names in (tools.names, tuple("VOXA" for _ in tools.names)):
@@ -86,11 +77,11 @@ def accepted(tools: Tools) -> dict[str, set[bytes | None]]:
     return result
 
 
-def run(tools: Tools, root: Path, limit: str, arguments: list[str]) -> runner.Run:
-    return runner.run([*tools.enter, limit, str(root), tools.orvane, *arguments], root)
+def run(tools: runner.Tools, root: Path, limit: str, arguments: list[str]) -> runner.Run:
+    return runner.run(tools.command(root, arguments, limit), root)
 
 
-def least_memory(tools: Tools) -> int:
+def least_memory(tools: runner.Tools) -> int:
     """The least address space, to the page, in which the tool starts at all: below it the kernel
     or the C library end the process before its first line."""
     low, high = 0, 64 * MEBIBYTE
@@ -106,7 +97,7 @@ def least_memory(tools: Tools) -> int:
     return high
 
 
-def check_run(tools: Tools, limit: str, texts: dict[str, set[bytes | None]]) -> tuple[bool, bool]:
+def check_run(tools: runner.Tools, limit: str, texts: dict[str, set[bytes | None]]) -> tuple[bool, bool]:
     """Whether the run was as it must be, and whether nothing was missing in it."""
     with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
@@ -123,7 +114,7 @@ def check_run(tools: Tools, limit: str, texts: dict[str, set[bytes | None]]) -> 
     return not faults, left == whole
 
 
-def sweep(tools: Tools, what: str, limits: list[str],
+def sweep(tools: runner.Tools, what: str, limits: list[str],
           texts: dict[str, set[bytes | None]]) -> bool:
     """The last limit is generous, so the last run must be whole, and the first must not."""
     outcomes = [check_run(tools, limit, texts) for limit in limits]
@@ -135,7 +126,7 @@ def sweep(tools: Tools, what: str, limits: list[str],
     return False
 
 
-def check_long_line(tools: Tools) -> bool:
+def check_long_line(tools: runner.Tools) -> bool:
     """A line of 64 MiB is read when there is memory for it, and else the file is as good as none."""
     good = True
     for limit, is_read in (("--memory=1073741824", True), ("--memory=33554432", False)):
@@ -158,7 +149,7 @@ def main(arguments: Sequence[str]) -> int:
     parser = argparse.ArgumentParser("limits", description=__doc__)
     runner.add_arguments(parser)
     options = parser.parse_args(arguments)
-    tools = Tools(options.orvane, runner.launcher(options), tuple(load_names()))
+    tools = runner.tools(options)
     texts = accepted(tools)
     try:
         least = least_memory(tools)

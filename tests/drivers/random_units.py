@@ -1,0 +1,159 @@
+# SPDX-License-Identifier: Apache-2.0
+"""What drivers share that ask something of many random units: the units, a pool, the reports."""
+
+from __future__ import annotations
+
+import argparse
+import multiprocessing
+import random
+import tempfile
+from collections import Counter
+from collections.abc import Callable, Sequence
+from dataclasses import dataclass
+from functools import partial
+from pathlib import Path
+from typing import Any
+
+from drivers import runner
+
+# So many units go to a worker at a time.
+CHUNK = 20
+
+# Units with a difference before the rest is left alone.
+MOST_DIFFERENCES = 10
+
+
+@dataclass(frozen=True)
+class RandomUnit:
+    """A unit as it was made, the arguments of its run, and what has more to draw for it.
+
+    `root` is the only entry of its folder: what a check makes may lie beside it.
+    """
+
+    root: Path
+    arguments: Sequence[str]
+    rng: random.Random
+
+
+@dataclass(frozen=True)
+class Finding:
+    """`lines` say what is not as it must be, `reached` the outcomes that this unit has."""
+
+    lines: Sequence[str]
+    reached: frozenset[str]
+
+
+@dataclass(frozen=True)
+class Question:
+    """What a driver asks of each unit.
+
+    `make` fills an empty folder and returns the arguments of the run. `check` gets the tools of
+    the driver; it raises BrokenRun where a tool could not be run. Each of `outcomes` must be
+    reached by some unit, where there are `enough_units`.
+    """
+
+    name: str
+    make: Callable[[Path, random.Random], Sequence[str]]
+    check: Callable[[RandomUnit, Any], Finding]
+    outcomes: Sequence[str]
+    enough_units: int
+
+
+@dataclass(frozen=True)
+class Report:
+    """`broken` says why a unit was not run; then there is no finding."""
+
+    index: int
+    arguments: Sequence[str]
+    finding: Finding
+    broken: str = ""
+
+
+def generator(seed: str, index: int) -> random.Random:
+    return random.Random(f"{seed}:{index}")
+
+
+def _check(question: Question, tools: Any, seed: str, index: int) -> Report:
+    with tempfile.TemporaryDirectory(prefix="orvane unit-") as folder:
+        root = Path(folder) / "unit"
+        root.mkdir()
+        rng = generator(seed, index)
+        arguments = question.make(root, rng)
+        try:
+            return Report(index, arguments, question.check(RandomUnit(root, arguments, rng), tools))
+        except runner.BrokenRun as error:
+            return Report(index, arguments, Finding((), frozenset()), str(error))
+
+
+def _keep(question: Question, keep: Path, seed: str, index: int) -> Path:
+    """A fresh copy of the unit, not run in."""
+    root = keep / f"unit-{seed}-{index}"
+    if root.exists():
+        raise SystemExit(f"{root} is already there")
+    root.mkdir(parents=True)
+    question.make(root, generator(seed, index))
+    return root
+
+
+def _print_difference(question: Question, report: Report, options: argparse.Namespace,
+                      more: Sequence[str]) -> None:
+    keep = options.keep or Path(tempfile.mkdtemp(prefix="orvane kept-"))
+    print(f"{question.name}: unit {report.index} of seed {options.seed}, "
+          f"arguments {list(report.arguments)!r}")
+    for line in report.finding.lines:
+        print(f"  {line}")
+    print(f"  kept, and not run: {_keep(question, keep, options.seed, report.index)}")
+    again = runner.again(question.name, options, *more, "--seed", options.seed,
+                         "--only", report.index, "--keep", "DIR")
+    print(f"  again: {again}")
+
+
+def _print_outcomes(question: Question, reached: Counter[str]) -> list[str]:
+    """Prints how many units had each outcome; returns those that none had."""
+    width = max(map(len, question.outcomes))
+    for outcome in question.outcomes:
+        print(f"  {outcome:{width}} {reached[outcome]:6}")
+    return [outcome for outcome in question.outcomes if reached[outcome] == 0]
+
+
+def add_arguments(parser: argparse.ArgumentParser, units: int) -> None:
+    """Those of every driver of random units; `units` is the usual number of them."""
+    runner.add_arguments(parser)
+    parser.add_argument("--units", type=int, default=units)
+    parser.add_argument("--seed", default="1", help='"random" draws one')
+    parser.add_argument("--only", type=int, help="the number of one single unit")
+    parser.add_argument("--keep", type=Path, help="where a unit that differs is kept")
+    parser.add_argument("--jobs", type=int, default=2)
+
+
+def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str) -> int:
+    """The exit status: 0 all is well, 1 a difference or an outcome that never came up, 2 a unit
+    was not run. `more` are the arguments of the driver that are not those of add_arguments."""
+    if options.seed == "random":
+        options.seed = str(random.SystemRandom().randrange(10**9))
+        print(f"{question.name}: seed {options.seed}")
+    single = options.only is not None
+    indices = [options.only] if single else range(options.units)
+    reached: Counter[str] = Counter()
+    differing = 0
+    with multiprocessing.Pool(options.jobs) as pool:
+        for report in pool.imap(partial(_check, question, tools, options.seed), indices, CHUNK):
+            if report.broken:
+                print(f"{question.name}: unit {report.index} was not run: {report.broken}")
+                return 2
+            if report.finding.lines:
+                _print_difference(question, report, options, more)
+                differing += 1
+                if differing == MOST_DIFFERENCES:
+                    print(f"{question.name}: the other units were left alone")
+                    return 1
+            reached.update(report.finding.reached)
+    missing = [] if single else _print_outcomes(question, reached)
+    print(f"{question.name}: {len(indices)} units, {differing} with a difference "
+          f"(seed {options.seed})")
+    if single and options.keep is not None and not differing:
+        print(f"  kept, and not run: {_keep(question, options.keep, options.seed, options.only)}")
+    if missing and len(indices) >= question.enough_units:
+        print("\n".join(f"{question.name}: never {outcome}" for outcome in missing))
+        return 1
+    return 1 if differing else 0
