@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Makes mutants: the product's sources with one thing changed."""
 
@@ -9,8 +8,8 @@ import re
 from collections.abc import Iterator
 from dataclasses import dataclass
 
-from source import Region, Source, Token, is_inside, unmutated_regions
-from statements import swaps
+from mutate.source import Region, Source, Token, is_inside, unmutated_regions
+from mutate.statements import swaps
 
 # The sources are formatted: a binary operator has blanks around it, a template's bracket, a
 # pointer's asterisk and a sign have not.

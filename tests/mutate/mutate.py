@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Changes one thing of the product at a time and looks whether the suite notices.
 
@@ -18,11 +17,11 @@ from collections.abc import Callable, Container, Sequence
 from concurrent.futures import ThreadPoolExecutor
 from pathlib import Path
 
-from equivalent import Entry, EntryError, read_entries
-from mutants import Key, Mutant, make_mutants
-from scratch import Broken, copy_tree
-from source import read_sources
-from workshop import Base, Job, Outcome
+from mutate.listed import Entry, EntryError, read_entries
+from mutate.mutants import Key, Mutant, make_mutants
+from mutate.scratch import Broken, copy_tree
+from mutate.source import read_sources
+from mutate.workshop import Base, Job, Outcome
 
 PROJECT = Path(__file__).resolve().parents[2]
 EQUIVALENT = PROJECT / "tests/mutate/equivalent.txt"
@@ -138,8 +137,8 @@ def stale_entries(entries: Sequence[Entry], made: Sequence[Mutant],
     return problems
 
 
-def parse_arguments() -> argparse.Namespace:
-    parser = argparse.ArgumentParser(description=__doc__)
+def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
+    parser = argparse.ArgumentParser(prog="mutate", description=__doc__)
     parser.add_argument("--only", metavar="FILE", help="one source, such as src/main/options.cpp")
     parser.add_argument("--line", type=int, help="of that file, one line")
     parser.add_argument("--limit", type=int, help="so many mutants, from every file in turn")
@@ -147,7 +146,7 @@ def parse_arguments() -> argparse.Namespace:
     parser.add_argument("--seed", default="1", help="of what is drawn")
     parser.add_argument("--list", action="store_true", help="only show the mutants")
     parser.add_argument("--build", type=Path, default=PROJECT / "build/mutate")
-    return parser.parse_args()
+    return parser.parse_args(arguments)
 
 
 def report(chosen: Sequence[Mutant], outcomes: Sequence[Outcome], entries: Sequence[Entry],
@@ -172,8 +171,8 @@ def report(chosen: Sequence[Mutant], outcomes: Sequence[Outcome], entries: Seque
     return share >= ENOUGH and survived == 0
 
 
-def main() -> int:
-    options = parse_arguments()
+def main(arguments: Sequence[str]) -> int:
+    options = parse_arguments(arguments)
     scratch = options.build.resolve()
     # From here on nothing looks at the project itself, which may change meanwhile.
     copy_tree(PROJECT, scratch / "tree")
@@ -203,7 +202,3 @@ def main() -> int:
     for problem in problems:
         print(problem, file=sys.stderr)
     return 0 if is_good and not problems else 1
-
-
-if __name__ == "__main__":
-    sys.exit(main())

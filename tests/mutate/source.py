@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """The product's sources as tokens, and which parts of them no mutant changes."""
 

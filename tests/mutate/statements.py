@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Finds pairs of adjacent statements, and of adjacent data members, that can change places."""
 
@@ -7,7 +6,7 @@ from __future__ import annotations
 import re
 from collections.abc import Iterator
 
-from source import Region, Token, matching
+from mutate.source import Region, Token, matching
 
 # Two of these, one after the other, do nothing that an order could change.
 QUIET_DECLARATION = re.compile(

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """What is changed and what is not, on sources that are made for it."""
 
@@ -6,11 +5,11 @@ from __future__ import annotations
 
 import unittest
 
-from equivalent import EntryError, parse_entries
-from mutants import Mutant, make_mutants
-from mutate import CATALOGUE_SAMPLE, limited, sample, stale_entries, verdict
-from source import Source, tokenize, unmutated_regions
-from workshop import Outcome
+from mutate.listed import EntryError, parse_entries
+from mutate.mutants import Mutant, make_mutants
+from mutate.mutate import CATALOGUE_SAMPLE, limited, sample, stale_entries, verdict
+from mutate.source import Source, tokenize, unmutated_regions
+from mutate.workshop import Outcome
 
 
 def source(text: str, path: str = "src/a/b.cpp") -> Source:
@@ -189,7 +188,3 @@ class EquivalentTest(unittest.TestCase):
         self.assertEqual([verdict(Outcome(by), False) for by in ("", "config", "compiler")],
                          ["survived", "tests", "compiler"])
         self.assertEqual(verdict(Outcome(""), True), "equivalent")
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -1,4 +1,3 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
 """Builds the unchanged project once, and then what one mutant changes; runs the suite on it.
 
@@ -19,8 +18,8 @@ import time
 from dataclasses import dataclass
 from pathlib import Path
 
-from mutants import Mutant
-from scratch import Broken, call, passes
+from mutate.mutants import Mutant
+from mutate.scratch import Broken, call, passes
 
 # The assertions are those of the debug build, which is part of the suite; its sanitizers are left
 # out for their time.

@@ -1,6 +1,5 @@
-#!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
-"""The list of mutants that nobody can tell from the original, each with its reason."""
+"""A list of mutants, each with its reason."""
 
 from __future__ import annotations
 
@@ -8,7 +7,7 @@ import re
 from dataclasses import dataclass
 from pathlib import Path
 
-from mutants import Key
+from mutate.mutants import Key
 
 # An entry, and the marks that its lines begin with.
 MARKS = ("@ ", "- ", "+ ", "= ")
