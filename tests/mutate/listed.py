@@ -33,7 +33,8 @@ class Entry:
         return self.path, self.occurrence, self.before, self.after
 
 
-def parse_entries(text: str) -> list[Entry]:
+def parse_entries(text: str, name: str) -> list[Entry]:
+    """`name` is that of the list, for complaints."""
     entries = []
     numbered = [(number, line.rstrip()) for number, line in enumerate(text.splitlines(), 1)
                 if line.strip() and not line.startswith("#")]
@@ -41,21 +42,21 @@ def parse_entries(text: str) -> list[Entry]:
         group = numbered[at:at + len(MARKS)]
         number = group[0][0]
         if [line[:2] for _, line in group] != list(MARKS):
-            raise EntryError(f"equivalent.txt:{number}: not the four lines @ - + = of an entry")
+            raise EntryError(f"{name}:{number}: not the four lines @ - + = of an entry")
         place, before, after, reason = (line[2:].strip() for _, line in group)
         match = PLACE.fullmatch(place)
         if not match:
-            raise EntryError(f"equivalent.txt:{number}: not a path: {place}")
+            raise EntryError(f"{name}:{number}: not a path: {place}")
         entries.append(Entry(number, match["path"], int(match["occurrence"] or 1), before, after,
                              reason))
     keys = [entry.key() for entry in entries]
     for index, entry in enumerate(entries):
         if entry.key() in keys[:index]:
-            raise EntryError(f"equivalent.txt:{entry.line}: stands there twice")
+            raise EntryError(f"{name}:{entry.line}: stands there twice")
         if not entry.reason:
-            raise EntryError(f"equivalent.txt:{entry.line}: no reason")
+            raise EntryError(f"{name}:{entry.line}: no reason")
     return entries
 
 
 def read_entries(path: Path) -> list[Entry]:
-    return parse_entries(path.read_text(encoding="utf-8"))
+    return parse_entries(path.read_text(encoding="utf-8"), path.name)

@@ -5,11 +5,12 @@ from __future__ import annotations
 
 import unittest
 
-from mutate.listed import EntryError, parse_entries
-from mutate.mutants import Mutant, make_mutants
-from mutate.mutate import CATALOGUE_SAMPLE, limited, sample, stale_entries, verdict
+from mutate.campaign import CATALOGUE_SAMPLE, in_turn, limited, sample, stale_entries
+from mutate.listed import Entry, EntryError, parse_entries
+from mutate.mutants import Key, Mutant, make_mutants
+from mutate.mutate import verdict
 from mutate.source import Source, tokenize, unmutated_regions
-from mutate.workshop import Outcome
+from mutate.suite import Outcome
 
 
 def source(text: str, path: str = "src/a/b.cpp") -> Source:
@@ -158,31 +159,46 @@ class SampleTest(unittest.TestCase):
         drawn = limited([*rows("a", 100), *rows("b", 2), *rows("c", 100)], 9, "1")
         self.assertEqual([sum(each.path == path for each in drawn) for path in "abc"], [4, 2, 3])
 
+    def test_what_is_drawn_in_turn_is_all_and_begins_with_every_file(self) -> None:
+        mutants = [*rows("a", 100), *rows("b", 2), *rows("c", 100)]
+        drawn = in_turn(mutants, "1")
+        self.assertEqual([each.path for each in drawn[:7]], list("abcabca"))
+        self.assertCountEqual(drawn, mutants)
+        self.assertNotEqual(drawn, in_turn(mutants, "2"))
+
 
 ENTRY = "@ src/a/b.cpp\n- g(!a);\n+ g(a);\n= nobody looks\n"
 
 
-class EquivalentTest(unittest.TestCase):
+def entries_of(text: str) -> list[Entry]:
+    return parse_entries(text, "list.txt")
+
+
+class ListTest(unittest.TestCase):
     def test_entry_is_that_of_its_mutant(self) -> None:
         first, second = make_mutants([source(body("g(!a);") + body("g(!a);"))])
-        self.assertEqual(parse_entries(ENTRY)[0].key(), first.key())
+        self.assertEqual(entries_of(ENTRY)[0].key(), first.key())
         second_entry = ENTRY.replace("b.cpp", "b.cpp (2)")
-        self.assertEqual(parse_entries("# why\n\n" + second_entry)[0].key(), second.key())
+        self.assertEqual(entries_of("# why\n\n" + second_entry)[0].key(), second.key())
 
-    def test_malformed_lists_are_refused(self) -> None:
+    def test_malformed_lists_are_refused_by_name(self) -> None:
         for text in (ENTRY + ENTRY, ENTRY + "@ x\n", ENTRY.replace("= ", "? "),
                      ENTRY.replace("nobody looks", ""), ENTRY.replace("b.cpp", "b.cpp two")):
-            with self.subTest(text), self.assertRaises(EntryError):
-                parse_entries(text)
+            with self.subTest(text), self.assertRaisesRegex(EntryError, r"^list\.txt:\d+: "):
+                entries_of(text)
 
-    def test_entry_without_its_mutant_or_that_is_noticed_is_stale(self) -> None:
-        entries = parse_entries(ENTRY)
+    def test_entry_without_its_mutant_or_that_is_untrue_is_stale(self) -> None:
+        entries = entries_of(ENTRY)
         mutant = make_mutants([source(body("g(!a);"))])[0]
-        self.assertEqual(stale_entries(entries, [mutant], [(mutant, Outcome(""))], None), [])
-        self.assertEqual(stale_entries(entries, [], [], "src/other.cpp"), [])
-        self.assertIn("no such mutant", stale_entries(entries, [], [], None)[0])
-        self.assertIn("noticed by config",
-                      stale_entries(entries, [mutant], [(mutant, Outcome("config"))], None)[0])
+
+        def stale(made: list[Mutant], untrue: dict[Key, str], only: str | None) -> list[str]:
+            return stale_entries("list.txt", entries, made, untrue, only)
+
+        self.assertEqual(stale([mutant], {}, None), [])
+        self.assertEqual(stale([], {}, "src/other.cpp"), [])
+        self.assertEqual(stale([], {}, None), ["list.txt:1: there is no such mutant"])
+        self.assertEqual(stale([mutant], {mutant.key(): "noticed by config"}, None),
+                         ["list.txt:1: noticed by config"])
 
     def test_each_outcome_has_its_column(self) -> None:
         self.assertEqual([verdict(Outcome(by), False) for by in ("", "config", "compiler")],

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Builds the unchanged project once, and then what one mutant changes; runs the suite on it.
+"""Builds the unchanged project once, and then the programs that one mutant changes.
 
 Everything lies in one scratch folder: tree/ (a copy of the project), base/ (its build), and a
 folder for each job with the sources, objects and programs of the mutant at hand.
@@ -11,15 +11,13 @@ import json
 import os
 import shlex
 import shutil
-import subprocess
-import sys
 import tempfile
-import time
+from collections.abc import Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
 from mutate.mutants import Mutant
-from mutate.scratch import Broken, call, passes
+from mutate.scratch import call
 
 # The assertions are those of the debug build, which is part of the suite; its sanitizers are left
 # out for their time.
@@ -28,24 +26,26 @@ CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
                  "-DCMAKE_EXE_LINKER_FLAGS=-static", "-DORVANE_KIT=ON", "-DORVANE_TESTS=ON",
                  "-DORVANE_TEST_FOLDERS=product;whole_runs",
                  "-DORVANE_FAULTS=ON")
-PROGRAMS = ("orvane", "orvane-enter", "orvane_tests", "orvane-short-transfer")
-
-WHOLE_RUNS = "whole_runs"
-DIFFERENTIAL = "differential"
-DIFFERENTIAL_UNITS = 150
-
-# Every system call fails once: this takes about a minute and comes last.
-FAULTS = "faults"
-FAULTS_TIME_LIMIT = 900
-
-# A mutant that takes so much longer than the original runs in an endless loop.
-TIME_LIMIT = 30
-TIME_FACTOR = 10
 
 
 @dataclass(frozen=True)
-class Unit:
-    """One translation unit of the base build."""
+class Program:
+    """`targets` are those of the build whose objects it is linked of, `words` go behind them."""
+
+    name: str
+    targets: tuple[str, ...]
+    words: tuple[str, ...] = ()
+
+    def holds(self, compiled: str) -> bool:
+        return any(f"/{target}.dir/" in compiled for target in self.targets)
+
+
+ORVANE = Program("orvane", ("orvane", "orvane_core"))
+
+
+@dataclass(frozen=True)
+class TranslationUnit:
+    """One of the base build. `depends` are the sources of the product that it includes."""
 
     source: str
     object: str
@@ -53,27 +53,26 @@ class Unit:
     depends: frozenset[str]
 
 
-@dataclass(frozen=True)
-class Outcome:
-    """`by`: "compiler", "time limit", the stage that failed, or "" when nothing noticed."""
-
-    by: str
-
-
 class Base:
-    """The unchanged project, built, and what it is made of."""
+    """The unchanged project, built, and what it is made of.
 
-    def __init__(self, scratch: Path, jobs: int) -> None:
+    `programs` are built again for each mutant, `others` only here.
+    """
+
+    def __init__(self, scratch: Path, jobs: int, programs: Sequence[Program],
+                 others: Sequence[str]) -> None:
         self.scratch = scratch
         self.tree = scratch / "tree"
         self.build = scratch / "base"
+        self.programs = programs
         call(["cmake", "-S", str(self.tree), "-B", str(self.build), "-G", "Ninja",
               *CONFIGURATION], scratch)
-        call(["ninja", "-C", str(self.build), "-j", str(jobs), *PROGRAMS], scratch)
+        call(["ninja", "-C", str(self.build), "-j", str(jobs),
+              *(program.name for program in programs), *others], scratch)
         self.units = self.read_units()
-        self.suites = self.read_suites()
 
-    def read_units(self) -> list[Unit]:
+    def read_units(self) -> list[TranslationUnit]:
+        """The product's own come first, so that what can't be compiled ends soon."""
         depends: dict[str, set[str]] = {}
         current: set[str] = set()
         for line in call(["ninja", "-C", str(self.build), "-t", "deps"], self.scratch).splitlines():
@@ -85,27 +84,15 @@ class Base:
         for entry in json.loads((self.build / "compile_commands.json").read_text()):
             command = tuple(shlex.split(entry["command"]))
             target = command[command.index("-o") + 1]
-            if any(f"{program}.dir/" in target for program in
-                   ("orvane", "orvane_core", "orvane_kit", "orvane_tests")) and \
+            if any(program.holds(target) for program in self.programs) and \
                     not target.endswith(".gch"):
-                units.append(Unit(entry["file"], target, command,
-                                  frozenset(depends.get(target, set()))))
-        return units
-
-    def read_suites(self) -> dict[str, list[str]]:
-        """By the folder of their file: the filters of the test suites."""
-        listing = self.scratch / "tests.json"
-        call([str(self.build / "tests/orvane_tests"), "--gtest_list_tests",
-              f"--gtest_output=json:{listing}"], self.scratch)
-        suites: dict[str, list[str]] = {}
-        for suite in json.loads(listing.read_text())["testsuites"]:
-            path = Path(suite["testsuite"][0]["file"]).relative_to(self.tree / "tests")
-            suites.setdefault(path.parts[-2], []).append(f"{suite['name']}.*")
-        return suites
+                units.append(TranslationUnit(entry["file"], target, command,
+                                             frozenset(depends.get(target, set()))))
+        return sorted(units, key=lambda unit: not unit.object.startswith("src/"))
 
 
 class Job:
-    """Makes and tries one mutant at a time. Its tool lies where its tests look for it."""
+    """Makes one mutant at a time, and programs of it."""
 
     def __init__(self, base: Base, number: int) -> None:
         self.base = base
@@ -116,126 +103,52 @@ class Job:
         memory = Path("/dev/shm")
         place = memory if os.access(memory, os.W_OK) else self.folder
         self.temporary = Path(tempfile.mkdtemp(prefix="orvane-mutate-", dir=place))
-        self.own = {unit.object: self.compile(unit, "", "own") for unit in base.units
-                    if "ORVANE_BINARY" in Path(unit.source).read_text(encoding="utf-8")}
-        self.objects: dict[str, str] = {}
-        self.limits: dict[str, float] = {}
+        self.mutated = ""
+        # By the base's object: what stands in for it, whatever the mutant, and for this mutant.
+        self.own: dict[str, str] = {}
+        self.changed: dict[str, str] = {}
 
     def close(self) -> None:
         shutil.rmtree(self.temporary, ignore_errors=True)
 
-    def command(self, unit: Unit, mutated: str, target: Path) -> list[str]:
-        """As the base compiles it, but with the mutated file, and with this job's tool."""
-        tree, overlay = self.base.tree, self.folder / "overlay"
-        words = [word.replace(f"{self.base.build}/orvane\"", f"{self.folder}/orvane\"")
-                 for word in unit.command]
-        words[words.index("-o") + 1] = str(target)
-        if unit.source == str(tree / mutated):
-            words[words.index("-c") + 1] = str(overlay / mutated)
-        return [words[0], f"-I{overlay / 'src'}", *words[1:]]
-
-    def compile(self, unit: Unit, mutated: str, kind: str) -> str:
-        target = self.folder / kind / unit.object
-        target.parent.mkdir(parents=True, exist_ok=True)
-        call(self.command(unit, mutated, target), self.base.build)
-        return str(target)
-
-    def link(self) -> None:
-        def objects(*programs: str) -> list[str]:
-            return [self.objects.get(unit.object) or self.own.get(unit.object) or unit.object
-                    for unit in self.base.units
-                    if any(f"/{program}.dir/" in unit.object for program in programs)]
-
-        for target, parts in (
-                ("orvane", objects("orvane", "orvane_core")),
-                ("orvane_tests", [*objects("orvane_tests", "orvane_kit", "orvane_core"),
-                                  "tests/liborvane_gtest.a", "-Wl,--no-warnings"])):
-            call(["g++", "-static", *parts, "-o", str(self.folder / target)], self.base.build)
-
-    def make(self, mutant: Mutant) -> None:
-        """Broken when the compiler refuses it."""
+    def lay(self, mutant: Mutant | None) -> None:
+        """From here on programs are built of this mutant, or of the unchanged sources."""
         overlay = self.folder / "overlay"
         for folder in (overlay, self.folder / "changed"):
             shutil.rmtree(folder, ignore_errors=True)
-        (overlay / mutant.path).parent.mkdir(parents=True)
-        (overlay / mutant.path).write_text(mutant.text, encoding="utf-8")
-        self.objects = {}
-        # The product's own objects come first, so that what can't be compiled ends soon.
-        for unit in sorted(self.base.units, key=lambda each: not each.object.startswith("src/")):
-            if mutant.path in unit.depends:
-                self.objects[unit.object] = self.compile(unit, mutant.path, "changed")
-        self.link()
+        self.changed = {}
+        self.mutated = ""
+        if mutant is not None:
+            self.mutated = mutant.path
+            (overlay / mutant.path).parent.mkdir(parents=True)
+            (overlay / mutant.path).write_text(mutant.text, encoding="utf-8")
 
-    def stages(self, folder: str) -> list[tuple[str, list[str]]]:
-        """The tests that stand next to `folder` come first, whole runs of the tool last."""
-        suites = self.base.suites
-        near = suites.get(folder, [])
-        rest = [suite for name, group in sorted(suites.items()) if name != WHOLE_RUNS
-                for suite in group if suite not in near]
-        tests = str(self.folder / "orvane_tests")
-        stages = [(name, [tests, "--gtest_fail_fast", f"--gtest_filter={':'.join(chosen)}"])
-                  for name, chosen in ((folder, near), ("the rest", rest),
-                                       (WHOLE_RUNS, suites.get(WHOLE_RUNS, []))) if chosen]
-        return [*stages, (DIFFERENTIAL, [*self.driver(DIFFERENTIAL),
-                                         "--units", str(DIFFERENTIAL_UNITS)])]
+    def command(self, unit: TranslationUnit, target: Path) -> list[str]:
+        """As the base compiles it, but with the mutated file."""
+        overlay = self.folder / "overlay"
+        words = list(unit.command)
+        words[words.index("-o") + 1] = str(target)
+        if unit.source == str(self.base.tree / self.mutated):
+            words[words.index("-c") + 1] = str(overlay / self.mutated)
+        return [words[0], f"-I{overlay / 'src'}", *words[1:]]
 
-    def driver(self, name: str) -> list[str]:
-        """A driver, on this job's tool."""
-        return [sys.executable, str(self.base.tree / "tests/drivers"), name, "--jobs", "1",
-                "--orvane", str(self.folder / "orvane"),
-                "--enter", str(self.base.build / "orvane-enter")]
+    def compile(self, unit: TranslationUnit, kind: str) -> str:
+        target = self.folder / kind / unit.object
+        target.parent.mkdir(parents=True, exist_ok=True)
+        call(self.command(unit, target), self.base.build)
+        return str(target)
 
-    def faults(self) -> tuple[str, list[str]]:
-        """The stage in which each system call fails once."""
-        shorten = str(self.base.build / "tests/orvane-short-transfer")
-        return FAULTS, [*self.driver(FAULTS), "--short-transfer", shorten]
+    def object(self, unit: TranslationUnit) -> str:
+        """Compiled for this mutant where it includes what is changed."""
+        if self.mutated in unit.depends and unit.object not in self.changed:
+            self.changed[unit.object] = self.compile(unit, "changed")
+        return self.changed.get(unit.object) or self.own.get(unit.object) or unit.object
 
-    def run(self, command: list[str], limit: float) -> bool:
-        scratch = self.temporary / "tmp"
-        shutil.rmtree(scratch, ignore_errors=True)
-        scratch.mkdir()
-        return passes(command, self.folder / "output", scratch, limit)
-
-    def check_original(self) -> None:
-        """The whole suite on the unchanged sources must pass; it also says how long it takes."""
-        self.objects = {}
-        self.link()
-        self.check(self.stages(""))
-
-    def check(self, stages: list[tuple[str, list[str]]]) -> None:
-        for stage, command in stages:
-            start = time.monotonic()
-            try:
-                if not self.run(command, FAULTS_TIME_LIMIT):
-                    said = (self.folder / "output").read_text(errors="replace").splitlines()
-                    raise Broken("\n".join([f"fails without any change: {stage}", *said[-40:]]))
-            except subprocess.TimeoutExpired as error:
-                raise Broken(f"does not end without any change: {stage}") from error
-            self.limits[stage] = max(TIME_LIMIT, TIME_FACTOR * (time.monotonic() - start))
-
-    def attempt(self, mutant: Mutant) -> Outcome:
-        try:
-            self.make(mutant)
-        except Broken:
-            return Outcome("compiler")
-        return self.outcome(self.stages(mutant.path.split("/")[1]))
-
-    def outcome(self, stages: list[tuple[str, list[str]]]) -> Outcome:
-        for stage, command in stages:
-            try:
-                if not self.run(command, self.limits.get(stage, TIME_LIMIT)):
-                    return Outcome(stage)
-            except subprocess.TimeoutExpired:
-                return Outcome("time limit")
-        return Outcome("")
-
-    def check_original_faults(self) -> None:
-        self.objects = {}
-        self.link()
-        self.check([self.faults()])
-
-    def attempt_faults(self, mutant: Mutant) -> Outcome:
-        """What the slowest tests say of a mutant that all others let pass."""
-        self.make(mutant)
-        self.limits[FAULTS] = FAULTS_TIME_LIMIT
-        return self.outcome([self.faults()])
+    def build(self, *programs: Program) -> None:
+        """Broken when the compiler refuses the mutant."""
+        objects = {unit.object: self.object(unit) for unit in self.base.units
+                   if any(program.holds(unit.object) for program in programs)}
+        for program in programs:
+            call(["g++", "-static",
+                  *(made for name, made in objects.items() if program.holds(name)),
+                  *program.words, "-o", str(self.folder / program.name)], self.base.build)
