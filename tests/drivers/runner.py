@@ -24,6 +24,9 @@ LAUNCHER_FAILED = 125
 # Far longer than any run takes, so that only a tool that hangs gets there.
 TIME_LIMIT = 60
 
+# The status of one that hangs. One that dies has the number of the signal, negative.
+OUT_OF_TIME = -99
+
 
 class BrokenRun(Exception):
     """The tool was not run at all: nothing can be said of it."""
@@ -82,7 +85,7 @@ def run(command: Sequence[str], root: Path, environment: Mapping[str, str] | Non
                               timeout=TIME_LIMIT, close_fds=False, check=False,
                               env={**os.environ, **(environment or {})})
     except subprocess.TimeoutExpired as error:
-        return Run(-1, error.stdout or b"", b"(ran out of time)", snapshot.take(root))
+        return Run(OUT_OF_TIME, error.stdout or b"", b"(ran out of time)", snapshot.take(root))
     except OSError as error:
         raise BrokenRun(f"{command[0]}: {error.strerror}") from error
     if done.returncode == LAUNCHER_FAILED:

@@ -68,18 +68,27 @@ def letters_of(options: Sequence[str]) -> str:
     return "".join(option[1:] for option in options)
 
 
-def explained(unit_tool: str, root: Path, options: Sequence[str],
-              stages: Sequence[reasons.Stage]) -> tuple[explanation.Explanation | None, list[str]]:
+def ask_explain(unit_tool: str, root: Path, options: Sequence[str]
+                ) -> tuple[explanation.Explanation | None, int, list[str]]:
+    """What explain says, its exit status, and why there is nothing that it says."""
     said = ask([unit_tool, "explain", str(root), "--json", "--content", *options])
     if said.stderr or said.status not in (0, 1):
-        return None, [f"explain: status {said.status}, said {said.stderr!r}"]
+        return None, said.status, [f"explain: status {said.status}, said {said.stderr!r}"]
     try:
-        found = explanation.parse(said.stdout)
+        return explanation.parse(said.stdout), said.status, []
     except (ValueError, KeyError, TypeError) as error:
-        return None, [f"explain: {error!r}: {said.stdout[:explanation.SHOWN]!r}"]
-    lines = explanation.own_faults(found, os.fsencode(root), letters_of(options), said.status)
-    return found, [f"explain: {line}" for line in
-                   lines + explanation.reason_faults(found, stages)]
+        shown = said.stdout[:explanation.SHOWN]
+        return None, said.status, [f"explain: {error!r}: {shown!r}"]
+
+
+def explained(unit_tool: str, root: Path, options: Sequence[str],
+              stages: Sequence[reasons.Stage]) -> tuple[explanation.Explanation | None, list[str]]:
+    found, status, lines = ask_explain(unit_tool, root, options)
+    if found is not None:
+        faults = [*explanation.own_faults(found, os.fsencode(root), letters_of(options), status),
+                  *explanation.reason_faults(found, stages)]
+        lines = [f"explain: {line}" for line in faults]
+    return found, lines
 
 
 def described(unit_tool: str, root: Path, folder: Path) -> list[str]:
