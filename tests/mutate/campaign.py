@@ -78,14 +78,18 @@ class Choice:
     originals: Mapping[str, str]
 
 
-def choose(options: argparse.Namespace) -> Choice:
-    """From a copy of the project: from here on nothing looks at the project itself."""
+def choose(options: argparse.Namespace, *folders: str) -> Choice:
+    """The mutants of these folders of the product, or of all.
+
+    They are those of a copy of the project: from here on nothing looks at the project itself.
+    """
     scratch = options.build.resolve()
     copy_tree(PROJECT, scratch / "tree")
     sources = read_sources(scratch / "tree")
     made = make_mutants(sources)
     chosen = [mutant for mutant in sample(made, options.seed)
-              if options.only in (None, mutant.path) and options.line in (None, mutant.line)]
+              if mutant.path.startswith(folders or ("",)) and
+              options.only in (None, mutant.path) and options.line in (None, mutant.line)]
     return Choice(scratch, made, chosen, {source.path: source.text for source in sources})
 
 

@@ -1,0 +1,228 @@
+# SPDX-License-Identifier: Apache-2.0
+"""Whether orvane-unit's explain says what a run of orvane leaves, in units that are made once."""
+
+from __future__ import annotations
+
+import os
+import shutil
+from collections.abc import Callable, Mapping, Sequence
+from dataclasses import dataclass
+from pathlib import Path
+
+from drivers import runner
+from drivers.explain.explain import ask_explain, flags, make_marked_unit
+from drivers.explain.explanation import Explanation, left_faults
+from model import snapshot
+from model.prediction import parse_options
+from model.snapshot import Entry
+from model.tree import Tree
+from mutate.mutants import Mutant
+from mutate.scratch import Broken, call
+from mutate.workshop import ORVANE, Base, Job, Program
+
+UNIT_TOOL = Program("orvane-unit", ("orvane-unit", "orvane_unit", "orvane_kit", "orvane_core"))
+
+RANDOM_UNITS = 50
+RANDOM_SEED = "1"
+
+# What can come of a mutant.
+COMPILER = "compiler"    # refused
+BROKEN = "broken"        # no run that ends changes an output: others die, or one never ends
+UNCHANGED = "unchanged"  # every output is that of the unchanged tool
+EXPLAINED = "explained"  # explain agrees with the run in every unit
+DIFFERS = "differs"
+
+
+@dataclass(frozen=True)
+class Finding:
+    """`lines` say in which unit explain and the run differ, and how."""
+
+    word: str
+    lines: tuple[str, ...] = ()
+
+    def changes_an_output(self) -> bool:
+        return self.word in (EXPLAINED, DIFFERS)
+
+
+@dataclass(frozen=True)
+class Recipe:
+    """`make` makes a unit at a path that is free, and returns the arguments of a run in it."""
+
+    name: str
+    make: Callable[[Path], list[str]]
+
+
+def golden_recipe(case: Path, unit_tool: Path) -> Recipe:
+    def make(root: Path) -> list[str]:
+        call([str(unit_tool), "new", str(root), "--from", str(case / "unit.toml")], case)
+        return (case / "arguments").read_text(encoding="utf-8").splitlines()
+
+    return Recipe(case.name, make)
+
+
+def random_recipe(index: int) -> Recipe:
+    def make(root: Path) -> list[str]:
+        root.mkdir()
+        return flags(make_marked_unit(root, RANDOM_SEED, index))
+
+    return Recipe(f"random unit {index}", make)
+
+
+def recipes(base: Base) -> list[Recipe]:
+    """Of every golden unit, and of some random ones."""
+    golden = sorted((base.tree / "tests/whole_runs/golden").iterdir())
+    return [*(golden_recipe(case, base.build / UNIT_TOOL.name) for case in golden),
+            *(random_recipe(index) for index in range(RANDOM_UNITS))]
+
+
+def changed_paths(before: Mapping[str, Entry], after: Mapping[str, Entry]) -> list[str]:
+    return sorted(path for path in before.keys() | after.keys()
+                  if before.get(path) != after.get(path))
+
+
+def undo_writes(root: Path, before: Mapping[str, Entry], after: Mapping[str, Entry]) -> bool:
+    """Undoes what a run did to files; False when it did more than that."""
+    for path in changed_paths(before, after):
+        was, has = before.get(path), after.get(path)
+        place = os.fspath(root) + path
+        if has is None or has.kind != snapshot.FILE:
+            return False
+        if was is None:
+            os.unlink(place)
+        elif was.kind == snapshot.FILE and was.stamp is None and was.mode == has.mode:
+            Path(place).write_bytes(was.content)
+        else:
+            return False
+    return True
+
+
+class Case:
+    """A unit in which runs are made and undone. `left` is what the unchanged tool leaves in it."""
+
+    def __init__(self, recipe: Recipe, root: Path, enter: Path, original: Path) -> None:
+        self.name = recipe.name
+        self.recipe = recipe
+        self.root = root
+        self.enter = enter
+        self.original = original
+        self.make()
+
+    def make(self) -> None:
+        self.arguments = self.recipe.make(self.root)
+        self.before = snapshot.take(self.root)
+        self.left = self.run(self.original).after
+        if not undo_writes(self.root, self.before, self.left):
+            raise Broken(f"{self.name}: what the unchanged tool does can't be undone")
+
+    def run(self, orvane: Path) -> runner.Run:
+        """What `undo` must follow."""
+        return runner.run([str(self.enter), str(self.root), str(orvane), *self.arguments],
+                          self.root)
+
+    def undo(self, after: Mapping[str, Entry]) -> None:
+        if not undo_writes(self.root, self.before, after):
+            shutil.rmtree(self.root)
+            self.make()
+
+    def run_and_undo(self, orvane: Path) -> runner.Run:
+        result = self.run(orvane)
+        self.undo(result.after)
+        return result
+
+    def letters(self) -> str:
+        return "".join(parse_options(self.arguments)[0])
+
+
+def run_faults(case: Case, said: Explanation | None, after: Mapping[str, Entry]) -> list[str]:
+    """Where the run, not undone yet, left something else than explain says, or somewhere else."""
+    outputs = said.outputs if said else ()
+    tree = Tree(case.root)
+    places = [tree.resolve(output.path) for output in outputs]
+    named = {place.path for place in places if place is not None}
+    return [*(left_faults(said, tree) if said else ()),
+            *(f"{path}: the run changes it, and explain does not name it"
+              for path in changed_paths(case.before, after) if path not in named)]
+
+
+def faults(case: Case, orvane: Path, unit_tool: Path) -> list[str] | None:
+    """How explain and a run differ in a unit; None when the run does not end by itself.
+
+    Nothing can be asked of explain for arguments without an option: then no output may change.
+    """
+    said: Explanation | None = None
+    lines: list[str] = []
+    if case.letters():
+        said, _, lines = ask_explain(str(unit_tool), case.root, case.letters())
+    result = case.run(orvane)
+    try:
+        if result.status < 0:
+            return None
+        return lines or run_faults(case, said, result.after)
+    finally:
+        case.undo(result.after)
+
+
+def first_change(cases: Sequence[Case], orvane: Path) -> Case | str:
+    """The first unit with another output than the unchanged tool's, or why there is none."""
+    word = UNCHANGED
+    for case in cases:
+        result = case.run_and_undo(orvane)
+        if result.status == runner.OUT_OF_TIME:
+            return BROKEN
+        if result.status < 0:
+            word = BROKEN
+        elif result.after != case.left:
+            return case
+    return word
+
+
+def compare(cases: Sequence[Case], first: Case, orvane: Path, unit_tool: Path) -> Finding:
+    """`first` comes first: a difference is likeliest where an output changes."""
+    for case in [first, *(case for case in cases if case is not first)]:
+        found = faults(case, orvane, unit_tool)
+        if found:
+            return Finding(DIFFERS, (f"{case.name}: {' '.join(case.arguments)}", *found))
+    return Finding(EXPLAINED)
+
+
+class AgreementJob(Job):
+    """Has units of its own."""
+
+    def __init__(self, base: Base, number: int) -> None:
+        super().__init__(base, number)
+        units = self.temporary / "units"
+        units.mkdir()
+        self.cases = [Case(recipe, units / str(index), base.build / "orvane-enter",
+                           base.build / ORVANE.name)
+                      for index, recipe in enumerate(recipes(base))]
+
+    def check_original(self) -> None:
+        for case in self.cases:
+            found = faults(case, self.base.build / ORVANE.name, self.base.build / UNIT_TOOL.name)
+            if found is None or found:
+                raise Broken("\n".join([f"explain fails without any change: {case.name}",
+                                        *(found or ["the run does not end"])]))
+
+    def is_built(self, program: Program) -> bool:
+        try:
+            self.build(program)
+        except Broken:
+            return False
+        return True
+
+    def attempt(self, mutant: Mutant) -> Finding:
+        """The unit tool, which takes longer to build, is built only where an output changes."""
+        self.lay(mutant)
+        orvane, unit_tool = self.folder / ORVANE.name, self.folder / UNIT_TOOL.name
+        if not self.is_built(ORVANE):
+            return Finding(COMPILER)
+        first = first_change(self.cases, orvane)
+        if isinstance(first, str):
+            return Finding(first)
+        if not self.is_built(UNIT_TOOL):
+            return Finding(COMPILER)
+        return compare(self.cases, first, orvane, unit_tool)
+
+
+def build_base(scratch: Path, jobs: int) -> Base:
+    return Base(scratch, jobs, (ORVANE, UNIT_TOOL), ("orvane-enter",))
