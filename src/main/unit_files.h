@@ -15,6 +15,9 @@ namespace orvane {
 /// The accessory files with their templates and stock files. The other outputs are TUNING_OUTPUTS.
 constexpr AccessoryFile ACCESSORY_FILES[] = {AIRPLAY_FILE, IAP2_DEVICE_FILE, IAP2_FILE, IAP1_FILE};
 
+/// The folder of all outputs.
+constexpr char OUTPUT_FOLDER[] = "/tmp";
+
 /// What is read for values: a memory object, a device, and a folder with its trailing slash.
 constexpr const char* VALUE_SOURCES[] = {CONFIG_SHM_NAME, BOOT_DISK, VERSION_DIR};
 
