@@ -10,8 +10,9 @@ from dataclasses import dataclass
 from pathlib import Path
 
 from drivers import runner
-from drivers.explain.explain import ask_explain, flags, make_marked_unit
+from drivers.explain.explain import ask_explain, make_marked_unit
 from drivers.explain.explanation import Explanation, left_faults
+from drivers.random_units import generator
 from model import snapshot
 from model.prediction import parse_options
 from model.snapshot import Entry
@@ -63,7 +64,7 @@ def golden_recipe(case: Path, unit_tool: Path) -> Recipe:
 def random_recipe(index: int) -> Recipe:
     def make(root: Path) -> list[str]:
         root.mkdir()
-        return flags(make_marked_unit(root, RANDOM_SEED, index))
+        return make_marked_unit(root, generator(RANDOM_SEED, index))
 
     return Recipe(f"random unit {index}", make)
 
@@ -129,8 +130,9 @@ class Case:
         self.undo(result.after)
         return result
 
-    def letters(self) -> str:
-        return "".join(parse_options(self.arguments)[0])
+    def options(self) -> list[str]:
+        """What explain is asked about: the options among the arguments that count."""
+        return [f"-{letter}" for letter in parse_options(self.arguments)[0]]
 
 
 def run_faults(case: Case, said: Explanation | None, after: Mapping[str, Entry]) -> list[str]:
@@ -151,8 +153,9 @@ def faults(case: Case, orvane: Path, unit_tool: Path) -> list[str] | None:
     """
     said: Explanation | None = None
     lines: list[str] = []
-    if case.letters():
-        said, _, lines = ask_explain(str(unit_tool), case.root, case.letters())
+    options = case.options()
+    if options:
+        said, _, lines = ask_explain(str(unit_tool), case.root, options)
     result = case.run(orvane)
     try:
         if result.status < 0:

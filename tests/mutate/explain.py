@@ -103,7 +103,8 @@ def print_differences(choice: Choice, tried: Sequence[Tried], listed: Container[
             word = "differs, as listed" if mutant.key() in listed else "differs"
             print(f"\n{word}, {mutant.path}:{mutant.line}, occurrence {mutant.occurrence}")
             print(mutant.diff(choice.originals[mutant.path]), end="")
-            print("\n".join(("in " + finding.lines[0], *finding.lines[1:])))
+            print(f"explain's (found) and the run's (expected) in {finding.lines[0]}")
+            print("\n".join(finding.lines[1:]))
 
 
 def report(tried: Sequence[Tried], listed: Container[Key], fewest: int) -> bool:
