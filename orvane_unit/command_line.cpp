@@ -4,7 +4,7 @@
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 #include "orvane_unit/commands.h"
-#include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/show/decoded_unit.h"
 
 #include <CLI/CLI.hpp>
 
@@ -13,7 +13,6 @@
 #include <exception>
 #include <functional>
 #include <iostream>
-#include <iterator>
 #include <memory>
 #include <sstream>
 #include <stdexcept>
@@ -74,8 +73,7 @@ Action addShow(CLI::App& app) {
     command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
         ->required();
     command->add_option("--only", options->only, "params, records, tuning, versions or files")
-        ->check(CLI::IsMember(
-            std::vector<std::string>(std::begin(CONTENT_PARTS), std::end(CONTENT_PARTS))));
+        ->check(CLI::IsMember(partNames()));
     command->add_flag("--json", options->isJson, "Print JSON");
     return [options] { return runShow(*options); };
 }

@@ -60,11 +60,11 @@ int runCapture(const CaptureCommand& command) {
 }
 
 int runShow(const ShowCommand& command) {
-    const Contents contents = readContents(command.root);
+    const DecodedUnit unit = decodeUnit(command.root);
     if (command.isJson) {
-        std::cout << contentsJson(command.root, contents, command.only) << '\n';
+        std::cout << decodedUnitJson(command.root, unit, command.only) << '\n';
     } else {
-        printContents(std::cout, contents, command.only);
+        printDecodedUnit(std::cout, unit, command.only);
     }
     return EXIT_AS_INTENDED;
 }

@@ -36,7 +36,7 @@ int runSet(const SetCommand& command);
 
 struct ShowCommand {
     std::string root;
-    std::string only; ///< one of CONTENT_PARTS; empty for all
+    std::string only; ///< one of partNames(); empty for all
     bool isJson = false;
 };
 int runShow(const ShowCommand& command);

@@ -4,13 +4,15 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "identity/inf_file.h"
-#include "kit/description/unit_description.h"
+#include "kit/description/value_places.h"
 #include "kit/host/sparse_content.h"
 #include "kit/host/text.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
+#include "orvane_unit/report/names.h"
+#include "orvane_unit/report/table.h"
 #include "orvane_unit/report/terminal.h"
 #include "tuning/dps_block.h"
 
@@ -33,23 +35,24 @@ std::string hexNumber(std::uint32_t number, int digits) {
     return text.str();
 }
 
-void printParams(std::ostream& out, const Contents& contents) {
-    out << "image: " << kit::counted(contents.image.bytes.size(), "byte");
-    if (contents.image.reason != Reason::fromImage) {
-        out << ", " << painted(Colour::bad, reasonInfo(contents.image.reason).sentence);
+constexpr Column PARAM_COLUMNS[] = {{"param", 5},   {"group", 6}, {"offset", 7},
+                                    {"size", 5},    {"raw", 7},   {"hex", 7},
+                                    {"default", 8}, {"mask", 11}, {"code", 5}};
+
+void printPart(std::ostream& out, const DecodedImage& image) {
+    out << "image: " << kit::counted(image.found.bytes.size(), "byte");
+    if (image.found.reason != Reason::fromImage) {
+        out << ", " << painted(Colour::bad, reasonInfo(image.found.reason).sentence);
     }
-    out << "\nparam group offset size    raw    hex default       mask code\n";
-    for (const Param& param : contents.params) {
-        out << std::setw(5) << param.row.number << std::setw(6) << param.row.group << std::setw(7)
-            << param.row.offset << std::setw(5) << param.size;
-        if (param.raw) {
-            out << std::setw(7) << *param.raw << std::setw(7)
-                << hexNumber(*param.raw, static_cast<int>(param.size) * 2);
-        } else {
-            out << std::setw(7) << "-" << std::setw(7) << "-";
-        }
-        out << std::setw(8) << param.row.defaultValue << ' ' << hexNumber(param.row.mask, 8)
-            << std::setw(5) << (param.row.id >> 16U);
+    out << '\n';
+    printTitles(out, PARAM_COLUMNS);
+    out << '\n';
+    for (const DecodedParam& param : image.params) {
+        const auto digits = static_cast<int>(param.size) * 2;
+        printCells(out, PARAM_COLUMNS, param.row.number, param.row.group, param.row.offset,
+                   param.size, param.raw ? std::to_string(*param.raw) : "-",
+                   param.raw ? hexNumber(*param.raw, digits) : "-", param.row.defaultValue,
+                   hexNumber(param.row.mask, 8), param.code);
         if (!param.meaning.empty()) {
             out << "  " << painted(Colour::good, kit::printable(param.meaning));
         }
@@ -57,58 +60,80 @@ void printParams(std::ostream& out, const Contents& contents) {
     }
 }
 
-void printBytes(std::ostream& out, const std::string& bytes) {
-    const std::string text = kit::withoutEndZeros(bytes);
+/// Bytes as a text, without the zeros at their end; "-" where they can't be read.
+std::string contentText(const std::optional<std::string>& bytes) {
+    if (!bytes) {
+        return "-";
+    }
+    const std::string text = kit::withoutEndZeros(*bytes);
     if (text.empty()) {
-        out << painted(Colour::faint, "zeros");
-    } else {
-        out << '"' << kit::printable(text) << '"';
-        if (kit::printable(text) != text) {
-            out << "  " << painted(Colour::faint, kit::hexText(text));
-        }
+        return painted(Colour::faint, "zeros");
     }
+    const std::string quoted = '"' + kit::printable(text) + '"';
+    return kit::printable(text) == text
+               ? quoted
+               : quoted + "  " + painted(Colour::faint, kit::hexText(text));
 }
 
-void printRecords(std::ostream& out, const Contents& contents) {
-    out << "disk: " << kit::counted(contents.diskSize, "byte");
-    if (contents.diskTrouble) {
-        out << ", " << painted(Colour::bad, reasonInfo(*contents.diskTrouble).sentence);
-    }
-    out << "\nslot offset size  content\n";
-    for (const Slot& slot : contents.slots) {
-        out << std::setw(4) << slot.number << std::setw(7) << slot.offset << std::setw(5)
-            << slot.size << "  ";
-        if (slot.number == CRC_RECORD_SLOT) {
-            out << "slots 1 to 9 once more";
-        } else if (slot.bytes) {
-            printBytes(out, *slot.bytes);
-        } else {
-            out << '-';
-        }
-        out << '\n';
-    }
-    out << "auxiliary area: ";
-    if (contents.aux) {
-        printBytes(out, *contents.aux);
-    } else {
-        out << '-';
-    }
-    out << "\nCRC over slots 1 to 9: " << hexNumber(contents.crc, 8) << ", "
-        << crcVerdictName(contents.crcVerdict) << '\n';
+/// "slots 1 to 9": what `slot` repeats; empty for a slot that repeats none.
+std::string repeatedSlots(std::uint32_t slot) {
+    const std::vector<std::uint32_t> slots = kit::slotsWithin(slot);
+    return slots.empty()
+               ? ""
+               : "slots " + std::to_string(slots.front()) + " to " + std::to_string(slots.back());
 }
 
-void printTuning(std::ostream& out, const Contents& contents) {
-    if (contents.tuning.reason != Reason::fromTuningBlock) {
-        out << "tuning blocks: "
-            << painted(Colour::bad, reasonInfo(contents.tuning.reason).sentence) << '\n';
+constexpr Column SLOT_COLUMNS[] = {{"slot", 4}, {"offset", 7}, {"size", 5}};
+
+void printPart(std::ostream& out, const DecodedRecords& records) {
+    out << "disk: " << kit::counted(records.diskSize, "byte");
+    if (records.diskTrouble) {
+        out << ", " << painted(Colour::bad, reasonInfo(*records.diskTrouble).sentence);
+    }
+    out << '\n';
+    printTitles(out, SLOT_COLUMNS);
+    out << "  content\n";
+    for (const DecodedSlot& slot : records.slots) {
+        printCells(out, SLOT_COLUMNS, slot.number, slot.offset, slot.size);
+        const std::string repeated = repeatedSlots(slot.number);
+        out << "  " << (repeated.empty() ? contentText(slot.bytes) : repeated + " once more")
+            << '\n';
+    }
+    out << "auxiliary area: " << contentText(records.aux) << '\n'
+        << "CRC over " << repeatedSlots(CRC_RECORD_SLOT) << ": " << hexNumber(records.crc, 8)
+        << ", " << nameOf(records.crcVerdict) << '\n';
+}
+
+constexpr std::size_t FIELD_NAME_WIDTH = 24;
+
+void printField(std::ostream& out, const DpsBlock& block, const DpsField& field) {
+    out << "  " << padded(field.key, FIELD_NAME_WIDTH);
+    for (std::size_t element = 0; element < field.count; ++element) {
+        out << (element == 0 ? "" : ", ") << decodeField(block, field, element);
+    }
+    if (field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord) {
+        const std::string word = fieldWord(field, decodeField(block, field, 0));
+        out << "  "
+            << (word.empty() ? painted(Colour::bad, "no word") : painted(Colour::good, word));
+    }
+    out << '\n';
+}
+
+const char* purposeOf(std::int32_t blockId) {
+    return blockId == DPS_BLOCK_TELEPHONY   ? ", telephony"
+           : blockId == DPS_BLOCK_SPEECHREC ? ", speech recognition"
+                                            : "";
+}
+
+void printPart(std::ostream& out, const TuningArea& tuning) {
+    if (tuning.reason != Reason::fromTuningBlock) {
+        out << "tuning blocks: " << painted(Colour::bad, reasonInfo(tuning.reason).sentence)
+            << '\n';
         return;
     }
     for (std::int32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
-        const DpsBlock& block = contents.tuning.blocks.at(static_cast<std::size_t>(id));
-        out << "tuning block " << id
-            << (id == DPS_BLOCK_TELEPHONY   ? ", telephony"
-                : id == DPS_BLOCK_SPEECHREC ? ", speech recognition"
-                                            : "");
+        const DpsBlock& block = tuning.blocks.at(static_cast<std::size_t>(id));
+        out << "tuning block " << id << purposeOf(id);
         const std::string bytes(block.bytes.begin(), block.bytes.end());
         if (kit::withoutEndZeros(bytes).empty()) {
             out << ": " << painted(Colour::faint, "zeros") << '\n';
@@ -116,27 +141,16 @@ void printTuning(std::ostream& out, const Contents& contents) {
         }
         out << '\n';
         for (const DpsField& field : DPS_LAYOUT) {
-            out << "  " << std::left << std::setw(24) << field.key << std::right;
-            for (std::size_t element = 0; element < field.count; ++element) {
-                out << (element == 0 ? "" : ", ") << decodeField(block, field, element);
-            }
-            if (field.kind == DpsKind::switchWord || field.kind == DpsKind::modeWord) {
-                const std::string word = fieldWord(field, decodeField(block, field, 0));
-                out << "  "
-                    << painted(word.empty() ? Colour::bad : Colour::good,
-                               word.empty() ? "no word" : word);
-            }
-            out << '\n';
+            printField(out, block, field);
         }
     }
 }
 
-void printVersions(std::ostream& out, const Contents& contents) {
-    const VersionFiles& versions = contents.versions;
-    for (std::size_t i = 0; i < versions.files.size(); ++i) {
-        const VersionFile& file = versions.files[i];
+void printPart(std::ostream& out, const DecodedVersions& versions) {
+    for (std::size_t i = 0; i < versions.found.files.size(); ++i) {
+        const VersionFile& file = versions.found.files[i];
         out << kit::printable(file.path) << ": ";
-        if (versions.chosen == i) {
+        if (versions.found.chosen == i) {
             out << painted(Colour::good,
                            "chosen: the first application in the order of the listing");
         } else if (file.isApplication) {
@@ -149,31 +163,20 @@ void printVersions(std::ostream& out, const Contents& contents) {
             out << "  " << kit::printable(key) << " = " << kit::printable(value) << '\n';
         }
     }
-    if (!versions.hasFolder) {
+    if (!versions.found.hasFolder) {
         out << painted(Colour::bad, reasonInfo(Reason::versionFolderMissing).sentence) << '\n';
     }
-    out << "version: \"" << kit::printable(contents.version) << "\", as digits "
-        << contents.versionDigits << '\n';
+    out << "version: \"" << kit::printable(versions.version) << "\", as digits " << versions.digits
+        << '\n';
 }
 
-const char* kindName(PathKind kind) {
-    switch (kind) {
-    case PathKind::nothing:
-        return "missing";
-    case PathKind::file:
-        return "file";
-    case PathKind::folder:
-        return "folder";
-    case PathKind::other:
-        return "device";
-    }
-    return "";
-}
+constexpr std::size_t PATH_WIDTH = 52;
+constexpr std::size_t ROLE_WIDTH = 26;
 
-void printFiles(std::ostream& out, const Contents& contents) {
-    for (const UnitFile& file : contents.files) {
-        out << std::left << std::setw(52) << file.path << ' ' << std::setw(26) << file.role
-            << std::right << ' ' << kindName(file.kind);
+void printPart(std::ostream& out, const std::vector<UnitFile>& files) {
+    for (const UnitFile& file : files) {
+        out << padded(file.path, PATH_WIDTH) << ' ' << padded(file.role, ROLE_WIDTH) << ' '
+            << wordOf(file.kind);
         if (file.kind == PathKind::file) {
             out << ", " << kit::counted(file.size, "byte");
         }
@@ -183,16 +186,12 @@ void printFiles(std::ostream& out, const Contents& contents) {
 
 } // namespace
 
-void printContents(std::ostream& out, const Contents& contents, const std::string& only) {
-    using Print = void (*)(std::ostream&, const Contents&);
-    constexpr Print PRINTS[] = {printParams, printRecords, printTuning, printVersions, printFiles};
-    std::size_t part = 0;
-    for (const char* name : CONTENT_PARTS) {
+void printDecodedUnit(std::ostream& out, const DecodedUnit& unit, const std::string& only) {
+    forEachPart(unit, [&out, &only](const char* name, const auto& part) {
         if (only.empty() || only == name) {
-            PRINTS[part](out, contents);
+            printPart(out, part);
         }
-        ++part;
-    }
+    });
 }
 
 } // namespace orvane::desk

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The contents of a unit for people.
+// A decoded unit for people.
 #pragma once
 
 #include "orvane_unit/show/decoded_unit.h"
@@ -10,10 +10,7 @@
 
 namespace orvane::desk {
 
-/// The parts that can be asked for alone.
-constexpr const char* CONTENT_PARTS[] = {"params", "records", "tuning", "versions", "files"};
-
 /// Prints the part `only`, or all of them when it is empty.
-void printContents(std::ostream& out, const Contents& contents, const std::string& only);
+void printDecodedUnit(std::ostream& out, const DecodedUnit& unit, const std::string& only);
 
 } // namespace orvane::desk

@@ -10,7 +10,7 @@
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
-#include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/report/names.h"
 #include "orvane_unit/report/place_text.h"
 #include "tuning/dps_block.h"
 
@@ -64,20 +64,6 @@ Json codesJson(const std::vector<Reason>& reasons) {
     return codes;
 }
 
-const char* pathKindName(PathKind kind) {
-    switch (kind) {
-    case PathKind::nothing:
-        return "nothing";
-    case PathKind::file:
-        return "file";
-    case PathKind::folder:
-        return "folder";
-    case PathKind::other:
-        return "other";
-    }
-    return "";
-}
-
 Json lineJson(const Line& line) {
     return {{"text", bytesJson(line.text)},
             {"reasons", codesJson(line.origin.reasons)},
@@ -85,9 +71,9 @@ Json lineJson(const Line& line) {
             {"detail", bytesJson(placeText(line.origin))}};
 }
 
-Json paramsJson(const Contents& contents) {
+Json partJson(const DecodedImage& image) {
     Json rows = Json::array();
-    for (const Param& param : contents.params) {
+    for (const DecodedParam& param : image.params) {
         rows.push_back({{"number", param.row.number},
                         {"group", param.row.group},
                         {"offset", param.row.offset},
@@ -95,29 +81,29 @@ Json paramsJson(const Contents& contents) {
                         {"raw", param.raw ? Json(*param.raw) : Json()},
                         {"default", param.row.defaultValue},
                         {"mask", param.row.mask},
-                        {"code", param.row.id >> 16U},
+                        {"code", param.code},
                         {"meaning", param.meaning.empty() ? Json() : bytesJson(param.meaning)}});
     }
-    return {{"image", reasonInfo(contents.image.reason).code},
-            {"size", contents.image.bytes.size()},
+    return {{"image", reasonInfo(image.found.reason).code},
+            {"size", image.found.bytes.size()},
             {"rows", rows}};
 }
 
-Json recordsJson(const Contents& contents) {
+Json partJson(const DecodedRecords& records) {
     Json slots = Json::array();
-    for (const Slot& slot : contents.slots) {
+    for (const DecodedSlot& slot : records.slots) {
         slots.push_back({{"number", slot.number},
                          {"size", slot.size},
                          {"offset", slot.offset},
                          {"bytes", slot.bytes ? Json(kit::hexText(*slot.bytes)) : Json()}});
     }
-    return {{"disk", contents.diskTrouble ? reasonInfo(*contents.diskTrouble).code
-                                          : reasonInfo(Reason::fromRecord).code},
-            {"size", contents.diskSize},
+    const Reason disk = records.diskTrouble.value_or(Reason::fromRecord);
+    return {{"disk", reasonInfo(disk).code},
+            {"size", records.diskSize},
             {"slots", slots},
-            {"aux", contents.aux ? Json(kit::hexText(*contents.aux)) : Json()},
-            {"crc", contents.crc},
-            {"crcVerdict", crcVerdictName(contents.crcVerdict)}};
+            {"aux", records.aux ? Json(kit::hexText(*records.aux)) : Json()},
+            {"crc", records.crc},
+            {"crcVerdict", nameOf(records.crcVerdict)}};
 }
 
 Json fieldJson(const DpsBlock& block, const DpsField& field) {
@@ -135,43 +121,43 @@ Json fieldJson(const DpsBlock& block, const DpsField& field) {
     return {{"code", value}, {"word", fieldWord(field, value)}};
 }
 
-Json tuningJson(const Contents& contents) {
+Json partJson(const TuningArea& tuning) {
     Json blocks = Json::array();
-    for (const DpsBlock& block : contents.tuning.blocks) {
+    for (const DpsBlock& block : tuning.blocks) {
         Json fields;
         for (const DpsField& field : DPS_LAYOUT) {
             fields[field.key] = fieldJson(block, field);
         }
         blocks.push_back(fields);
     }
-    return {{"disk", reasonInfo(contents.tuning.reason).code}, {"blocks", blocks}};
+    return {{"disk", reasonInfo(tuning.reason).code}, {"blocks", blocks}};
 }
 
-Json versionsJson(const Contents& contents) {
+Json partJson(const DecodedVersions& versions) {
     Json files = Json::array();
-    for (std::size_t i = 0; i < contents.versions.files.size(); ++i) {
-        const VersionFile& file = contents.versions.files[i];
+    for (std::size_t i = 0; i < versions.found.files.size(); ++i) {
+        const VersionFile& file = versions.found.files[i];
         Json record = Json::array();
         for (const auto& [key, value] : file.record) {
             record.push_back({{"key", bytesJson(key)}, {"value", bytesJson(value)}});
         }
         files.push_back({{"path", bytesJson(file.path)},
                          {"isApplication", file.isApplication},
-                         {"isChosen", contents.versions.chosen == i},
+                         {"isChosen", versions.found.chosen == i},
                          {"record", record}});
     }
-    return {{"hasFolder", contents.versions.hasFolder},
+    return {{"hasFolder", versions.found.hasFolder},
             {"files", files},
-            {"version", bytesJson(contents.version)},
-            {"digits", bytesJson(contents.versionDigits)}};
+            {"version", bytesJson(versions.version)},
+            {"digits", bytesJson(versions.digits)}};
 }
 
-Json filesJson(const Contents& contents) {
+Json partJson(const std::vector<UnitFile>& unitFiles) {
     Json files = Json::array();
-    for (const UnitFile& file : contents.files) {
+    for (const UnitFile& file : unitFiles) {
         files.push_back({{"path", file.path},
                          {"role", file.role},
-                         {"kind", pathKindName(file.kind)},
+                         {"kind", nameOf(file.kind)},
                          {"size", file.size}});
     }
     return files;
@@ -210,7 +196,7 @@ std::string explanationJson(const std::string& root, const std::string& letters,
                       {"isIntended", isIntended(output)},
                       {"reasons", codesJson(output.reasons)},
                       {"lines", lines},
-                      {"left", pathKindName(output.kindAfter)}};
+                      {"left", nameOf(output.kindAfter)}};
         if (hasContent) {
             entry["content"] =
                 output.kindAfter == PathKind::file ? bytesJson(output.contentAfter) : Json();
@@ -220,19 +206,15 @@ std::string explanationJson(const std::string& root, const std::string& letters,
     return json.dump();
 }
 
-std::string contentsJson(const std::string& root, const Contents& contents,
-                         const std::string& only) {
+std::string decodedUnitJson(const std::string& root, const DecodedUnit& unit,
+                            const std::string& only) {
     Json json = begin("show");
     json["root"] = bytesJson(root);
-    using Part = Json (*)(const Contents&);
-    constexpr Part PARTS[] = {paramsJson, recordsJson, tuningJson, versionsJson, filesJson};
-    std::size_t part = 0;
-    for (const char* name : CONTENT_PARTS) {
+    forEachPart(unit, [&json, &only](const char* name, const auto& part) {
         if (only.empty() || only == name) {
-            json[name] = PARTS[part](contents);
+            json[name] = partJson(part);
         }
-        ++part;
-    }
+    });
     return json.dump();
 }
 

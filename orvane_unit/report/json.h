@@ -23,9 +23,9 @@ constexpr int JSON_FORMAT = 1;
 std::string explanationJson(const std::string& root, const std::string& letters,
                             const Explanation& explanation, bool hasContent);
 
-/// `only` as in printContents.
-std::string contentsJson(const std::string& root, const Contents& contents,
-                         const std::string& only);
+/// `only` as in printDecodedUnit.
+std::string decodedUnitJson(const std::string& root, const DecodedUnit& unit,
+                            const std::string& only);
 
 std::string runJson(const std::string& root, const kit::RunResult& result, const TmpTree& before,
                     const TmpTree& after);

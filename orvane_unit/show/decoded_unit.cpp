@@ -8,7 +8,7 @@
 #include "config/record_slots.h"
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
-#include "kit/description/unit_description.h"
+#include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/sparse_content.h"
 #include "main/unit_files.h"
@@ -62,18 +62,16 @@ std::string meaningOf(std::uint16_t number) {
     }
 }
 
-std::vector<Param> readParams(const Image& image) {
+std::vector<DecodedParam> decodeParams(const Image& image) {
     ConfigStore store;
     store.init();
     const bool isOpen = store.open() == 0;
-    std::vector<Param> params;
+    std::vector<DecodedParam> params;
     for (std::uint16_t number = 1; number <= PARAM_COUNT; ++number) {
-        Param param;
-        std::int32_t index = 0;
-        ParamInfo info{};
-        lookupParam(number, index, param.row);
-        describeParam(number, info);
-        param.size = info.size;
+        DecodedParam param;
+        param.row = kit::paramRow(number);
+        param.code = param.row.id >> 16U;
+        param.size = kit::paramPlace(number).size;
         std::uint16_t value = 0; // one byte arrives in the low byte here, as in readAllParams
         if (isOpen && param.row.offset + param.size <= image.bytes.size() &&
             getParam(store, number, &value) == PARAM_OK) {
@@ -85,32 +83,38 @@ std::vector<Param> readParams(const Image& image) {
     return params;
 }
 
-void readRecords(Contents& contents) {
-    bool isBlank = false;
+CrcVerdict verdictOn(const DecodedRecords& records) {
+    constexpr std::uint32_t ALL_ONES = 0xFFFFFFFF;
+    if (diskTrouble(CRC_RANGE_START)) {
+        return CrcVerdict::unreadable;
+    }
+    if (records.crc == ALL_ONES) {
+        return CrcVerdict::ambiguous;
+    }
+    const std::optional<std::string>& range = records.slots.at(CRC_RECORD_SLOT).bytes;
+    return range && kit::withoutEndZeros(*range).empty() ? CrcVerdict::blank : CrcVerdict::computed;
+}
+
+DecodedRecords decodeRecords() {
+    DecodedRecords records;
+    records.diskSize = diskSize();
+    records.diskTrouble = diskTrouble(RECORD_AREA_SIZE);
     for (std::uint32_t number = 0; number < RECORD_SLOT_COUNT; ++number) {
-        Slot slot;
-        slot.number = number;
-        recordSlotLayout(number, slot.size, slot.offset);
-        std::string bytes(slot.size, '\0');
-        if (readRecordSlot(number, bytes.data(), slot.size) == 0) {
+        const kit::SlotPlace place = kit::slotPlace(number);
+        DecodedSlot slot{number, place.size, place.offset, std::nullopt};
+        std::string bytes(place.size, '\0');
+        if (readRecordSlot(number, bytes.data(), place.size) == 0) {
             slot.bytes = bytes;
-            isBlank = number == CRC_RECORD_SLOT ? kit::withoutEndZeros(bytes).empty() : isBlank;
         }
-        contents.slots.push_back(std::move(slot));
+        records.slots.push_back(std::move(slot));
     }
     std::string aux(AUX_AREA_SIZE, '\0');
     if (readAuxArea(aux.data(), AUX_AREA_SIZE) == 0) {
-        contents.aux = aux;
+        records.aux = aux;
     }
-    contents.crc = recordAreaCrc();
-    constexpr std::uint32_t ALL_ONES = 0xFFFFFFFF;
-    if (diskTrouble(CRC_RANGE_START)) {
-        contents.crcVerdict = CrcVerdict::unreadable;
-    } else if (contents.crc == ALL_ONES) {
-        contents.crcVerdict = CrcVerdict::ambiguous;
-    } else {
-        contents.crcVerdict = isBlank ? CrcVerdict::blank : CrcVerdict::computed;
-    }
+    records.crc = recordAreaCrc();
+    records.crcVerdict = verdictOn(records);
+    return records;
 }
 
 UnitFile look(const std::string& path, const char* role) {
@@ -145,34 +149,22 @@ std::vector<UnitFile> lookAtFiles() {
 
 } // namespace
 
-const char* crcVerdictName(CrcVerdict verdict) {
-    switch (verdict) {
-    case CrcVerdict::computed:
-        return "computed";
-    case CrcVerdict::blank:
-        return "blank";
-    case CrcVerdict::ambiguous:
-        return "ambiguous";
-    case CrcVerdict::unreadable:
-        return "unreadable";
-    }
-    return "";
+std::vector<std::string> partNames() {
+    std::vector<std::string> names;
+    forEachPart({}, [&names](const char* name, const auto& /*part*/) { names.push_back(name); });
+    return names;
 }
 
-Contents readContents(const std::filesystem::path& root) {
+DecodedUnit decodeUnit(const std::filesystem::path& root) {
     const kit::EnteredRoot entered(root);
-    Contents contents;
-    contents.image = readImage();
-    contents.params = readParams(contents.image);
-    contents.diskSize = diskSize();
-    contents.diskTrouble = diskTrouble(RECORD_AREA_SIZE);
-    readRecords(contents);
-    contents.tuning = readUnitTuning();
-    contents.versions = readVersionFiles();
-    contents.version = findApplicationVersion();
-    contents.versionDigits = softwareVersion();
-    contents.files = lookAtFiles();
-    return contents;
+    DecodedUnit unit;
+    unit.image.found = readImage();
+    unit.image.params = decodeParams(unit.image.found);
+    unit.records = decodeRecords();
+    unit.tuning = readUnitTuning();
+    unit.versions = {readVersionFiles(), findApplicationVersion(), softwareVersion()};
+    unit.files = lookAtFiles();
+    return unit;
 }
 
 } // namespace orvane::desk

@@ -17,21 +17,27 @@
 
 namespace orvane::desk {
 
-struct Param {
+struct DecodedParam {
     ParamDescriptor row{};
+    std::uint32_t code = 0;           ///< the upper half of the row's id
     std::uint32_t size = 0;           ///< bytes
     std::optional<std::uint16_t> raw; ///< none without an image, or past its end
     std::string meaning; ///< what the tool makes of it; empty where it does not read it
 };
 
-struct Slot {
+struct DecodedImage {
+    Image found;
+    std::vector<DecodedParam> params; ///< all of the catalogue
+};
+
+struct DecodedSlot {
     std::uint32_t number = 0;
     std::uint32_t size = 0;   ///< bytes
     std::uint64_t offset = 0; ///< from the record area's base
     std::optional<std::string> bytes;
 };
 
-/// What can be said of the CRC over slots 1 to 9; no place of the disk holds one to compare with.
+/// What can be said of the CRC; no place of the disk holds one to compare with.
 enum class CrcVerdict {
     computed,
     blank,      ///< the records are all zero
@@ -39,34 +45,52 @@ enum class CrcVerdict {
     unreadable, ///< the disk can't be read
 };
 
-const char* crcVerdictName(CrcVerdict verdict);
+struct DecodedRecords {
+    std::uint64_t diskSize = 0;        ///< bytes
+    std::optional<Reason> diskTrouble; ///< why the record area can't be read
+    std::vector<DecodedSlot> slots;    ///< all of them
+    std::optional<std::string> aux;
+    std::uint32_t crc = 0;
+    CrcVerdict crcVerdict = CrcVerdict::unreadable;
+};
+
+struct DecodedVersions {
+    VersionFiles found;
+    std::string version; ///< as the two iAP2 files carry it
+    std::string digits;  ///< as the iAP1 file carries it
+};
 
 /// A path that a run opens, and what is there.
 struct UnitFile {
     std::string path;
-    std::string role; ///< "template", "stock", "output", ...
+    std::string role; ///< "template", "stock file", "output", ...
     PathKind kind = PathKind::nothing;
     std::uint64_t size = 0; ///< bytes, of a file
 };
 
-struct Contents {
-    Image image;
-    std::vector<Param> params; ///< all of the catalogue
-    std::uint64_t diskSize = 0;
-    std::optional<Reason> diskTrouble; ///< why the record area can't be read
-    std::vector<Slot> slots;           ///< all of them
-    std::optional<std::string> aux;
-    std::uint32_t crc = 0;
-    CrcVerdict crcVerdict = CrcVerdict::unreadable;
+struct DecodedUnit {
+    DecodedImage image;
+    DecodedRecords records;
     TuningArea tuning;
-    VersionFiles versions;
-    std::string version; ///< as the two iAP2 files carry it
-    std::string versionDigits;
+    DecodedVersions versions;
     std::vector<UnitFile> files;
 };
 
+/// Calls `visit(name, part)` for each part that can be asked for alone: one list for all reports.
+template <class Visit>
+void forEachPart(const DecodedUnit& unit, Visit visit) {
+    visit("params", unit.image);
+    visit("records", unit.records);
+    visit("tuning", unit.tuning);
+    visit("versions", unit.versions);
+    visit("files", unit.files);
+}
+
+/// The names of the parts, in the order in which they are reported.
+std::vector<std::string> partNames();
+
 /// Reads the unit at `root`, "/" for the system itself. Throws kit::KitError when it can't be
 /// entered.
-Contents readContents(const std::filesystem::path& root);
+DecodedUnit decodeUnit(const std::filesystem::path& root);
 
 } // namespace orvane::desk

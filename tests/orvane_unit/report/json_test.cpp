@@ -4,7 +4,6 @@
 #include "kit/enter/captured_run.h"
 #include "kit/unit/describe_inputs.h"
 #include "orvane_unit/explain/explain.h"
-#include "orvane_unit/report/decoded_unit_text.h"
 #include "orvane_unit/report/json.h"
 #include "tests/orvane_unit/explain/described_unit.h"
 #include "tests/support/host_command.h"
@@ -51,13 +50,13 @@ TEST(JsonTest, ExplanationHasItsLinesAndOnlyThenItsContent) {
     EXPECT_FALSE(brief.at("outputs").at(0).contains("content"));
 }
 
-TEST(JsonTest, ContentsHaveThePartsThatAreAskedFor) {
+TEST(JsonTest, DecodedUnitHasThePartsThatAreAskedFor) {
     const DescribedUnit described;
-    const desk::Contents contents = desk::readContents(described.root());
-    const json all = parsed(desk::contentsJson("R", contents, ""), "show");
-    for (const char* part : desk::CONTENT_PARTS) {
+    const desk::DecodedUnit unit = desk::decodeUnit(described.root());
+    const json all = parsed(desk::decodedUnitJson("R", unit, ""), "show");
+    for (const std::string& part : desk::partNames()) {
         EXPECT_TRUE(all.contains(part)) << part;
-        EXPECT_EQ(parsed(desk::contentsJson("R", contents, part), "show").size(), 4U) << part;
+        EXPECT_EQ(parsed(desk::decodedUnitJson("R", unit, part), "show").size(), 4U) << part;
     }
     EXPECT_EQ(all.at("params").at("rows").at(138).at("raw"), 26);
     EXPECT_EQ(all.at("records").at("slots").at(9).at("bytes"), "53 4e 30 30 34 32 31 37");
@@ -146,7 +145,7 @@ TEST(JsonTest, TextsThatAreNoUtf8AreHexWhereverTheyStand) {
         unit.files["/fs/rwdata/.Version/\xff.inf"] = "Type=\xfe\n\xfd=1\n";
     });
     const json shown =
-        parsed(desk::contentsJson("R", desk::readContents(described.root()), "versions"), "show");
+        parsed(desk::decodedUnitJson("R", desk::decodeUnit(described.root()), "versions"), "show");
     EXPECT_NE(shown.dump().find(R"({"key":"Type","value":{"hex":"fe"}})"), std::string::npos);
     EXPECT_NE(shown.dump().find(R"({"key":{"hex":"fd"},"value":"1"})"), std::string::npos);
 }

@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What the reports call the values of enumerations.
+#pragma once
+
+#include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/show/decoded_unit.h"
+
+namespace orvane::desk {
+
+/// Published: texts and JSON have the same names, which programs read.
+const char* nameOf(CrcVerdict verdict);
+const char* nameOf(PathKind kind);
+
+/// What is at a path, for people.
+const char* wordOf(PathKind kind);
+
+} // namespace orvane::desk
