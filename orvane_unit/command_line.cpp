@@ -1,184 +1,394 @@
 // SPDX-License-Identifier: Apache-2.0
+//
+// All subcommands, each a class: what its options are, and what it does. A new one is a class and
+// its name in chooseAndRun.
 #include "orvane_unit/command_line.h"
 
+#include "kit/description/description_text.h"
+#include "kit/description/parse_description.h"
+#include "kit/description/sample.h"
+#include "kit/description/unit_description.h"
+#include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
-#include "orvane_unit/commands.h"
+#include "kit/unit/capture_unit.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/describe_unit.h"
+#include "kit/unit/edit.h"
+#include "kit/unit/make_unit.h"
+#include "kit/unit/marker.h"
+#include "main/options.h"
+#include "orvane_unit/check/case_check.h"
+#include "orvane_unit/check/tmp_tree.h"
+#include "orvane_unit/compare/impact.h"
+#include "orvane_unit/compare/output_differences.h"
+#include "orvane_unit/compare/unit_values.h"
+#include "orvane_unit/explain/explain.h"
+#include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/find_orvane.h"
+#include "orvane_unit/report/check_text.h"
+#include "orvane_unit/report/comparison_text.h"
+#include "orvane_unit/report/decoded_unit_text.h"
+#include "orvane_unit/report/explanation_text.h"
+#include "orvane_unit/report/json.h"
+#include "orvane_unit/report/run_text.h"
 #include "orvane_unit/show/decoded_unit.h"
 
 #include <CLI/CLI.hpp>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cstddef>
 #include <exception>
-#include <functional>
+#include <filesystem>
 #include <iostream>
 #include <memory>
 #include <sstream>
-#include <stdexcept>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {
 
 namespace {
 
-/// A command's own part of the command line: its options, and what to do when it is chosen.
-using Action = std::function<int()>;
+/// A subcommand. Its options are members that the parser fills.
+class Command {
+public:
+    Command(CLI::App& app, const char* name, const char* what, const char* example)
+        : parser_(app.add_subcommand(name, what)) {
+        parser_->footer(std::string("Example:\n  ") + example);
+    }
+    Command(const Command&) = delete;
+    Command& operator=(const Command&) = delete;
+    virtual ~Command() = default;
 
-constexpr char ROOT_HELP[] = "The unit's folder";
+    bool isChosen() const { return parser_->parsed(); }
 
-CLI::App* addCommand(CLI::App& app, const char* name, const char* what, const char* example) {
-    CLI::App* const command = app.add_subcommand(name, what);
-    command->footer(std::string("Example:\n  ") + example);
-    return command;
+    /// Prints its report to standard output. Throws kit::KitError for wrong use or bad input.
+    virtual ExitStatus run() const = 0;
+
+protected:
+    void addOption(const char* name, std::string& value, const char* what) {
+        parser_->add_option(name, value, what);
+    }
+    void addNeeded(const char* name, std::string& value, const char* what) {
+        parser_->add_option(name, value, what)->required();
+    }
+    CLI::App& parser() { return *parser_; }
+    const CLI::App& parser() const { return *parser_; }
+
+private:
+    CLI::App* parser_;
+};
+
+constexpr char MARKED_ROOT[] = "The unit's folder";
+constexpr char ANY_ROOT[] = "The unit's folder, or / for this system";
+constexpr char NEW_ROOT[] = "The folder to make, absent or empty";
+constexpr char BINARY[] = "The binary to run; by default the one beside this program, else on PATH";
+constexpr char JSON[] = "Print JSON";
+
+class NewCommand : public Command {
+public:
+    explicit NewCommand(CLI::App& app)
+        : Command(app, "new", "Make a unit", "orvane-unit new bench --from unit.toml") {
+        addNeeded("ROOT", root_, NEW_ROOT);
+        addOption("--from", description_,
+                  "The unit's description in TOML; the built-in sample unit without it");
+    }
+
+    ExitStatus run() const override {
+        kit::makeUnit(description_.empty()
+                          ? kit::parseDescription(kit::sampleDescriptionText(), "sample")
+                          : kit::readDescription(description_),
+                      root_);
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string root_;
+    std::string description_;
+};
+
+class DescribeCommand : public Command {
+public:
+    explicit DescribeCommand(CLI::App& app)
+        : Command(app, "describe", "Print the description of a unit, which makes the same unit",
+                  "orvane-unit describe bench > unit.toml") {
+        addNeeded("ROOT", root_, MARKED_ROOT);
+    }
+
+    ExitStatus run() const override {
+        std::cout << kit::descriptionText(kit::inspectUnit(root_));
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string root_;
+};
+
+class SetCommand : public Command {
+public:
+    explicit SetCommand(CLI::App& app)
+        : Command(app, "set", "Change single values of a unit",
+                  "orvane-unit set bench param.139=12 serial=SN004217 tuning.3.qwaNRAtten=-40") {
+        addNeeded("ROOT", root_, MARKED_ROOT);
+        parser()
+            .add_option("KEY=VALUE", assignments_,
+                        "param.N, serial, slot.N, aux, tuning.BLOCK.FIELD, or tuning.BLOCK=FILE")
+            ->required();
+    }
+
+    ExitStatus run() const override {
+        kit::setValues(root_, assignments_);
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string root_;
+    std::vector<std::string> assignments_;
+};
+
+class ShowCommand : public Command {
+public:
+    explicit ShowCommand(CLI::App& app)
+        : Command(app, "show", "Print everything that a unit holds, decoded",
+                  "orvane-unit show bench --only versions") {
+        addNeeded("ROOT", root_, ANY_ROOT);
+        parser()
+            .add_option("--only", only_, "params, records, tuning, versions or files")
+            ->check(CLI::IsMember(partNames()));
+        parser().add_flag("--json", isJson_, JSON);
+    }
+
+    ExitStatus run() const override {
+        const DecodedUnit unit = decodeUnit(root_);
+        if (isJson_) {
+            std::cout << decodedUnitJson(root_, unit, only_) << '\n';
+        } else {
+            printDecodedUnit(std::cout, unit, only_);
+        }
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string root_;
+    std::string only_;
+    bool isJson_ = false;
+};
+
+void addLetters(CLI::App& parser) {
+    parser.add_flag("-a", "orvane's option -a; both, first -a, without either");
+    parser.add_flag("-i", "orvane's option -i");
 }
 
-Action addNew(CLI::App& app) {
-    auto options = std::make_shared<NewCommand>();
-    CLI::App* const command =
-        addCommand(app, "new", "Make a unit", "orvane-unit new bench --from unit.toml");
-    command->add_option("ROOT", options->root, "The folder to make, absent or empty")->required();
-    command->add_option("--from", options->description,
-                        "The unit's description in TOML; the built-in sample unit without it");
-    return [options] { return runNew(*options); };
-}
-
-Action addDescribe(CLI::App& app) {
-    auto options = std::make_shared<DescribeCommand>();
-    CLI::App* const command =
-        addCommand(app, "describe", "Print the description of a unit, which makes the same unit",
-                   "orvane-unit describe bench > unit.toml");
-    command->add_option("ROOT", options->root, ROOT_HELP)->required();
-    return [options] { return runDescribe(*options); };
-}
-
-Action addSet(CLI::App& app) {
-    auto options = std::make_shared<SetCommand>();
-    CLI::App* const command =
-        addCommand(app, "set", "Change single values of a unit",
-                   "orvane-unit set bench param.139=12 serial=SN004217 tuning.3.qwaNRAtten=-40");
-    command->add_option("ROOT", options->root, ROOT_HELP)->required();
-    command
-        ->add_option("KEY=VALUE", options->assignments,
-                     "param.N, serial, slot.N, aux, tuning.BLOCK.FIELD, or tuning.BLOCK=FILE")
-        ->required();
-    return [options] { return runSet(*options); };
-}
-
-Action addShow(CLI::App& app) {
-    auto options = std::make_shared<ShowCommand>();
-    CLI::App* const command = addCommand(app, "show", "Print everything that a unit holds, decoded",
-                                         "orvane-unit show bench --only versions");
-    command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
-        ->required();
-    command->add_option("--only", options->only, "params, records, tuning, versions or files")
-        ->check(CLI::IsMember(partNames()));
-    command->add_flag("--json", options->isJson, "Print JSON");
-    return [options] { return runShow(*options); };
-}
-
-void addLetters(CLI::App& command) {
-    command.add_flag("-a", "orvane's option -a; both, first -a, without either");
-    command.add_flag("-i", "orvane's option -i");
-}
-
-/// -a and -i in the order and as often as they were given.
-std::string givenLetters(const CLI::App& command) {
+/// orvane's own options, in the order and as often as they were given.
+std::string givenLetters(const CLI::App& parser) {
     std::string letters;
-    for (const CLI::Option* const option : command.parse_order()) {
+    for (const CLI::Option* const option : parser.parse_order()) {
         const std::string name = option->get_name();
         if (name == "-a" || name == "-i") {
             letters += name[1];
         }
     }
-    return letters;
+    return letters.empty() ? std::string{AIRPLAY_OPTION, IAP_OPTION} : letters;
 }
 
-Action addExplain(CLI::App& app) {
-    auto options = std::make_shared<ExplainCommand>();
-    CLI::App* const command =
-        addCommand(app, "explain", "Say what orvane would write, and why, without running it",
-                   "orvane-unit explain bench -a");
-    command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
-        ->required();
-    addLetters(*command);
-    command->add_flag("--all", options->showsAll, "Print orvane's own text as well");
-    CLI::Option* const json = command->add_flag("--json", options->isJson, "Print JSON");
-    command->add_flag("--content", options->hasContent, "With --json: what each file would hold")
-        ->needs(json);
-    return [options, command] {
-        options->letters = givenLetters(*command);
-        return runExplain(*options);
-    };
-}
+class ExplainCommand : public Command {
+public:
+    explicit ExplainCommand(CLI::App& app)
+        : Command(app, "explain", "Say what orvane would write, and why, without running it",
+                  "orvane-unit explain bench -a") {
+        addNeeded("ROOT", root_, ANY_ROOT);
+        addLetters(parser());
+        parser().add_flag("--all", showsAll_, "Print orvane's own text as well");
+        CLI::Option* const json = parser().add_flag("--json", isJson_, JSON);
+        parser()
+            .add_flag("--content", hasContent_, "With --json: what each file would hold")
+            ->needs(json);
+    }
 
-Action addRun(CLI::App& app) {
-    auto options = std::make_shared<RunCommand>();
-    CLI::App* const command =
-        addCommand(app, "run", "Run the unmodified orvane in a unit, and show what it changed",
-                   "orvane-unit run bench -- -a -i");
-    command->add_option("ROOT", options->root, ROOT_HELP)->required();
-    command->add_option("--orvane", options->binary,
-                        "The binary to run; by default the one beside this program, else on PATH");
-    command->add_flag("--json", options->isJson, "Print JSON");
-    command->add_flag("--brief", options->isBrief, "Only name the files that changed");
-    command->add_option("ARGUMENTS", options->arguments, "orvane's own options, after --");
-    return [options] { return runRun(*options); };
-}
+    ExitStatus run() const override {
+        const std::string letters = givenLetters(parser());
+        const Explanation explanation = explainUnit(root_, letters);
+        if (isJson_) {
+            std::cout << explanationJson(root_, letters, explanation, hasContent_) << '\n';
+        } else {
+            printExplanation(std::cout, explanation, showsAll_);
+        }
+        return isIntended(explanation) ? EXIT_AS_INTENDED : EXIT_ANSWER_IS_NO;
+    }
 
-Action addDiff(CLI::App& app) {
-    auto options = std::make_shared<DiffCommand>();
-    CLI::App* const command = addCommand(
-        app, "diff", "Print the values that differ between two units, and the lines they move",
-        "orvane-unit diff bench field");
-    command->add_option("A", options->first, "A unit's folder, or /")->required();
-    command->add_option("B", options->second, "Another unit's folder, or /")->required();
-    addLetters(*command);
-    command->add_flag("--json", options->isJson, "Print JSON");
-    return [options, command] {
-        options->letters = givenLetters(*command);
-        return runDiff(*options);
-    };
-}
+private:
+    std::string root_;
+    bool showsAll_ = false;
+    bool isJson_ = false;
+    bool hasContent_ = false;
+};
 
-Action addImpact(CLI::App& app) {
-    auto options = std::make_shared<ImpactCommand>();
-    CLI::App* const command = addCommand(
-        app, "impact", "Change every input in a copy of a unit, and say which output lines move",
-        "orvane-unit impact bench param. slot.9");
-    command->add_option("ROOT", options->root, "The unit's folder, or / for this system")
-        ->required();
-    command->add_option("KEY", options->prefixes,
-                        "Only the inputs whose key begins so; all without any");
-    command->add_flag("--json", options->isJson, "Print JSON");
-    return [options] { return runImpact(*options); };
-}
+class RunCommand : public Command {
+public:
+    explicit RunCommand(CLI::App& app)
+        : Command(app, "run", "Run the unmodified orvane in a unit, and show what it changed",
+                  "orvane-unit run bench -- -a -i") {
+        addNeeded("ROOT", root_, MARKED_ROOT);
+        addOption("--orvane", binary_, BINARY);
+        parser().add_flag("--json", isJson_, JSON);
+        parser().add_flag("--brief", isBrief_, "Only name the files that changed");
+        parser().add_option("ARGUMENTS", arguments_, "orvane's own options, after --");
+    }
 
-Action addCapture(CLI::App& app) {
-    auto options = std::make_shared<CaptureCommand>();
-    CLI::App* const command =
-        addCommand(app, "capture", "Copy the inputs of a real unit into a new one",
-                   "orvane-unit capture /mnt/field field --redact-serial");
-    command->add_option("SOURCE", options->source, "/, or where an image of a unit is mounted")
-        ->required();
-    command->add_option("ROOT", options->root, "The folder to make, absent or empty")->required();
-    command->add_flag("--redact-serial", options->redactsSerial, "Replace the serial by X");
-    return [options] { return runCapture(*options); };
-}
+    ExitStatus run() const override {
+        kit::requireKitUnit(root_);
+        const TmpTree before = readTmp(root_);
+        const kit::RunResult result = kit::runInside(root_, {findOrvane(binary_), arguments_});
+        const TmpTree after = readTmp(root_);
+        if (isJson_) {
+            std::cout << runJson(root_, result, before, after) << '\n';
+        } else {
+            std::cout << result.standardOutput;
+            std::cerr << result.standardError;
+            printTmpChanges(std::cout, before, after, isBrief_);
+        }
+        if (result.exitStatus != 0) {
+            std::cerr << "orvane-unit: orvane ended with exit status " << result.exitStatus << '\n';
+            return EXIT_ANSWER_IS_NO;
+        }
+        return EXIT_AS_INTENDED;
+    }
 
-Action addCheck(CLI::App& app) {
-    auto options = std::make_shared<CheckCommand>();
-    CLI::App* const command =
-        addCommand(app, "check", "Run orvane in every unit of a folder, and compare",
-                   "orvane-unit check cases");
-    command->add_option("FOLDER", options->folder, "A folder of folders with a unit.toml each")
-        ->required();
-    command->add_option("--orvane", options->binary,
-                        "The binary to run; by default the one beside this program, else on PATH");
-    command->add_flag("--update", options->updates, "Write what is found as the new expectations");
-    command->add_flag("--json", options->isJson, "Print JSON");
-    return [options] { return runCheck(*options); };
+private:
+    std::string root_;
+    std::string binary_;
+    std::vector<std::string> arguments_;
+    bool isBrief_ = false;
+    bool isJson_ = false;
+};
+
+class DiffCommand : public Command {
+public:
+    explicit DiffCommand(CLI::App& app)
+        : Command(app, "diff",
+                  "Print the values that differ between two units, and the lines they move",
+                  "orvane-unit diff bench field") {
+        addNeeded("A", first_, "A unit's folder, or /");
+        addNeeded("B", second_, "Another unit's folder, or /");
+        addLetters(parser());
+        parser().add_flag("--json", isJson_, JSON);
+    }
+
+    ExitStatus run() const override {
+        const std::string letters = givenLetters(parser());
+        const std::vector<ValueChange> changes = differingValues(
+            unitValues(kit::inspectInputs(first_)), unitValues(kit::inspectInputs(second_)));
+        const std::vector<Consequence> found =
+            consequences(changes, outputDifferences(explainUnit(first_, letters),
+                                                    explainUnit(second_, letters)));
+        if (isJson_) {
+            std::cout << consequencesJson(first_, second_, found) << '\n';
+        } else {
+            printConsequences(std::cout, found);
+        }
+        return found.empty() ? EXIT_AS_INTENDED : EXIT_ANSWER_IS_NO;
+    }
+
+private:
+    std::string first_;
+    std::string second_;
+    bool isJson_ = false;
+};
+
+class ImpactCommand : public Command {
+public:
+    explicit ImpactCommand(CLI::App& app)
+        : Command(app, "impact",
+                  "Change every input in a copy of a unit, and say which output lines move",
+                  "orvane-unit impact bench param. slot.9") {
+        addNeeded("ROOT", root_, ANY_ROOT);
+        parser().add_option("KEY", prefixes_,
+                            "Only the inputs whose key begins so; all without any");
+        parser().add_flag("--json", isJson_, JSON);
+    }
+
+    ExitStatus run() const override {
+        const bool showsProgress = ::isatty(STDERR_FILENO) == 1;
+        const std::vector<Impact> impacts =
+            findImpacts(root_, prefixes_, [showsProgress](std::size_t done, std::size_t all) {
+                if (showsProgress) {
+                    printProgress(std::cerr, done, all);
+                }
+            });
+        if (isJson_) {
+            std::cout << impactsJson(root_, impacts) << '\n';
+        } else {
+            printImpacts(std::cout, impacts);
+        }
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string root_;
+    std::vector<std::string> prefixes_;
+    bool isJson_ = false;
+};
+
+class CaptureCommand : public Command {
+public:
+    explicit CaptureCommand(CLI::App& app)
+        : Command(app, "capture", "Copy the inputs of a real unit into a new one",
+                  "orvane-unit capture /mnt/field field --redact-serial") {
+        addNeeded("SOURCE", source_, "/, or where an image of a unit is mounted");
+        addNeeded("ROOT", root_, NEW_ROOT);
+        parser().add_flag("--redact-serial", redactsSerial_, "Replace the serial by X");
+    }
+
+    ExitStatus run() const override {
+        kit::captureUnit(source_, root_, redactsSerial_);
+        return EXIT_AS_INTENDED;
+    }
+
+private:
+    std::string source_;
+    std::string root_;
+    bool redactsSerial_ = false;
+};
+
+class CheckCommand : public Command {
+public:
+    explicit CheckCommand(CLI::App& app)
+        : Command(app, "check", "Run orvane in every unit of a folder, and compare",
+                  "orvane-unit check cases") {
+        addNeeded("FOLDER", folder_, "A folder of folders with a unit.toml each");
+        addOption("--orvane", binary_, BINARY);
+        parser().add_flag("--update", updates_, "Write what is found as the new expectations");
+        parser().add_flag("--json", isJson_, JSON);
+    }
+
+    ExitStatus run() const override {
+        const CheckReport report = checkCases(folder_, findOrvane(binary_), updates_);
+        if (isJson_) {
+            std::cout << checkJson(folder_, report) << '\n';
+        } else {
+            printCheck(std::cout, report);
+        }
+        return std::all_of(report.cases.begin(), report.cases.end(),
+                           [](const CaseResult& result) { return result.isAsExpected(); })
+                   ? EXIT_AS_INTENDED
+                   : EXIT_ANSWER_IS_NO;
+    }
+
+private:
+    std::string folder_;
+    std::string binary_;
+    bool updates_ = false;
+    bool isJson_ = false;
+};
+
+template <class... Commands>
+std::vector<std::unique_ptr<Command>> addCommands(CLI::App& app) {
+    std::vector<std::unique_ptr<Command>> commands;
+    (commands.push_back(std::make_unique<Commands>(app)), ...);
+    return commands;
 }
 
 /// The first word must be a command or an option; the parser would only say that one is missing.
@@ -206,13 +416,9 @@ int chooseAndRun(int argc, const char* const* argv) {
     app.set_version_flag("--version", ORVANE_VERSION);
     app.footer("Exit status: 0 all as intended; 1 the answer is no: a fallback or a default stands "
                "in,\na difference, a failed check; 2 wrong use or bad input.");
-    using Add = Action (*)(CLI::App&);
-    constexpr Add COMMANDS[] = {addNew, addDescribe, addSet,    addShow,    addExplain,
-                                addRun, addDiff,     addImpact, addCapture, addCheck};
-    std::vector<Action> actions;
-    for (const Add add : COMMANDS) {
-        actions.push_back(add(app));
-    }
+    const std::vector<std::unique_ptr<Command>> commands =
+        addCommands<NewCommand, DescribeCommand, SetCommand, ShowCommand, ExplainCommand,
+                    RunCommand, DiffCommand, ImpactCommand, CaptureCommand, CheckCommand>(app);
     checkCommand(app, argc, argv);
     try {
         app.parse(argc, argv);
@@ -223,14 +429,10 @@ int chooseAndRun(int argc, const char* const* argv) {
         throw kit::KitError(std::string(error.what()) +
                             (isRun ? "; orvane's own options follow --" : ""));
     }
-    const std::vector<const CLI::App*> commands =
-        static_cast<const CLI::App&>(app).get_subcommands([](const CLI::App*) { return true; });
-    for (std::size_t i = 0; i < commands.size(); ++i) {
-        if (commands[i]->parsed()) {
-            return actions.at(i)();
-        }
-    }
-    return EXIT_BAD_INPUT; // not reached: one command is required
+    // The parser has seen to it that there is one.
+    const auto chosen = std::find_if(commands.begin(), commands.end(),
+                                     [](const auto& command) { return command->isChosen(); });
+    return (*chosen)->run();
 }
 
 /// A complaint may have several lines, one for each thing that is wrong.

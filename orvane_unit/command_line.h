@@ -3,6 +3,13 @@
 
 namespace orvane::desk {
 
+/// The exit status of every command.
+enum ExitStatus {
+    EXIT_AS_INTENDED = 0,
+    EXIT_ANSWER_IS_NO = 1, ///< a fallback or default stands in, a difference, a failed check
+    EXIT_BAD_INPUT = 2,    ///< wrong use or bad input; a line on standard error says what
+};
+
 /// Reads the command line, does what it says, and returns the exit status. What goes wrong is one
 /// complaint on standard error; nothing is thrown.
 int runCommandLine(int argc, const char* const* argv);

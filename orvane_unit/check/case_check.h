@@ -20,6 +20,8 @@ struct CaseResult {
     std::vector<std::string> differences; ///< none when all is as expected
     std::vector<std::string> surprises;   ///< where the explanation and the run do not agree
     std::set<Reason> reasons;             ///< all that its explanation gives
+
+    bool isAsExpected() const { return differences.empty() && surprises.empty(); }
 };
 
 struct CheckReport {

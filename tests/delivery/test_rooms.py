@@ -58,9 +58,9 @@ class RoomsTest(unittest.TestCase):
     def test_include_from_behind_is_seen(self) -> None:
         for path, included in (("kit/host/text.h", "kit/enter/entered_root.h"),
                                ("kit/tuning/a.cpp", "kit/description/toml_text.h"),
-                               ("kit/unit/marker.cpp", "orvane_unit/commands.h"),
+                               ("kit/unit/marker.cpp", "orvane_unit/command_line.h"),
                                ("orvane_unit/compare/text_diff.cpp", "orvane_unit/report/terminal.h"),
-                               ("orvane_unit/report/json.h", "orvane_unit/commands.h")):
+                               ("orvane_unit/report/json.h", "orvane_unit/command_line.h")):
             for line in (f'#include "{included}"', f' #  include "{included}"'):
                 with self.subTest(path=path, line=line):
                     self.assertEqual(list(included_from_behind(path, f"#pragma once\n{line}\n")), [included])

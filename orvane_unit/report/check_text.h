@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "orvane_unit/check/case_check.h"
+
+#include <iosfwd>
+
+namespace orvane::desk {
+
+/// Prints each case with what is not as expected, then how many they are and which reasons no case
+/// reaches.
+void printCheck(std::ostream& out, const CheckReport& report);
+
+} // namespace orvane::desk
