@@ -45,7 +45,7 @@ int runNew(const NewCommand& command) {
 }
 
 int runDescribe(const DescribeCommand& command) {
-    std::cout << kit::descriptionText(kit::inspectUnit(command.root));
+    std::cout << kit::descriptionText(kit::describeUnit(command.root));
     return EXIT_AS_INTENDED;
 }
 
@@ -84,8 +84,8 @@ int runExplain(const ExplainCommand& command) {
 int runDiff(const DiffCommand& command) {
     const std::string letters = lettersOrAll(command.letters);
     const std::vector<ValueChange> changes =
-        differingValues(unitValues(kit::inspectInputs(command.first)),
-                        unitValues(kit::inspectInputs(command.second)));
+        differingValues(unitValues(kit::describeInputs(command.first)),
+                        unitValues(kit::describeInputs(command.second)));
     const std::vector<OutputDifference> differences = outputDifferences(
         explainUnit(command.first, letters), explainUnit(command.second, letters));
     const std::vector<Consequence> found = consequences(changes, differences);

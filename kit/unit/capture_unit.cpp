@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/capture_unit.h"
 
+#include "kit/unit/describe_inputs.h"
 #include "kit/unit/make_unit.h"
 #include "kit/unit/redact_serial.h"
-#include "kit/unit/unit_inputs.h"
 
 #include <utility>
 
@@ -15,7 +15,7 @@ void captureUnit(const std::filesystem::path& source, const std::filesystem::pat
     if (redactsSerial) {
         redactSerial(inputs);
     }
-    makeUnit(describeInputs(std::move(inputs)), root);
+    makeUnit(descriptionOf(std::move(inputs)), root);
 }
 
 } // namespace orvane::kit

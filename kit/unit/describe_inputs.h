@@ -1,11 +1,27 @@
 // SPDX-License-Identifier: Apache-2.0
+//
+// All that a run of the tool reads in a unit, which the kit need not have made.
 #pragma once
 
 #include "kit/description/unit_description.h"
+#include "kit/host/bytes.h"
 
 #include <filesystem>
+#include <optional>
+#include <string>
 
 namespace orvane::kit {
+
+struct UnitInputs {
+    UnitDescription unit;      ///< everything but what the disk holds
+    std::optional<Bytes> disk; ///< the disk's last mebibyte, or all of a shorter one
+};
+
+/// Reads the inputs of the unit at `source`, as describeInputs says. Throws KitError.
+UnitInputs readInputs(const std::filesystem::path& source);
+
+/// The inputs as one description.
+UnitDescription descriptionOf(UnitInputs inputs);
 
 /// What a run of the tool reads in the unit at `source` ("/", or a mounted image of a unit; the kit
 /// need not have made it), as a description of a unit in which a run does the same:
@@ -18,6 +34,6 @@ namespace orvane::kit {
 /// missing. What outputs and inputs share by a link is not kept, nor the order of the version
 /// folder's listing, which is the file system's. Never writes. Throws KitError when the source
 /// can't be entered, or something in it is there and can't be read.
-UnitDescription inspectInputs(const std::filesystem::path& source);
+UnitDescription describeInputs(const std::filesystem::path& source);
 
 } // namespace orvane::kit

@@ -34,15 +34,15 @@ void findAbsent(const std::vector<std::string>& there, UnitDescription& unit) {
     }
 }
 
-class Inspector {
+class UnitReader {
 public:
-    explicit Inspector(fs::path root) : root_(std::move(root)) {}
+    explicit UnitReader(fs::path root) : root_(std::move(root)) {}
 
-    UnitDescription inspect() {
+    UnitDescription read() {
         for (pending_ = {""}; !pending_.empty();) {
             const std::string path = std::move(pending_.back());
             pending_.pop_back();
-            inspectFolder(path);
+            readFolder(path);
         }
         std::sort(there_.begin(), there_.end());
         std::sort(unit_.folders.begin(), unit_.folders.end());
@@ -52,12 +52,12 @@ public:
 
 private:
     /// `path` is a folder of the unit, empty for the top.
-    void inspectFolder(const std::string& path) {
+    void readFolder(const std::string& path) {
         const auto entries = listFolder(root_ / fs::path(path).relative_path());
         for (const fs::directory_entry& entry : entries) {
             const std::string name = entry.path().filename().string();
             if (!path.empty() || name != MARKER_NAME) {
-                inspectEntry(std::string(path).append("/").append(name), entry);
+                readEntry(std::string(path).append("/").append(name), entry);
             }
         }
         if (entries.empty() && !isStandardFolder(path)) {
@@ -65,7 +65,7 @@ private:
         }
     }
 
-    void inspectEntry(const std::string& path, const fs::directory_entry& entry) {
+    void readEntry(const std::string& path, const fs::directory_entry& entry) {
         there_.push_back(path);
         const fs::file_type kind = kindOf(entry.path());
         if (kind == fs::file_type::directory) {
@@ -73,13 +73,13 @@ private:
         } else if (kind == fs::file_type::symlink) {
             unit_.links.emplace(path, targetOf(entry.path()));
         } else if (kind == fs::file_type::regular) {
-            inspectFile(path, entry.path());
+            readFile(path, entry.path());
         } else {
             throw KitError(entry.path().string() + " is neither a file, a folder nor a link");
         }
     }
 
-    void inspectFile(const std::string& path, const fs::path& file) {
+    void readFile(const std::string& path, const fs::path& file) {
         const Descriptor descriptor = openForReading(file);
         const std::uint64_t size = sizeOf(descriptor, file);
         if (path == CONFIG_SHM_NAME && size <= LONGEST_IMAGE) {
@@ -99,9 +99,9 @@ private:
 
 } // namespace
 
-UnitDescription inspectUnit(const fs::path& root) {
+UnitDescription describeUnit(const fs::path& root) {
     requireKitUnit(root);
-    return Inspector(root).inspect();
+    return UnitReader(root).read();
 }
 
 } // namespace orvane::kit

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The way back of makeUnit: what there is, as a description. Each function gives one canonical
+// The inverse of makeUnit: what there is, as a description. Each function gives one canonical
 // description of the many that make the same.
 #pragma once
 
@@ -25,7 +25,7 @@ ImageDescription describeImage(const Bytes& image);
 /// The disk of the first `size` bytes: slots (never slot 15, which repeats slots 1 to 9), auxiliary
 /// area and tuning blocks that are not all zero, without the zeros at their ends, and as raw bytes
 /// what else is not zero. A disk shorter than the record area is raw bytes only. Holes and zeros
-/// take no time to speak of. `file` stands in the text of the KitError of a failed read.
+/// cost almost nothing. `file` stands in the text of the KitError of a failed read.
 DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem::path& file,
                              std::uint64_t size);
 DiskDescription describeDisk(const Bytes& content);
@@ -39,6 +39,6 @@ void describeFile(const Descriptor& descriptor, const std::filesystem::path& fil
 /// folders, files, contents and links. Modes, times and owners are not part of a description, nor
 /// is the kit's own mark. Reads only. Throws KitError when something can't be read, or is neither a
 /// file, a folder nor a link.
-UnitDescription inspectUnit(const std::filesystem::path& root);
+UnitDescription describeUnit(const std::filesystem::path& root);
 
 } // namespace orvane::kit

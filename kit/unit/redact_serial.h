@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "kit/unit/unit_inputs.h"
+#include "kit/unit/describe_inputs.h"
 
 namespace orvane::kit {
 

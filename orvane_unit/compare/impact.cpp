@@ -167,7 +167,7 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
                                 const Progress& progress) {
     const kit::ScratchFolder scratch;
     const fs::path copy = scratch.path() / "unit";
-    kit::makeUnit(kit::inspectInputs(root), copy);
+    kit::makeUnit(kit::describeInputs(root), copy);
     const CopiedFile image = openCopied(copy / (CONFIG_SHM_NAME + 1));
     const CopiedFile disk = openCopied(copy / (BOOT_DISK + 1));
     std::vector<Input> inputs;

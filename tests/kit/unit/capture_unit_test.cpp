@@ -62,7 +62,7 @@ TEST_F(CaptureUnitTest, UnitOfTheInputsIsMade) {
     EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "stock");
     EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.inf"), "Type=Application\n");
     EXPECT_TRUE(fs::is_directory(root() / "tmp/iap1.cfg"));
-    EXPECT_TRUE(kit::inspectUnit(root()) == kit::inspectInputs(source()));
+    EXPECT_TRUE(kit::describeUnit(root()) == kit::describeInputs(source()));
 }
 
 TEST_F(CaptureUnitTest, CapturedUnitHasTheSameInputs) {
@@ -71,7 +71,7 @@ TEST_F(CaptureUnitTest, CapturedUnitHasTheSameInputs) {
     putDisk("SN004217");
     fs::remove(at("/tmp"));
     capture();
-    EXPECT_TRUE(kit::inspectInputs(root()) == kit::inspectInputs(source()));
+    EXPECT_TRUE(kit::describeInputs(root()) == kit::describeInputs(source()));
     EXPECT_FALSE(fs::exists(root() / "tmp"));
 }
 

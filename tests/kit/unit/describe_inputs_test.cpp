@@ -24,19 +24,19 @@ namespace fs = std::filesystem;
 using Paths = std::vector<std::string>;
 using Files = std::map<std::string, std::string>;
 
-class InspectInputsTest : public SourceUnitTest {
+class DescribeInputsTest : public SourceUnitTest {
 protected:
     /// What is found; the source is not touched.
     kit::UnitDescription found() const {
         const auto before = state();
-        kit::UnitDescription unit = kit::inspectInputs(source());
+        kit::UnitDescription unit = kit::describeInputs(source());
         EXPECT_EQ(differenceOf(before, state()), "");
         return unit;
     }
 
     std::string refusal() const {
         try {
-            kit::inspectInputs(source());
+            kit::describeInputs(source());
         } catch (const kit::KitError& error) {
             return error.what();
         }
@@ -44,7 +44,7 @@ protected:
     }
 };
 
-TEST_F(InspectInputsTest, EmptySourceLacksImageAndDisk) {
+TEST_F(DescribeInputsTest, EmptySourceLacksImageAndDisk) {
     const kit::UnitDescription unit = found();
     kit::UnitDescription expected;
     expected.absent = {IMAGE_PATH, "/dev/hd0"};
@@ -55,7 +55,7 @@ TEST_F(InspectInputsTest, EmptySourceLacksImageAndDisk) {
     EXPECT_TRUE(found() == expected);
 }
 
-TEST_F(InspectInputsTest, ImageIsTaken) {
+TEST_F(DescribeInputsTest, ImageIsTaken) {
     std::string image(181, '\0');
     image[21] = 1;
     image[180] = 'x';
@@ -68,14 +68,14 @@ TEST_F(InspectInputsTest, ImageIsTaken) {
     EXPECT_EQ(found().absent, Paths{"/dev/hd0"});
 }
 
-TEST_F(InspectInputsTest, LongImageIsAFile) {
+TEST_F(DescribeInputsTest, LongImageIsAFile) {
     put(IMAGE_PATH, "x");
     fs::resize_file(at(IMAGE_PATH), std::uint64_t{3} << 30U);
-    EXPECT_EQ(kit::inspectInputs(source()).sparseFiles.at(IMAGE_PATH),
+    EXPECT_EQ(kit::describeInputs(source()).sparseFiles.at(IMAGE_PATH),
               (kit::SparseFile{std::uint64_t{3} << 30U, {{0, "x"}}}));
 }
 
-TEST_F(InspectInputsTest, LastMebibyteOfTheDiskIsTaken) {
+TEST_F(DescribeInputsTest, LastMebibyteOfTheDiskIsTaken) {
     put("/dev/hd0", std::string(700, 'x') + std::string(129, '\0') + "SN004217" +
                         std::string(MEBIBYTE - 137, '\0'));
     kit::DiskDescription expected;
@@ -84,7 +84,7 @@ TEST_F(InspectInputsTest, LastMebibyteOfTheDiskIsTaken) {
     EXPECT_TRUE(found().disk == expected);
 }
 
-TEST_F(InspectInputsTest, ShorterDiskIsTakenWhole) {
+TEST_F(DescribeInputsTest, ShorterDiskIsTakenWhole) {
     put("/dev/hd0", std::string(1000, '\0') + "x");
     kit::DiskDescription expected;
     expected.size = 1001;
@@ -92,7 +92,7 @@ TEST_F(InspectInputsTest, ShorterDiskIsTakenWhole) {
     EXPECT_TRUE(found().disk == expected);
 }
 
-TEST_F(InspectInputsTest, VersionFilesAreThoseThatTheToolTakes) {
+TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolTakes) {
     const std::string folder = "/fs/rwdata/.Version/";
     put("/fs/rwdata/elsewhere", "Type=Application\n");
     put(folder + "a.inf", "a");
@@ -116,7 +116,7 @@ TEST_F(InspectInputsTest, VersionFilesAreThoseThatTheToolTakes) {
     EXPECT_TRUE(unit.links.empty());
 }
 
-TEST_F(InspectInputsTest, VersionFolderMayBeMissingOrNoFolder) {
+TEST_F(DescribeInputsTest, VersionFolderMayBeMissingOrNoFolder) {
     fs::remove_all(at("/fs/rwdata/.Version"));
     EXPECT_TRUE(found().files.empty());
     put("/fs/rwdata/.Version", "no folder");
@@ -129,7 +129,7 @@ const std::string PRODUCT_FILES[] = {
     "/fs/mp/etc/mm/iap2_static.cfg",     "/fs/mp/etc/mm/iap2.cfg",
     "/fs/mp/etc/mm/iap1_static.cfg",     "/fs/mp/etc/mm/iap1.cfg"};
 
-TEST_F(InspectInputsTest, TemplatesAndStockFilesAreTakenAndNoOthers) {
+TEST_F(DescribeInputsTest, TemplatesAndStockFilesAreTakenAndNoOthers) {
     Files expected;
     for (const std::string& path : PRODUCT_FILES) {
         put(path, "content of " + path + std::string("\0\xFF", 2));
@@ -140,7 +140,7 @@ TEST_F(InspectInputsTest, TemplatesAndStockFilesAreTakenAndNoOthers) {
     EXPECT_EQ(found().files, expected);
 }
 
-TEST_F(InspectInputsTest, FolderInTheirPlaceIsAFolder) {
+TEST_F(DescribeInputsTest, FolderInTheirPlaceIsAFolder) {
     Paths expected = {"/dev/hd0", IMAGE_PATH};
     putFolder("/dev/hd0");
     putFolder(std::string(IMAGE_PATH) + "/below");
@@ -154,7 +154,7 @@ TEST_F(InspectInputsTest, FolderInTheirPlaceIsAFolder) {
     EXPECT_TRUE(unit.absent.empty());
 }
 
-TEST_F(InspectInputsTest, LinksAreFollowedInsideTheSource) {
+TEST_F(DescribeInputsTest, LinksAreFollowedInsideTheSource) {
     put("/kept", "inside");
     put("/image", std::string(5, 'x'));
     put("/dev/disk0", "disk");
@@ -170,7 +170,7 @@ TEST_F(InspectInputsTest, LinksAreFollowedInsideTheSource) {
     EXPECT_EQ(unit.folders, Paths{"/fs/mp/etc/mm/iap1.cfg"});
 }
 
-TEST_F(InspectInputsTest, OutputsAreLeftOutButForThoseThatCannotBeWritten) {
+TEST_F(DescribeInputsTest, OutputsAreLeftOutButForThoseThatCannotBeWritten) {
     put("/tmp/airplay.conf", "left by a run");
     putFolder("/tmp/iap2_device.cfg");
     putLink("/tmp/iap2.cfg", "/none/at/all");
@@ -183,7 +183,7 @@ TEST_F(InspectInputsTest, OutputsAreLeftOutButForThoseThatCannotBeWritten) {
     EXPECT_TRUE(unit.files.empty());
 }
 
-TEST_F(InspectInputsTest, OutputFolderThatIsNoneIsAbsent) {
+TEST_F(DescribeInputsTest, OutputFolderThatIsNoneIsAbsent) {
     fs::remove(at("/tmp"));
     EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0", "/tmp"}));
     put("/tmp", "no folder");
@@ -196,8 +196,8 @@ TEST_F(InspectInputsTest, OutputFolderThatIsNoneIsAbsent) {
     EXPECT_EQ(found().folders, Paths{"/tmp/iap1.cfg"});
 }
 
-TEST_F(InspectInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
-    kit::inspectInputs(source()); // permissions hold for the last user namespace that is entered
+TEST_F(DescribeInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
+    kit::describeInputs(source()); // permissions hold for the last user namespace that is entered
     for (const std::string& path :
          {std::string("/fs/mp/etc/airplay.conf"), std::string(IMAGE_PATH), std::string("/dev/hd0"),
           std::string("/fs/rwdata/.Version/a.inf")}) {
@@ -213,27 +213,27 @@ TEST_F(InspectInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
     }
 }
 
-TEST_F(InspectInputsTest, WhatIsNeitherFileNorFolderIsRefusedByName) {
+TEST_F(DescribeInputsTest, WhatIsNeitherFileNorFolderIsRefusedByName) {
     ASSERT_EQ(::mkfifo(at("/fs/mp/etc/airplay.conf").c_str(), 0600), 0);
     EXPECT_EQ(refusal(), "/fs/mp/etc/airplay.conf is neither a file nor a folder");
 }
 
-TEST_F(InspectInputsTest, SourceThatIsNoFolderIsRefused) {
+TEST_F(DescribeInputsTest, SourceThatIsNoFolderIsRefused) {
     fs::remove_all(source());
     try {
-        kit::inspectInputs(source());
+        kit::describeInputs(source());
         ADD_FAILURE() << "found";
     } catch (const kit::KitError& error) {
         EXPECT_EQ(error.what(), source().string() + " is not a folder");
     }
 }
 
-TEST_F(InspectInputsTest, PresentRootIsASourceLikeAnyOther) {
+TEST_F(DescribeInputsTest, PresentRootIsASourceLikeAnyOther) {
     put(IMAGE_PATH, std::string(179, 'i'));
     put("/fs/mp/etc/airplay.conf", "stock");
     const kit::UnitDescription fromOutside = found();
     const kit::EnteredRoot entered(source());
-    EXPECT_TRUE(kit::inspectInputs("/") == fromOutside);
+    EXPECT_TRUE(kit::describeInputs("/") == fromOutside);
 }
 
 } // namespace

@@ -26,20 +26,20 @@ namespace fs = std::filesystem;
 
 using Paths = std::vector<std::string>;
 
-class InspectUnitTest : public ::testing::Test {
+class DescribeUnitTest : public ::testing::Test {
 protected:
     fs::path root() const { return folder_.path() / "unit"; }
     fs::path other() const { return folder_.path() / "other"; }
 
     /// What is found in a unit made of `unit`.
-    kit::UnitDescription inspected(const kit::UnitDescription& unit) const {
+    kit::UnitDescription described(const kit::UnitDescription& unit) const {
         kit::makeUnit(unit, root());
-        return kit::inspectUnit(root());
+        return kit::describeUnit(root());
     }
 
     std::string refusal() const {
         try {
-            kit::inspectUnit(root());
+            kit::describeUnit(root());
         } catch (const kit::KitError& error) {
             return error.what();
         }
@@ -50,11 +50,11 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(InspectUnitTest, UnitOfNothingIsFoundAsThat) {
-    EXPECT_TRUE(inspected({}) == kit::UnitDescription());
+TEST_F(DescribeUnitTest, UnitOfNothingIsFoundAsThat) {
+    EXPECT_TRUE(described({}) == kit::UnitDescription());
 }
 
-TEST_F(InspectUnitTest, EachKindOfEntryIsFound) {
+TEST_F(DescribeUnitTest, EachKindOfEntryIsFound) {
     kit::UnitDescription unit;
     unit.image.params[22] = 1;
     unit.disk.slots[9] = "SN004217";
@@ -62,67 +62,67 @@ TEST_F(InspectUnitTest, EachKindOfEntryIsFound) {
     unit.sparseFiles = {{"/long", {4096, {}}}, {"/longer", {100000, {{99999, "e"}}}}};
     unit.links = {{"/tmp/link", "nowhere"}, {"/dev/loop", "loop"}};
     unit.folders = {"/a/b/c", "/fs/mp/etc/mm/iap2.cfg", "/tmp/folder"};
-    EXPECT_TRUE(inspected(unit) == unit);
+    EXPECT_TRUE(described(unit) == unit);
 }
 
-TEST_F(InspectUnitTest, WhatIsMissingIsAbsentByItsTopmostPath) {
+TEST_F(DescribeUnitTest, WhatIsMissingIsAbsentByItsTopmostPath) {
     kit::UnitDescription unit;
     unit.absent = {"/dev/hd0", "/fs/mp", "/fs/tmpfs", "/tmp"};
-    EXPECT_EQ(inspected(unit).absent, unit.absent);
+    EXPECT_EQ(described(unit).absent, unit.absent);
     fs::remove_all(root() / "fs");
-    EXPECT_EQ(kit::inspectUnit(root()).absent, (Paths{"/dev/hd0", "/fs", "/tmp"}));
+    EXPECT_EQ(kit::describeUnit(root()).absent, (Paths{"/dev/hd0", "/fs", "/tmp"}));
     fs::remove_all(root() / "dev");
-    EXPECT_EQ(kit::inspectUnit(root()).absent, (Paths{"/dev", "/fs", "/tmp"}));
+    EXPECT_EQ(kit::describeUnit(root()).absent, (Paths{"/dev", "/fs", "/tmp"}));
 }
 
-TEST_F(InspectUnitTest, WhatGaveWayIsNotAbsent) {
+TEST_F(DescribeUnitTest, WhatGaveWayIsNotAbsent) {
     kit::UnitDescription unit;
     unit.links = {{"/fs/mp", "x"}, {"/dev/hd0", "disk0"}};
     unit.files = {{"/tmp", "no folder"}};
     unit.folders = {IMAGE_PATH};
-    EXPECT_TRUE(inspected(unit) == unit);
+    EXPECT_TRUE(described(unit) == unit);
 }
 
-TEST_F(InspectUnitTest, LongImageIsDescribedAsAFile) {
+TEST_F(DescribeUnitTest, LongImageIsDescribedAsAFile) {
     kit::makeUnit({}, root());
     fs::resize_file(root() / std::string(IMAGE_PATH).substr(1), std::uint64_t{5} << 30U);
-    const kit::UnitDescription unit = kit::inspectUnit(root());
+    const kit::UnitDescription unit = kit::describeUnit(root());
     EXPECT_EQ(unit.sparseFiles.at(IMAGE_PATH), (kit::SparseFile{std::uint64_t{5} << 30U, {}}));
     kit::makeUnit(unit, other());
     EXPECT_EQ(fs::file_size(other() / std::string(IMAGE_PATH).substr(1)), std::uint64_t{5} << 30U);
 }
 
-TEST_F(InspectUnitTest, LongDiskTakesNoTime) {
+TEST_F(DescribeUnitTest, LongDiskTakesNoTime) {
     kit::UnitDescription unit;
     unit.disk.size = std::uint64_t{1} << 40U;
     unit.disk.slots[9] = "SN004217";
     unit.disk.bytes[5] = "x";
-    EXPECT_TRUE(inspected(unit) == unit);
+    EXPECT_TRUE(described(unit) == unit);
 }
 
-TEST_F(InspectUnitTest, MarkIsNoPartOfIt) {
+TEST_F(DescribeUnitTest, MarkIsNoPartOfIt) {
     kit::makeUnit({}, root());
     writeFile(root() / "tmp/.orvane-unit", "a file like any other");
-    const kit::UnitDescription unit = kit::inspectUnit(root());
+    const kit::UnitDescription unit = kit::describeUnit(root());
     EXPECT_EQ(unit.files,
               (std::map<std::string, std::string>{{"/tmp/.orvane-unit", "a file like any other"}}));
 }
 
-TEST_F(InspectUnitTest, WhatIsNoUnitIsRefused) {
+TEST_F(DescribeUnitTest, WhatIsNoUnitIsRefused) {
     EXPECT_EQ(refusal(), root().string() + " is not a folder");
     fs::create_directories(root() / "fs");
     EXPECT_EQ(refusal(), root().string() +
                              " is not a unit that orvane-unit made: it has no file .orvane-unit");
 }
 
-TEST_F(InspectUnitTest, WhatCannotBeDescribedIsRefusedByName) {
+TEST_F(DescribeUnitTest, WhatCannotBeDescribedIsRefusedByName) {
     kit::makeUnit({}, root());
     const fs::path pipe = root() / "tmp/pipe";
     ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
     EXPECT_EQ(refusal(), pipe.string() + " is neither a file, a folder nor a link");
 }
 
-TEST_F(InspectUnitTest, WhatCannotBeReadIsRefusedByName) {
+TEST_F(DescribeUnitTest, WhatCannotBeReadIsRefusedByName) {
     kit::makeUnit({}, root());
     const fs::path locked = root() / "tmp/locked";
     for (const bool isFolder : {false, true}) {
@@ -144,16 +144,16 @@ TEST_F(InspectUnitTest, WhatCannotBeReadIsRefusedByName) {
 }
 
 /// Once more over the text, and made again: the same tree, and the same description of it.
-TEST_F(InspectUnitTest, RandomUnitsAreMadeAgainAsTheyWere) {
+TEST_F(DescribeUnitTest, RandomUnitsAreMadeAgainAsTheyWere) {
     for (std::uint32_t seed = 0; seed < 200; ++seed) {
         SCOPED_TRACE(seed);
-        const kit::UnitDescription found = inspected(RandomUnit(seed).unit());
+        const kit::UnitDescription found = described(RandomUnit(seed).unit());
         const std::string text = kit::descriptionText(found);
         const kit::UnitDescription again = kit::parseDescription(text, "unit.toml");
         ASSERT_TRUE(again == found);
         kit::makeUnit(again, other());
         ASSERT_EQ(differenceOf(treeOf(root()), treeOf(other())), "");
-        ASSERT_TRUE(kit::inspectUnit(other()) == found);
+        ASSERT_TRUE(kit::describeUnit(other()) == found);
         fs::remove_all(root());
         fs::remove_all(other());
     }

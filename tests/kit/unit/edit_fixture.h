@@ -47,7 +47,7 @@ protected:
         kit::setValues(root(), assignments);
     }
 
-    kit::UnitDescription found() const { return kit::inspectUnit(root()); }
+    kit::UnitDescription found() const { return kit::describeUnit(root()); }
 
     /// What an assignment is refused with, all of the unit untouched.
     std::string refusalOf(const std::vector<std::string>& assignments) const {

@@ -41,7 +41,7 @@ TEST(ImpactTest, SampleUnitMovesByFourParametersTheSerialAndTwoBlocks) {
     const TemporaryFolder folder;
     const std::filesystem::path root = folder.path() / "unit";
     kit::makeUnit(kit::parseDescription(kit::sampleDescriptionText(), "sample"), root);
-    const kit::UnitDescription before = kit::inspectUnit(root);
+    const kit::UnitDescription before = kit::describeUnit(root);
     // All of them take long where everything is watched; the guide shows a run of all.
     const std::map<std::string, Impact> impacts =
         impactsOf(root, {"param.22", "param.36", "param.5", "param.134", "param.139", "param.140",
@@ -64,7 +64,7 @@ TEST(ImpactTest, SampleUnitMovesByFourParametersTheSerialAndTwoBlocks) {
     EXPECT_EQ(
         impacts.at("param.134").lines,
         (Lines{"/tmp/airplay.conf:20", "/tmp/speechrec_FFFF.txt", "/tmp/telephony_FFFF.txt"}));
-    EXPECT_EQ(kit::inspectUnit(root), before);
+    EXPECT_EQ(kit::describeUnit(root), before);
 }
 
 TEST(ImpactTest, BytesBehindTheSerialsEndAndUnaskedBlocksMoveNothing) {

@@ -33,8 +33,8 @@ std::map<std::string, Consequence> consequencesOf(
     });
     std::map<std::string, Consequence> found;
     for (const Consequence& consequence : desk::consequences(
-             desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
-                                   desk::unitValues(kit::inspectInputs(second.root()))),
+             desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
+                                   desk::unitValues(kit::describeInputs(second.root()))),
              desk::outputDifferences(desk::explainUnit(first.root(), "ai"),
                                      desk::explainUnit(second.root(), "ai")))) {
         found[keyText(consequence.change.key)] = consequence;

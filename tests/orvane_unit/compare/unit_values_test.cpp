@@ -30,8 +30,8 @@ Changes changesOf(const std::function<void(UnitDescription&)>& change) {
     const DescribedUnit second(change);
     Changes changes;
     for (const ValueChange& value :
-         desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
-                               desk::unitValues(kit::inspectInputs(second.root())))) {
+         desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
+                               desk::unitValues(kit::describeInputs(second.root())))) {
         changes[keyText(value.key)] = {value.before, value.after};
     }
     return changes;
@@ -130,8 +130,8 @@ TEST(UnitValuesTest, LinesOfNoValueComeLast) {
         unit.image.params[50] = 1;
     });
     const std::vector<desk::Consequence> found = desk::consequences(
-        desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
-                              desk::unitValues(kit::inspectInputs(second.root()))),
+        desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
+                              desk::unitValues(kit::describeInputs(second.root()))),
         desk::outputDifferences(desk::explainUnit(first.root(), "i"),
                                 desk::explainUnit(second.root(), "i")));
     ASSERT_EQ(found.size(), 2U);

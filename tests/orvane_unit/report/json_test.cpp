@@ -89,8 +89,8 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
         parsed(desk::consequencesJson(
                    "A", "B",
                    desk::consequences(
-                       desk::differingValues(desk::unitValues(kit::inspectInputs(first.root())),
-                                             desk::unitValues(kit::inspectInputs(second.root()))),
+                       desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
+                                             desk::unitValues(kit::describeInputs(second.root()))),
                        desk::outputDifferences(desk::explainUnit(first.root(), "a"),
                                                desk::explainUnit(second.root(), "a")))),
                "diff");
