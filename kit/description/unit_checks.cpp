@@ -4,6 +4,8 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "kit/description/unit_layout.h"
+#include "kit/description/value_key.h"
+#include "kit/description/value_places.h"
 #include "kit/host/kit_error.h"
 #include "kit/tuning/tuning_encode.h"
 #include "tuning/dps_block.h"
@@ -28,7 +30,7 @@ void checkLength(const std::string& what, const Bytes& bytes, std::uint32_t size
 
 void checkParam(std::uint16_t number, std::int64_t value) {
     ParamInfo info{};
-    const std::string name = "parameter " + std::to_string(number);
+    const std::string name = valueName(paramKey(number));
     if (describeParam(number, info) != 0) {
         throw KitError("there is no " + name + ": they are 1 to " + std::to_string(PARAM_COUNT));
     }
@@ -39,24 +41,21 @@ void checkParam(std::uint16_t number, std::int64_t value) {
 }
 
 void checkSlot(std::uint32_t slot, const Bytes& bytes) {
-    std::uint32_t size = 0;
-    std::uint64_t offset = NO_SLOT_OFFSET;
-    recordSlotLayout(slot, size, offset);
-    const std::string name = "slot " + std::to_string(slot);
-    if (offset == NO_SLOT_OFFSET) {
+    const std::string name = valueName(slotKey(slot));
+    if (slot >= RECORD_SLOT_COUNT) {
         throw KitError("there is no " + name + ": they are 0 to " +
                        std::to_string(RECORD_SLOT_COUNT - 1));
     }
-    checkLength(name, bytes, size);
+    checkLength(name, bytes, slotPlace(slot).size);
 }
 
 void checkAux(const Bytes& bytes) {
-    checkLength("the auxiliary area", bytes, AUX_AREA_SIZE);
+    checkLength(valueName(auxKey()), bytes, AUX_AREA_SIZE);
 }
 
 void checkTuning(std::uint32_t id, const TuningDescription& block) {
     if (id >= DPS_BLOCK_COUNT) {
-        throw KitError("there is no tuning block " + std::to_string(id) + ": they are 0 to " +
+        throw KitError("there is no " + valueName(tuningBlockKey(id)) + ": they are 0 to " +
                        std::to_string(DPS_BLOCK_COUNT - 1));
     }
     encodeTuningBlock(block); // only for its refusals
@@ -73,7 +72,7 @@ void checkUnitPath(const std::string& path) {
             path + "\"");
     }
     const std::string mark = std::string("/") + MARKER_NAME;
-    if (path == mark || path.compare(0, mark.size() + 1, mark + "/") == 0) {
+    if (isAtOrBelow(path, mark)) {
         throw KitError("a path must not be " + mark + ", which is the kit's own mark: \"" + path +
                        "\"");
     }

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/unit_layout.h"
 
-#include "config/boot_disk.h"
-#include "config/config_store.h"
+#include "main/unit_files.h"
 
 #include <algorithm>
 #include <iterator>
+#include <set>
 #include <utility>
 #include <vector>
 
@@ -13,8 +13,22 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr const char* UNIT_FOLDERS[] = {"/fs/mp/etc/mm", "/fs/rwdata/.Version", "/fs/tmpfs", "/dev",
-                                        "/tmp"};
+/// The folders that every unit has: those of all that a run opens.
+std::set<std::string> unitFolders() {
+    std::set<std::string> folders;
+    for (const char* source : VALUE_SOURCES) {
+        folders.insert(pathAbove(source));
+    }
+    for (const AccessoryFile& file : ACCESSORY_FILES) {
+        folders.insert(pathAbove(file.templateFile));
+        folders.insert(pathAbove(file.stockFile));
+        folders.insert(pathAbove(file.output));
+    }
+    for (const TuningOutput& output : TUNING_OUTPUTS) {
+        folders.insert(pathAbove(output.path));
+    }
+    return folders;
+}
 
 /// The folders above each entry, where nothing stands yet.
 void addFoldersAbove(const std::string& path, Layout& layout) {
@@ -55,7 +69,7 @@ Layout layoutOf(const UnitDescription& unit) {
     for (const auto& [path, kind] : named) {
         addFoldersAbove(path, layout);
     }
-    for (const char* folder : UNIT_FOLDERS) {
+    for (const std::string& folder : unitFolders()) {
         addUnlessTaken(folder, EntryKind::folder, layout);
     }
     addUnlessTaken(CONFIG_SHM_NAME, EntryKind::image, layout);
@@ -78,9 +92,9 @@ bool isAtOrBelow(const std::string& path, const std::string& ancestor) {
 }
 
 bool isStandardFolder(const std::string& path) {
-    return std::any_of(
-        std::begin(UNIT_FOLDERS), std::end(UNIT_FOLDERS),
-        [&ancestor = path](const std::string& folder) { return isAtOrBelow(folder, ancestor); });
+    const std::set<std::string> folders = unitFolders();
+    return std::any_of(folders.begin(), folders.end(),
+                       [&path](const std::string& folder) { return isAtOrBelow(folder, path); });
 }
 
 } // namespace orvane::kit

@@ -4,6 +4,7 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "kit/description/description_values.h"
+#include "kit/description/value_places.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 #include "kit/tuning/tuning_encode.h"
@@ -68,13 +69,6 @@ std::string partText(Part part, const ValueKey& key) {
     return {};
 }
 
-std::uint32_t sizeOfSlot(std::uint64_t slot) {
-    std::uint32_t size = 0;
-    std::uint64_t offset = 0;
-    recordSlotLayout(static_cast<std::uint32_t>(slot), size, offset);
-    return size;
-}
-
 /// Enters `text` into `key`. Throws KitError.
 void readPart(Part part, std::string_view text, ValueKey& key) {
     constexpr std::uint64_t GREATEST = std::numeric_limits<std::uint64_t>::max();
@@ -88,8 +82,9 @@ void readPart(Part part, std::string_view text, ValueKey& key) {
         key.number = keyNumber(text, {0, RECORD_SLOT_COUNT - 1}, "a slot number");
         break;
     case Part::byteOfSlot:
-        key.offset = keyNumber(text, {0, sizeOfSlot(key.number) - 1},
-                               "a byte of slot " + std::to_string(key.number));
+        key.offset =
+            keyNumber(text, {0, slotPlace(static_cast<std::uint32_t>(key.number)).size - 1},
+                      "a byte of slot " + std::to_string(key.number));
         break;
     case Part::block:
         key.number = keyNumber(text, {0, DPS_BLOCK_COUNT - 1}, "a tuning block");

@@ -5,6 +5,7 @@
 #include "config/config_store.h"
 #include "config/record_slots.h"
 #include "identity/software_version.h"
+#include "kit/description/unit_layout.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
@@ -12,11 +13,8 @@
 #include "kit/host/output_place.h"
 #include "kit/host/tree_entries.h"
 #include "kit/unit/describe_unit.h"
+#include "main/unit_files.h"
 #include "platform/shared_memory.h"
-#include "tuning/audio_profile.h"
-#include "writers/airplay_writer.h"
-#include "writers/iap_writer.h"
-#include "writers/template_merge.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -24,6 +22,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdint>
+#include <set>
 #include <system_error>
 #include <utility>
 #include <vector>
@@ -35,10 +34,6 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr int FLAGS = O_RDONLY | O_NONBLOCK | O_CLOEXEC;
-constexpr char OUTPUT_FOLDER[] = "/tmp";
-constexpr char VERSION_MARK[] = ".inf"; ///< anywhere in a name
-constexpr const AccessoryFile* ACCESSORY_FILES[] = {&AIRPLAY_FILE, &IAP2_DEVICE_FILE, &IAP2_FILE,
-                                                    &IAP1_FILE};
 
 /// Whether the last failed call was about something that is not there.
 bool isMissing() {
@@ -66,9 +61,9 @@ public:
         readImage();
         readDisk();
         readVersionFiles();
-        for (const AccessoryFile* file : ACCESSORY_FILES) {
-            readFile(file->templateFile);
-            readFile(file->stockFile);
+        for (const AccessoryFile& file : ACCESSORY_FILES) {
+            readFile(file.templateFile);
+            readFile(file.stockFile);
         }
         findOutputs();
         std::sort(unit_.folders.begin(), unit_.folders.end());
@@ -109,9 +104,9 @@ private:
             return;
         }
         for (const fs::directory_entry& entry : listFolder(VERSION_DIR)) {
-            const std::string name = entry.path().filename().string();
-            if (name.find(VERSION_MARK) != std::string::npos) {
-                readFile(VERSION_DIR + name);
+            const std::string path = VERSION_DIR + entry.path().filename().string();
+            if (isVersionFile(path)) {
+                readFile(path);
             }
         }
     }
@@ -133,24 +128,27 @@ private:
     }
 
     void findOutputs() {
-        if (!isFolder(OUTPUT_FOLDER)) {
-            unit_.absent.emplace_back(OUTPUT_FOLDER);
-            return;
+        std::set<std::string> absent;
+        for (const AccessoryFile& file : ACCESSORY_FILES) {
+            findOutput(file.output, absent);
         }
-        for (const AccessoryFile* file : ACCESSORY_FILES) {
-            findOutput(file->output);
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            findOutput(output.path, absent);
         }
-        findOutput(TELEPHONY_TUNING_FILE);
-        findOutput(SPEECHREC_TUNING_FILE);
+        unit_.absent.insert(unit_.absent.end(), absent.begin(), absent.end());
     }
 
-    void findOutput(const char* path) {
-        if (!canBeWritten(path)) {
-            unit_.folders.emplace_back(path);
+    /// Enters the output's folder into `absent` where there is none.
+    void findOutput(const std::string& path, std::set<std::string>& absent) {
+        const std::string folder = pathAbove(path);
+        if (!isFolder(folder)) {
+            absent.insert(folder);
+        } else if (!canBeWritten(path)) {
+            unit_.folders.push_back(path);
         }
     }
 
-    static bool isFolder(const char* path) {
+    static bool isFolder(const std::string& path) {
         std::error_code error;
         return fs::is_directory(path, error);
     }

@@ -20,6 +20,7 @@
 #include <functional>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -27,9 +28,6 @@
 namespace orvane::kit {
 
 namespace {
-
-constexpr std::uint32_t SLOT_OF_SLOTS = 15; ///< slots 1 to 9 once more
-constexpr std::uint32_t FIRST_SLOT_BEHIND_GAP = 10;
 
 /// A shorter file is not worth a table of its own. In bytes.
 constexpr std::uint64_t LEAST_SPARSE = 4096;
@@ -47,14 +45,12 @@ Bytes takePart(Bytes& area, std::int64_t begin, std::size_t length) {
 /// Takes the slots out of `area`, the record area.
 void takeSlots(Bytes& area, DiskDescription& disk) {
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
-        std::uint32_t size = 0;
-        std::uint64_t offset = 0;
-        recordSlotLayout(slot, size, offset);
-        if (slot == SLOT_OF_SLOTS) {
+        if (!slotsWithin(slot).empty()) {
             continue;
         }
+        const SlotPlace place = slotPlace(slot);
         const Bytes bytes =
-            withoutEndZeros(takePart(area, static_cast<std::int64_t>(offset), size));
+            withoutEndZeros(takePart(area, static_cast<std::int64_t>(place.offset), place.size));
         if (!bytes.empty()) {
             disk.slots.emplace(slot, bytes);
         }
@@ -74,18 +70,15 @@ void takeTuning(Bytes& area, DiskDescription& disk) {
     }
 }
 
-std::int64_t slotOffset(std::uint32_t slot) {
-    std::uint32_t size = 0;
-    std::uint64_t offset = 0;
-    recordSlotLayout(slot, size, offset);
-    return static_cast<std::int64_t>(offset);
-}
-
-/// Where a group of parts that were taken begins, from the area's base: what is left before and
-/// behind it must not become one run. Slots 0 to 9 stand at the base.
-std::array<std::int64_t, 5> bordersOfParts() {
-    return {0, slotOffset(FIRST_SLOT_BEHIND_GAP), RECORD_AREA_SIZE - AUX_AREA_START,
-            RECORD_AREA_SIZE - TUNING_AREA_START, RECORD_AREA_SIZE};
+/// Where parts of the area begin that are taken out of it, and its end: what is left before and
+/// behind a part must not become one run.
+std::set<std::uint64_t> bordersOfParts() {
+    std::set<std::uint64_t> borders = {RECORD_AREA_SIZE - AUX_AREA_START,
+                                       RECORD_AREA_SIZE - TUNING_AREA_START, RECORD_AREA_SIZE};
+    for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
+        borders.insert(slotPlace(slot).offset);
+    }
+    return borders;
 }
 
 /// `area` is the record area, the last part of the disk.
@@ -98,12 +91,12 @@ void describeRecordArea(Bytes area, DiskDescription& disk) {
     }
     takeTuning(area, disk);
     const std::uint64_t base = disk.size - static_cast<std::uint64_t>(RECORD_AREA_SIZE);
-    const auto borders = bordersOfParts();
-    for (std::size_t border = 1; border < borders.size(); ++border) {
-        const auto begin = static_cast<std::size_t>(borders[border - 1]);
-        const auto end = static_cast<std::size_t>(borders[border]);
+    std::size_t begin = 0;
+    for (const std::uint64_t border : bordersOfParts()) {
+        const auto end = static_cast<std::size_t>(border);
         disk.bytes.merge(
             nonZeroRuns(std::string_view(area).substr(begin, end - begin), base + begin));
+        begin = end;
     }
 }
 

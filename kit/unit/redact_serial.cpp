@@ -1,12 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/redact_serial.h"
 
-#include "config/record_slots.h"
+#include "identity/vehicle_identity.h"
 #include "kit/description/unit_description.h"
+#include "kit/description/value_key.h"
+#include "kit/description/value_places.h"
 #include "kit/host/bytes.h"
 
 #include <cstddef>
-#include <cstdint>
 #include <map>
 #include <optional>
 #include <string>
@@ -15,7 +16,6 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr std::uint32_t SERIAL_SLOT = 9;
 /// A shorter serial may stand anywhere by chance. In bytes.
 constexpr std::size_t LEAST_TOLD = 4;
 
@@ -29,15 +29,13 @@ void redact(const Bytes& serial, Bytes& bytes) {
 } // namespace
 
 void redactSerial(UnitInputs& inputs) {
-    std::uint32_t size = 0;
-    std::uint64_t offset = 0;
-    recordSlotLayout(SERIAL_SLOT, size, offset);
-    const std::uint64_t bytesBeforeEnd = static_cast<std::uint64_t>(RECORD_AREA_SIZE) - offset;
-    if (!inputs.disk || inputs.disk->size() < bytesBeforeEnd) {
+    const ValuePlace place = valuePlace(slotKey(SERIAL_RECORD_SLOT));
+    if (!inputs.disk || inputs.disk->size() < place.leastSize) {
         return;
     }
     Bytes& disk = *inputs.disk;
-    const std::size_t begin = disk.size() - static_cast<std::size_t>(bytesBeforeEnd);
+    const auto begin = static_cast<std::size_t>(place.offsetIn(disk.size()));
+    const std::size_t size = place.mask.size();
     const Bytes slot = disk.substr(begin, size);
     const Bytes serial = slot.substr(0, slot.find('\0'));
     disk.replace(begin, size, size, '\0');
