@@ -119,7 +119,7 @@ public:
     }
 
     ExitStatus run() const override {
-        std::cout << kit::descriptionText(kit::inspectUnit(root_));
+        std::cout << kit::descriptionText(kit::describeUnit(root_));
         return EXIT_AS_INTENDED;
     }
 
@@ -177,9 +177,12 @@ private:
     bool isJson_ = false;
 };
 
+const std::string AIRPLAY_FLAG = {'-', AIRPLAY_OPTION};
+const std::string IAP_FLAG = {'-', IAP_OPTION};
+
 void addLetters(CLI::App& parser) {
-    parser.add_flag("-a", "orvane's option -a; both, first -a, without either");
-    parser.add_flag("-i", "orvane's option -i");
+    parser.add_flag(AIRPLAY_FLAG, "orvane's option -a; both, first -a, without either");
+    parser.add_flag(IAP_FLAG, "orvane's option -i");
 }
 
 /// orvane's own options, in the order and as often as they were given.
@@ -187,7 +190,7 @@ std::string givenLetters(const CLI::App& parser) {
     std::string letters;
     for (const CLI::Option* const option : parser.parse_order()) {
         const std::string name = option->get_name();
-        if (name == "-a" || name == "-i") {
+        if (name == AIRPLAY_FLAG || name == IAP_FLAG) {
             letters += name[1];
         }
     }
@@ -210,7 +213,7 @@ public:
 
     ExitStatus run() const override {
         const std::string letters = givenLetters(parser());
-        const Explanation explanation = explainUnit(root_, letters);
+        const Explanation explanation = explainUnit(root_, {"-" + letters});
         if (isJson_) {
             std::cout << explanationJson(root_, letters, explanation, hasContent_) << '\n';
         } else {
@@ -280,10 +283,10 @@ public:
     ExitStatus run() const override {
         const std::string letters = givenLetters(parser());
         const std::vector<ValueChange> changes = differingValues(
-            unitValues(kit::inspectInputs(first_)), unitValues(kit::inspectInputs(second_)));
+            unitValues(kit::describeInputs(first_)), unitValues(kit::describeInputs(second_)));
         const std::vector<Consequence> found =
-            consequences(changes, outputDifferences(explainUnit(first_, letters),
-                                                    explainUnit(second_, letters)));
+            consequences(changes, outputDifferences(explainUnit(first_, {"-" + letters}),
+                                                    explainUnit(second_, {"-" + letters})));
         if (isJson_) {
             std::cout << consequencesJson(first_, second_, found) << '\n';
         } else {

@@ -171,7 +171,7 @@ CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool update
 
     CaseResult result;
     result.name = folder.filename().string();
-    const Explanation explanation = explainUnit(root, optionLetters(arguments));
+    const Explanation explanation = explainUnit(root, arguments);
     for (const Output& output : explanation) {
         result.reasons.insert(output.reasons.begin(), output.reasons.end());
         for (const Line& line : output.lines) {
@@ -191,18 +191,6 @@ CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool update
 }
 
 } // namespace
-
-std::string optionLetters(const std::vector<std::string>& arguments) {
-    std::string letters;
-    for (const std::string& argument : arguments) {
-        if (argument.size() < 2 || argument[0] != '-' || argument == "--") {
-            break;
-        }
-        std::copy_if(argument.begin() + 1, argument.end(), std::back_inserter(letters),
-                     [](char letter) { return letter == 'a' || letter == 'i'; });
-    }
-    return letters;
-}
 
 CheckReport checkCases(const fs::path& folder, const fs::path& binary, bool updates) {
     CheckReport report;

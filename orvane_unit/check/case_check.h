@@ -36,7 +36,4 @@ struct CheckReport {
 CheckReport checkCases(const std::filesystem::path& folder, const std::filesystem::path& binary,
                        bool updates);
 
-/// The option letters of a command line as getopt(3) finds them, those that count.
-std::string optionLetters(const std::vector<std::string>& arguments);
-
 } // namespace orvane::desk

@@ -14,6 +14,7 @@
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_inputs.h"
 #include "kit/unit/make_unit.h"
+#include "main/options.h"
 #include "orvane_unit/compare/output_differences.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/explain/explain.h"
@@ -181,15 +182,15 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
     }
 
     const kit::EnteredRoot entered(copy);
-    const std::string LETTERS = "ai";
-    const Explanation baseline = explain(LETTERS);
+    const std::vector<std::string> both = {std::string{'-', AIRPLAY_OPTION, IAP_OPTION}};
+    const Explanation baseline = explain(both);
     std::vector<Impact> impacts;
     for (const Input& input : inputs) {
         Impact impact{input.key, input.values.size(), 0, {}};
         for (const std::string& value : input.values) {
             input.file->write(input.offset, value);
             const std::vector<OutputDifference> differences =
-                outputDifferences(baseline, explain(LETTERS));
+                outputDifferences(baseline, explain(both));
             impact.changing += differences.empty() ? 0U : 1U;
             addLines(differences, impact);
         }

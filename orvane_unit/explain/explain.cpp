@@ -15,6 +15,9 @@
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 
+#include <unistd.h>
+
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <cstdint>
@@ -79,10 +82,14 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
     AirplayValues values;
     readVehicleValues(values);
     values.audioProfile = readAudioProfile();
+    const TuningOutputRange asked = tuningOutputsFor(values.audioProfile);
     for (const TuningOutput& tuning : TUNING_OUTPUTS) {
-        outputs.push_back(asksForTuning(values.audioProfile)
-                              ? generatedTuning(files, tuning)
-                              : tuningNotAsked(tuning, values.audioProfile));
+        const bool isAsked =
+            std::any_of(asked.begin(), asked.end(), [&tuning](const TuningOutput& other) {
+                return other.blockId == tuning.blockId;
+            });
+        outputs.push_back(isAsked ? generatedTuning(files, tuning)
+                                  : tuningNotAsked(tuning, values.audioProfile));
     }
     const Image image = readImage();
     const std::vector<MergedValue<AirplayValues>> sources = {
@@ -128,13 +135,32 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
     }
 }
 
+/// The writers that a command line asks for, in their order, by the product's own reading of it.
+/// What that says to standard error is left out.
+std::vector<Writer> writersOf(const std::vector<std::string>& arguments) {
+    std::vector<std::string> words = {"orvane"};
+    words.insert(words.end(), arguments.begin(), arguments.end());
+    std::vector<char*> argv;
+    for (std::string& word : words) {
+        argv.push_back(word.data());
+    }
+    argv.push_back(nullptr);
+    const int diagnostics = std::exchange(::opterr, 0);
+    ::optind = 0; // forgets the words of an earlier call, too; 1 would not
+    std::vector<Writer> writers;
+    while (const Writer writer = nextWriter(static_cast<int>(words.size()), argv.data())) {
+        writers.push_back(writer);
+    }
+    ::opterr = diagnostics;
+    return writers;
+}
+
 } // namespace
 
-Explanation explain(const std::string& letters) {
+Explanation explain(const std::vector<std::string>& arguments) {
     Explanation outputs;
     PlannedFiles files;
-    for (const char letter : letters) {
-        const Writer writer = writerOf(letter);
+    for (const Writer writer : writersOf(arguments)) {
         if (writer == updateAirplayConfigFile) {
             explainAirplay(files, outputs);
         } else if (writer == updateIapConfigFiles) {
@@ -148,9 +174,10 @@ Explanation explain(const std::string& letters) {
     return outputs;
 }
 
-Explanation explainUnit(const std::filesystem::path& root, const std::string& letters) {
+Explanation explainUnit(const std::filesystem::path& root,
+                        const std::vector<std::string>& arguments) {
     const kit::EnteredRoot entered(root);
-    return explain(letters);
+    return explain(arguments);
 }
 
 } // namespace orvane::desk

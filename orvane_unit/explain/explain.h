@@ -8,15 +8,16 @@
 
 #include <filesystem>
 #include <string>
+#include <vector>
 
 namespace orvane::desk {
 
-/// Explains a run with the option letters `letters` ("a", "i", each as often as wanted) in the unit
-/// that this process has as its root.
-Explanation explain(const std::string& letters);
+/// Explains a run with the command line `arguments` in the unit that this process has as its root.
+Explanation explain(const std::vector<std::string>& arguments);
 
 /// The same for the unit at `root`, "/" for the system itself. Throws kit::KitError when it can't
 /// be entered.
-Explanation explainUnit(const std::filesystem::path& root, const std::string& letters);
+Explanation explainUnit(const std::filesystem::path& root,
+                        const std::vector<std::string>& arguments);
 
 } // namespace orvane::desk

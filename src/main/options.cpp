@@ -22,20 +22,23 @@ void run(Writer writer) {
 
 } // namespace
 
-Writer writerOf(int letter) {
-    if (letter == AIRPLAY_OPTION) {
-        return updateAirplayConfigFile;
-    }
-    return letter == IAP_OPTION ? updateIapConfigFiles : nullptr;
-}
-
-int runOptions(int argc, char* const argv[]) {
+Writer nextWriter(int argc, char* const argv[]) {
     constexpr int END_OF_OPTIONS = -1;
     int letter = END_OF_OPTIONS;
     while ((letter = platform::nextOption(argc, argv, OPTION_LETTERS)) != END_OF_OPTIONS) {
-        if (const Writer writer = writerOf(letter)) {
-            run(writer);
+        if (letter == AIRPLAY_OPTION) {
+            return updateAirplayConfigFile;
         }
+        if (letter == IAP_OPTION) {
+            return updateIapConfigFiles;
+        }
+    }
+    return nullptr;
+}
+
+int runOptions(int argc, char* const argv[]) {
+    while (const Writer writer = nextWriter(argc, argv)) {
+        run(writer);
     }
     return 0;
 }

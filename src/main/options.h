@@ -10,11 +10,11 @@ constexpr char OPTION_LETTERS[] = {IAP_OPTION, AIRPLAY_OPTION, '\0'};
 /// Writes the files of one option.
 using Writer = int (*)();
 
-/// The writer of an option letter; null for any other letter.
-Writer writerOf(int letter);
+/// The writer of the next option, in command-line order; null when there is no more. Other letters
+/// are left to the C library's own diagnostic.
+Writer nextWriter(int argc, char* const argv[]);
 
-/// Runs the writer of every option letter, in command-line order. Other letters are left to the C
-/// library's own diagnostic. Always returns 0, whatever the writers do.
+/// Runs the writer of every option. Always returns 0, whatever the writers do.
 int runOptions(int argc, char* const argv[]);
 
 } // namespace orvane

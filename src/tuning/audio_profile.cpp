@@ -5,6 +5,8 @@
 #include "config/param_access.h"
 #include "tuning/tuning_file.h"
 
+#include <iterator>
+
 namespace orvane {
 
 namespace {
@@ -33,16 +35,15 @@ std::int32_t readAudioProfile() {
     return isRead ? profile : NO_AUDIO_PROFILE;
 }
 
-bool asksForTuning(std::int32_t profile) {
-    return profile == AUDIO_PROFILE_GENERATED;
+TuningOutputRange tuningOutputsFor(std::int32_t profile) {
+    const TuningOutput* const first = std::begin(TUNING_OUTPUTS);
+    return {first, profile == AUDIO_PROFILE_GENERATED ? std::end(TUNING_OUTPUTS) : first};
 }
 
 std::int32_t getAudioProfile() {
     const std::int32_t profile = readAudioProfile();
-    if (asksForTuning(profile)) {
-        for (const TuningOutput& output : TUNING_OUTPUTS) {
-            generate(output);
-        }
+    for (const TuningOutput& output : tuningOutputsFor(profile)) {
+        generate(output);
     }
     return profile;
 }

@@ -35,11 +35,21 @@ constexpr TuningOutput TUNING_OUTPUTS[] = {
 /// on every path.
 std::int32_t readAudioProfile();
 
-/// Whether `profile`, as readAudioProfile gives it, asks for TUNING_OUTPUTS.
-bool asksForTuning(std::int32_t profile);
+/// Some of TUNING_OUTPUTS, one after the other.
+struct TuningOutputRange {
+    const TuningOutput* first;
+    const TuningOutput* last; ///< behind the last one
 
-/// readAudioProfile. Where the profile asks for them it first writes TUNING_OUTPUTS; whether they
-/// could be written does not matter to the result.
+    const TuningOutput* begin() const { return first; }
+    const TuningOutput* end() const { return last; }
+};
+
+/// What `profile`, as readAudioProfile gives it, asks for: all of TUNING_OUTPUTS for
+/// AUDIO_PROFILE_GENERATED, else none.
+TuningOutputRange tuningOutputsFor(std::int32_t profile);
+
+/// readAudioProfile. It first writes what the profile asks for; whether that could be written does
+/// not matter to the result.
 std::int32_t getAudioProfile();
 
 } // namespace orvane

@@ -164,35 +164,6 @@ TEST(CaseCheckFolderTest, GoldenUnitsAgreeWithTheirExplanations) {
     EXPECT_TRUE(report.unreached.empty()) << report.unreached.front();
 }
 
-TEST(OptionLettersTest, AreThoseThatGetoptFinds) {
-    EXPECT_EQ(desk::optionLetters({}), "");
-    EXPECT_EQ(desk::optionLetters({"-a", "-i"}), "ai");
-    EXPECT_EQ(desk::optionLetters({"-xia", "-a"}), "iaa");
-    EXPECT_EQ(desk::optionLetters({"-a", "--", "-i"}), "a");
-    EXPECT_EQ(desk::optionLetters({"word", "-a"}), "");
-    EXPECT_EQ(desk::optionLetters({"-i", "-", "-a"}), "i");
-    EXPECT_EQ(desk::optionLetters({"", "-a"}), "");
-    EXPECT_EQ(desk::optionLetters({"--a", "-i"}), "ai");
-    EXPECT_EQ(desk::optionLetters({"-a-i"}), "ai");
-}
-
-/// Each writer is seen by the output that it leaves.
-TEST(OptionLettersTest, AreThoseThatTheRealBinaryFinds) {
-    const Lines rows[] = {
-        {},      {"-xia"}, {"-a", "--", "-i"}, {"word", "-a"}, {"-i", "-"},  {"", "-a"},
-        {"--a"}, {"-a-i"}, {"-", "-ia"},       {"--", "-ia"},  {"-x", "-i"}, {"-a", "word", "-i"}};
-    for (const Lines& arguments : rows) {
-        const DescribedUnit described;
-        ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
-        const std::string letters = desk::optionLetters(arguments);
-        const auto isThere = [&described](const char* name) {
-            return fs::exists(described.root() / "tmp" / name);
-        };
-        EXPECT_EQ(isThere("airplay.conf"), letters.find('a') != std::string::npos) << letters;
-        EXPECT_EQ(isThere("iap1.cfg"), letters.find('i') != std::string::npos) << letters;
-    }
-}
-
 } // namespace
 
 } // namespace orvane::test

@@ -35,8 +35,8 @@ std::map<std::string, Consequence> consequencesOf(
     for (const Consequence& consequence : desk::consequences(
              desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
                                    desk::unitValues(kit::describeInputs(second.root()))),
-             desk::outputDifferences(desk::explainUnit(first.root(), "ai"),
-                                     desk::explainUnit(second.root(), "ai")))) {
+             desk::outputDifferences(desk::explainUnit(first.root(), {"-ai"}),
+                                     desk::explainUnit(second.root(), {"-ai"})))) {
         found[keyText(consequence.change.key)] = consequence;
     }
     return found;

@@ -132,8 +132,8 @@ TEST(UnitValuesTest, LinesOfNoValueComeLast) {
     const std::vector<desk::Consequence> found = desk::consequences(
         desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
                               desk::unitValues(kit::describeInputs(second.root()))),
-        desk::outputDifferences(desk::explainUnit(first.root(), "i"),
-                                desk::explainUnit(second.root(), "i")));
+        desk::outputDifferences(desk::explainUnit(first.root(), {"-i"}),
+                                desk::explainUnit(second.root(), {"-i"})));
     ASSERT_EQ(found.size(), 2U);
     EXPECT_TRUE(found[0].change.key == kit::paramKey(50));
     EXPECT_TRUE(found[0].outputs.empty());

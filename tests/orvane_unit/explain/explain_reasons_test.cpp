@@ -152,7 +152,7 @@ protected:
 
 TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
     const DescribedUnit described(row().change);
-    const desk::Explanation explanation = desk::explainUnit(described.root(), "ai");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
     const auto output =
         std::find_if(explanation.begin(), explanation.end(),
                      [](const desk::Output& other) { return other.path == row().output; });
@@ -165,7 +165,7 @@ TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
 
 TEST_P(ExplainReasonsTest, RunLeavesWhatIsExplained) {
     const DescribedUnit described(row().change);
-    const desk::Explanation explanation = desk::explainUnit(described.root(), "ai");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, {"-a", "-i"}}).exitStatus, 0);
     for (const desk::Output& output : explanation) {
         const fs::path file = described.root() / output.path.substr(1);

@@ -63,7 +63,7 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
 
 TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
     const DescribedUnit described;
-    const Explanation explanation = desk::explainUnit(described.root(), "ai");
+    const Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
     const Output& airplay = outputOf(explanation, AIRPLAY_FILE.output);
     EXPECT_EQ(lineOf(airplay, "param.139").text, "model = Quarion Velmira\n");
     EXPECT_EQ(placeOf(airplay, "param.139"), "parameter 139, image byte 139: 1a");
@@ -89,28 +89,59 @@ TEST(ExplainTest, VersionLineIsTheLastOneOfItsKey) {
         unit.files["/fs/rwdata/.Version/app.inf"] =
             "Version Number=1.1.1\nno line\nType=Application\nVersion Number = 2.2.2\n";
     });
-    const Explanation explanation = desk::explainUnit(described.root(), "i");
+    const Explanation explanation = desk::explainUnit(described.root(), {"-i"});
     EXPECT_EQ(placeOf(outputOf(explanation, IAP2_FILE.output), "file./fs/rwdata/.Version/app.inf"),
               "/fs/rwdata/.Version/app.inf:4: Version Number is \"2.2.2\"");
 }
 
-TEST(ExplainTest, LettersComeInTheirOrderAndAsOftenAsGiven) {
+TEST(ExplainTest, ReadsArgumentsAsTheRealBinaryDoes) {
+    using Arguments = std::vector<std::string>;
     const DescribedUnit described;
-    const auto pathsOf = [&described](const std::string& letters) {
-        std::vector<std::string> paths;
-        for (const Output& output : desk::explainUnit(described.root(), letters)) {
-            paths.push_back(output.path);
-        }
-        return paths;
+    const Arguments airplay = {TELEPHONY_TUNING_FILE, SPEECHREC_TUNING_FILE, AIRPLAY_FILE.output};
+    const Arguments iap = {IAP2_DEVICE_FILE.output, IAP2_FILE.output, IAP1_FILE.output};
+    struct Row {
+        Arguments arguments;
+        std::string expected; ///< a letter for each writer
     };
-    const std::vector<std::string> airplay = {TELEPHONY_TUNING_FILE, SPEECHREC_TUNING_FILE,
-                                              AIRPLAY_FILE.output};
-    std::vector<std::string> expected = {IAP2_DEVICE_FILE.output, IAP2_FILE.output,
-                                         IAP1_FILE.output};
-    expected.insert(expected.end(), airplay.begin(), airplay.end());
-    EXPECT_EQ(pathsOf("ia"), expected);
-    EXPECT_EQ(pathsOf("aa").size(), 6U);
-    EXPECT_TRUE(pathsOf("").empty());
+    const Row rows[] = {
+        {{}, ""},
+        {{"-a", "-i"}, "ai"},
+        {{"-xia", "-a"}, "iaa"},
+        {{"-a", "--", "-i"}, "a"},
+        {{"word", "-a"}, ""},
+        {{"-i", "-", "-a"}, "i"},
+        {{"", "-a"}, ""},
+        {{"--a", "-i"}, "ai"},
+        {{"-a-i"}, "ai"},
+        {{"-x", "-i"}, "i"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(testing::PrintToString(row.arguments));
+        Arguments expected;
+        for (const char letter : row.expected) {
+            const Arguments& paths = letter == 'a' ? airplay : iap;
+            expected.insert(expected.end(), paths.begin(), paths.end());
+        }
+        Arguments found;
+        for (const Output& output : desk::explainUnit(described.root(), row.arguments)) {
+            found.push_back(output.path);
+        }
+        EXPECT_EQ(found, expected);
+
+        const DescribedUnit fresh;
+        ASSERT_EQ(kit::runInside(fresh.root(), {ORVANE_BINARY, row.arguments}).exitStatus, 0);
+        for (const char* path : {AIRPLAY_FILE.output, IAP1_FILE.output}) {
+            const bool isExplained = std::find(found.begin(), found.end(), path) != found.end();
+            EXPECT_EQ(fs::exists(fresh.root() / (path + 1)), isExplained) << path;
+        }
+    }
+}
+
+TEST(ExplainTest, SaysNothingOfUnknownOptions) {
+    const DescribedUnit described;
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(desk::explainUnit(described.root(), {"-xi", "-a"}).size(), 6U);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
 }
 
 TEST(ExplainTest, SerialWithLineEndsAndZeroBytesIsOnePiece) {
@@ -118,7 +149,7 @@ TEST(ExplainTest, SerialWithLineEndsAndZeroBytesIsOnePiece) {
                                       std::string("AB\0CD", 5), std::string("\xff\nserial")}) {
         const DescribedUnit described(
             [&serial](UnitDescription& unit) { unit.disk.slots[9] = serial; });
-        const Explanation explanation = desk::explainUnit(described.root(), "i");
+        const Explanation explanation = desk::explainUnit(described.root(), {"-i"});
         const std::string text = serial.substr(0, serial.find('\0'));
         EXPECT_EQ(lineOf(outputOf(explanation, IAP2_FILE.output), "slot.9").text,
                   "serial=" + text + "\n");
@@ -143,7 +174,7 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
     for (const Link& link : links) {
         const DescribedUnit described(
             [&link](UnitDescription& unit) { unit.links[link.from] = link.to; });
-        const Explanation explanation = desk::explainUnit(described.root(), "ai");
+        const Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
         SCOPED_TRACE(std::string(link.from) + " -> " + link.to);
         expectRunLeaves(described, explanation, {"-a", "-i"});
     }
@@ -152,7 +183,7 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
 TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
     const DescribedUnit described(
         [](UnitDescription& unit) { unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n"; });
-    const Explanation explanation = desk::explainUnit(described.root(), "a");
+    const Explanation explanation = desk::explainUnit(described.root(), {"-a"});
     const Output& output = outputOf(explanation, TELEPHONY_TUNING_FILE);
     EXPECT_EQ(output.outcome, desk::Outcome::notAsked);
     EXPECT_EQ(output.kindAfter, desk::PathKind::file);
@@ -162,7 +193,7 @@ TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
 
 TEST(ExplainTest, MissingTmpKeepsAllOutputs) {
     const DescribedUnit described([](UnitDescription& unit) { unit.absent.push_back("/tmp"); });
-    for (const Output& output : desk::explainUnit(described.root(), "i")) {
+    for (const Output& output : desk::explainUnit(described.root(), {"-i"})) {
         EXPECT_EQ(output.outcome, desk::Outcome::kept) << output.path;
         EXPECT_EQ(output.kindAfter, desk::PathKind::nothing) << output.path;
     }
@@ -173,7 +204,7 @@ TEST(ExplainTest, UnitIsOnlyReadAndNeedsNoMark) {
     fs::remove(described.root() / kit::MARKER_NAME);
     const auto before = treeStates(described.root());
     letTimePass();
-    EXPECT_EQ(desk::explainUnit(described.root(), "aia").size(), 9U);
+    EXPECT_EQ(desk::explainUnit(described.root(), {"-aia"}).size(), 9U);
     EXPECT_EQ(treeStates(described.root()), before);
 }
 

@@ -33,7 +33,7 @@ std::size_t compareLines(const fs::path& folder) {
     const TemporaryFolder made;
     kit::makeUnit(kit::readDescription(folder / "unit.toml"), made.path() / "unit");
     const desk::Explanation explanation =
-        desk::explainUnit(made.path() / "unit", desk::optionLetters(argumentsOf(folder)));
+        desk::explainUnit(made.path() / "unit", argumentsOf(folder));
     std::size_t compared = 0;
     for (const Output& output : explanation) {
         if (output.outcome == Outcome::kept || output.outcome == Outcome::notAsked) {

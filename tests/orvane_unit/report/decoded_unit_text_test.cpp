@@ -145,7 +145,8 @@ TEST(DecodedUnitTextTest, FilesTellTheirKind) {
 }
 
 TEST(DecodedUnitTextTest, PartsArePrintedAloneOrAll) {
-    const DecodedUnit unit;
+    DecodedUnit unit;
+    unit.files = {{"/tmp/a", "output", PathKind::nothing, 0}};
     std::string all;
     for (const std::string& name : desk::partNames()) {
         EXPECT_NE(printed(unit, name), "") << name;

@@ -28,7 +28,7 @@ json parsed(const std::string& text, const char* command) {
 
 TEST(JsonTest, ExplanationHasItsLinesAndOnlyThenItsContent) {
     const DescribedUnit described([](kit::UnitDescription& unit) { unit.disk.slots[9] = "A\xff"; });
-    const desk::Explanation explanation = desk::explainUnit(described.root(), "i");
+    const desk::Explanation explanation = desk::explainUnit(described.root(), {"-i"});
     const json report = parsed(desk::explanationJson("R", "i", explanation, true), "explain");
     EXPECT_EQ(report.at("root"), "R");
     EXPECT_EQ(report.at("letters"), "i");
@@ -91,8 +91,8 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
                    desk::consequences(
                        desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
                                              desk::unitValues(kit::describeInputs(second.root()))),
-                       desk::outputDifferences(desk::explainUnit(first.root(), "a"),
-                                               desk::explainUnit(second.root(), "a")))),
+                       desk::outputDifferences(desk::explainUnit(first.root(), {"-a"}),
+                                               desk::explainUnit(second.root(), {"-a"})))),
                "diff");
     EXPECT_EQ(
         report.at("values"),

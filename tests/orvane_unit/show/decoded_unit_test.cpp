@@ -91,7 +91,7 @@ TEST(DecodedUnitTest, BlankRecordsHaveABlankCrc) {
 
 TEST(DecodedUnitTest, CrcIsThatOfSlots1To9) {
     // The complement of zlib's CRC-32 of 128 zero bytes and the serial.
-    EXPECT_EQ(desk::decodeUnit(DescribedUnit().root()).crc, 0xC44C7586U);
+    EXPECT_EQ(desk::decodeUnit(DescribedUnit().root()).records.crc, 0xC44C7586U);
 }
 
 TEST(DecodedUnitTest, CrcOfAllOnesIsAmbiguous) {
