@@ -9,7 +9,7 @@
 namespace orvane::kit {
 
 /// What the kit throws for wrong use, a bad root or a refusing system: one clear line without a
-/// newline at its end, or several, where one text has several faults.
+/// newline at its end.
 struct KitError : std::runtime_error {
     using std::runtime_error::runtime_error;
 };

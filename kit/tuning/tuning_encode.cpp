@@ -4,6 +4,7 @@
 #include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/sparse_content.h"
+#include "kit/host/text.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -27,17 +28,18 @@ std::string rangeText(const DpsField& field) {
 /// The code of `word` in the field's own table.
 std::int64_t codeOf(const DpsField& field, const std::string& word) {
     if (!hasWords(field)) {
-        throw KitError(std::string(field.key) + " takes numbers, not the word \"" + word + "\"");
+        throw KitError(std::string(field.key) + " takes numbers, not the word " +
+                       inQuotes(printable(word)));
     }
     std::string known;
-    for (const QwaWord& row : wordsOf(field)) {
+    for (const QwaWord& row : fieldWords(field)) {
         if (word == row.word) {
             return row.code;
         }
         known += std::string(row.word) + ", ";
     }
-    throw KitError(std::string(field.key) + " has no word \"" + word + "\": it takes " + known +
-                   "or a code " + rangeText(field));
+    throw KitError(std::string(field.key) + " has no word " + inQuotes(printable(word)) +
+                   ": it takes " + known + "or a code " + rangeText(field));
 }
 
 /// The value as a list of numbers, whatever it was.
@@ -74,11 +76,6 @@ void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std:
         block.bytes[at] = static_cast<std::uint8_t>(bits);
         break;
     }
-}
-
-/// The word of `field` for `code`; empty where it has none, and for a field without words.
-std::string tuningWord(const DpsField& field, std::int64_t code) {
-    return hasWords(field) ? qwaWord(wordsOf(field), static_cast<std::int32_t>(code)) : "";
 }
 
 } // namespace
@@ -144,10 +141,6 @@ std::int64_t greatestOf(const DpsField& field) {
     return 32767;
 }
 
-const std::array<QwaWord, 3>& wordsOf(const DpsField& field) {
-    return field.kind == DpsKind::switchWord ? qwaSwitchWords : qwaModeWords;
-}
-
 DpsBlock withoutFields(DpsBlock block) {
     for (const DpsField& field : DPS_LAYOUT) {
         for (std::size_t element = 0; element < field.count; ++element) {
@@ -169,7 +162,8 @@ TuningDescription describeTuningBlock(const DpsBlock& block) {
             value = std::move(numbers);
             continue;
         }
-        const std::string word = tuningWord(field, numbers.front());
+        const std::string word =
+            hasWords(field) ? fieldWord(field, static_cast<std::int32_t>(numbers.front())) : "";
         value = word.empty() ? TuningValue(numbers.front()) : TuningValue(word);
     }
     const DpsBlock rest = withoutFields(block);

@@ -6,7 +6,6 @@
 #include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
-#include <array>
 #include <cstdint>
 #include <string>
 
@@ -35,9 +34,6 @@ TuningDescription describeTuningBlock(const DpsBlock& block);
 /// The numbers that an element of `field` can hold.
 std::int64_t leastOf(const DpsField& field);
 std::int64_t greatestOf(const DpsField& field);
-
-/// The words of `field`, which is a switch or a mode.
-const std::array<QwaWord, 3>& wordsOf(const DpsField& field);
 
 /// The block with all bits that a field has set to zero: what no field reads.
 DpsBlock withoutFields(DpsBlock block);

@@ -3,137 +3,177 @@
 
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
-#include "kit/tuning/tuning_line.h"
+#include "tuning/tuning_file.h"
 
 #include <algorithm>
-#include <array>
+#include <charconv>
 #include <cstddef>
+#include <limits>
+#include <map>
+#include <optional>
+#include <set>
+#include <sstream>
 #include <string_view>
-#include <utility>
+#include <system_error>
+#include <vector>
 
 namespace orvane::kit {
 
 namespace {
 
-constexpr std::string_view HEADER_BEGIN = "; Genereated config from DPS (blockId ";
-constexpr std::string_view HEADER_END = ")";
+// A file is read leniently, and the product then writes it again: whatever the product writes
+// otherwise is wrong. So the form of a tuning file is known to the product alone.
 
-bool isHeader(std::string_view line) {
-    const std::size_t digit = HEADER_BEGIN.size();
-    return line.size() == digit + 1 + HEADER_END.size() && line.substr(0, digit) == HEADER_BEGIN &&
-           line[digit] >= '0' && line[digit] <= '9' && line.substr(digit + 1) == HEADER_END;
+/// A value that no block can hold.
+struct ValueFault {
+    std::size_t column = 0; ///< of the value, from 0
+    std::string what;
+};
+
+/// What a lenient reader makes of a file.
+struct Reading {
+    DpsBlock block{};
+    std::map<std::size_t, ValueFault> faults; ///< by line, from 0
+};
+
+/// The words of `text` between its blanks.
+std::vector<std::string> wordsIn(std::string_view text) {
+    std::istringstream in{std::string(text)};
+    std::vector<std::string> words;
+    for (std::string word; in >> word;) {
+        words.push_back(word);
+    }
+    return words;
 }
 
-class TuningReader {
-public:
-    explicit TuningReader(std::string name) : name_(std::move(name)) {}
-
-    DpsBlock read(std::string_view text, std::int32_t blockId) {
-        while (!text.empty()) {
-            ++lineNumber_;
-            const std::size_t end = std::min(text.find('\n'), text.size());
-            readLine(text.substr(0, end), end < text.size(), blockId);
-            text.remove_prefix(std::min(end + 1, text.size()));
-        }
-        ++lineNumber_;
-        if (lineNumber_ == 1) {
-            failHeader(blockId);
-        }
-        findMissing();
-        if (!faults_.empty()) {
-            throw KitError(faults_);
-        }
-        return block_;
+/// A decimal number; one that is too great for any field is the greatest.
+std::optional<std::int64_t> numberIn(const std::string& word) {
+    std::int64_t number = 0;
+    const char* const last = word.data() + word.size();
+    const auto [end, error] = std::from_chars(word.data(), last, number);
+    if (error == std::errc::invalid_argument || end != last) {
+        return std::nullopt;
     }
+    using Limits = std::numeric_limits<std::int64_t>;
+    return error == std::errc{} ? number : word.front() == '-' ? Limits::min() : Limits::max();
+}
 
-private:
-    void readLine(std::string_view line, bool hasEnd, std::int32_t blockId) {
-        const std::size_t faultsBefore = faults_.size();
-        const std::string key(line.substr(0, line.find(' ')));
-        const std::size_t carriageReturn = line.find('\r');
-        if (lineNumber_ == 1 && !isTuningField(key)) {
-            if (carriageReturn != std::string_view::npos) {
-                fail(carriageReturn, "a line ends with a line feed alone, not a carriage return");
-            } else if (!isHeader(line)) {
-                failHeader(blockId);
-            }
-        } else {
-            if (lineNumber_ == 1) {
-                failHeader(blockId);
-            }
-            readField(line, key);
-        }
-        if (!hasEnd && faults_.size() == faultsBefore) {
-            fail(line.size(), "the last line has no line end");
-        }
+/// Puts what `text` says into `field`, or the nearest that the field can hold: the product's text
+/// then differs from the file's where the fault is. Returns the fault; empty when there is none.
+std::string readValue(std::string_view text, const DpsField& field, DpsBlock& block) {
+    const bool isList = field.kind == DpsKind::list;
+    std::vector<std::int64_t> numbers;
+    std::string word; // the first that is no number
+    for (const std::string& part : wordsIn(text)) {
+        const std::optional<std::int64_t> number = numberIn(part);
+        numbers.push_back(number.value_or(0));
+        word = number || !word.empty() ? word : part;
     }
+    TuningValue value = numbers;
+    if (!word.empty()) {
+        value = word;
+    } else if (!isList) {
+        value = numbers.empty() ? 0 : numbers.front();
+    }
+    try {
+        encodeTuningField(block, field.key, value);
+        return "";
+    } catch (const KitError& error) {
+        numbers.resize(field.count);
+        for (std::int64_t& number : numbers) {
+            number = std::clamp(number, leastOf(field), greatestOf(field));
+        }
+        encodeTuningField(block, field.key,
+                          isList ? TuningValue(numbers) : TuningValue(numbers.front()));
+        return error.what();
+    }
+}
 
-    void readField(std::string_view line, std::string key) {
-        const std::size_t carriageReturn = line.find('\r');
-        if (key.find('\r') != std::string::npos) {
-            key.erase(key.find('\r'));
+/// The first line that begins with a key counts.
+Reading readLeniently(const std::string& text) {
+    Reading reading;
+    std::set<std::string> seen;
+    std::istringstream lines(text);
+    std::size_t number = 0;
+    for (std::string line; std::getline(lines, line); ++number) {
+        const std::vector<std::string> words = wordsIn(line);
+        const std::string key = words.empty() ? "" : words.front();
+        if (!isTuningField(key) || !seen.insert(key).second) {
+            continue;
         }
-        if (!isTuningField(key)) {
-            fail(0, "unknown key " + inQuotes(printable(key)));
-            return;
-        }
-        const DpsField& field = tuningField(key);
-        const auto index = static_cast<std::size_t>(&field - DPS_LAYOUT.data());
-        const bool isRepeated = isSeen_.at(index);
-        isSeen_.at(index) = true;
-        if (isRepeated) {
-            fail(0, key + " is there already");
-        } else if (index < last_) {
-            fail(0, key + " must stand before " + DPS_LAYOUT.at(last_).key);
-        } else {
-            last_ = index;
-            if (carriageReturn != std::string_view::npos) {
-                fail(carriageReturn, "a line ends with a line feed alone, not a carriage return");
-                return;
-            }
-            const LineFault fault = readTuningLine(line, field, block_);
-            if (!fault.what.empty()) {
-                fail(fault.column, fault.what);
-            }
+        const std::size_t value = line.find(key) + key.size();
+        const std::string fault =
+            readValue(std::string_view(line).substr(value), tuningField(key), reading.block);
+        if (!fault.empty()) {
+            reading.faults[number] = {value, fault};
         }
     }
+    return reading;
+}
 
-    void findMissing() {
-        std::string missing;
-        for (std::size_t index = 0; index < DPS_FIELD_COUNT; ++index) {
-            if (!isSeen_.at(index)) {
-                missing += (missing.empty() ? "" : ", ") + std::string(DPS_LAYOUT.at(index).key);
-            }
+std::string textOf(const DpsBlock& block, std::int32_t blockId) {
+    std::ostringstream text;
+    writeTuningText(text, blockId, block);
+    return text.str();
+}
+
+std::size_t sameBytes(const std::string& one, const std::string& other) {
+    return static_cast<std::size_t>(
+        std::mismatch(one.begin(), one.end(), other.begin(), other.end()).first - one.begin());
+}
+
+/// The tuning file of `block` that agrees longest with `text`: that of `blockId`, or any other.
+std::string nearestFile(const DpsBlock& block, std::int32_t blockId, const std::string& text) {
+    std::string nearest = textOf(block, blockId);
+    for (std::int32_t id = 0; isTuningBlock(id); ++id) {
+        const std::string file = textOf(block, id);
+        if (sameBytes(file, text) > sameBytes(nearest, text)) {
+            nearest = file;
         }
-        if (!missing.empty()) {
-            fail(0, "there is no line of " + missing);
-        }
     }
+    return nearest;
+}
 
-    void failHeader(std::int32_t blockId) {
-        fail(0, "the first line must be \"" + std::string(HEADER_BEGIN) + std::to_string(blockId) +
-                    std::string(HEADER_END) + "\", or that of another block from 0 to 9");
+/// The line of `text` that begins at `begin`, for an error.
+std::string shownLine(const std::string& text, std::size_t begin) {
+    const std::string line = text.substr(begin, text.find('\n', begin) - begin);
+    return line.size() <= DPS_LINE_MAX ? inQuotes(printable(line))
+                                       : inQuotes(printable(line.substr(0, DPS_LINE_MAX))) + "...";
+}
+
+/// What differs in the line at `begin`, where both texts still have the same bytes before it.
+std::string differenceAt(std::size_t begin, const std::string& written, const std::string& found) {
+    if (begin == written.size()) {
+        return "orvane writes no further line, not " + shownLine(found, begin);
     }
-
-    void fail(std::size_t column, const std::string& what) {
-        faults_ += (faults_.empty() ? "" : "\n") + name_ + ":" +
-                   std::to_string(std::max<std::size_t>(1, lineNumber_)) + ":" +
-                   std::to_string(column + 1) + ": " + what;
+    const std::string line = shownLine(written, begin);
+    if (begin == found.size()) {
+        return "the text ends here: orvane writes " + line;
     }
-
-    std::string name_;
-    std::size_t lineNumber_ = 0;
-    std::size_t last_ = 0; ///< index of the last field that stood in its place
-    std::array<bool, DPS_FIELD_COUNT> isSeen_{};
-    DpsBlock block_{};
-    std::string faults_;
-};
+    return shownLine(found, begin) == line
+               ? "the last line has no line end"
+               : "orvane writes " + line + " here, not " + shownLine(found, begin);
+}
 
 } // namespace
 
 DpsBlock parseTuningText(const std::string& text, const std::string& name, std::int32_t blockId) {
-    return TuningReader(name).read(text, blockId);
+    const Reading reading = readLeniently(text);
+    const std::string file = nearestFile(reading.block, blockId, text);
+    if (file == text) {
+        return reading.block;
+    }
+    const std::size_t place = sameBytes(text, file);
+    const auto lines = static_cast<std::size_t>(
+        std::count(text.begin(), text.begin() + static_cast<std::ptrdiff_t>(place), '\n'));
+    const std::size_t begin = lines == 0 ? 0 : text.rfind('\n', place - 1) + 1;
+    const auto fault = reading.faults.find(lines);
+    const bool isInValue = fault != reading.faults.end() && begin + fault->second.column <= place;
+    throw KitError(name + ":" + std::to_string(lines + 1) + ":" +
+                   std::to_string(place - begin + 1) + ": " +
+                   (isInValue ? fault->second.what : differenceAt(begin, file, text)));
 }
 
 } // namespace orvane::kit
