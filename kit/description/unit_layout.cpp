@@ -15,17 +15,13 @@ namespace {
 
 /// The folders that every unit has: those of all that a run opens.
 std::set<std::string> unitFolders() {
-    std::set<std::string> folders;
+    std::set<std::string> folders = {OUTPUT_FOLDER};
     for (const char* source : VALUE_SOURCES) {
         folders.insert(pathAbove(source));
     }
     for (const AccessoryFile& file : ACCESSORY_FILES) {
         folders.insert(pathAbove(file.templateFile));
         folders.insert(pathAbove(file.stockFile));
-        folders.insert(pathAbove(file.output));
-    }
-    for (const TuningOutput& output : TUNING_OUTPUTS) {
-        folders.insert(pathAbove(output.path));
     }
     return folders;
 }

@@ -5,7 +5,6 @@
 #include "config/config_store.h"
 #include "config/record_slots.h"
 #include "identity/software_version.h"
-#include "kit/description/unit_layout.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
@@ -22,7 +21,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdint>
-#include <set>
 #include <system_error>
 #include <utility>
 #include <vector>
@@ -128,27 +126,25 @@ private:
     }
 
     void findOutputs() {
-        std::set<std::string> absent;
+        if (!isFolder(OUTPUT_FOLDER)) {
+            unit_.absent.emplace_back(OUTPUT_FOLDER);
+            return;
+        }
         for (const AccessoryFile& file : ACCESSORY_FILES) {
-            findOutput(file.output, absent);
+            findOutput(file.output);
         }
         for (const TuningOutput& output : TUNING_OUTPUTS) {
-            findOutput(output.path, absent);
-        }
-        unit_.absent.insert(unit_.absent.end(), absent.begin(), absent.end());
-    }
-
-    /// Enters the output's folder into `absent` where there is none.
-    void findOutput(const std::string& path, std::set<std::string>& absent) {
-        const std::string folder = pathAbove(path);
-        if (!isFolder(folder)) {
-            absent.insert(folder);
-        } else if (!canBeWritten(path)) {
-            unit_.folders.push_back(path);
+            findOutput(output.path);
         }
     }
 
-    static bool isFolder(const std::string& path) {
+    void findOutput(const char* path) {
+        if (!canBeWritten(path)) {
+            unit_.folders.emplace_back(path);
+        }
+    }
+
+    static bool isFolder(const char* path) {
         std::error_code error;
         return fs::is_directory(path, error);
     }
