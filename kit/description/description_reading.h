@@ -9,7 +9,10 @@
 #include "kit/description/value_key.h"
 #include "kit/description/value_places.h"
 
+#include <algorithm>
+#include <cstddef>
 #include <filesystem>
+#include <iterator>
 #include <map>
 #include <string>
 
@@ -21,19 +24,42 @@ struct DescriptionReading {
     std::map<ValueKey, Place> places; ///< of the keys that a conflict may name
 };
 
-void readImage(const toml::table& table, DescriptionReading& reading);
-void readDisk(const toml::table& table, DescriptionReading& reading);
-void readFiles(const toml::table& table, DescriptionReading& reading);
-void readLinks(const toml::table& table, DescriptionReading& reading);
+/// A key that a table may have, and the reader of what stands there.
+struct TableEntry {
+    const char* key;
+    void (*read)(const toml::key& key, const toml::node& value, DescriptionReading& reading);
+};
 
-/// The paths of the list under `key`. `keyOf` gives the key of the value that is at a path.
-std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
-                                   ValueKey (*keyOf)(std::string), DescriptionReading& reading);
+/// Reads `table` by `entries`, which are all that it may have. `where` names it in an error.
+template <std::size_t COUNT>
+void readEntries(const toml::table& table, const char* where, const TableEntry (&entries)[COUNT],
+                 DescriptionReading& reading) {
+    for (const auto& [key, value] : table) {
+        const auto* const entry =
+            std::find_if(std::begin(entries), std::end(entries),
+                         [&k = key](const TableEntry& row) { return k == row.key; });
+        if (entry == std::end(entries)) {
+            std::string known;
+            for (const TableEntry& row : entries) {
+                known += (known.empty() ? "" : ", ") + std::string(row.key);
+            }
+            failUnknown(key, where, known);
+        }
+        entry->read(key, value, reading);
+    }
+}
+
+void readImage(const toml::key& key, const toml::node& node, DescriptionReading& reading);
+void readDisk(const toml::key& key, const toml::node& node, DescriptionReading& reading);
+void readFiles(const toml::key& key, const toml::node& node, DescriptionReading& reading);
+void readLinks(const toml::key& key, const toml::node& node, DescriptionReading& reading);
+void readFolders(const toml::key& key, const toml::node& node, DescriptionReading& reading);
+void readAbsent(const toml::key& key, const toml::node& node, DescriptionReading& reading);
 
 /// A table of raw bytes in hex by offset. `keyOf` gives the key of those at an offset.
 template <class Map, class KeyOf>
-void readBytes(const toml::table& table, Map& bytes, DescriptionReading& reading,
-               const KeyOf& keyOf) {
+void readBytes(const toml::table& table, Map& bytes, const KeyOf& keyOf,
+               DescriptionReading& reading) {
     constexpr std::uint64_t GREATEST =
         sizeof(typename Map::key_type) == 4 ? 0xFFFFFFFFU : 0x7FFFFFFFFFFFFFFFU;
     for (const auto& [key, value] : table) {

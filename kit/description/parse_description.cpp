@@ -23,25 +23,10 @@ namespace orvane::kit {
 
 namespace {
 
-void readTable(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
-        if (key == "folders") {
-            reading.unit.folders = readPaths(key, value, folderKey, reading);
-        } else if (key == "absent") {
-            reading.unit.absent = readPaths(key, value, absentKey, reading);
-        } else if (key == "image") {
-            readImage(tableOf(key, value), reading);
-        } else if (key == "disk") {
-            readDisk(tableOf(key, value), reading);
-        } else if (key == "files") {
-            readFiles(tableOf(key, value), reading);
-        } else if (key == "links") {
-            readLinks(tableOf(key, value), reading);
-        } else {
-            failUnknown(key, "a unit", "folders, absent, image, disk, files, links");
-        }
-    }
-}
+constexpr TableEntry UNIT_ENTRIES[] = {
+    {"folders", readFolders}, {"absent", readAbsent}, {"image", readImage},
+    {"disk", readDisk},       {"files", readFiles},   {"links", readLinks},
+};
 
 void failIfAny(const std::optional<Conflict>& conflict, const DescriptionReading& reading) {
     if (conflict) {
@@ -60,7 +45,7 @@ UnitDescription parseDescription(const std::string& text, const std::string& nam
     }
     DescriptionReading reading;
     reading.folder = std::filesystem::path(name).parent_path();
-    readTable(table, reading);
+    readEntries(table, "a unit", UNIT_ENTRIES, reading);
     failIfAny(findPathConflict(reading.unit), reading);
     failIfAny(findSizeConflict(reading.unit, layoutOf(reading.unit)), reading);
     return std::move(reading.unit);

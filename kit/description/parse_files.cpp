@@ -15,11 +15,14 @@
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>
+#include <iterator>
 #include <limits>
 #include <map>
 #include <string>
 #include <string_view>
 #include <type_traits>
+#include <utility>
+#include <variant>
 #include <vector>
 
 namespace orvane::kit {
@@ -28,8 +31,6 @@ namespace {
 
 /// Most bytes of a repeated text or of a host's file: a slip of the finger shall not fill the disk.
 constexpr std::uint64_t CONTENT_LIMIT = std::uint64_t{1} << 30;
-
-constexpr char CONTENT_FORMS[] = "hex, or repeat and count, or path, or size and bytes";
 
 /// A path of the unit, as a text or after "hex:".
 std::string unitPathOf(const Place& place, std::string_view text) {
@@ -40,104 +41,110 @@ std::string unitPathOf(const Place& place, std::string_view text) {
     });
 }
 
-Bytes repeatedContent(const toml::node& repeat, const toml::node& count, const std::string& what) {
+/// The content of one file, while its table is read.
+struct ContentReading {
+    const toml::table& table;
+    const std::string& path; ///< on the unit
+    std::string what;        ///< "the content of" that path
+    DescriptionReading& reading;
+
+    /// The value of `key`, which must be there.
+    const toml::node& valueOf(const char* key) const { return *table.get(key); }
+    std::string nameOf(const char* key) const { return key + (" in " + what); }
+};
+
+using Content = std::variant<Bytes, SparseFile>;
+
+Content hexContent(const ContentReading& content) {
+    return hexOf(content.valueOf("hex"), content.nameOf("hex"));
+}
+
+Content repeatedContent(const ContentReading& content) {
+    const toml::node& repeat = content.valueOf("repeat");
+    const std::string name = content.nameOf("repeat");
     const toml::table* hex = repeat.as_table();
     if (hex != nullptr && (hex->size() != 1 || hex->get("hex") == nullptr)) {
-        failAt(hex->source(), "repeat in " + what + " must be a text or { hex = \"...\" }");
+        failAt(hex->source(), name + " must be a text or { hex = \"...\" }");
     }
-    const Bytes part = hex != nullptr ? hexOf(*hex->get("hex"), "repeat in " + what)
-                                      : textOf(repeat, "repeat in " + what);
-    const std::uint64_t times = numberUpTo(
-        count, CONTENT_LIMIT / std::max<std::uint64_t>(1, part.size()), "count in " + what);
-    Bytes content;
-    content.reserve(part.size() * static_cast<std::size_t>(times));
+    const Bytes part = hex != nullptr ? hexOf(*hex->get("hex"), name) : textOf(repeat, name);
+    const std::uint64_t times = numberUpTo(content.valueOf("count"),
+                                           CONTENT_LIMIT / std::max<std::uint64_t>(1, part.size()),
+                                           content.nameOf("count"));
+    Bytes bytes;
+    bytes.reserve(part.size() * static_cast<std::size_t>(times));
     for (std::uint64_t i = 0; i < times && !part.empty(); ++i) {
-        content += part;
+        bytes += part;
     }
-    return content;
+    return bytes;
 }
 
-Bytes hostContent(const toml::node& node, const std::string& what,
-                  const std::filesystem::path& folder) {
-    const std::filesystem::path file = folder / textOf(node, "path in " + what);
-    return at(node.source(), what, [&file] { return readRegularFile(file, CONTENT_LIMIT); });
+Content hostContent(const ContentReading& content) {
+    const toml::node& path = content.valueOf("path");
+    const std::filesystem::path file =
+        content.reading.folder / textOf(path, content.nameOf("path"));
+    return at(path.source(), content.what,
+              [&file] { return readRegularFile(file, CONTENT_LIMIT); });
 }
 
-SparseFile sparseContent(const toml::table& table, const std::string& path,
-                         DescriptionReading& reading) {
+Content sparseContent(const ContentReading& content) {
     SparseFile file;
-    file.size = numberUpTo(*table.get("size"), std::numeric_limits<std::int64_t>::max(),
-                           "size in the content of " + path);
-    if (const toml::node* bytes = table.get("bytes")) {
+    file.size = numberUpTo(content.valueOf("size"), std::numeric_limits<std::int64_t>::max(),
+                           content.nameOf("size"));
+    if (const toml::node* bytes = content.table.get("bytes")) {
         if (!bytes->is_table()) {
-            failAt(bytes->source(), "bytes in the content of " + path +
+            failAt(bytes->source(), content.nameOf("bytes") +
                                         " must be a table of hex by offset, not " + shown(*bytes));
         }
-        readBytes(*bytes->as_table(), file.bytes, reading,
-                  [&path](std::uint64_t offset) { return fileBytesKey(path, offset); });
+        readBytes(
+            *bytes->as_table(), file.bytes,
+            [&content](std::uint64_t offset) { return fileBytesKey(content.path, offset); },
+            content.reading);
     }
     return file;
 }
 
-/// The ways to give a file's content besides a text.
-void readContentTable(const toml::key& key, const toml::table& table, const std::string& path,
-                      DescriptionReading& reading) {
-    const std::string what = "the content of " + path;
-    for (const auto& [part, value] : table) {
-        if (part != "hex" && part != "repeat" && part != "count" && part != "path" &&
-            part != "size" && part != "bytes") {
-            failUnknown(part, what, CONTENT_FORMS);
-        }
-    }
-    const toml::node* hex = table.get("hex");
-    const toml::node* repeat = table.get("repeat");
-    const toml::node* count = table.get("count");
-    const toml::node* host = table.get("path");
-    UnitDescription& unit = reading.unit;
-    if (hex != nullptr && table.size() == 1) {
-        putOnce(unit.files, key, path, hexOf(*hex, "hex in " + what), path);
-    } else if (repeat != nullptr && count != nullptr && table.size() == 2) {
-        putOnce(unit.files, key, path, repeatedContent(*repeat, *count, what), path);
-    } else if (host != nullptr && table.size() == 1) {
-        putOnce(unit.files, key, path, hostContent(*host, what, reading.folder), path);
-    } else if (table.get("size") != nullptr &&
-               table.size() == (table.get("bytes") != nullptr ? 2 : 1)) {
-        putOnce(unit.sparseFiles, key, path, sparseContent(table, path, reading), path);
-    } else {
-        failAt(table.source(), what + " must be given in one way: " + CONTENT_FORMS);
-    }
+/// A way to give a file's content besides a text: the keys that its table has, and its reader.
+struct ContentForm {
+    std::string_view keys[2]; ///< the second may be empty
+    Content (*read)(const ContentReading& content);
+};
+
+constexpr ContentForm CONTENT_FORMS[] = {
+    {{"hex", ""}, hexContent},          {{"repeat", "count"}, repeatedContent},
+    {{"path", ""}, hostContent},        {{"size", ""}, sparseContent},
+    {{"size", "bytes"}, sparseContent},
+};
+constexpr char CONTENT_FORMS_TEXT[] = "hex, or repeat and count, or path, or size and bytes";
+
+bool hasKey(const ContentForm& form, std::string_view key) {
+    return !key.empty() && (form.keys[0] == key || form.keys[1] == key);
 }
 
-} // namespace
-
-void readFiles(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
-        const std::string path = unitPathOf(key.source(), key.str());
-        if (const toml::table* content = value.as_table()) {
-            readContentTable(key, *content, path, reading);
-        } else if (value.is_string()) {
-            putOnce(reading.unit.files, key, path, value.as_string()->get(), path);
-        } else {
-            failAt(value.source(), "the content of " + path + " must be a text, or a table of " +
-                                       CONTENT_FORMS + ", not " + shown(value));
-        }
-        reading.places[fileKey(path)] = key.source();
-    }
+/// Whether `table` has the keys of `form`, and no others.
+bool isOfForm(const toml::table& table, const ContentForm& form) {
+    const std::size_t count = form.keys[1].empty() ? 1 : 2;
+    return table.size() == count &&
+           std::all_of(table.begin(), table.end(),
+                       [&form](const auto& entry) { return hasKey(form, entry.first.str()); });
 }
 
-void readLinks(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
-        const std::string path = unitPathOf(key.source(), key.str());
-        const std::string what = "the target of " + path;
-        const std::string& text = textOf(value, what);
-        const std::string target = at(value.source(), what, [&text] {
-            std::string bytes = textOrHexBytes(text);
-            checkLinkTarget(bytes);
-            return bytes;
-        });
-        putOnce(reading.unit.links, key, path, target, path);
-        reading.places[linkKey(path)] = key.source();
+Content readContentTable(const ContentReading& content) {
+    for (const auto& [key, value] : content.table) {
+        const bool isKnown =
+            std::any_of(std::begin(CONTENT_FORMS), std::end(CONTENT_FORMS),
+                        [&k = key](const ContentForm& form) { return hasKey(form, k.str()); });
+        if (!isKnown) {
+            failUnknown(key, content.what, CONTENT_FORMS_TEXT);
+        }
     }
+    const auto* const form =
+        std::find_if(std::begin(CONTENT_FORMS), std::end(CONTENT_FORMS),
+                     [&content](const ContentForm& row) { return isOfForm(content.table, row); });
+    if (form == std::end(CONTENT_FORMS)) {
+        failAt(content.table.source(),
+               content.what + " must be given in one way: " + CONTENT_FORMS_TEXT);
+    }
+    return form->read(content);
 }
 
 std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
@@ -153,6 +160,53 @@ std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
         reading.places[keyOf(paths.back())] = element.source();
     }
     return paths;
+}
+
+} // namespace
+
+void readFiles(const toml::key& tableKey, const toml::node& node, DescriptionReading& reading) {
+    UnitDescription& unit = reading.unit;
+    for (const auto& [key, value] : tableOf(tableKey, node)) {
+        const std::string path = unitPathOf(key.source(), key.str());
+        const std::string what = "the content of " + path;
+        if (const toml::table* table = value.as_table()) {
+            Content content = readContentTable({*table, path, what, reading});
+            if (auto* const sparse = std::get_if<SparseFile>(&content)) {
+                putOnce(unit.sparseFiles, key, path, std::move(*sparse), path);
+            } else {
+                putOnce(unit.files, key, path, std::get<Bytes>(std::move(content)), path);
+            }
+        } else if (value.is_string()) {
+            putOnce(unit.files, key, path, value.as_string()->get(), path);
+        } else {
+            failAt(value.source(), what + " must be a text, or a table of " + CONTENT_FORMS_TEXT +
+                                       ", not " + shown(value));
+        }
+        reading.places[fileKey(path)] = key.source();
+    }
+}
+
+void readLinks(const toml::key& tableKey, const toml::node& node, DescriptionReading& reading) {
+    for (const auto& [key, value] : tableOf(tableKey, node)) {
+        const std::string path = unitPathOf(key.source(), key.str());
+        const std::string what = "the target of " + path;
+        const std::string& text = textOf(value, what);
+        const std::string target = at(value.source(), what, [&text] {
+            std::string bytes = textOrHexBytes(text);
+            checkLinkTarget(bytes);
+            return bytes;
+        });
+        putOnce(reading.unit.links, key, path, target, path);
+        reading.places[linkKey(path)] = key.source();
+    }
+}
+
+void readFolders(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    reading.unit.folders = readPaths(key, node, folderKey, reading);
+}
+
+void readAbsent(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    reading.unit.absent = readPaths(key, node, absentKey, reading);
 }
 
 } // namespace orvane::kit

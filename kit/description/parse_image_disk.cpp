@@ -28,8 +28,8 @@ namespace orvane::kit {
 
 namespace {
 
-void readParams(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
+void readParams(const toml::key& tableKey, const toml::node& node, DescriptionReading& reading) {
+    for (const auto& [key, value] : tableOf(tableKey, node)) {
         const auto number =
             static_cast<std::uint16_t>(numberOf(key, {1, PARAM_COUNT}, "a parameter number"));
         const ValueKey param = paramKey(number);
@@ -41,8 +41,8 @@ void readParams(const toml::table& table, DescriptionReading& reading) {
     }
 }
 
-void readSlots(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
+void readSlots(const toml::key& tableKey, const toml::node& node, DescriptionReading& reading) {
+    for (const auto& [key, value] : tableOf(tableKey, node)) {
         const auto slot =
             static_cast<std::uint32_t>(numberOf(key, {0, RECORD_SLOT_COUNT - 1}, "a slot number"));
         const std::string what = valueName(slotKey(slot));
@@ -101,8 +101,8 @@ TuningDescription readTuningBlock(std::uint64_t id, const toml::table& table) {
     return block;
 }
 
-void readTuning(const toml::table& table, DescriptionReading& reading) {
-    for (const auto& [key, value] : table) {
+void readTuning(const toml::key& tableKey, const toml::node& node, DescriptionReading& reading) {
+    for (const auto& [key, value] : tableOf(tableKey, node)) {
         const std::uint64_t id = numberOf(key, {0, DPS_BLOCK_COUNT - 1}, "a tuning block");
         const ValueKey block = tuningBlockKey(id);
         putOnce(reading.unit.disk.tuning, key, id, readTuningBlock(id, tableOf(key, value)),
@@ -111,42 +111,43 @@ void readTuning(const toml::table& table, DescriptionReading& reading) {
     }
 }
 
-} // namespace
-
-void readImage(const toml::table& table, DescriptionReading& reading) {
-    ImageDescription& image = reading.unit.image;
-    for (const auto& [key, value] : table) {
-        if (key == "size") {
-            image.size = static_cast<std::uint32_t>(
-                numberUpTo(value, std::numeric_limits<std::uint32_t>::max(), "the image's size"));
-        } else if (key == "params") {
-            readParams(tableOf(key, value), reading);
-        } else if (key == "bytes") {
-            readBytes(tableOf(key, value), image.bytes, reading, imageBytesKey);
-        } else {
-            failUnknown(key, "[image]", "size, params, bytes");
-        }
-    }
+void readImageSize(const toml::key& /*key*/, const toml::node& node, DescriptionReading& reading) {
+    reading.unit.image.size = static_cast<std::uint32_t>(
+        numberUpTo(node, std::numeric_limits<std::uint32_t>::max(), "the image's size"));
 }
 
-void readDisk(const toml::table& table, DescriptionReading& reading) {
-    DiskDescription& disk = reading.unit.disk;
-    for (const auto& [key, value] : table) {
-        if (key == "size") {
-            disk.size =
-                numberUpTo(value, std::numeric_limits<std::int64_t>::max(), "the disk's size");
-        } else if (key == "slots") {
-            readSlots(tableOf(key, value), reading);
-        } else if (key == "aux") {
-            readAux(key, value, reading);
-        } else if (key == "tuning") {
-            readTuning(tableOf(key, value), reading);
-        } else if (key == "bytes") {
-            readBytes(tableOf(key, value), disk.bytes, reading, diskBytesKey);
-        } else {
-            failUnknown(key, "[disk]", "size, slots, aux, tuning, bytes");
-        }
-    }
+void readImageBytes(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    readBytes(tableOf(key, node), reading.unit.image.bytes, imageBytesKey, reading);
+}
+
+void readDiskSize(const toml::key& /*key*/, const toml::node& node, DescriptionReading& reading) {
+    reading.unit.disk.size =
+        numberUpTo(node, std::numeric_limits<std::int64_t>::max(), "the disk's size");
+}
+
+void readDiskBytes(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    readBytes(tableOf(key, node), reading.unit.disk.bytes, diskBytesKey, reading);
+}
+
+constexpr TableEntry IMAGE_ENTRIES[] = {
+    {"size", readImageSize},
+    {"params", readParams},
+    {"bytes", readImageBytes},
+};
+
+constexpr TableEntry DISK_ENTRIES[] = {
+    {"size", readDiskSize}, {"slots", readSlots},     {"aux", readAux},
+    {"tuning", readTuning}, {"bytes", readDiskBytes},
+};
+
+} // namespace
+
+void readImage(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    readEntries(tableOf(key, node), "[image]", IMAGE_ENTRIES, reading);
+}
+
+void readDisk(const toml::key& key, const toml::node& node, DescriptionReading& reading) {
+    readEntries(tableOf(key, node), "[disk]", DISK_ENTRIES, reading);
 }
 
 } // namespace orvane::kit

@@ -73,7 +73,7 @@ inline std::string shown(const toml::node& node) {
 
 /// Throws for a key that `where` does not know; `known` lists those that it does.
 [[noreturn]] inline void failUnknown(const toml::key& key, const std::string& where,
-                                     const char* known) {
+                                     const std::string& known) {
     failAt(key.source(),
            "unknown key " + inQuotes(key.str()) + " in " + where + ": it takes " + known);
 }

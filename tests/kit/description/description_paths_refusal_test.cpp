@@ -47,6 +47,12 @@ const DescriptionRefusal REFUSALS[] = {
     {"[files]\n\"/x\" = { text = \"41\" }\n",
      "unit.toml:2:10: unknown key \"text\" in the content of /x: it takes hex, or repeat and "
      "count, or path, or size and bytes"},
+    {"[files]\n\"/x\" = { \"\" = \"41\" }\n",
+     "unit.toml:2:10: unknown key \"\" in the content of /x: it takes hex, or repeat and count, or "
+     "path, or size and bytes"},
+    {"[files]\n\"/x\" = { hex = \"41\", path = \"x\" }\n",
+     "unit.toml:2:8: the content of /x must be given in one way: hex, or repeat and count, or "
+     "path, or size and bytes"},
     {"[files]\n\"/x\" = { repeat = \"41\" }\n",
      "unit.toml:2:8: the content of /x must be given in one way: hex, or repeat and count, or "
      "path, or size and bytes"},
