@@ -1,26 +1,43 @@
 # SPDX-License-Identifier: Apache-2.0
 # What the kit and the tests need besides a compiler. All of it is a Debian package and header-only
 # or built from its sources, so that it serves every compiler, standard library and processor here.
-find_path(ORVANE_CLI11_DIR CLI/CLI.hpp)
-find_path(ORVANE_TOMLPP_DIR toml++/toml.h)
-find_path(ORVANE_JSON_DIR nlohmann/json.hpp)
-find_path(ORVANE_DTL_DIR dtl/dtl.hpp)
-find_path(ORVANE_UTFCPP_DIR utf8.h PATH_SUFFIXES utf8cpp)
-find_path(ORVANE_GOOGLETEST_DIR googletest/src/gtest-all.cc PATHS /usr/src/googletest NO_CMAKE_FIND_ROOT_PATH)
-mark_as_advanced(ORVANE_CLI11_DIR ORVANE_TOMLPP_DIR ORVANE_JSON_DIR ORVANE_DTL_DIR ORVANE_UTFCPP_DIR
-  ORVANE_GOOGLETEST_DIR)
-
+# Each library is an imported target, and ORVANE_KIT_MISSING lists the packages of those that were not
+# found.
 set(ORVANE_KIT_MISSING "")
-foreach(library CLI11:libcli11-dev TOMLPP:libtomlplusplus-dev JSON:nlohmann-json3-dev DTL:libdtl-dev
-    UTFCPP:libutfcpp-dev)
-  string(REPLACE ":" ";" library ${library})
-  list(GET library 0 name)
-  list(GET library 1 package)
-  if(NOT ORVANE_${name}_DIR)
+
+# orvane_find_library(NAME DEBIAN_PACKAGE): by the files that the package has for CMake.
+macro(orvane_find_library name package)
+  find_package(${name} CONFIG QUIET)
+  mark_as_advanced(${name}_DIR)
+  if(NOT ${name}_FOUND)
     list(APPEND ORVANE_KIT_MISSING ${package})
   endif()
-endforeach()
+endmacro()
 
+# orvane_find_header(NAME DEBIAN_PACKAGE HEADER): where a package has no such files, or none that serve
+# here. Makes the target orvane::NAME.
+macro(orvane_find_header name package header)
+  find_path(ORVANE_${name}_DIR ${header} ${ARGN})
+  mark_as_advanced(ORVANE_${name}_DIR)
+  if(ORVANE_${name}_DIR)
+    add_library(orvane::${name} INTERFACE IMPORTED)
+    target_include_directories(orvane::${name} INTERFACE ${ORVANE_${name}_DIR})
+  else()
+    list(APPEND ORVANE_KIT_MISSING ${package})
+  endif()
+endmacro()
+
+orvane_find_library(CLI11 libcli11-dev)
+orvane_find_library(nlohmann_json nlohmann-json3-dev)
+orvane_find_header(dtl libdtl-dev dtl/dtl.hpp)
+# Its target is the shared library of one processor, made with one standard library.
+orvane_find_header(tomlplusplus libtomlplusplus-dev toml++/toml.h)
+# Its target, for one processor as well, names a folder that Debian does not have.
+orvane_find_header(utf8cpp libutfcpp-dev utf8.h PATH_SUFFIXES utf8cpp)
+
+# Sources, which no package file describes.
+find_path(ORVANE_GOOGLETEST_DIR googletest/src/gtest-all.cc PATHS /usr/src/googletest NO_CMAKE_FIND_ROOT_PATH)
+mark_as_advanced(ORVANE_GOOGLETEST_DIR)
 set(ORVANE_TESTS_MISSING ${ORVANE_KIT_MISSING})
 if(NOT ORVANE_KIT)
   list(APPEND ORVANE_TESTS_MISSING "the kit, which is off")
