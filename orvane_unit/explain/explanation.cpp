@@ -5,22 +5,6 @@
 
 namespace orvane::desk {
 
-const char* outcomeName(Outcome outcome) {
-    switch (outcome) {
-    case Outcome::generated:
-        return "generated";
-    case Outcome::stock:
-        return "stock";
-    case Outcome::empty:
-        return "empty";
-    case Outcome::kept:
-        return "kept";
-    case Outcome::notAsked:
-        return "not-asked";
-    }
-    return "";
-}
-
 Origin fixedText() {
     return {{Reason::fixedText}, {}, {}};
 }

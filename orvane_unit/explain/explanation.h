@@ -34,8 +34,6 @@ enum class Outcome {
     notAsked, ///< nothing asked for it: what was there is there still
 };
 
-const char* outcomeName(Outcome outcome);
-
 /// What is at a path.
 enum class PathKind { nothing, file, folder, other };
 

@@ -6,6 +6,7 @@
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/report/names.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"
 #include "tuning/dps_block.h"
@@ -26,7 +27,7 @@ using kit::ValueKey;
 void printDifference(std::ostream& out, const OutputDifference& output) {
     out << "  " << painted(Colour::place, output.path);
     if (output.before != output.after) {
-        out << ": " << outcomeName(output.before) << " -> " << outcomeName(output.after);
+        out << ": " << nameOf(output.before) << " -> " << nameOf(output.after);
     }
     out << '\n';
     for (const DifferingLine& line : output.lines) {

@@ -3,6 +3,7 @@
 
 #include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/report/names.h"
 #include "orvane_unit/report/place_text.h"
 #include "orvane_unit/report/terminal.h"
 
@@ -121,7 +122,7 @@ void printExplanation(std::ostream& out, const Explanation& explanation, bool sh
     for (const Output& output : explanation) {
         const Colour colour = isIntended(output.reasons) ? Colour::good : Colour::bad;
         out << painted(Colour::place, output.path) << ": "
-            << painted(colour, outcomeName(output.outcome)) << '\n';
+            << painted(colour, nameOf(output.outcome)) << '\n';
         for (const Reason reason : output.reasons) {
             if (reason != Reason::generated) {
                 out << "  " << painted(colour, reasonInfo(reason).code) << ": "

@@ -172,8 +172,8 @@ Json differenceJson(const OutputDifference& output) {
                          {"text", bytesJson(line.line.text)}});
     }
     return {{"path", output.path},
-            {"first", outcomeName(output.before)},
-            {"second", outcomeName(output.after)},
+            {"first", nameOf(output.before)},
+            {"second", nameOf(output.after)},
             {"lines", lines}};
 }
 
@@ -192,7 +192,7 @@ std::string explanationJson(const std::string& root, const std::string& letters,
             lines.push_back(lineJson(line));
         }
         Json entry = {{"path", output.path},
-                      {"outcome", outcomeName(output.outcome)},
+                      {"outcome", nameOf(output.outcome)},
                       {"isIntended", isIntended(output)},
                       {"reasons", codesJson(output.reasons)},
                       {"lines", lines},

@@ -15,6 +15,11 @@ struct Named {
     const char* name;
 };
 
+constexpr Named<Outcome> OUTCOMES[] = {
+    {Outcome::generated, "generated"}, {Outcome::stock, "stock"},        {Outcome::empty, "empty"},
+    {Outcome::kept, "kept"},           {Outcome::notAsked, "not-asked"},
+};
+
 constexpr Named<CrcVerdict> CRC_VERDICTS[] = {
     {CrcVerdict::computed, "computed"},
     {CrcVerdict::blank, "blank"},
@@ -48,6 +53,10 @@ const char* nameIn(const Named<Value> (&rows)[COUNT], Value value) {
 }
 
 } // namespace
+
+const char* nameOf(Outcome outcome) {
+    return nameIn(OUTCOMES, outcome);
+}
 
 const char* nameOf(CrcVerdict verdict) {
     return nameIn(CRC_VERDICTS, verdict);

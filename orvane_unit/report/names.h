@@ -9,6 +9,7 @@
 namespace orvane::desk {
 
 /// Published: texts and JSON have the same names, which programs read.
+const char* nameOf(Outcome outcome);
 const char* nameOf(CrcVerdict verdict);
 const char* nameOf(PathKind kind);
 

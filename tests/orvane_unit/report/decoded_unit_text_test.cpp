@@ -75,18 +75,6 @@ TEST(DecodedUnitTextTest, DiskThatCannotBeReadIsTold) {
     EXPECT_EQ(printed(unit, "tuning"), "tuning blocks: the boot disk can't be opened\n");
 }
 
-TEST(DecodedUnitTextTest, VerdictsOnTheCrcHaveTheirNames) {
-    DecodedUnit unit;
-    for (const auto& [verdict, name] :
-         {std::pair(CrcVerdict::computed, "computed"), std::pair(CrcVerdict::blank, "blank"),
-          std::pair(CrcVerdict::ambiguous, "ambiguous"),
-          std::pair(CrcVerdict::unreadable, "unreadable")}) {
-        unit.records.crcVerdict = verdict;
-        EXPECT_NE(printed(unit, "records").find(std::string(", ") + name + "\n"),
-                  std::string::npos);
-    }
-}
-
 TEST(DecodedUnitTextTest, TuningBlocksShowTheirWords) {
     DecodedUnit unit;
     unit.tuning.blocks[3].bytes[0] = 0x02; // qwaAECSwitch
