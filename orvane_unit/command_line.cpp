@@ -7,7 +7,7 @@
 #include "kit/description/description_text.h"
 #include "kit/description/parse_description.h"
 #include "kit/description/sample.h"
-#include "kit/description/unit_description.h"
+#include "kit/enter/captured_run.h"
 #include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
@@ -40,12 +40,11 @@
 #include <algorithm>
 #include <cstddef>
 #include <exception>
-#include <filesystem>
 #include <iostream>
 #include <memory>
 #include <sstream>
+#include <stdexcept>
 #include <string>
-#include <utility>
 #include <vector>
 
 namespace orvane::desk {

@@ -5,7 +5,6 @@
 #include "kit/host/text.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/compare/unit_values.h"
-#include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"
@@ -16,7 +15,6 @@
 #include <ostream>
 #include <set>
 #include <string>
-#include <utility>
 
 namespace orvane::desk {
 

@@ -5,6 +5,7 @@
 #include "config/record_slots.h"
 #include "identity/inf_file.h"
 #include "kit/description/value_places.h"
+#include "kit/host/bytes.h"
 #include "kit/host/sparse_content.h"
 #include "kit/host/text.h"
 #include "orvane_unit/explain/explanation.h"
@@ -23,6 +24,7 @@
 #include <map>
 #include <optional>
 #include <sstream>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {

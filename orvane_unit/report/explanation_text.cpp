@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/report/explanation_text.h"
 
+#include "kit/description/value_key.h"
 #include "kit/host/text.h"
+#include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/place_text.h"
@@ -12,6 +14,7 @@
 #include <ostream>
 #include <set>
 #include <string>
+#include <utility>
 #include <variant>
 #include <vector>
 

@@ -3,6 +3,7 @@
 
 #include "config/param_catalogue.h"
 #include "identity/inf_file.h"
+#include "kit/description/value_key.h"
 #include "kit/enter/captured_run.h"
 #include "kit/host/text.h"
 #include "orvane_unit/compare/text_diff.h"

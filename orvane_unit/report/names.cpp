@@ -2,6 +2,7 @@
 #include "orvane_unit/report/names.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <iterator>
 #include <stdexcept>
 

@@ -2,9 +2,10 @@
 #include "orvane_unit/report/place_text.h"
 
 #include "kit/host/text.h"
+#include "orvane_unit/explain/place.h"
 
-#include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <variant>
 
 namespace orvane::desk {

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "kit/description/value_key.h"
 #include "orvane_unit/explain/explanation.h"
 
 #include <string>

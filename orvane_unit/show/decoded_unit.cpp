@@ -10,12 +10,16 @@
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
+#include "kit/host/bytes.h"
 #include "kit/host/sparse_content.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"
+#include "writers/template_merge.h"
 
 #include <sys/stat.h>
 
+#include <cstddef>
+#include <memory>
 #include <utility>
 
 namespace orvane::desk {
