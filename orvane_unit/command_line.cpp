@@ -17,12 +17,12 @@
 #include "kit/unit/edit.h"
 #include "kit/unit/make_unit.h"
 #include "kit/unit/marker.h"
+#include "kit/unit/unit_values.h"
 #include "main/options.h"
 #include "orvane_unit/check/case_check.h"
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/compare/impact.h"
 #include "orvane_unit/compare/output_differences.h"
-#include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/find_orvane.h"
@@ -281,8 +281,9 @@ public:
 
     ExitStatus run() const override {
         const std::string letters = givenLetters(parser());
-        const std::vector<ValueChange> changes = differingValues(
-            unitValues(kit::describeInputs(first_)), unitValues(kit::describeInputs(second_)));
+        const std::vector<kit::ValueChange> changes =
+            kit::differingValues(kit::unitValues(kit::describeInputs(first_)),
+                                 kit::unitValues(kit::describeInputs(second_)));
         const std::vector<Consequence> found =
             consequences(changes, outputDifferences(explainUnit(first_, {"-" + letters}),
                                                     explainUnit(second_, {"-" + letters})));

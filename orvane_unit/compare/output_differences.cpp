@@ -105,8 +105,8 @@ bool isAbout(const ValueKey& changed, const ValueKey& key) {
 /// Collects the outputs and lines of each change.
 class Distribution {
 public:
-    explicit Distribution(const std::vector<ValueChange>& changes) {
-        for (const ValueChange& change : changes) {
+    explicit Distribution(const std::vector<kit::ValueChange>& changes) {
+        for (const kit::ValueChange& change : changes) {
             consequences_.push_back({change, {}});
         }
     }
@@ -171,7 +171,7 @@ std::vector<OutputDifference> outputDifferences(const Explanation& before,
     return differences;
 }
 
-std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
+std::vector<Consequence> consequences(const std::vector<kit::ValueChange>& changes,
                                       const std::vector<OutputDifference>& differences) {
     Distribution distribution(changes);
     for (const OutputDifference& output : differences) {

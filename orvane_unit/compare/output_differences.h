@@ -4,8 +4,8 @@
 #pragma once
 
 #include "kit/description/value_key.h"
+#include "kit/unit/unit_values.h"
 #include "orvane_unit/compare/text_diff.h"
-#include "orvane_unit/compare/unit_values.h"
 #include "orvane_unit/explain/explanation.h"
 
 #include <string>
@@ -34,14 +34,14 @@ std::vector<OutputDifference> outputDifferences(const Explanation& before,
 
 /// A value that differs, and the outputs that differ because of it.
 struct Consequence {
-    ValueChange change;
+    kit::ValueChange change;
     std::vector<OutputDifference> outputs;
 };
 
 /// Assigns every differing line to the changed value that it comes from; where its own value has
 /// not changed, to one that decided its output's outcome. What no value accounts for goes to a last
 /// entry with an empty key.
-std::vector<Consequence> consequences(const std::vector<ValueChange>& changes,
+std::vector<Consequence> consequences(const std::vector<kit::ValueChange>& changes,
                                       const std::vector<OutputDifference>& differences);
 
 } // namespace orvane::desk

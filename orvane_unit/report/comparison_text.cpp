@@ -3,8 +3,9 @@
 
 #include "kit/description/value_key.h"
 #include "kit/host/text.h"
+#include "kit/unit/unit_values.h"
 #include "orvane_unit/compare/text_diff.h"
-#include "orvane_unit/compare/unit_values.h"
+#include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"
@@ -95,7 +96,7 @@ std::vector<ValueKey> withWholeBlocks(const std::vector<ValueKey>& keys) {
 
 void printConsequences(std::ostream& out, const std::vector<Consequence>& consequences) {
     for (const Consequence& consequence : consequences) {
-        const ValueChange& change = consequence.change;
+        const kit::ValueChange& change = consequence.change;
         if (change.key.isEmpty()) {
             out << "of no value that differs:\n";
         } else {

@@ -5,7 +5,7 @@
 #include "kit/enter/captured_run.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/marker.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 

@@ -2,7 +2,7 @@
 #include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "orvane_unit/check/case_check.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

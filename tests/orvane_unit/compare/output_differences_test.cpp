@@ -4,7 +4,7 @@
 #include "kit/unit/describe_inputs.h"
 #include "orvane_unit/compare/output_differences.h"
 #include "orvane_unit/explain/explain.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 
@@ -33,8 +33,8 @@ std::map<std::string, Consequence> consequencesOf(
     });
     std::map<std::string, Consequence> found;
     for (const Consequence& consequence : desk::consequences(
-             desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
-                                   desk::unitValues(kit::describeInputs(second.root()))),
+             kit::differingValues(kit::unitValues(kit::describeInputs(first.root())),
+                                  kit::unitValues(kit::describeInputs(second.root()))),
              desk::outputDifferences(desk::explainUnit(first.root(), {"-ai"}),
                                      desk::explainUnit(second.root(), {"-ai"})))) {
         found[keyText(consequence.change.key)] = consequence;
@@ -209,6 +209,26 @@ TEST(OutputDifferencesTest, FolderInThePlaceOfAnOutputIsTheCause) {
         consequencesOf([&path](UnitDescription& unit) { unit.folders.push_back(path); });
     ASSERT_EQ(found.size(), 1U);
     EXPECT_EQ(pathsOf(found.at("folder." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
+}
+
+/// An output that is a link to a template of a later one: no single input accounts for that.
+TEST(OutputDifferencesTest, LinesOfNoValueComeLast) {
+    const DescribedUnit first;
+    const DescribedUnit second([](UnitDescription& unit) {
+        unit.links[IAP2_FILE.output] = IAP1_FILE.templateFile;
+        unit.image.params[50] = 1;
+    });
+    const std::vector<desk::Consequence> found = desk::consequences(
+        kit::differingValues(kit::unitValues(kit::describeInputs(first.root())),
+                             kit::unitValues(kit::describeInputs(second.root()))),
+        desk::outputDifferences(desk::explainUnit(first.root(), {"-i"}),
+                                desk::explainUnit(second.root(), {"-i"})));
+    ASSERT_EQ(found.size(), 2U);
+    EXPECT_TRUE(found[0].change.key == kit::paramKey(50));
+    EXPECT_TRUE(found[0].outputs.empty());
+    EXPECT_TRUE(found[1].change.key.isEmpty());
+    ASSERT_EQ(found[1].outputs.size(), 1U);
+    EXPECT_EQ(found[1].outputs[0].path, IAP1_FILE.output);
 }
 
 } // namespace

@@ -5,7 +5,7 @@
 #include "config/config_store.h"
 #include "kit/enter/run_inside.h"
 #include "orvane_unit/explain/explain.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"

@@ -5,7 +5,7 @@
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/place_text.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/orvane_unit/tree_state.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"

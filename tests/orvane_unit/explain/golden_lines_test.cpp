@@ -5,7 +5,7 @@
 #include "kit/unit/make_unit.h"
 #include "orvane_unit/check/case_check.h"
 #include "orvane_unit/explain/explain.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/unit_test.h"
 
 #include <set>

@@ -5,7 +5,7 @@
 #include "kit/unit/describe_inputs.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/json.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 
@@ -89,8 +89,8 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
         parsed(desk::consequencesJson(
                    "A", "B",
                    desk::consequences(
-                       desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
-                                             desk::unitValues(kit::describeInputs(second.root()))),
+                       kit::differingValues(kit::unitValues(kit::describeInputs(first.root())),
+                                            kit::unitValues(kit::describeInputs(second.root()))),
                        desk::outputDifferences(desk::explainUnit(first.root(), {"-a"}),
                                                desk::explainUnit(second.root(), {"-a"})))),
                "diff");

@@ -3,7 +3,7 @@
 #include "config/config_store.h"
 #include "kit/host/sparse_content.h"
 #include "orvane_unit/show/decoded_unit.h"
-#include "tests/orvane_unit/explain/described_unit.h"
+#include "tests/kit/unit/described_unit.h"
 #include "tests/support/unit_test.h"
 
 namespace orvane::test {

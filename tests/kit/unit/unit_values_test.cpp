@@ -1,12 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-//
-// Kinds of values that no output comes from, and changes that no value accounts for.
 #include "config/boot_disk.h"
 #include "kit/unit/describe_inputs.h"
-#include "orvane_unit/compare/output_differences.h"
-#include "orvane_unit/explain/explain.h"
-#include "tests/orvane_unit/explain/described_unit.h"
-#include "writers/iap_writer.h"
+#include "kit/unit/unit_values.h"
+#include "tests/kit/unit/described_unit.h"
 
 #include <gtest/gtest.h>
 
@@ -18,9 +14,9 @@ namespace orvane::test {
 
 namespace {
 
-using desk::UnitValues;
-using desk::ValueChange;
 using kit::UnitDescription;
+using kit::UnitValues;
+using kit::ValueChange;
 
 /// Both sides of each value that differs, by its key.
 using Changes = std::map<std::string, std::pair<std::string, std::string>>;
@@ -30,8 +26,8 @@ Changes changesOf(const std::function<void(UnitDescription&)>& change) {
     const DescribedUnit second(change);
     Changes changes;
     for (const ValueChange& value :
-         desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
-                               desk::unitValues(kit::describeInputs(second.root())))) {
+         kit::differingValues(kit::unitValues(kit::describeInputs(first.root())),
+                              kit::unitValues(kit::describeInputs(second.root())))) {
         changes[keyText(value.key)] = {value.before, value.after};
     }
     return changes;
@@ -83,7 +79,7 @@ TEST(UnitValuesTest, BytesOfASparseFileAreNotThoseOfAFileWithANumberAtItsEnd) {
     UnitDescription second = first;
     second.files["/fs/x.5"] = "map\n";
     const std::vector<ValueChange> changes =
-        desk::differingValues(desk::unitValues(first), desk::unitValues(second));
+        kit::differingValues(kit::unitValues(first), kit::unitValues(second));
     ASSERT_EQ(changes.size(), 1U);
     EXPECT_TRUE(changes[0].key == kit::fileKey("/fs/x.5"));
     EXPECT_EQ(changes[0].before, "(missing)");
@@ -115,31 +111,11 @@ TEST(UnitValuesTest, DifferencesComeInTheOrderOfTheFirstThenTheSecond) {
     const UnitValues before = {{key(3), "1"}, {key(1), "1"}, {key(2), "1"}};
     const UnitValues after = {{key(4), "2"}, {key(2), "2"}, {key(3), "1"}};
     std::vector<std::string> found;
-    for (const ValueChange& change : desk::differingValues(before, after)) {
+    for (const ValueChange& change : kit::differingValues(before, after)) {
         found.push_back(keyText(change.key) + ": " + change.before + " " + change.after);
     }
     EXPECT_EQ(found, (std::vector<std::string>{"param.1: 1 (missing)", "param.2: 1 2",
                                                "param.4: (missing) 2"}));
-}
-
-/// An output that is a link to a template of a later one: no single input accounts for that.
-TEST(UnitValuesTest, LinesOfNoValueComeLast) {
-    const DescribedUnit first;
-    const DescribedUnit second([](UnitDescription& unit) {
-        unit.links[IAP2_FILE.output] = IAP1_FILE.templateFile;
-        unit.image.params[50] = 1;
-    });
-    const std::vector<desk::Consequence> found = desk::consequences(
-        desk::differingValues(desk::unitValues(kit::describeInputs(first.root())),
-                              desk::unitValues(kit::describeInputs(second.root()))),
-        desk::outputDifferences(desk::explainUnit(first.root(), {"-i"}),
-                                desk::explainUnit(second.root(), {"-i"})));
-    ASSERT_EQ(found.size(), 2U);
-    EXPECT_TRUE(found[0].change.key == kit::paramKey(50));
-    EXPECT_TRUE(found[0].outputs.empty());
-    EXPECT_TRUE(found[1].change.key.isEmpty());
-    ASSERT_EQ(found[1].outputs.size(), 1U);
-    EXPECT_EQ(found[1].outputs[0].path, IAP1_FILE.output);
 }
 
 } // namespace

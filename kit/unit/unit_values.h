@@ -10,20 +10,20 @@
 #include <utility>
 #include <vector>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 /// Key and value, in the order of a description. A value that is not there has no entry.
-using UnitValues = std::vector<std::pair<kit::ValueKey, std::string>>;
+using UnitValues = std::vector<std::pair<ValueKey, std::string>>;
 
-UnitValues unitValues(const kit::UnitDescription& unit);
+UnitValues unitValues(const UnitDescription& unit);
 
 /// A value that differs between two units. "(missing)" stands for one that is not there.
 struct ValueChange {
-    kit::ValueKey key;
+    ValueKey key;
     std::string before;
     std::string after;
 };
 
 std::vector<ValueChange> differingValues(const UnitValues& before, const UnitValues& after);
 
-} // namespace orvane::desk
+} // namespace orvane::kit

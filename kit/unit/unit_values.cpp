@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "orvane_unit/compare/unit_values.h"
+#include "kit/unit/unit_values.h"
 
 #include "config/boot_disk.h"
 #include "config/config_store.h"
@@ -23,7 +23,7 @@
 #include <sstream>
 #include <variant>
 
-namespace orvane::desk {
+namespace orvane::kit {
 
 namespace {
 
@@ -43,20 +43,20 @@ std::string crcText(const std::string& bytes) {
 }
 
 std::string fileText(const std::string& bytes) {
-    return kit::counted(bytes.size(), "byte") + ", CRC-32 " + crcText(bytes);
+    return counted(bytes.size(), "byte") + ", CRC-32 " + crcText(bytes);
 }
 
 /// As `orvane-unit set` takes it.
 std::string textOrHex(const std::string& bytes) {
-    if (kit::printable(bytes) == bytes && bytes.compare(0, 4, "hex:") != 0) {
+    if (printable(bytes) == bytes && bytes.compare(0, 4, "hex:") != 0) {
         return bytes;
     }
-    std::string hex = kit::hexText(bytes);
+    std::string hex = hexText(bytes);
     hex.erase(std::remove(hex.begin(), hex.end(), ' '), hex.end());
     return hex.size() <= LONGEST_SHOWN ? "hex:" + hex : fileText(bytes);
 }
 
-std::string tuningText(const kit::TuningValue& value) {
+std::string tuningText(const TuningValue& value) {
     if (const auto* word = std::get_if<std::string>(&value)) {
         return *word;
     }
@@ -78,51 +78,49 @@ void addRuns(UnitValues& values, const Runs& runs, const KeyOf& keyOf) {
     }
 }
 
-bool isNamed(const kit::UnitDescription& unit, const std::string& path) {
-    const auto isAbsent = [&path](const std::string& absent) {
-        return kit::isAtOrBelow(path, absent);
-    };
+bool isNamed(const UnitDescription& unit, const std::string& path) {
+    const auto isAbsent = [&path](const std::string& absent) { return isAtOrBelow(path, absent); };
     return unit.files.count(path) != 0 || unit.sparseFiles.count(path) != 0 ||
            unit.links.count(path) != 0 ||
            std::find(unit.folders.begin(), unit.folders.end(), path) != unit.folders.end() ||
            std::any_of(unit.absent.begin(), unit.absent.end(), isAbsent);
 }
 
-void addImage(UnitValues& values, const kit::ImageDescription& image) {
-    values.emplace_back(kit::imageSizeKey(), std::to_string(image.size));
+void addImage(UnitValues& values, const ImageDescription& image) {
+    values.emplace_back(imageSizeKey(), std::to_string(image.size));
     for (std::uint16_t number = 1; number <= PARAM_COUNT; ++number) {
         const auto param = image.params.find(number);
-        values.emplace_back(kit::paramKey(number),
+        values.emplace_back(paramKey(number),
                             std::to_string(param == image.params.end() ? 0 : param->second));
     }
-    addRuns(values, image.bytes, kit::imageBytesKey);
+    addRuns(values, image.bytes, imageBytesKey);
 }
 
-void addDisk(UnitValues& values, const kit::DiskDescription& disk) {
+void addDisk(UnitValues& values, const DiskDescription& disk) {
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
         const auto content = disk.slots.find(slot);
-        if (kit::slotsWithin(slot).empty()) { // or its bytes have keys already
-            values.emplace_back(kit::slotKey(slot),
+        if (slotsWithin(slot).empty()) { // or its bytes have keys already
+            values.emplace_back(slotKey(slot),
                                 content == disk.slots.end() ? "" : textOrHex(content->second));
         }
     }
-    values.emplace_back(kit::auxKey(), textOrHex(disk.aux.value_or("")));
+    values.emplace_back(auxKey(), textOrHex(disk.aux.value_or("")));
     for (std::uint32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
         const auto block = disk.tuning.find(id);
-        const kit::TuningDescription zeros = kit::describeTuningBlock(DpsBlock{});
-        const kit::TuningDescription& content = block == disk.tuning.end() ? zeros : block->second;
+        const TuningDescription zeros = describeTuningBlock(DpsBlock{});
+        const TuningDescription& content = block == disk.tuning.end() ? zeros : block->second;
         for (const DpsField& field : DPS_LAYOUT) {
-            values.emplace_back(kit::tuningFieldKey(id, field.key),
+            values.emplace_back(tuningFieldKey(id, field.key),
                                 tuningText(content.fields.at(field.key)));
         }
-        values.emplace_back(kit::tuningRawKey(id), textOrHex(content.raw));
+        values.emplace_back(tuningRawKey(id), textOrHex(content.raw));
     }
-    addRuns(values, disk.bytes, kit::diskBytesKey);
+    addRuns(values, disk.bytes, diskBytesKey);
 }
 
 } // namespace
 
-UnitValues unitValues(const kit::UnitDescription& unit) {
+UnitValues unitValues(const UnitDescription& unit) {
     UnitValues values;
     if (!isNamed(unit, CONFIG_SHM_NAME)) {
         addImage(values, unit.image);
@@ -131,27 +129,27 @@ UnitValues unitValues(const kit::UnitDescription& unit) {
         addDisk(values, unit.disk);
     }
     for (const auto& [path, content] : unit.files) {
-        values.emplace_back(kit::fileKey(path), fileText(content));
+        values.emplace_back(fileKey(path), fileText(content));
     }
     for (const auto& [path, content] : unit.sparseFiles) {
-        values.emplace_back(kit::fileKey(path), kit::counted(content.size, "byte"));
+        values.emplace_back(fileKey(path), counted(content.size, "byte"));
         addRuns(values, content.bytes,
-                [&p = path](std::uint64_t offset) { return kit::fileBytesKey(p, offset); });
+                [&p = path](std::uint64_t offset) { return fileBytesKey(p, offset); });
     }
     for (const auto& [path, target] : unit.links) {
-        values.emplace_back(kit::linkKey(path), textOrHex(target));
+        values.emplace_back(linkKey(path), textOrHex(target));
     }
     for (const std::string& path : unit.folders) {
-        values.emplace_back(kit::folderKey(path), "a folder");
+        values.emplace_back(folderKey(path), "a folder");
     }
     for (const std::string& path : unit.absent) {
-        values.emplace_back(kit::absentKey(path), "removed");
+        values.emplace_back(absentKey(path), "removed");
     }
     return values;
 }
 
 std::vector<ValueChange> differingValues(const UnitValues& before, const UnitValues& after) {
-    std::map<kit::ValueKey, std::string> later(after.begin(), after.end());
+    std::map<ValueKey, std::string> later(after.begin(), after.end());
     std::vector<ValueChange> changes;
     for (const auto& [key, value] : before) {
         const auto found = later.find(key);
@@ -171,4 +169,4 @@ std::vector<ValueChange> differingValues(const UnitValues& before, const UnitVal
     return changes;
 }
 
-} // namespace orvane::desk
+} // namespace orvane::kit
