@@ -8,8 +8,8 @@
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
 #include "kit/description/value_key.h"
-#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/whole_file.h"
 
 #include <filesystem>
 #include <map>
@@ -56,7 +56,7 @@ UnitDescription readDescription(const std::filesystem::path& file) {
     if (std::filesystem::is_directory(file, error)) {
         throw KitError(file.string() + " is a folder, not a description");
     }
-    return parseDescription(readStream(file), file.string());
+    return parseDescription(readWholeFile(file), file.string());
 }
 
 } // namespace orvane::kit

@@ -7,9 +7,9 @@
 #include "kit/description/unit_description.h"
 #include "kit/description/value_key.h"
 #include "kit/host/bytes.h"
-#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
+#include "kit/host/whole_file.h"
 
 #include <algorithm>
 #include <cstddef>

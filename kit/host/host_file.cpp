@@ -7,7 +7,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <array>
 #include <cstddef>
 #include <string>
 
@@ -70,33 +69,6 @@ Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 
 Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file) {
     return readAt(descriptor, file, 0, sizeOf(descriptor, file));
-}
-
-Bytes readStream(const std::filesystem::path& file) {
-    const Descriptor descriptor(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
-    Bytes bytes;
-    std::array<char, 65536> buffer{};
-    ssize_t count = 0;
-    while ((count = ::read(descriptor.number(), buffer.data(), buffer.size())) > 0) {
-        bytes.append(buffer.data(), static_cast<std::size_t>(count));
-    }
-    if (count < 0) {
-        throw systemError("cannot read " + file.string());
-    }
-    return bytes;
-}
-
-Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
-    const Descriptor descriptor = openForReading(file);
-    struct stat state {};
-    if (::fstat(descriptor.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
-        throw KitError(file.string() + " is not a regular file");
-    }
-    if (static_cast<std::uint64_t>(state.st_size) > limit) {
-        throw KitError(file.string() + " has " + std::to_string(state.st_size) +
-                       " bytes: at most " + std::to_string(limit) + " are taken");
-    }
-    return readAt(descriptor, file, 0, static_cast<std::uint64_t>(state.st_size));
 }
 
 bool isRootDirectory(const std::filesystem::path& folder) {

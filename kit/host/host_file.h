@@ -32,12 +32,6 @@ Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 /// All bytes, up to the size that sizeOf tells.
 Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file);
 
-/// All bytes up to the end of `file`, which may be a pipe.
-Bytes readStream(const std::filesystem::path& file);
-
-/// All bytes of the regular file `file`, a link to one included, of at most `limit` bytes.
-Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit);
-
 /// Whether `folder` is this process's "/", by whatever name. Throws nothing.
 bool isRootDirectory(const std::filesystem::path& folder);
 

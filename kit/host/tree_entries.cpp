@@ -41,6 +41,18 @@ fs::file_type kindOf(const fs::path& entry) {
     return status.type();
 }
 
+fs::file_type kindBehind(const fs::path& entry) {
+    std::error_code error;
+    const fs::file_type type = fs::status(entry, error).type();
+    if (type != fs::file_type::none) {
+        return type;
+    }
+    if (error == std::errc::too_many_symbolic_link_levels) {
+        return fs::file_type::not_found;
+    }
+    throw KitError("cannot read " + entry.string() + ": " + error.message());
+}
+
 std::string targetOf(const fs::path& link) {
     std::error_code error;
     std::string target = fs::read_symlink(link, error).string();

@@ -15,6 +15,9 @@ std::vector<std::filesystem::directory_entry> listFolder(const std::filesystem::
 /// What `entry` is, links not followed.
 std::filesystem::file_type kindOf(const std::filesystem::path& entry);
 
+/// What `entry` leads to, links followed; `not_found` for a link that leads nowhere or in a circle.
+std::filesystem::file_type kindBehind(const std::filesystem::path& entry);
+
 /// The target of a link.
 std::string targetOf(const std::filesystem::path& link);
 

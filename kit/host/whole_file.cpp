@@ -1,19 +1,77 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/whole_file.h"
 
-#include <fstream>
-#include <sstream>
+#include "kit/host/descriptor.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <cstddef>
+#include <string>
 
 namespace orvane::kit {
 
-std::optional<std::string> readWholeFile(const std::filesystem::path& path) {
-    std::ifstream file(path, std::ios::binary);
-    if (!file) {
+namespace {
+
+/// Waits for the other end of a pipe.
+Descriptor openStream(const std::filesystem::path& file) {
+    return Descriptor(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
+}
+
+KitError readError(const std::filesystem::path& file) {
+    return systemError("cannot read " + file.string());
+}
+
+Bytes readToEnd(const Descriptor& descriptor, const std::filesystem::path& file) {
+    Bytes bytes;
+    std::array<char, 65536> buffer{};
+    ssize_t count = 0;
+    while ((count = ::read(descriptor.number(), buffer.data(), buffer.size())) > 0) {
+        bytes.append(buffer.data(), static_cast<std::size_t>(count));
+    }
+    if (count < 0) {
+        throw readError(file);
+    }
+    return bytes;
+}
+
+} // namespace
+
+Bytes readWholeFile(const std::filesystem::path& file) {
+    const Descriptor descriptor = openStream(file);
+    if (!descriptor.isOpen()) {
+        throw readError(file);
+    }
+    return readToEnd(descriptor, file);
+}
+
+std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file) {
+    const Descriptor descriptor = openStream(file);
+    if (!descriptor.isOpen() && (errno == ENOENT || errno == ENOTDIR)) {
         return std::nullopt;
     }
-    std::ostringstream content;
-    content << file.rdbuf(); // an empty file fails the copy, and is one all the same
-    return content.str();
+    if (!descriptor.isOpen()) {
+        throw readError(file);
+    }
+    return readToEnd(descriptor, file);
+}
+
+Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
+    const Descriptor descriptor = openForReading(file);
+    struct stat state {};
+    if (::fstat(descriptor.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
+        throw KitError(file.string() + " is not a regular file");
+    }
+    if (static_cast<std::uint64_t>(state.st_size) > limit) {
+        throw KitError(file.string() + " has " + std::to_string(state.st_size) +
+                       " bytes: at most " + std::to_string(limit) + " are taken");
+    }
+    return readAt(descriptor, file, 0, static_cast<std::uint64_t>(state.st_size));
 }
 
 } // namespace orvane::kit

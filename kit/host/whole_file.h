@@ -1,13 +1,24 @@
 // SPDX-License-Identifier: Apache-2.0
+//
+// Reading whole files by their paths. Every function throws KitError for what is there and can't be
+// read, the file's path in its text.
 #pragma once
 
+#include "kit/host/bytes.h"
+
+#include <cstdint>
 #include <filesystem>
 #include <optional>
-#include <string>
 
 namespace orvane::kit {
 
-/// All bytes of a file; nothing when it can't be opened.
-std::optional<std::string> readWholeFile(const std::filesystem::path& path);
+/// All bytes up to the end of `file`, which may be a pipe.
+Bytes readWholeFile(const std::filesystem::path& file);
+
+/// The same; nothing where there is no such file.
+std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file);
+
+/// All bytes of the regular file `file`, a link to one included, of at most `limit` bytes.
+Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit);
 
 } // namespace orvane::kit

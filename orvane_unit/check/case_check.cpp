@@ -5,6 +5,7 @@
 #include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"
+#include "kit/host/tree_entries.h"
 #include "kit/host/whole_file.h"
 #include "kit/unit/make_unit.h"
 #include "orvane_unit/check/tmp_tree.h"
@@ -19,7 +20,6 @@
 #include <memory>
 #include <optional>
 #include <sstream>
-#include <system_error>
 #include <utility>
 
 namespace orvane::desk {
@@ -32,22 +32,19 @@ constexpr char NO_TMP[] = "(absent)";
 
 std::vector<fs::path> caseFolders(const fs::path& folder) {
     std::vector<fs::path> folders;
-    std::error_code error;
-    for (const fs::directory_entry& entry : fs::directory_iterator(folder, error)) {
-        if (fs::exists(entry.path() / "unit.toml", error)) {
-            folders.push_back(entry.path());
+    for (const fs::path& entry : kit::listFolder(folder)) {
+        if (kit::kindBehind(entry / "unit.toml") != fs::file_type::not_found) {
+            folders.push_back(entry);
         }
     }
     if (folders.empty()) {
         throw kit::KitError("no folder in " + folder.string() + " holds a unit.toml");
     }
-    std::sort(folders.begin(), folders.end());
     return folders;
 }
 
 void writeWhole(const fs::path& file, const std::string& text) {
-    std::error_code error;
-    fs::create_directories(file.parent_path(), error);
+    fs::create_directories(file.parent_path());
     std::ofstream out(file, std::ios::binary);
     out << text;
     out.close();
@@ -57,7 +54,7 @@ void writeWhole(const fs::path& file, const std::string& text) {
 }
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
-    const std::optional<std::string> text = kit::readWholeFile(folder / "arguments");
+    const std::optional<std::string> text = kit::readWholeFileIfThere(folder / "arguments");
     if (!text) {
         return {"-a", "-i"};
     }
@@ -80,25 +77,24 @@ std::string listOf(const TmpTree& tree) {
     return list;
 }
 
-void compareLists(const std::string& found, const std::string& expected,
-                  std::vector<std::string>& differences) {
-    const auto lines = [](const std::string& text) {
-        std::set<std::string> names;
-        std::istringstream in(text);
-        for (std::string line; std::getline(in, line);) {
-            names.insert(line);
-        }
-        return names;
-    };
-    const std::set<std::string> there = lines(found);
-    const std::set<std::string> wanted = lines(expected);
-    for (const std::string& name : wanted) {
-        if (there.count(name) == 0) {
+std::set<std::string> linesOf(const std::string& text) {
+    std::set<std::string> lines;
+    std::istringstream in(text);
+    for (std::string line; std::getline(in, line);) {
+        lines.insert(line);
+    }
+    return lines;
+}
+
+void compareEntries(const std::set<std::string>& found, const std::set<std::string>& expected,
+                    std::vector<std::string>& differences) {
+    for (const std::string& name : expected) {
+        if (found.count(name) == 0) {
             differences.push_back("/tmp/" + name + " is missing");
         }
     }
-    for (const std::string& name : there) {
-        if (wanted.count(name) == 0) {
+    for (const std::string& name : found) {
+        if (expected.count(name) == 0) {
             differences.push_back("/tmp/" + name + " is not expected");
         }
     }
@@ -116,26 +112,26 @@ void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences
 
 void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run,
              std::vector<std::string>& differences) {
-    if (run.standardError != kit::readWholeFile(expected / "stderr").value_or("")) {
+    if (run.standardError != kit::readWholeFileIfThere(expected / "stderr").value_or("")) {
         differences.push_back("standard error differs");
     }
-    const std::optional<std::string> list = kit::readWholeFile(expected / "tmp.list");
+    const std::optional<std::string> list = kit::readWholeFileIfThere(expected / "tmp.list");
     if (!list) {
         differences.push_back("there is no expectation: no expected/tmp.list");
         return;
     }
-    compareLists(listOf(tree), *list, differences);
+    const std::set<std::string> wanted = linesOf(*list);
+    compareEntries(linesOf(listOf(tree)), wanted, differences);
     for (const auto& [path, content] : tree.entries) {
-        if (content && list->find(path) != std::string::npos &&
-            *content != kit::readWholeFile(expected / "tmp" / path)) {
+        if (content && wanted.count(path) != 0 &&
+            *content != kit::readWholeFileIfThere(expected / "tmp" / path)) {
             differences.push_back("/tmp/" + path + " differs");
         }
     }
 }
 
-void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
-    std::error_code error;
-    fs::remove_all(expected, error);
+void record(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
+    fs::remove_all(expected);
     writeWhole(expected / "tmp.list", listOf(tree));
     if (!run.standardError.empty()) {
         writeWhole(expected / "stderr", run.standardError);
@@ -144,6 +140,15 @@ void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult&
         if (content) {
             writeWhole(expected / "tmp" / path, *content);
         }
+    }
+}
+
+void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
+    try {
+        record(expected, tree, run);
+    } catch (const fs::filesystem_error& error) {
+        throw kit::KitError("cannot write " + error.path1().string() + ": " +
+                            error.code().message());
     }
 }
 

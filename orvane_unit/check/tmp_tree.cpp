@@ -2,9 +2,10 @@
 #include "orvane_unit/check/tmp_tree.h"
 
 #include "kit/enter/entered_root.h"
+#include "kit/host/tree_entries.h"
 #include "kit/host/whole_file.h"
 
-#include <system_error>
+#include <vector>
 
 namespace orvane::desk {
 
@@ -14,25 +15,41 @@ namespace {
 
 constexpr char TMP[] = "/tmp";
 
+/// Enters what is in `folder`, and gives the folders among it; links are not gone into.
+std::vector<fs::path> readFolder(const fs::path& folder, TmpTree& tree) {
+    std::vector<fs::path> folders;
+    for (const fs::path& entry : kit::listFolder(folder)) {
+        const std::string path = entry.lexically_relative(TMP).string();
+        const fs::file_type kind = kit::kindBehind(entry);
+        if (kind == fs::file_type::directory) {
+            tree.entries[path + "/"];
+            if (kit::kindOf(entry) == fs::file_type::directory) {
+                folders.push_back(entry);
+            }
+        } else if (kind == fs::file_type::regular) {
+            tree.entries[path] = kit::readWholeFile(entry);
+        } else {
+            tree.entries[path];
+        }
+    }
+    return folders;
+}
+
 } // namespace
 
 TmpTree readTmp(const fs::path& root) {
     const kit::EnteredRoot entered(root);
-    std::error_code error;
-    if (!fs::is_directory(TMP, error)) {
-        return {};
-    }
     TmpTree tree;
-    tree.isThere = true;
-    for (auto entry = fs::recursive_directory_iterator(TMP, error);
-         entry != fs::recursive_directory_iterator(); entry.increment(error)) {
-        const std::string path = entry->path().lexically_relative(TMP).string();
-        if (entry->is_directory(error)) {
-            tree.entries[path + "/"];
-        } else {
-            tree.entries[path] =
-                entry->is_regular_file(error) ? kit::readWholeFile(entry->path()) : std::nullopt;
-        }
+    tree.isThere = kit::kindBehind(TMP) == fs::file_type::directory;
+    std::vector<fs::path> unread;
+    if (tree.isThere) {
+        unread.emplace_back(TMP);
+    }
+    while (!unread.empty()) {
+        const fs::path folder = unread.back();
+        unread.pop_back();
+        const std::vector<fs::path> inside = readFolder(folder, tree);
+        unread.insert(unread.end(), inside.begin(), inside.end());
     }
     return tree;
 }

@@ -25,7 +25,7 @@ struct TmpTree {
     }
 };
 
-/// Throws kit::KitError when the root can't be entered.
+/// Throws kit::KitError when the root can't be entered, or a folder or file can't be read.
 TmpTree readTmp(const std::filesystem::path& root);
 
 } // namespace orvane::desk

@@ -29,13 +29,12 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
     if (written != written_.end()) {
         return written->second;
     }
-    if (place->kind == S_IFDIR) {
-        // Opens and yields nothing.
-        return ::access(place->path.c_str(), R_OK) == 0 ? std::optional<std::string>("")
-                                                        : std::nullopt;
+    // Anything else is left alone: looking into a pipe would take from it, or wait for ever.
+    const bool isFolder = place->kind == S_IFDIR;
+    if ((!isFolder && place->kind != S_IFREG) || ::access(place->path.c_str(), R_OK) != 0) {
+        return std::nullopt;
     }
-    // Anything but a file is left alone: looking into a pipe would take from it, or wait for ever.
-    return place->kind == S_IFREG ? kit::readWholeFile(place->path) : std::nullopt;
+    return isFolder ? "" : kit::readWholeFile(place->path); // a folder opens and yields nothing
 }
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {

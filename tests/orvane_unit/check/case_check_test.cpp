@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "kit/enter/entered_root.h"
 #include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "orvane_unit/check/case_check.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/folder_names.h"
+#include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
@@ -17,6 +19,16 @@ namespace fs = std::filesystem;
 using desk::CaseResult;
 using desk::CheckReport;
 using Lines = std::vector<std::string>;
+
+template <class Action>
+std::string refusalOf(const Action& action) {
+    try {
+        action();
+    } catch (const kit::KitError& error) {
+        return error.what();
+    }
+    return "";
+}
 
 /// A folder with one case, whose only output is its stock file.
 class CaseCheckTest : public ::testing::Test {
@@ -67,6 +79,13 @@ TEST_F(CaseCheckTest, MissingFileOfTheExpectationIsTold) {
 TEST_F(CaseCheckTest, MissingAndFurtherEntriesAreTold) {
     writeFile(expected() / "tmp.list", "other\n");
     EXPECT_EQ(differences(), (Lines{"/tmp/other is missing", "/tmp/airplay.conf is not expected"}));
+}
+
+TEST_F(CaseCheckTest, EntryIsNotExpectedForThePrefixOfAnother) {
+    writeFile(expected() / "tmp.list", "airplay.conf.old\n");
+    writeFile(expected() / "tmp/airplay.conf", "other\n");
+    EXPECT_EQ(differences(),
+              (Lines{"/tmp/airplay.conf.old is missing", "/tmp/airplay.conf is not expected"}));
 }
 
 TEST_F(CaseCheckTest, MissingListIsNoExpectation) {
@@ -130,6 +149,41 @@ TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
         EXPECT_EQ(result.differences[0], "exit status 1");
         EXPECT_EQ(result.differences.size(), updates ? 1U : 2U);
     }
+}
+
+/// A file that its maker may not read itself.
+TEST_F(CaseCheckTest, OutputThatCannotBeReadIsBadInputAndNotRecorded) {
+    writeFile(folder() / "one/arguments", "-c\numask 777; echo > /tmp/closed\n");
+    { const kit::EnteredRoot once(folder()); } // a namespace gives privileges back
+    const PermissionsHold hold;
+    for (const bool updates : {false, true}) {
+        EXPECT_EQ(refusalOf([&] { desk::checkCases(folder(), "/bin/sh", updates); }),
+                  "cannot read /tmp/closed: Permission denied");
+    }
+    EXPECT_EQ(readFile(expected() / "tmp.list"), "airplay.conf\n");
+}
+
+TEST_F(CaseCheckTest, CaseThatCannotBeReadIsBadInput) {
+    { const kit::EnteredRoot once(folder()); }
+    const PermissionsHold hold;
+    const fs::path paths[] = {expected() / "tmp.list", folder() / "one/arguments", folder() / "one",
+                              folder()};
+    for (const fs::path& path : paths) {
+        fs::permissions(path, fs::perms::none);
+        const fs::path named = path == folder() / "one" ? path / "unit.toml" : path;
+        EXPECT_EQ(refusalOf([&] { check(); }),
+                  "cannot read " + named.string() + ": Permission denied");
+        fs::permissions(path, fs::perms::owner_all);
+    }
+}
+
+TEST_F(CaseCheckTest, ExpectationThatCannotBeReplacedIsBadInput) {
+    { const kit::EnteredRoot once(folder()); }
+    const PermissionsHold hold;
+    fs::permissions(expected(), fs::perms::owner_read | fs::perms::owner_exec);
+    EXPECT_EQ(refusalOf([&] { check(true); }),
+              "cannot write " + expected().string() + ": Permission denied");
+    fs::permissions(expected(), fs::perms::owner_all);
 }
 
 TEST_F(CaseCheckTest, NothingIsWrittenUnasked) {
