@@ -91,7 +91,8 @@ TuningDescription readTuningBlock(std::uint64_t id, const toml::table& table) {
             at(value.source(), "raw", [&] { encodeTuningBlock({block.raw, {}}); });
         } else if (!isTuningField(name)) {
             failUnknown(key, valueName(tuningBlockKey(id)),
-                        "raw and the 44 keys of a tuning file, such as qwaAECSwitch");
+                        "raw and the " + std::to_string(DPS_LAYOUT.size()) +
+                            " keys of a tuning file, such as " + DPS_LAYOUT.front().key);
         } else {
             const TuningValue fieldValue = tuningValueOf(value, name);
             at(value.source(), [&] { encodeTuningField(scratch, name, fieldValue); });

@@ -14,6 +14,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
 #include <fstream>
 #include <iterator>
 #include <map>
@@ -90,12 +91,12 @@ void compareEntries(const std::set<std::string>& found, const std::set<std::stri
                     std::vector<std::string>& differences) {
     for (const std::string& name : expected) {
         if (found.count(name) == 0) {
-            differences.push_back("/tmp/" + name + " is missing");
+            differences.push_back(pathInTmp(name) + " is missing");
         }
     }
     for (const std::string& name : found) {
         if (expected.count(name) == 0) {
-            differences.push_back("/tmp/" + name + " is not expected");
+            differences.push_back(pathInTmp(name) + " is not expected");
         }
     }
 }
@@ -125,7 +126,7 @@ void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult
     for (const auto& [path, content] : tree.entries) {
         if (content && wanted.count(path) != 0 &&
             *content != kit::readWholeFileIfThere(expected / "tmp" / path)) {
-            differences.push_back("/tmp/" + path + " differs");
+            differences.push_back(pathInTmp(path) + " differs");
         }
     }
 }
@@ -155,9 +156,9 @@ void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult&
 /// Whether the run has left what the explanation says.
 void compareWithRun(const Explanation& explanation, const TmpTree& tree,
                     std::vector<std::string>& surprises) {
-    constexpr char TMP[] = "/tmp/";
+    const std::size_t folderLength = pathInTmp("").size();
     for (const Output& output : explanation) {
-        const std::string name = output.path.substr(sizeof TMP - 1);
+        const std::string name = output.path.substr(folderLength);
         const std::optional<std::string> file = tree.file(name);
         const bool agrees = output.kindAfter == PathKind::file     ? file == output.contentAfter
                             : output.kindAfter == PathKind::folder ? tree.hasFolder(name)

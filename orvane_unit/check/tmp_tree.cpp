@@ -4,6 +4,7 @@
 #include "kit/enter/entered_root.h"
 #include "kit/host/tree_entries.h"
 #include "kit/host/whole_file.h"
+#include "main/unit_files.h"
 
 #include <vector>
 
@@ -13,13 +14,11 @@ namespace fs = std::filesystem;
 
 namespace {
 
-constexpr char TMP[] = "/tmp";
-
 /// Enters what is in `folder`, and gives the folders among it; links are not gone into.
 std::vector<fs::path> readFolder(const fs::path& folder, TmpTree& tree) {
     std::vector<fs::path> folders;
     for (const fs::path& entry : kit::listFolder(folder)) {
-        const std::string path = entry.lexically_relative(TMP).string();
+        const std::string path = entry.lexically_relative(OUTPUT_FOLDER).string();
         const fs::file_type kind = kit::kindBehind(entry);
         if (kind == fs::file_type::directory) {
             tree.entries[path + "/"];
@@ -37,13 +36,17 @@ std::vector<fs::path> readFolder(const fs::path& folder, TmpTree& tree) {
 
 } // namespace
 
+std::string pathInTmp(const std::string& name) {
+    return std::string(OUTPUT_FOLDER) + "/" + name;
+}
+
 TmpTree readTmp(const fs::path& root) {
     const kit::EnteredRoot entered(root);
     TmpTree tree;
-    tree.isThere = kit::kindBehind(TMP) == fs::file_type::directory;
+    tree.isThere = kit::kindBehind(OUTPUT_FOLDER) == fs::file_type::directory;
     std::vector<fs::path> unread;
     if (tree.isThere) {
-        unread.emplace_back(TMP);
+        unread.emplace_back(OUTPUT_FOLDER);
     }
     while (!unread.empty()) {
         const fs::path folder = unread.back();

@@ -25,6 +25,9 @@ struct TmpTree {
     }
 };
 
+/// The path on the unit of an entry of a TmpTree.
+std::string pathInTmp(const std::string& name);
+
 /// Throws kit::KitError when the root can't be entered, or a folder or file can't be read.
 TmpTree readTmp(const std::filesystem::path& root);
 

@@ -4,6 +4,7 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "identity/inf_file.h"
+#include "identity/software_version.h"
 #include "kit/description/value_places.h"
 #include "kit/host/bytes.h"
 #include "kit/host/sparse_content.h"
@@ -158,7 +159,7 @@ void printPart(std::ostream& out, const DecodedVersions& versions) {
         } else if (file.isApplication) {
             out << "not chosen: an application, but not the first one";
         } else {
-            out << "not chosen: its type has no \"Application\" in it";
+            out << "not chosen: its type has no \"" << APPLICATION_TYPE << "\" in it";
         }
         out << '\n';
         for (const auto& [key, value] : file.record) {

@@ -228,7 +228,7 @@ std::string runJson(const std::string& root, const kit::RunResult& result, const
     json["standardError"] = bytesJson(result.standardError);
     json["files"] = Json::array();
     for (const auto& [path, content] : after.entries) {
-        json["files"].push_back({{"path", bytesJson("/tmp/" + path)},
+        json["files"].push_back({{"path", bytesJson(pathInTmp(path))},
                                  {"before", bytesOrNull(before.file(path))},
                                  {"after", bytesOrNull(content)}});
     }

@@ -14,7 +14,7 @@ namespace orvane::desk {
 
 void printTmpChanges(std::ostream& out, const TmpTree& before, const TmpTree& after, bool isBrief) {
     for (const auto& [name, content] : after.entries) {
-        const std::string path = "/tmp/" + name;
+        const std::string path = pathInTmp(name);
         const std::optional<std::string> old = before.file(name);
         if (!content || old == content) {
             continue;

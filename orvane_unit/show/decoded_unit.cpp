@@ -49,7 +49,7 @@ std::string profileMeaning(std::int32_t profile) {
 std::string meaningOf(std::uint16_t number) {
     switch (number) {
     case RIGHT_HAND_DRIVE_PARAM:
-        return "rightHandDrive " + std::to_string(getRightHandDrive());
+        return "right-hand drive " + std::to_string(getRightHandDrive());
     case BRAND_PARAM:
         return "brand " + textBy(getBrandName);
     case FUEL_TYPE_PARAM:

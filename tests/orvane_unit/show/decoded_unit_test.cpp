@@ -31,7 +31,7 @@ TEST(DecodedUnitTest, ParametersAreDecoded) {
     EXPECT_EQ(unit.image.params[133].raw, 0xFFFF);
     EXPECT_EQ(unit.image.params[133].meaning,
               "audio profile 65535, generated from tuning blocks 3 and 2");
-    EXPECT_EQ(unit.image.params[21].meaning, "rightHandDrive 1");
+    EXPECT_EQ(unit.image.params[21].meaning, "right-hand drive 1");
     EXPECT_EQ(unit.image.params[35].meaning, "brand QUARION");
     EXPECT_EQ(unit.image.params[49].meaning, "fuel type cng, which is written nowhere");
     EXPECT_EQ(unit.image.params[170].raw, 255);
