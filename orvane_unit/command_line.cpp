@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// All subcommands, each a class: what its options are, and what it does. A new one is a class and
-// its name in chooseAndRun.
+// Each subcommand is a class: its options, and what it does with them. To add one, write a class
+// and name it in chooseAndRun.
 #include "orvane_unit/command_line.h"
 
 #include "kit/description/description_text.h"
@@ -51,7 +51,7 @@ namespace orvane::desk {
 
 namespace {
 
-/// A subcommand. Its options are members that the parser fills.
+/// A subcommand. The parser fills its members with the options.
 class Command {
 public:
     Command(CLI::App& app, const char* name, const char* what, const char* example)
@@ -432,13 +432,13 @@ int chooseAndRun(int argc, const char* const* argv) {
         throw kit::KitError(std::string(error.what()) +
                             (isRun ? "; orvane's own options follow --" : ""));
     }
-    // The parser has seen to it that there is one.
+    // There is one: the parser requires it.
     const auto chosen = std::find_if(commands.begin(), commands.end(),
                                      [](const auto& command) { return command->isChosen(); });
     return (*chosen)->run();
 }
 
-/// A complaint may have several lines, one for each thing that is wrong.
+/// Prints a complaint, which has a line for each thing that is wrong.
 void complain(const std::string& what) {
     std::istringstream lines(what);
     for (std::string line; std::getline(lines, line);) {

@@ -10,8 +10,8 @@ enum ExitStatus {
     EXIT_BAD_INPUT = 2,    ///< wrong use or bad input; a line on standard error says what
 };
 
-/// Reads the command line, does what it says, and returns the exit status. What goes wrong is one
-/// complaint on standard error; nothing is thrown.
+/// Reads the command line, does what it says, and returns the exit status. Prints on standard error
+/// what goes wrong; throws nothing.
 int runCommandLine(int argc, const char* const* argv);
 
 } // namespace orvane::desk

@@ -36,7 +36,7 @@ void printDifference(std::ostream& out, const OutputDifference& output) {
     }
 }
 
-std::string valueForEyes(const std::string& value) {
+std::string valueText(const std::string& value) {
     return value.empty() ? "(empty)" : value;
 }
 
@@ -101,8 +101,8 @@ void printConsequences(std::ostream& out, const std::vector<Consequence>& conseq
             out << "of no value that differs:\n";
         } else {
             out << kit::printable(keyText(change.key)) << ": "
-                << painted(Colour::removed, valueForEyes(change.before)) << " -> "
-                << painted(Colour::added, valueForEyes(change.after)) << '\n';
+                << painted(Colour::removed, valueText(change.before)) << " -> "
+                << painted(Colour::added, valueText(change.after)) << '\n';
         }
         if (consequence.outputs.empty()) {
             out << "  " << painted(Colour::faint, "moves no output") << '\n';

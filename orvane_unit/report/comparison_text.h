@@ -18,7 +18,7 @@ void printConsequences(std::ostream& out, const std::vector<Consequence>& conseq
 /// Prints each input that moves a line with the lines it moves, then all that move nothing.
 void printImpacts(std::ostream& out, const std::vector<Impact>& impacts);
 
-/// Draws a bar over the one drawn before, and wipes it out at the end.
+/// Draws a bar over the one drawn before, and erases it at the end.
 void printProgress(std::ostream& terminal, std::size_t done, std::size_t all);
 
 } // namespace orvane::desk

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The reports as JSON, one object on one line each. All have "format" (FORMAT, raised when a change
-// would break a reader), "command" and what the command was about; docs/orvane-unit.md has the
-// rest. Bytes are a text where they are UTF-8, else {"hex": "..."}.
+// The reports as JSON, one object on one line each. All have "format" (JSON_FORMAT, raised when a
+// change would break a reader), "command" and what the command was about; docs/orvane-unit.md has
+// the rest. Bytes are a text where they are UTF-8, else {"hex": "..."}.
 #pragma once
 
 #include "kit/enter/captured_run.h"

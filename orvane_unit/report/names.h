@@ -8,7 +8,7 @@
 
 namespace orvane::desk {
 
-/// Published: texts and JSON have the same names, which programs read.
+/// The published names, the same in texts and in JSON: programs read them.
 const char* nameOf(Outcome outcome);
 const char* nameOf(CrcVerdict verdict);
 const char* nameOf(PathKind kind);

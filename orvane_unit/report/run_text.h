@@ -7,7 +7,8 @@
 
 namespace orvane::desk {
 
-/// Prints a diff of each file of /tmp that a run has made or changed; `isBrief`, only its name.
+/// Prints a diff of each file in /tmp that a run has made or changed. With `isBrief`, prints only
+/// its name and size.
 void printTmpChanges(std::ostream& out, const TmpTree& before, const TmpTree& after, bool isBrief);
 
 } // namespace orvane::desk

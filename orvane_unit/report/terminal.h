@@ -7,7 +7,8 @@
 
 namespace orvane::desk {
 
-/// What a text is, as the number that a terminal takes for the colour (ECMA-48, "SGR").
+/// The colours by what they mean. The value is the number of the colour in an escape sequence
+/// (ECMA-48, "SGR").
 enum class Colour { good = 32, added = good, bad = 31, removed = bad, place = 36, faint = 2 };
 
 /// Whether standard output is a terminal and NO_COLOR is unset or empty.

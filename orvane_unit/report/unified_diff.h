@@ -8,12 +8,12 @@
 namespace orvane::desk {
 
 /// Prints a unified diff of the file `name`; nothing on a side where there is no file. Prints
-/// nothing when both sides are the same. Bytes that are no text are escaped.
+/// nothing when both sides are the same. Anything that is not text is escaped.
 void printUnifiedDiff(std::ostream& out, const std::string& name,
                       const std::optional<std::string>& before,
                       const std::optional<std::string>& after);
 
-/// A line without its line end, bytes that are no text escaped.
+/// A line without its line end. Anything that is not text is escaped.
 std::string printableLine(const std::string& line);
 
 } // namespace orvane::desk

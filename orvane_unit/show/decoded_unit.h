@@ -37,11 +37,11 @@ struct DecodedSlot {
     std::optional<std::string> bytes;
 };
 
-/// What can be said of the CRC; no place of the disk holds one to compare with.
+/// What can be said of the CRC. The disk holds none to compare it with.
 enum class CrcVerdict {
     computed,
     blank,      ///< the records are all zero
-    ambiguous,  ///< all ones, which is the value of a failure, too
+    ambiguous,  ///< all ones, which is also the value of a failure
     unreadable, ///< the disk can't be read
 };
 
@@ -76,7 +76,7 @@ struct DecodedUnit {
     std::vector<UnitFile> files;
 };
 
-/// Calls `visit(name, part)` for each part that can be asked for alone: one list for all reports.
+/// Calls `visit(name, part)` for each part that can be reported alone. All reports use this list.
 template <class Visit>
 void forEachPart(const DecodedUnit& unit, Visit visit) {
     visit("params", unit.image);
