@@ -7,6 +7,7 @@
 #include "kit/description/parse_description.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
+#include "tests/kit/description/description_equality.h"
 
 #include <algorithm>
 #include <cctype>

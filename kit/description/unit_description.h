@@ -20,10 +20,6 @@ struct ImageDescription {
     std::uint32_t size = CONFIG_IMAGE_SIZE;        ///< bytes; values beyond it are an error
     std::map<std::uint16_t, std::uint16_t> params; ///< by parameter number
     std::map<std::uint32_t, Bytes> bytes; ///< raw bytes by offset, put after the parameters
-
-    bool operator==(const ImageDescription& other) const {
-        return size == other.size && params == other.params && bytes == other.bytes;
-    }
 };
 
 /// The boot disk: zeros but for what is named here.
@@ -33,21 +29,12 @@ struct DiskDescription {
     std::optional<Bytes> aux;                          ///< through writeAuxArea
     std::map<std::uint32_t, TuningDescription> tuning; ///< by block id, through writeTuningArea
     std::map<std::uint64_t, Bytes> bytes; ///< raw bytes by offset from the start of the disk
-
-    bool operator==(const DiskDescription& other) const {
-        return size == other.size && slots == other.slots && aux == other.aux &&
-               tuning == other.tuning && bytes == other.bytes;
-    }
 };
 
 /// A file of zeros but for what is named here; the zeros take no room on the host.
 struct SparseFile {
     std::uint64_t size = 0;               ///< bytes
     std::map<std::uint64_t, Bytes> bytes; ///< by offset; they lie within the size
-
-    bool operator==(const SparseFile& other) const {
-        return size == other.size && bytes == other.bytes;
-    }
 };
 
 /// A whole unit, by absolute paths on it. No path is named twice but in `absent`, and nothing lies
@@ -60,12 +47,6 @@ struct UnitDescription {
     std::map<std::string, std::string> links;      ///< path -> target of a symbolic link
     std::vector<std::string> folders;              ///< further folders
     std::vector<std::string> absent; ///< paths at and below which nothing is made after all
-
-    bool operator==(const UnitDescription& other) const {
-        return image == other.image && disk == other.disk && files == other.files &&
-               sparseFiles == other.sparseFiles && links == other.links &&
-               folders == other.folders && absent == other.absent;
-    }
 };
 
 } // namespace orvane::kit

@@ -20,10 +20,6 @@ using TuningValue = std::variant<std::string, std::int64_t, std::vector<std::int
 struct TuningDescription {
     Bytes raw;                                 ///< at most 188 bytes
     std::map<std::string, TuningValue> fields; ///< by key, as in a tuning file
-
-    bool operator==(const TuningDescription& other) const {
-        return raw == other.raw && fields == other.fields;
-    }
 };
 
 } // namespace orvane::kit

@@ -2,6 +2,7 @@
 #include "kit/description/description_text.h"
 #include "kit/description/parse_description.h"
 #include "kit/description/toml_text.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/description/random_unit.h"
 
 #include <gtest/gtest.h>

@@ -5,6 +5,7 @@
 #include "kit/unit/describe_inputs.h"
 #include "kit/unit/describe_unit.h"
 #include "kit/unit/marker.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/unit/source_unit.h"
 
 #include <gtest/gtest.h>

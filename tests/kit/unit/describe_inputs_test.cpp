@@ -3,6 +3,7 @@
 #include "kit/enter/entered_root.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_inputs.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/unit/source_unit.h"
 #include "tests/support/permissions.h"
 

@@ -2,6 +2,7 @@
 #include "kit/host/host_file.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/description/random_unit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"

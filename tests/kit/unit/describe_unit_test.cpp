@@ -5,6 +5,7 @@
 #include "kit/host/kit_error.h"
 #include "kit/unit/describe_unit.h"
 #include "kit/unit/make_unit.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/description/random_unit.h"
 #include "tests/kit/unit/unit_tree.h"
 #include "tests/support/permissions.h"

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/tuning/tuning_encode.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/host/open_descriptors.h"
 #include "tests/kit/unit/edit_fixture.h"
 #include "tuning/tuning_file.h"

@@ -5,6 +5,7 @@
 #include "kit/unit/describe_unit.h"
 #include "kit/unit/make_unit.h"
 #include "orvane_unit/compare/impact.h"
+#include "tests/kit/description/description_equality.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/temporary_folder.h"
 
