@@ -6,6 +6,7 @@
 
 #include <charconv>
 #include <cstddef>
+#include <limits>
 #include <system_error>
 
 namespace orvane::kit {
@@ -42,24 +43,36 @@ Bytes hexBytes(std::string_view text) {
     return bytes;
 }
 
+bool hasHexPrefix(std::string_view text) {
+    return text.substr(0, HEX_PREFIX.size()) == HEX_PREFIX;
+}
+
 Bytes textOrHexBytes(std::string_view text) {
-    if (text.substr(0, HEX_PREFIX.size()) == HEX_PREFIX) {
+    if (hasHexPrefix(text)) {
         return hexBytes(text.substr(HEX_PREFIX.size()));
     }
     return Bytes(text);
 }
 
-std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what) {
-    const bool isHex = key.substr(0, 2) == "0x";
-    const std::string_view digits = isHex ? key.substr(2) : key;
+std::optional<std::uint64_t> wholeNumber(std::string_view text) {
+    const bool isHex = text.substr(0, 2) == "0x";
+    const std::string_view digits = isHex ? text.substr(2) : text;
     const char* const last = digits.data() + digits.size();
     std::uint64_t number = 0;
     const auto [end, error] = std::from_chars(digits.data(), last, number, isHex ? 16 : 10);
-    if (error != std::errc{} || end != last || number < range.least || number > range.greatest) {
+    if (error == std::errc::invalid_argument || end != last) {
+        return std::nullopt;
+    }
+    return error == std::errc{} ? number : std::numeric_limits<std::uint64_t>::max();
+}
+
+std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what) {
+    const std::optional<std::uint64_t> number = wholeNumber(key);
+    if (!number || *number < range.least || *number > range.greatest) {
         throw KitError(what + " must be from " + std::to_string(range.least) + " to " +
                        std::to_string(range.greatest) + ", not " + inQuotes(key));
     }
-    return number;
+    return *number;
 }
 
 } // namespace orvane::kit

@@ -53,10 +53,6 @@ std::string betweenQuotes(const std::string& text) {
     return quotes + text + quotes;
 }
 
-bool beginsWithHexPrefix(std::string_view text) {
-    return text.substr(0, HEX_PREFIX.size()) == HEX_PREFIX;
-}
-
 } // namespace
 
 bool isReadable(std::string_view text) {
@@ -96,15 +92,14 @@ std::string tomlHex(std::string_view bytes) {
 }
 
 std::string tomlTextOrHex(std::string_view bytes) {
-    return isReadable(bytes) && !beginsWithHexPrefix(bytes)
+    return isReadable(bytes) && !hasHexPrefix(bytes)
                ? tomlText(bytes)
                : betweenQuotes(std::string(HEX_PREFIX) + hexLines(bytes));
 }
 
 std::string tomlPath(std::string_view path) {
-    return isUtf8(path) && !beginsWithHexPrefix(path)
-               ? tomlText(path)
-               : tomlText(std::string(HEX_PREFIX) + hexText(path));
+    return isUtf8(path) && !hasHexPrefix(path) ? tomlText(path)
+                                               : tomlText(std::string(HEX_PREFIX) + hexText(path));
 }
 
 } // namespace orvane::kit

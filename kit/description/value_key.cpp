@@ -71,7 +71,7 @@ std::string partText(Part part, const ValueKey& key) {
 
 /// Enters `text` into `key`. Throws KitError.
 void readPart(Part part, std::string_view text, ValueKey& key) {
-    constexpr std::uint64_t GREATEST = std::numeric_limits<std::uint64_t>::max();
+    constexpr std::uint64_t GREATEST = std::numeric_limits<std::int64_t>::max();
     switch (part) {
     case Part::none:
         break;

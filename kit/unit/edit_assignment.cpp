@@ -16,14 +16,12 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <cstddef>
 #include <cstdint>
 #include <limits>
 #include <map>
 #include <optional>
 #include <string_view>
-#include <system_error>
 #include <utility>
 
 namespace orvane::kit {
@@ -35,29 +33,16 @@ using Kind = ValueKey::Kind;
 constexpr char SERIAL[] = "serial"; ///< another name for its slot
 constexpr std::uint64_t LONGEST_TUNING_FILE = std::uint64_t{1} << 20U; ///< bytes
 
-/// Takes `prefix` from the front of `text`, if it is there.
-bool takePrefix(std::string_view& text, std::string_view prefix) {
-    if (text.substr(0, prefix.size()) != prefix) {
-        return false;
-    }
-    text.remove_prefix(prefix.size());
-    return true;
-}
-
-/// A whole number, decimal or in hex; nothing for any other text.
+/// A whole number, decimal or in hex, negative after "-"; nothing for any other text. What is
+/// too great fits nowhere: the greatest number stands for it.
 std::optional<std::int64_t> numberIn(std::string_view text) {
-    const bool isNegative = takePrefix(text, "-");
-    const bool isHex = takePrefix(text, "0x");
-    const char* const last = text.data() + text.size();
-    std::uint64_t number = 0;
-    const auto [end, error] = std::from_chars(text.data(), last, number, isHex ? 16 : 10);
-    if (error == std::errc::invalid_argument || end != last) {
-        return {};
+    const bool isNegative = text.substr(0, 1) == "-";
+    const std::optional<std::uint64_t> number = wholeNumber(text.substr(isNegative ? 1 : 0));
+    if (!number) {
+        return std::nullopt;
     }
-    // What is greater fits nowhere either.
     constexpr std::uint64_t GREATEST = std::numeric_limits<std::int64_t>::max();
-    const auto magnitude =
-        static_cast<std::int64_t>(error == std::errc{} ? std::min(number, GREATEST) : GREATEST);
+    const auto magnitude = static_cast<std::int64_t>(std::min(*number, GREATEST));
     return isNegative ? -magnitude : magnitude;
 }
 

@@ -6,6 +6,7 @@
 #include "config/crc32.h"
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
+#include "kit/description/description_values.h"
 #include "kit/description/unit_layout.h"
 #include "kit/description/value_places.h"
 #include "kit/host/text.h"
@@ -48,12 +49,12 @@ std::string fileText(const std::string& bytes) {
 
 /// As `orvane-unit set` takes it.
 std::string textOrHex(const std::string& bytes) {
-    if (printable(bytes) == bytes && bytes.compare(0, 4, "hex:") != 0) {
+    if (printable(bytes) == bytes && !hasHexPrefix(bytes)) {
         return bytes;
     }
     std::string hex = hexText(bytes);
     hex.erase(std::remove(hex.begin(), hex.end(), ' '), hex.end());
-    return hex.size() <= LONGEST_SHOWN ? "hex:" + hex : fileText(bytes);
+    return hex.size() <= LONGEST_SHOWN ? std::string(HEX_PREFIX) + hex : fileText(bytes);
 }
 
 std::string tuningText(const TuningValue& value) {
