@@ -54,7 +54,7 @@ UnitDescription parseDescription(const std::string& text, const std::string& nam
 UnitDescription readDescription(const std::filesystem::path& file) {
     std::error_code error;
     if (std::filesystem::is_directory(file, error)) {
-        throw KitError(file.string() + " is a folder, not a description");
+        throw KitError("", file, " is a folder, not a description");
     }
     return parseDescription(readWholeFile(file), file.string());
 }

@@ -70,12 +70,13 @@ bool isFolder(const std::filesystem::path& path) {
 
 void changeRoot(const std::filesystem::path& root) {
     if (!isFolder(root)) {
-        throw KitError(root.string() + " is not a folder");
+        throw KitError("", root, " is not a folder");
     }
     if (!succeeds([&root] { return ::chroot(root.c_str()); })) {
-        const std::string remedy = errno == EPERM ? REMEDY : "";
-        throw KitError(systemError("cannot make " + root.string() + " the root directory").what() +
-                       remedy);
+        const int error = errno;
+        throw KitError("cannot make ", root,
+                       " the root directory: " + std::generic_category().message(error) +
+                           (error == EPERM ? REMEDY : ""));
     }
 }
 

@@ -45,7 +45,7 @@ ElfHeader readHeader(std::istream& in) {
 ElfHeader readElfHeader(const std::filesystem::path& file) {
     std::ifstream in(file, std::ios::binary);
     if (!in) {
-        throw systemError("cannot read " + file.string());
+        throw systemError("cannot read ", file);
     }
     unsigned char identity[EI_NIDENT] = {};
     in.read(reinterpret_cast<char*>(identity), sizeof identity);
@@ -57,10 +57,10 @@ ElfHeader readElfHeader(const std::filesystem::path& file) {
     } else if (isElf && identity[EI_CLASS] == ELFCLASS32) {
         header = readHeader<Elf32_Ehdr, Elf32_Phdr>(in);
     } else {
-        throw KitError(file.string() + " is not a little-endian ELF program");
+        throw KitError("", file, " is not a little-endian ELF program");
     }
     if (!in) {
-        throw KitError(file.string() + " is cut short");
+        throw KitError("", file, " is cut short");
     }
     return header;
 }

@@ -39,9 +39,9 @@ EnteredRoot::EnteredRoot(const std::filesystem::path& root)
         changeRoot(root);
     }
     if (::chdir("/") != 0) {
-        const std::string failure = systemError("cannot enter " + root.string()).what();
+        const KitError failure = systemError("cannot enter ", root);
         leaveRoot(outerRoot_, outerCwd_);
-        throw KitError(failure);
+        throw failure;
     }
 }
 

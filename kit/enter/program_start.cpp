@@ -30,7 +30,7 @@ std::string relativeToHost(const fs::path& file) {
     std::error_code error;
     const fs::path real = fs::canonical(file, error);
     if (error) {
-        throw KitError("cannot find " + file.string() + ": " + error.message());
+        throw KitError("cannot find ", file, ": " + error.message());
     }
     return real.relative_path().string();
 }
@@ -110,7 +110,7 @@ ProgramStart staticStart(const Program& program, const std::string& name) {
     ProgramStart start;
     start.binary = Descriptor(::open(program.path.c_str(), O_RDONLY | O_CLOEXEC));
     if (!start.binary.isOpen()) {
-        throw systemError("cannot open " + program.path.string());
+        throw systemError("cannot open ", program.path);
     }
     start.argv = {name};
     return start;
@@ -124,7 +124,7 @@ ProgramStart findProgramStart(const Program& program) {
     const bool isEmulated =
         header.machine == EM_ARM && (ownMachine() != EM_ARM || OWN_EMULATOR[0] != '\0');
     if (isEmulated && !header.interpreter.empty()) {
-        throw KitError(program.path.string() +
+        throw KitError("", program.path,
                        " is a dynamic 32-bit ARM program: link it with -static to run it here");
     }
     ProgramStart start = isEmulated ? emulatedStart(program, name)
@@ -145,7 +145,7 @@ void enterRootFor(const ProgramStart& start, const std::filesystem::path& root) 
     }
     changeRoot(root);
     if (isByDescriptor && ::chdir("/") != 0) {
-        throw systemError("cannot enter " + root.string());
+        throw systemError("cannot enter ", root);
     }
 }
 

@@ -15,11 +15,11 @@ namespace orvane::kit {
 ChangedFile::ChangedFile(std::filesystem::path path)
     : path_(std::move(path)), descriptor_(::open(path_.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC)) {
     if (!descriptor_.isOpen()) {
-        throw systemError("cannot change " + path_.string());
+        throw systemError("cannot change ", path_);
     }
     struct stat state {};
     if (::fstat(descriptor_.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
-        throw KitError(path_.string() + " is not a regular file");
+        throw KitError("", path_, " is not a regular file");
     }
 }
 

@@ -42,15 +42,6 @@ fs::path makeBeside(const fs::path& place) {
     }
 }
 
-/// The same text with the final paths in place of those beside.
-std::string withFinalPaths(std::string text, const std::string& beside, const std::string& place) {
-    for (std::size_t at = text.find(beside); at != std::string::npos;
-         at = text.find(beside, at + place.size())) {
-        text.replace(at, beside.size(), place);
-    }
-    return text;
-}
-
 /// Removes the folder beside, unless it has been renamed.
 class Cleaner {
 public:
@@ -66,13 +57,15 @@ private:
     fs::path beside_;
 };
 
-std::string reasonOf(const fs::filesystem_error& failure) {
-    return "cannot make " + failure.path1().string() + ": " + failure.code().message();
+/// Of the two paths of a link's failure the second is the link.
+KitError errorOf(const fs::filesystem_error& failure) {
+    const fs::path& path = failure.path2().empty() ? failure.path1() : failure.path2();
+    return {"cannot make ", path, ": " + failure.code().message()};
 }
 
 /// The system's own text of a failure that has no place within the folder.
 [[noreturn]] void failAtFolder(const fs::path& folder, const std::error_code& error) {
-    throw KitError("cannot make " + folder.string() + ": " + error.message());
+    throw KitError("cannot make ", folder, ": " + error.message());
 }
 
 } // namespace
@@ -82,7 +75,7 @@ void makeFinishedFolder(const fs::path& folder, const std::function<void(const f
     const fs::file_status status = fs::status(folder, error);
     const bool isThere = fs::exists(status);
     if (isThere && (!fs::is_directory(status) || !fs::is_empty(folder, error) || error)) {
-        throw KitError(folder.string() + " is there already and is not an empty folder");
+        throw KitError("", folder, " is there already and is not an empty folder");
     }
     if (folder.empty()) {
         failAtFolder(folder, std::make_error_code(std::errc::no_such_file_or_directory));
@@ -102,9 +95,9 @@ void makeFinishedFolder(const fs::path& folder, const std::function<void(const f
     try {
         fill(beside);
     } catch (const fs::filesystem_error& failure) {
-        throw KitError(withFinalPaths(reasonOf(failure), beside.string(), folder.string()));
+        throw errorOf(failure).moved(beside, folder);
     } catch (const KitError& failure) {
-        throw KitError(withFinalPaths(failure.what(), beside.string(), folder.string()));
+        throw failure.moved(beside, folder);
     }
     if (isThere) {
         fs::permissions(beside, status.permissions(), error);

@@ -11,9 +11,9 @@ namespace orvane::kit {
 /// Has `fill` fill an empty folder beside `folder`, then renames it to `folder`, which must be
 /// absent or an empty folder. The folder beside is named "." + the folder's name + ".unfinished-"
 /// and a number, and has the access rights that an empty `folder` had. What `fill` throws, this
-/// throws on as KitError, with the paths that will never be replaced by the final ones; the folder
-/// beside is then removed and `folder` is as it was. Also throws KitError when `folder` is anything
-/// but absent or empty, or the system refuses.
+/// throws on: a failure of the file system as KitError, and a KitError about a path of the folder
+/// beside as one about the final path. The folder beside is then removed and `folder` is as it was.
+/// Also throws KitError when `folder` is anything but absent or empty, or the system refuses.
 void makeFinishedFolder(const std::filesystem::path& folder,
                         const std::function<void(const std::filesystem::path&)>& fill);
 

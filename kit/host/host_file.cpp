@@ -15,7 +15,7 @@ namespace orvane::kit {
 Descriptor makeSparseFile(const std::filesystem::path& file, std::uint64_t size) {
     Descriptor descriptor(::open(file.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
     if (!descriptor.isOpen() || ::ftruncate(descriptor.number(), static_cast<off_t>(size)) != 0) {
-        throw systemError("cannot make " + file.string());
+        throw systemError("cannot make ", file);
     }
     return descriptor;
 }
@@ -27,7 +27,7 @@ void writeAt(const Descriptor& descriptor, const std::filesystem::path& file, st
         const ssize_t count = ::pwrite(descriptor.number(), bytes.data() + done,
                                        bytes.size() - done, static_cast<off_t>(offset + done));
         if (count <= 0) {
-            throw systemError("cannot write " + file.string());
+            throw systemError("cannot write ", file);
         }
         done += static_cast<std::size_t>(count);
     }
@@ -36,7 +36,7 @@ void writeAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 Descriptor openForReading(const std::filesystem::path& file) {
     Descriptor descriptor(::open(file.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
     if (!descriptor.isOpen()) {
-        throw systemError("cannot read " + file.string());
+        throw systemError("cannot read ", file);
     }
     return descriptor;
 }
@@ -44,7 +44,7 @@ Descriptor openForReading(const std::filesystem::path& file) {
 std::uint64_t sizeOf(const Descriptor& descriptor, const std::filesystem::path& file) {
     const off_t size = ::lseek(descriptor.number(), 0, SEEK_END);
     if (size < 0) {
-        throw systemError("cannot measure " + file.string());
+        throw systemError("cannot measure ", file);
     }
     return static_cast<std::uint64_t>(size);
 }
@@ -57,7 +57,7 @@ Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, st
         const ssize_t count = ::pread(descriptor.number(), bytes.data() + done, bytes.size() - done,
                                       static_cast<off_t>(offset + done));
         if (count < 0) {
-            throw systemError("cannot read " + file.string());
+            throw systemError("cannot read ", file);
         }
         if (count == 0) {
             bytes.resize(done);

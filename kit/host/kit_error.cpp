@@ -6,8 +6,28 @@
 
 namespace orvane::kit {
 
+namespace fs = std::filesystem;
+
+KitError::KitError(const std::string& what) : KitError(what, "", "") {}
+
+KitError::KitError(const std::string& before, const fs::path& path, const std::string& after)
+    : std::runtime_error(before + path.string() + after), before_(before), path_(path),
+      after_(after) {}
+
+KitError KitError::moved(const fs::path& from, const fs::path& to) const {
+    const fs::path below = path_.lexically_relative(from);
+    if (below.empty() || *below.begin() == "..") {
+        return *this;
+    }
+    return {before_, below == "." ? to : to / below, after_};
+}
+
 KitError systemError(const std::string& what) {
-    return KitError(what + ": " + std::generic_category().message(errno));
+    return systemError(what, "");
+}
+
+KitError systemError(const std::string& before, const fs::path& path, const std::string& after) {
+    return {before, path, after + ": " + std::generic_category().message(errno)};
 }
 
 } // namespace orvane::kit

@@ -3,6 +3,7 @@
 // The kit's one kind of failure.
 #pragma once
 
+#include <filesystem>
 #include <stdexcept>
 #include <string>
 
@@ -10,11 +11,27 @@ namespace orvane::kit {
 
 /// What the kit throws for wrong use, a bad root or a refusing system: one clear line without a
 /// newline at its end.
-struct KitError : std::runtime_error {
-    using std::runtime_error::runtime_error;
+class KitError : public std::runtime_error {
+public:
+    explicit KitError(const std::string& what);
+    /// An error about `path`: its text is `before`, the path and `after`.
+    KitError(const std::string& before, const std::filesystem::path& path,
+             const std::string& after);
+
+    /// The same error as if what lies at or below `from` lay at or below `to`.
+    KitError moved(const std::filesystem::path& from, const std::filesystem::path& to) const;
+
+private:
+    std::string before_; ///< all of the text where the error is about no path
+    std::filesystem::path path_;
+    std::string after_;
 };
 
 /// The error for a system call that has just failed: `what`, a colon, and the text of errno.
 KitError systemError(const std::string& what);
+
+/// The same about `path`: `before`, the path and `after`, a colon, and the text of errno.
+KitError systemError(const std::string& before, const std::filesystem::path& path,
+                     const std::string& after = "");
 
 } // namespace orvane::kit

@@ -93,8 +93,8 @@ Runs nonZeroRuns(const Descriptor& descriptor, const std::filesystem::path& file
             const ssize_t count =
                 ::pread(descriptor.number(), buffer.data(), wanted, static_cast<off_t>(at));
             if (count <= 0) {
-                throw count < 0 ? systemError("cannot read " + file.string())
-                                : KitError(file.string() + " has become shorter");
+                throw count < 0 ? systemError("cannot read ", file)
+                                : KitError("", file, " has become shorter");
             }
             collector.take({buffer.data(), static_cast<std::size_t>(count)}, at);
             at += static_cast<std::uint64_t>(count);

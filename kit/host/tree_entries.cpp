@@ -15,7 +15,7 @@ namespace fs = std::filesystem;
 /// Throws what the system says of `path`.
 void check(const std::error_code& error, const fs::path& path) {
     if (error) {
-        throw KitError("cannot read " + path.string() + ": " + error.message());
+        throw KitError("cannot read ", path, ": " + error.message());
     }
 }
 
@@ -50,7 +50,7 @@ fs::file_type kindBehind(const fs::path& entry) {
     if (error == std::errc::too_many_symbolic_link_levels) {
         return fs::file_type::not_found;
     }
-    throw KitError("cannot read " + entry.string() + ": " + error.message());
+    throw KitError("cannot read ", entry, ": " + error.message());
 }
 
 std::string targetOf(const fs::path& link) {

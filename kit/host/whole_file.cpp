@@ -24,7 +24,7 @@ Descriptor openStream(const std::filesystem::path& file) {
 }
 
 KitError readError(const std::filesystem::path& file) {
-    return systemError("cannot read " + file.string());
+    return systemError("cannot read ", file);
 }
 
 Bytes readToEnd(const Descriptor& descriptor, const std::filesystem::path& file) {
@@ -65,7 +65,7 @@ Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
     const Descriptor descriptor = openForReading(file);
     struct stat state {};
     if (::fstat(descriptor.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
-        throw KitError(file.string() + " is not a regular file");
+        throw KitError("", file, " is not a regular file");
     }
     if (static_cast<std::uint64_t>(state.st_size) > limit) {
         throw KitError(file.string() + " has " + std::to_string(state.st_size) +

@@ -36,10 +36,10 @@ bool isKitUnit(const fs::path& root) {
 void requireKitUnit(const fs::path& root) {
     std::error_code error;
     if (!fs::is_directory(root, error)) {
-        throw KitError(root.string() + " is not a folder");
+        throw KitError("", root, " is not a folder");
     }
     if (isRootDirectory(root)) {
-        throw KitError(root.string() + " is the root directory of this system, not a unit");
+        throw KitError("", root, " is the root directory of this system, not a unit");
     }
     if (!isKitUnit(root)) {
         throw KitError(root.string() + " is not a unit that orvane-unit made: it has no file " +

@@ -85,14 +85,35 @@ TEST_F(FinishedFolderTest, AccessRightsOfAnEmptyFolderAreKept) {
 }
 
 TEST_F(FinishedFolderTest, FailureLeavesNothingAndNamesTheFinalPath) {
+    for (const char* below : {"a", "a/b", ""}) {
+        const fs::path named = *below == '\0' ? place() : place() / below;
+        EXPECT_EQ(refusalOf(place(),
+                            [&](const fs::path& folder) {
+                                putFile(folder);
+                                throw kit::KitError("no ", *below == '\0' ? folder : folder / below,
+                                                    " here");
+                            }),
+                  "no " + named.string() + " here");
+        EXPECT_EQ(folderNames(above()), Names{});
+    }
+}
+
+TEST_F(FinishedFolderTest, FailureAboutAnotherPathOrNoneIsToldAsItIs) {
+    for (const fs::path& path : {fs::path("/proc/none"), above(), fs::path()}) {
+        EXPECT_EQ(
+            refusalOf(place(), [&](const fs::path&) { throw kit::KitError("no ", path, " here"); }),
+            "no " + path.string() + " here");
+    }
+    EXPECT_EQ(refusalOf(place(), [](const fs::path&) { throw kit::KitError("no luck"); }),
+              "no luck");
+}
+
+TEST_F(FinishedFolderTest, LinkThatCannotBeMadeIsNamedAndNotItsTarget) {
     EXPECT_EQ(refusalOf(place(),
                         [](const fs::path& folder) {
-                            putFile(folder);
-                            throw kit::KitError("no " + (folder / "a").string() + ", no " +
-                                                (folder / "b").string());
+                            fs::create_symlink("/target", folder / "none/link");
                         }),
-              "no " + (place() / "a").string() + ", no " + (place() / "b").string());
-    EXPECT_EQ(folderNames(above()), Names{});
+              "cannot make " + (place() / "none/link").string() + ": No such file or directory");
 }
 
 TEST_F(FinishedFolderTest, RefusalOfTheFileSystemNamesTheFinalPath) {
