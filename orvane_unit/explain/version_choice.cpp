@@ -98,18 +98,18 @@ Origin versionDigitsOrigin(const VersionFiles& versions) {
     }
     const std::string version = versionText(versions.files[*versions.chosen].record);
     const VersionComponents components = versionComponents(version);
-    std::vector<Reason> reasons;
+    std::vector<Reason> faults;
     if (isIncomplete(version)) {
-        reasons.push_back(Reason::versionIncomplete);
+        faults.push_back(Reason::versionIncomplete);
     }
     if (!std::all_of(components.begin(), components.end(), isNumeric)) {
-        reasons.push_back(Reason::versionNotNumeric);
+        faults.push_back(Reason::versionNotNumeric);
     }
     if (!std::all_of(components.begin(), components.end(), fitsOneByte)) {
-        reasons.push_back(Reason::versionOutOfRange);
+        faults.push_back(Reason::versionOutOfRange);
     }
-    if (!reasons.empty()) {
-        origin.reasons = reasons;
+    if (!faults.empty()) {
+        origin.reasons = faults;
     }
     return origin;
 }

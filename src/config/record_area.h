@@ -2,7 +2,7 @@
 //
 // Byte access to the record area of the raw boot disk. Every operation opens the device, seeks
 // relative to its end, transfers once, and closes: nothing is kept between calls, and a transfer
-// that comes out short counts as success. All return 0 or -1; none tells causes apart.
+// that comes out short counts as success. All return 0 or -1, whatever the cause.
 #pragma once
 
 #include <cstdint>

@@ -8,7 +8,8 @@
 
 namespace orvane {
 
-/// One parsed file: values by key, in the byte-wise order of the keys. Both without blanks around.
+/// One parsed file: values by key, in the byte-wise order of the keys. Neither has surrounding
+/// blanks.
 using Inf_Data = std::map<std::string, std::string>;
 
 /// Splits one line, given without its line end. False, with both outputs as they were, for a line

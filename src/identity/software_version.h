@@ -18,11 +18,11 @@ namespace orvane {
 /// Folder of the version description files, with its trailing slash.
 constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 
-/// The keys of a version description file that count here.
+/// The keys of a version description file that matter here.
 constexpr char TYPE_KEY[] = "Type";
 constexpr char VERSION_KEY[] = "Version Number";
 
-/// What stands in the "Type" of the application, and for a version that there is none of.
+/// The "Type" of the application contains the one; the other stands for a missing version.
 constexpr char APPLICATION_TYPE[] = "Application";
 constexpr char NO_VERSION[] = "N/A";
 
@@ -35,7 +35,7 @@ constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 /// Whether the file at `path` is a version description file: ".inf" may stand anywhere in it.
 bool isVersionFile(const std::string& path);
 
-/// The version description files of VERSION_DIR, one by one in the order of the directory listing.
+/// The version description files of VERSION_DIR, one by one, in the order of the directory listing.
 class VersionFileListing {
 public:
     VersionFileListing();
