@@ -59,8 +59,9 @@ def limited(mutants: Sequence[Mutant], limit: int, seed: str) -> list[Mutant]:
 
 def argument_parser(name: str, description: str | None) -> argparse.ArgumentParser:
     parser = argparse.ArgumentParser(prog=name, description=description)
-    parser.add_argument("--only", metavar="FILE", help="one source, such as src/main/options.cpp")
-    parser.add_argument("--line", type=int, help="of that file, one line")
+    parser.add_argument("--only", metavar="FILE", action="append", default=[],
+                        help="a source, such as src/main/options.cpp; more than once for several")
+    parser.add_argument("--line", type=int, help="of those, one line")
     parser.add_argument("--jobs", type=int, default=2)
     parser.add_argument("--seed", default="1", help="of what is drawn")
     parser.add_argument("--list", action="store_true", help="only show the mutants")
@@ -89,7 +90,8 @@ def choose(options: argparse.Namespace, *folders: str) -> Choice:
     made = make_mutants(sources)
     chosen = [mutant for mutant in sample(made, options.seed)
               if mutant.path.startswith(folders or ("",)) and
-              options.only in (None, mutant.path) and options.line in (None, mutant.line)]
+              (not options.only or mutant.path in options.only) and
+              options.line in (None, mutant.line)]
     return Choice(scratch, made, chosen, {source.path: source.text for source in sources})
 
 
@@ -135,12 +137,12 @@ def print_table(mutants: Sequence[Mutant], verdicts: Sequence[str],
 
 
 def stale_entries(name: str, entries: Sequence[Entry], made: Sequence[Mutant],
-                  untrue: Mapping[Key, str], only: str | None) -> list[str]:
+                  untrue: Mapping[Key, str], only: Sequence[str]) -> list[str]:
     """What the list `name` has and is no mutant at all, or one whose entry is untrue, and why."""
     known = {mutant.key() for mutant in made}
     problems = []
     for entry in entries:
-        if only in (None, entry.path) and entry.key() not in known:
+        if (not only or entry.path in only) and entry.key() not in known:
             problems.append(f"{name}:{entry.line}: there is no such mutant")
         elif entry.key() in untrue:
             problems.append(f"{name}:{entry.line}: {untrue[entry.key()]}")

@@ -149,7 +149,7 @@ def main(arguments: Sequence[str]) -> int:
     listed = {entry.key() for entry in entries}
     print_differences(choice, tried, listed)
     # One file alone may not have as many.
-    fewest = min(FEWEST, options.limit) if options.only is None else 0
+    fewest = min(FEWEST, options.limit) if not options.only else 0
     is_good = report(tried, listed, fewest)
     problems = [
         *stale_entries(UNEXPLAINED.name, entries, choice.made, untrue_entries(tried), options.only),
