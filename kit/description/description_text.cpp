@@ -2,6 +2,8 @@
 #include "kit/description/description_text.h"
 
 #include "kit/description/toml_text.h"
+#include "kit/host/bytes.h"
+#include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
 #include <array>

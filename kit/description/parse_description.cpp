@@ -17,7 +17,6 @@
 #include <string>
 #include <system_error>
 #include <utility>
-#include <vector>
 
 namespace orvane::kit {
 

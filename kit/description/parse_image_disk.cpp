@@ -15,13 +15,13 @@
 #include "kit/tuning/tuning_encode.h"
 #include "tuning/dps_block.h"
 
+#include <array>
 #include <cstdint>
 #include <limits>
 #include <map>
 #include <optional>
 #include <string>
 #include <type_traits>
-#include <variant>
 #include <vector>
 
 namespace orvane::kit {

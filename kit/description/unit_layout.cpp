@@ -1,7 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/unit_layout.h"
 
+#include "config/boot_disk.h"
+#include "config/config_store.h"
 #include "main/unit_files.h"
+#include "writers/template_merge.h"
 
 #include <algorithm>
 #include <iterator>

@@ -4,8 +4,8 @@
 #pragma once
 
 #include "config/param_catalogue.h"
-#include "kit/description/unit_description.h"
 #include "kit/description/value_key.h"
+#include "kit/host/bytes.h"
 
 #include <cstdint>
 #include <string>

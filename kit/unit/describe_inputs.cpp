@@ -14,6 +14,8 @@
 #include "kit/unit/describe_unit.h"
 #include "main/unit_files.h"
 #include "platform/shared_memory.h"
+#include "tuning/audio_profile.h"
+#include "writers/template_merge.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>

@@ -8,6 +8,7 @@
 #include "kit/host/host_file.h"
 #include "kit/host/little_endian.h"
 #include "kit/host/sparse_content.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
 #include "kit/unit/describe_unit.h"
 #include "tuning/dps_block.h"
@@ -24,6 +25,7 @@
 #include <string>
 #include <string_view>
 #include <utility>
+#include <vector>
 
 namespace orvane::kit {
 

@@ -18,11 +18,13 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <iterator>
 #include <limits>
 #include <map>
 #include <optional>
 #include <string_view>
 #include <utility>
+#include <variant>
 
 namespace orvane::kit {
 

@@ -19,6 +19,10 @@
 #include "tuning/dps_block.h"
 
 #include <array>
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
 #include <type_traits>
 
 namespace orvane::kit {

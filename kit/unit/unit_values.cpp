@@ -9,9 +9,10 @@
 #include "kit/description/description_values.h"
 #include "kit/description/unit_layout.h"
 #include "kit/description/value_places.h"
+#include "kit/host/bytes.h"
 #include "kit/host/text.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/tuning/tuning_encode.h"
-#include "kit/unit/describe_unit.h"
 #include "tuning/dps_block.h"
 
 #include <algorithm>
@@ -22,6 +23,7 @@
 #include <map>
 #include <optional>
 #include <sstream>
+#include <string_view>
 #include <variant>
 
 namespace orvane::kit {

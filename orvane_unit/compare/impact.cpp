@@ -7,6 +7,7 @@
 #include "config/record_slots.h"
 #include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
+#include "kit/host/bytes.h"
 #include "kit/host/changed_file.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/little_endian.h"
