@@ -32,7 +32,7 @@ public:
         }
     }
 
-    Runs runs;
+    SparseContent runs;
 
 private:
     void takePage(std::string_view page, std::uint64_t offset) {
@@ -74,14 +74,14 @@ std::uint64_t seekNext(const Descriptor& descriptor, std::uint64_t offset, int w
 
 } // namespace
 
-Runs nonZeroRuns(std::string_view bytes, std::uint64_t offset) {
+SparseContent sparseContent(std::string_view bytes, std::uint64_t offset) {
     RunCollector collector;
     collector.take(bytes, offset);
     return std::move(collector.runs);
 }
 
-Runs nonZeroRuns(const Descriptor& descriptor, const std::filesystem::path& file,
-                 std::uint64_t size) {
+SparseContent sparseContent(const Descriptor& descriptor, const std::filesystem::path& file,
+                            std::uint64_t size) {
     RunCollector collector;
     Bytes buffer(CHUNK, '\0');
     std::uint64_t end = 0;
@@ -108,7 +108,7 @@ bool isAllZero(std::string_view bytes) {
            (bytes[0] == '\0' && std::memcmp(bytes.data(), bytes.data() + 1, bytes.size() - 1) == 0);
 }
 
-Bytes withoutEndZeros(const Bytes& bytes) {
+Bytes withoutTrailingZeros(const Bytes& bytes) {
     return bytes.substr(0, bytes.find_last_not_of('\0') + 1);
 }
 

@@ -16,21 +16,22 @@ namespace orvane::kit {
 /// So many zero bytes or more between two others end a run; fewer are part of it.
 constexpr std::uint64_t RUN_GAP = 16;
 
-/// The runs of bytes that are not zero, by offset. Each begins and ends with such a byte.
-using Runs = std::map<std::uint64_t, Bytes>;
+/// Mostly zeros: the runs of other bytes, by offset. Each begins and ends with a byte that is not
+/// zero.
+using SparseContent = std::map<std::uint64_t, Bytes>;
 
-/// The runs of `bytes`, which stand at `offset`.
-Runs nonZeroRuns(std::string_view bytes, std::uint64_t offset = 0);
+/// The content of `bytes`, which stand at `offset`.
+SparseContent sparseContent(std::string_view bytes, std::uint64_t offset = 0);
 
-/// The runs of the first `size` bytes of a file or device; holes are skipped where it tells them.
-/// Throws KitError, `file` in its text.
-Runs nonZeroRuns(const Descriptor& descriptor, const std::filesystem::path& file,
-                 std::uint64_t size);
+/// The content of the first `size` bytes of a file or device; holes are skipped where it tells
+/// them. Throws KitError, `file` in its text.
+SparseContent sparseContent(const Descriptor& descriptor, const std::filesystem::path& file,
+                            std::uint64_t size);
 
 /// Whether all of `bytes` are zero.
 bool isAllZero(std::string_view bytes);
 
 /// `bytes` without the zeros at their end.
-Bytes withoutEndZeros(const Bytes& bytes);
+Bytes withoutTrailingZeros(const Bytes& bytes);
 
 } // namespace orvane::kit

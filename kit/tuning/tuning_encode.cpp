@@ -3,6 +3,7 @@
 
 #include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/little_endian.h"
 #include "kit/host/sparse_content.h"
 #include "kit/host/text.h"
 
@@ -62,20 +63,14 @@ std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& va
 
 /// Puts one number, known to be in range.
 void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std::int64_t number) {
-    const auto bits = static_cast<std::uint16_t>(number); // two's complement
-    const std::size_t at = field.offset + element * dpsElementSize(field.encoding);
-    switch (field.encoding) {
-    case DpsEncoding::code2:
-        block.bytes[at] = static_cast<std::uint8_t>((block.bytes[at] & ~(3U << field.bit)) |
-                                                    (unsigned{bits} << field.bit));
-        break;
-    case DpsEncoding::i16:
-        block.bytes[at + 1] = static_cast<std::uint8_t>(bits >> 8U);
-        [[fallthrough]];
-    case DpsEncoding::u8:
-        block.bytes[at] = static_cast<std::uint8_t>(bits);
-        break;
+    const std::size_t size = dpsElementSize(field.encoding);
+    const std::size_t at = field.offset + element * size;
+    auto bits = static_cast<std::uint64_t>(number); // two's complement
+    if (field.encoding == DpsEncoding::code2) {
+        bits = (block.bytes[at] & ~(3U << field.bit)) | bits << field.bit;
     }
+    const Bytes bytes = littleEndian(bits, size);
+    std::copy(bytes.begin(), bytes.end(), block.bytes.begin() + static_cast<std::ptrdiff_t>(at));
 }
 
 } // namespace
@@ -167,7 +162,7 @@ TuningDescription describeTuningBlock(const DpsBlock& block) {
         value = word.empty() ? TuningValue(numbers.front()) : TuningValue(word);
     }
     const DpsBlock rest = withoutFields(block);
-    description.raw = withoutEndZeros(Bytes(rest.bytes.begin(), rest.bytes.end()));
+    description.raw = withoutTrailingZeros(Bytes(rest.bytes.begin(), rest.bytes.end()));
     return description;
 }
 

@@ -51,8 +51,8 @@ void takeSlots(Bytes& area, DiskDescription& disk) {
             continue;
         }
         const SlotPlace place = slotPlace(slot);
-        const Bytes bytes =
-            withoutEndZeros(takePart(area, static_cast<std::int64_t>(place.offset), place.size));
+        const Bytes bytes = withoutTrailingZeros(
+            takePart(area, static_cast<std::int64_t>(place.offset), place.size));
         if (!bytes.empty()) {
             disk.slots.emplace(slot, bytes);
         }
@@ -87,7 +87,7 @@ std::set<std::uint64_t> bordersOfParts() {
 void describeRecordArea(Bytes area, DiskDescription& disk) {
     takeSlots(area, disk);
     const Bytes aux =
-        withoutEndZeros(takePart(area, RECORD_AREA_SIZE - AUX_AREA_START, AUX_AREA_SIZE));
+        withoutTrailingZeros(takePart(area, RECORD_AREA_SIZE - AUX_AREA_START, AUX_AREA_SIZE));
     if (!aux.empty()) {
         disk.aux = aux;
     }
@@ -97,7 +97,7 @@ void describeRecordArea(Bytes area, DiskDescription& disk) {
     for (const std::uint64_t border : bordersOfParts()) {
         const auto end = static_cast<std::size_t>(border);
         disk.bytes.merge(
-            nonZeroRuns(std::string_view(area).substr(begin, end - begin), base + begin));
+            sparseContent(std::string_view(area).substr(begin, end - begin), base + begin));
         begin = end;
     }
 }
@@ -122,7 +122,7 @@ ImageDescription describeImage(const Bytes& image) {
             description.params.emplace(number, static_cast<std::uint16_t>(value));
         }
     }
-    for (auto& [offset, bytes] : nonZeroRuns(rest)) {
+    for (auto& [offset, bytes] : sparseContent(rest)) {
         description.bytes.emplace(static_cast<std::uint32_t>(offset), bytes);
     }
     return description;
@@ -133,7 +133,7 @@ DiskDescription describeDisk(const Descriptor& descriptor, const std::filesystem
     DiskDescription disk;
     disk.size = size;
     const std::uint64_t base = hasRecordArea(size) ? size - RECORD_AREA_SIZE : size;
-    disk.bytes = nonZeroRuns(descriptor, file, base);
+    disk.bytes = sparseContent(descriptor, file, base);
     if (hasRecordArea(size)) {
         Bytes area = readAt(descriptor, file, base, RECORD_AREA_SIZE);
         area.resize(RECORD_AREA_SIZE);
@@ -147,7 +147,7 @@ DiskDescription describeDisk(const Bytes& content) {
     disk.size = content.size();
     const std::size_t base =
         hasRecordArea(disk.size) ? content.size() - RECORD_AREA_SIZE : content.size();
-    disk.bytes = nonZeroRuns(std::string_view(content).substr(0, base));
+    disk.bytes = sparseContent(std::string_view(content).substr(0, base));
     if (hasRecordArea(disk.size)) {
         describeRecordArea(content.substr(base), disk);
     }
@@ -157,7 +157,7 @@ DiskDescription describeDisk(const Bytes& content) {
 void describeFile(const Descriptor& descriptor, const std::filesystem::path& file,
                   const std::string& path, UnitDescription& unit) {
     const std::uint64_t size = sizeOf(descriptor, file);
-    Runs runs = nonZeroRuns(descriptor, file, size);
+    SparseContent runs = sparseContent(descriptor, file, size);
     std::uint64_t cost = 0;
     for (const auto& [offset, bytes] : runs) {
         cost += RUN_COST + bytes.size();

@@ -68,7 +68,7 @@ std::string contentText(const std::optional<std::string>& bytes) {
     if (!bytes) {
         return "-";
     }
-    const std::string text = kit::withoutEndZeros(*bytes);
+    const std::string text = kit::withoutTrailingZeros(*bytes);
     if (text.empty()) {
         return painted(Colour::faint, "zeros");
     }
@@ -138,7 +138,7 @@ void printPart(std::ostream& out, const TuningArea& tuning) {
         const DpsBlock& block = tuning.blocks.at(static_cast<std::size_t>(id));
         out << "tuning block " << id << purposeOf(id);
         const std::string bytes(block.bytes.begin(), block.bytes.end());
-        if (kit::withoutEndZeros(bytes).empty()) {
+        if (kit::withoutTrailingZeros(bytes).empty()) {
             out << ": " << painted(Colour::faint, "zeros") << '\n';
             continue;
         }

@@ -93,7 +93,8 @@ CrcVerdict verdictOn(const DecodedRecords& records) {
         return CrcVerdict::ambiguous;
     }
     const std::optional<std::string>& range = records.slots.at(CRC_RECORD_SLOT).bytes;
-    return range && kit::withoutEndZeros(*range).empty() ? CrcVerdict::blank : CrcVerdict::computed;
+    return range && kit::withoutTrailingZeros(*range).empty() ? CrcVerdict::blank
+                                                              : CrcVerdict::computed;
 }
 
 DecodedRecords decodeRecords() {

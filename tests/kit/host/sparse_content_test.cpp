@@ -26,13 +26,13 @@ class NonZeroRunsTest : public ::testing::Test {
 protected:
     fs::path file() const { return folder_.path() / "file"; }
 
-    kit::Runs runsOfFile() const {
-        return kit::nonZeroRuns(kit::openForReading(file()), file(), fs::file_size(file()));
+    kit::SparseContent runsOfFile() const {
+        return kit::sparseContent(kit::openForReading(file()), file(), fs::file_size(file()));
     }
 
     /// The same from memory and from a file.
-    void expectRuns(const std::string& content, const kit::Runs& expected) const {
-        EXPECT_EQ(kit::nonZeroRuns(content), expected);
+    void expectRuns(const std::string& content, const kit::SparseContent& expected) const {
+        EXPECT_EQ(kit::sparseContent(content), expected);
         writeFile(file(), content);
         EXPECT_EQ(runsOfFile(), expected);
     }
@@ -69,7 +69,7 @@ TEST_F(NonZeroRunsTest, RunGoesOverTheEdgesOfPagesAndReads) {
 }
 
 TEST_F(NonZeroRunsTest, OffsetsCountFromWhereTheBytesStand) {
-    EXPECT_EQ(kit::nonZeroRuns(zeros(2) + "a", 1000), (kit::Runs{{1002, "a"}}));
+    EXPECT_EQ(kit::sparseContent(zeros(2) + "a", 1000), (kit::SparseContent{{1002, "a"}}));
 }
 
 TEST_F(NonZeroRunsTest, RunsPutBackGiveTheSameBytes) {
@@ -79,7 +79,7 @@ TEST_F(NonZeroRunsTest, RunsPutBackGiveTheSameBytes) {
                                     random.bytes(random.below(3000));
         std::string again = zeros(content.size());
         std::uint64_t end = 0;
-        for (const auto& [offset, run] : kit::nonZeroRuns(content)) {
+        for (const auto& [offset, run] : kit::sparseContent(content)) {
             ASSERT_TRUE(end == 0 || offset >= end + 16) << seed;
             ASSERT_TRUE(run.front() != '\0' && run.back() != '\0') << seed;
             ASSERT_EQ(run.find(zeros(16)), std::string::npos) << seed;
@@ -96,18 +96,19 @@ TEST_F(NonZeroRunsTest, HolesAreSkipped) {
     const kit::Descriptor made = kit::makeSparseFile(file(), SIZE);
     kit::writeAt(made, file(), SIZE / 2 - 1, "ab");
     kit::writeAt(made, file(), SIZE - 1, "c");
-    EXPECT_EQ(runsOfFile(), (kit::Runs{{SIZE / 2 - 1, "ab"}, {SIZE - 1, "c"}}));
+    EXPECT_EQ(runsOfFile(), (kit::SparseContent{{SIZE / 2 - 1, "ab"}, {SIZE - 1, "c"}}));
 }
 
 TEST_F(NonZeroRunsTest, OnlyTheBytesAskedForAreLookedAt) {
     writeFile(file(), "abcd");
-    EXPECT_EQ(kit::nonZeroRuns(kit::openForReading(file()), file(), 2), (kit::Runs{{0, "ab"}}));
+    EXPECT_EQ(kit::sparseContent(kit::openForReading(file()), file(), 2),
+              (kit::SparseContent{{0, "ab"}}));
 }
 
 TEST_F(NonZeroRunsTest, WhatCannotBeReadIsNamed) {
     const fs::path folder = file().parent_path();
     try {
-        kit::nonZeroRuns(kit::openForReading(folder), folder, 1);
+        kit::sparseContent(kit::openForReading(folder), folder, 1);
         ADD_FAILURE() << "read";
     } catch (const kit::KitError& error) {
         EXPECT_EQ(error.what(), "cannot read " + folder.string() + ": Is a directory");
@@ -115,10 +116,10 @@ TEST_F(NonZeroRunsTest, WhatCannotBeReadIsNamed) {
 }
 
 TEST(WithoutEndZeros, LeavesZerosInside) {
-    EXPECT_EQ(kit::withoutEndZeros(""), "");
-    EXPECT_EQ(kit::withoutEndZeros(zeros(9)), "");
-    EXPECT_EQ(kit::withoutEndZeros("a" + zeros(2) + "b" + zeros(3)), "a" + zeros(2) + "b");
-    EXPECT_EQ(kit::withoutEndZeros("ab"), "ab");
+    EXPECT_EQ(kit::withoutTrailingZeros(""), "");
+    EXPECT_EQ(kit::withoutTrailingZeros(zeros(9)), "");
+    EXPECT_EQ(kit::withoutTrailingZeros("a" + zeros(2) + "b" + zeros(3)), "a" + zeros(2) + "b");
+    EXPECT_EQ(kit::withoutTrailingZeros("ab"), "ab");
 }
 
 } // namespace

@@ -76,7 +76,7 @@ TEST(DecodedUnitTest, RecordsAreRead) {
     EXPECT_EQ(unit.records.slots[9].offset, 129U);
     EXPECT_EQ(unit.records.slots[17].bytes, std::string("\x2a\x00", 2));
     EXPECT_EQ(unit.records.slots[15].bytes->substr(128), "SN004217");
-    EXPECT_EQ(kit::withoutEndZeros(*unit.records.aux), "bench 2");
+    EXPECT_EQ(kit::withoutTrailingZeros(*unit.records.aux), "bench 2");
     EXPECT_EQ(unit.records.diskSize, 2U * 1024 * 1024);
     EXPECT_EQ(unit.records.crcVerdict, CrcVerdict::computed);
 }
