@@ -2,6 +2,7 @@
 #include "tests/support/unit_test.h"
 
 #include "kit/enter/entered_root.h"
+#include "kit/host/whole_file.h"
 
 #include <fcntl.h>
 
@@ -10,7 +11,6 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
-#include <iterator>
 
 namespace orvane::test {
 
@@ -29,9 +29,7 @@ void patchFile(const std::string& path, std::uint64_t offset, const std::string&
 } // namespace
 
 std::string readFile(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    EXPECT_TRUE(file.is_open()) << path;
-    return {std::istreambuf_iterator<char>(file), {}};
+    return kit::readWholeFile(path);
 }
 
 void writeFile(const std::string& path, const std::string& content) {

@@ -28,7 +28,7 @@ protected:
         EXPECT_EQ(differenceOf(before, state()), "");
     }
 
-    std::string disk() const { return wholeFile(root() / "dev/hd0"); }
+    std::string disk() const { return readFile(root() / "dev/hd0"); }
 
     /// A disk of a mebibyte and a bit with this in slot 9, and more by offset from the base.
     void putDisk(const std::string& serial,

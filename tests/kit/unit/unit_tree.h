@@ -1,23 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <gtest/gtest.h>
+#include "tests/support/unit_test.h"
 
 #include <filesystem>
-#include <fstream>
 #include <map>
 #include <string>
 
 namespace orvane::test {
-
-/// As readFile, but in one go: quick on a whole disk.
-inline std::string wholeFile(const std::filesystem::path& path) {
-    std::string content(std::filesystem::file_size(path), '\0');
-    std::ifstream file(path, std::ios::binary);
-    file.read(content.data(), static_cast<std::streamsize>(content.size()));
-    EXPECT_TRUE(file.good()) << path;
-    return content;
-}
 
 /// Every entry below a unit's root but the kit's mark: "folder", "link " and its target, or "file "
 /// and its content.
@@ -33,7 +23,7 @@ inline std::map<std::string, std::string> treeOf(const std::filesystem::path& ro
         } else if (entry.is_directory()) {
             tree[path] = "folder";
         } else {
-            tree[path] = "file " + wholeFile(entry.path());
+            tree[path] = "file " + readFile(entry.path());
         }
     }
     return tree;
