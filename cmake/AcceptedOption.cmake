@@ -2,15 +2,15 @@
 include(CheckCXXCompilerFlag)
 include(CheckLinkerFlag)
 
-# Sets RESULT to whether the compiler knows OPTION: the units' compilers are years apart. Asked in
-# C++11, the latest that the oldest one has.
+# Sets RESULT to whether the compiler knows OPTION: the units' compilers are years apart. The test is
+# compiled as C++11, the latest standard that the oldest one supports.
 function(orvane_accepts result option)
   set(CMAKE_CXX_STANDARD 11)
   check_cxx_compiler_flag(${option} ${result})
 endfunction()
 
-# orvane_add_linker_options(TARGET OPTION...): for users of TARGET, each that the linker takes. Only
-# that of a unit's SDK is asked; a desk's linker that lacks one should say so.
+# orvane_add_linker_options(TARGET OPTION...): adds each option that the linker accepts for users of
+# TARGET. Only the linker of a unit's SDK is asked; a desk's linker that lacks one should say so.
 function(orvane_add_linker_options target)
   foreach(option ${ARGN})
     if(CMAKE_CXX_COMPILER_ID STREQUAL QCC)

@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-# Refuses a compiler that can't build this, or is not the one that was asked for. Not in a toolchain
-# file: only after project() does CMake know which compiler it has. QCC is its name for the driver of
-# the unit's SDK, the version is that of the GCC behind it.
+# Refuses a compiler that can't build this, or is not the one that was asked for. This can't be in a
+# toolchain file: CMake knows its compiler only after project(). QCC is CMake's name for the driver of the
+# unit's SDK; the version is that of the GCC behind it.
 if(CMAKE_CXX_COMPILER_ID MATCHES "^(GNU|QCC)$" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 4.7)
   set(advice "")
   if(CMAKE_CXX_COMPILER_ID STREQUAL QCC)

@@ -1,12 +1,12 @@
 # SPDX-License-Identifier: Apache-2.0
-# What makes a fault of ours harder to exploit and costs no measurable start, as an interface target:
-# canaries on the stack, checked library calls where the compiler can't prove a size, no executable
-# stack, and tables of the loader that are read-only once the program runs. Not in Debug builds:
-# _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
+# Options that make a fault of ours harder to exploit and don't measurably delay the start, as an
+# interface target: canaries on the stack, checked library calls where the compiler can't prove a size, no
+# executable stack, and loader tables that are read-only once the program runs. Debug builds don't have
+# them: _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
 include(CheckCXXSourceCompiles)
 
-# Sets RESULT to whether a function that OPTION protects is compiled and linked: a canary needs the C
-# library, too.
+# Sets RESULT to whether a function that OPTION protects can be compiled and linked: a canary also needs
+# the C library.
 function(orvane_protects result option)
   set(CMAKE_CXX_STANDARD 11)
   set(CMAKE_REQUIRED_FLAGS ${option})

@@ -1,11 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
-# What the kit and the tests need besides a compiler. All of it is a Debian package and header-only
-# or built from its sources, so that it serves every compiler, standard library and processor here.
+# What the kit and the tests need besides a compiler. Each library is a Debian package, and is header-only
+# or built from its sources, so that it works with every compiler, standard library and processor here.
 # Each library is an imported target, and ORVANE_KIT_MISSING lists the packages of those that were not
 # found.
 set(ORVANE_KIT_MISSING "")
 
-# orvane_find_library(NAME DEBIAN_PACKAGE): by the files that the package has for CMake.
+# orvane_find_library(NAME DEBIAN_PACKAGE): finds the library by its package's own files for CMake.
 macro(orvane_find_library name package)
   find_package(${name} CONFIG QUIET)
   mark_as_advanced(${name}_DIR)
@@ -14,7 +14,7 @@ macro(orvane_find_library name package)
   endif()
 endmacro()
 
-# orvane_find_header(NAME DEBIAN_PACKAGE HEADER): where a package has no such files, or none that serve
+# orvane_find_header(NAME DEBIAN_PACKAGE HEADER): for a package that has no such files, or none that work
 # here. Makes the target orvane::NAME.
 macro(orvane_find_header name package header)
   find_path(ORVANE_${name}_DIR ${header} ${ARGN})
@@ -30,12 +30,12 @@ endmacro()
 orvane_find_library(CLI11 libcli11-dev)
 orvane_find_library(nlohmann_json nlohmann-json3-dev)
 orvane_find_header(dtl libdtl-dev dtl/dtl.hpp)
-# Its target is the shared library of one processor, made with one standard library.
+# The package's target is a shared library for one processor and one standard library.
 orvane_find_header(tomlplusplus libtomlplusplus-dev toml++/toml.h)
-# Its target, for one processor as well, names a folder that Debian does not have.
+# The package's target, also for one processor, names a folder that Debian does not have.
 orvane_find_header(utf8cpp libutfcpp-dev utf8.h PATH_SUFFIXES utf8cpp)
 
-# Sources, which no package file describes.
+# These are sources; no package file describes them.
 find_path(ORVANE_GOOGLETEST_DIR googletest/src/gtest-all.cc PATHS /usr/src/googletest NO_CMAKE_FIND_ROOT_PATH)
 mark_as_advanced(ORVANE_GOOGLETEST_DIR)
 set(ORVANE_TESTS_MISSING ${ORVANE_KIT_MISSING})

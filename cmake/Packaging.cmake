@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-# What `cmake --install` lays down and `cpack` packs. Three components: `programs` runs on a unit or on
-# a host, `host` is what a host adds for the people who type, `field` what a unit adds. The Debian
-# package holds the first two, the tarball for a target programs and field.
+# What `cmake --install` installs and `cpack` packs. There are three components: `programs` runs on a unit
+# or a host, `host` adds what people at a host need, `field` adds what a unit needs. The Debian package
+# holds programs and host, the tarball for a target holds programs and field.
 include(GNUInstallDirs)
 
 install(TARGETS orvane RUNTIME COMPONENT programs)
@@ -15,7 +15,7 @@ endif()
 
 find_program(ORVANE_GZIP gzip)
 mark_as_advanced(ORVANE_GZIP)
-# install_compressed FILE FOLDER NAME: Debian wants pages and changelogs so; -n keeps the date out.
+# install_compressed FILE FOLDER NAME: Debian wants pages and changelogs compressed; -n omits the date.
 function(install_compressed file folder name)
   if(NOT ORVANE_GZIP)
     message(STATUS "no gzip: ${file} will not be installed")

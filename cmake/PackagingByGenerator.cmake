@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-# Read by cpack for each kind of package: what sets the two apart.
+# cpack reads this for each kind of package: the differences between the two.
 if(CPACK_GENERATOR STREQUAL TGZ)
   set(CPACK_COMPONENTS_ALL programs field)
   set(CPACK_ARCHIVE_COMPONENT_INSTALL ON)

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
-# The warnings of our own code, as an interface target: third-party sources don't get them.
+# The warnings for our own code, as an interface target: third-party sources don't get them.
 add_library(orvane_warnings INTERFACE)
-# The unit's compilers may be older than half of these warnings, and end at an option that they don't
-# know. The desk's compilers have checked these sources with all warnings.
+# The unit's compilers may be older than half of these warnings, and fail at an option that they don't
+# know. The desk's compilers check these sources with all warnings.
 if(CMAKE_CXX_COMPILER_ID STREQUAL QCC)
   target_compile_options(orvane_warnings INTERFACE -Wall -Wextra)
   return()

@@ -3,5 +3,5 @@
 set(CMAKE_SYSTEM_NAME Linux)
 set(CMAKE_SYSTEM_PROCESSOR arm)
 set(CMAKE_CXX_COMPILER arm-linux-gnueabihf-g++)
-set(CMAKE_CXX_FLAGS_INIT -Wno-psabi) # a note on an ABI change long before ours
+set(CMAKE_CXX_FLAGS_INIT -Wno-psabi) # a note on an ABI change that predates this project
 set(CMAKE_CROSSCOMPILING_EMULATOR /usr/bin/qemu-arm-static)

@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
-# QNX Neutrino on 32-bit ARM, by the SDK's q++: the unit. No SDK was at hand: never run with a real
-# one. tests/target_build runs it with a stand-in.
+# QNX Neutrino on 32-bit ARM, by the SDK's q++: the unit. No SDK was available: this file has never been
+# used with a real one. tests/target_build runs it with a stand-in.
 #
 #   . <the SDK's environment script>      # sets QNX_HOST and QNX_TARGET
 #   cmake -B build -DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/qnx-armv7.cmake
@@ -14,24 +14,24 @@ foreach(variable QNX_HOST QNX_TARGET)
   file(TO_CMAKE_PATH "$ENV{${variable}}" ${variable})
 endforeach()
 
-# With the GNU C++ library, one of the two that the tests ran with. `q++ -V` lists what an SDK has.
-# A variant alone takes the SDK's default compiler. With a version before it, 4.7.3,gcc_ntoarmv7le_gpp,
-# it takes that one. A build by 7.1, for 64-bit ARM, has gcc/8.3.0 there. cmake/Compiler.cmake refuses
-# a compiler that is too old.
+# This variant has the GNU C++ library, one of the two that the tests ran with. `q++ -V` lists what an SDK
+# has. A variant alone takes the SDK's default compiler; with a version before it, as in
+# 4.7.3,gcc_ntoarmv7le_gpp, it takes that one. A build by 7.1, for 64-bit ARM, has gcc/8.3.0 there.
+# cmake/Compiler.cmake refuses a compiler that is too old.
 set(ORVANE_QNX_VARIANT gcc_ntoarmv7le_gpp CACHE STRING "What q++ gets after -V")
 set(CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ORVANE_QNX_VARIANT)
 
-# orvane_find_tool(VARIABLE NAME...): only among the SDK's own, or the host's could be taken.
+# orvane_find_tool(VARIABLE NAME...): searches only the SDK's own tools, or the host's could be taken.
 function(orvane_find_tool variable)
   find_program(${variable} NAMES ${ARGN} PATHS ${QNX_HOST}/usr/bin NO_DEFAULT_PATH REQUIRED)
 endfunction()
 
-# The variant is a part of the command: no CXXFLAGS or CMAKE_CXX_FLAGS can replace it, and CMake asks
-# that compiler for its version. It finds headers and libraries by QNX_TARGET itself.
+# The variant is part of the command: no CXXFLAGS or CMAKE_CXX_FLAGS can replace it, and CMake asks that
+# compiler for its version. The compiler itself finds headers and libraries by QNX_TARGET.
 orvane_find_tool(ORVANE_QPP q++)
 set(CMAKE_CXX_COMPILER ${ORVANE_QPP} -V${ORVANE_QNX_VARIANT})
 
-# SDKs name a tool for its processor, for its whole target with the system's version, or both ways.
+# SDKs name a tool after its processor, after its whole target with the system's version, or both.
 foreach(tool AR RANLIB STRIP OBJCOPY)
   string(TOLOWER ${tool} name)
   set(names ntoarmv7-${name})
