@@ -1,10 +1,9 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 # What an integrator would write instead of orvane: the same files from the same sources, with the
-# programs that every system has. It leaves the same bytes on the sample unit, which the benchmark
-# checks, and wherever else nothing is missing or odd. Damaged inputs are not its strength: od and awk
-# have their own ideas of short images and long numbers, and wc would read the whole of a real disk to
-# find its end.
+# programs that every system has. It leaves the same bytes on the sample unit, as the benchmark checks,
+# and wherever nothing is missing or odd. It handles damaged inputs badly: od and awk treat short images
+# and long numbers in their own way, and wc would read the whole of a real disk to find its end.
 image=/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM
 disk=/dev/hd0
 static=/fs/mp/etc
@@ -68,12 +67,12 @@ read_image() {
     esac
 }
 
-# The place so many bytes before the end of the disk.
+# place BYTES: prints the offset that is so many bytes before the end of the disk.
 place() {
     echo $(($(wc -c <"$disk") - $1))
 }
 
-# One block of the disk's tuning area as text: write_tuning BLOCK FILE.
+# write_tuning BLOCK FILE: writes one block of the disk's tuning area as text.
 write_tuning() {
     if [ -r "$disk" ]; then
         od -An -v -tu1 -j "$(place $((1044480 - 188 * $1)))" -N 188 "$disk"
@@ -88,7 +87,7 @@ write_tuning() {
             modes = " qwaSingleChannel qwaMultiChannel qwaCombined"
             split(switches, word, " ")
             split(modes, mode, " ")
-            # key, offset, lower bit of a pair of bits or kind, elements of a list
+            # key, offset, lower bit of a pair of bits or kind, number of elements of a list
             lines = split("AECSwitch 0 0,AGCSwitch 0 2,DiagSwitch 0 4,HFESwitch 0 6,MixFiltSwitch 1 0," \
                 "MixSwitch 1 2,NRSwitch 1 4,RECSwitch 2 0,RecvAGCSwitch 2 2,RecvBWESwitch 2 4," \
                 "RecvDLCSwitch 2 6,RecvDTFSwitch 3 0,RecvENSSwitch 3 2,RecvEQSwitch 3 4," \
@@ -120,7 +119,7 @@ write_tuning() {
         }' >"$2"
 }
 
-# The version of the first application, behind its first "_".
+# Prints the version of the first application, from behind its first "_".
 read_version() {
     awk '
         function trim(text) {
@@ -145,7 +144,7 @@ read_version() {
         END { found() }' /fs/rwdata/.Version/*.inf* 2>/dev/null
 }
 
-# Three components of a version, two hexadecimal digits each; a missing one repeats the last.
+# Prints three components of a version in two hexadecimal digits each; a missing one repeats the last.
 six_digits() {
     case $1 in
     '' | N/A) echo 000000 ;;
@@ -158,7 +157,7 @@ six_digits() {
     esac
 }
 
-# Whether an output can be made from its template: can_generate OUTPUT TEMPLATE.
+# can_generate OUTPUT TEMPLATE: whether the output can be made from its template.
 can_generate() {
     : >"$1" && [ -r "$2" ]
 } 2>/dev/null

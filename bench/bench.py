@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
-"""What a whole run of `orvane -a -i` costs on the sample unit, beside a floor and a script.
+"""What a whole run of `orvane -a -i` costs on the sample unit, compared with a floor and a script.
 
 Prints its tables; with --write they also replace those of docs/performance.md.
 """
@@ -36,7 +36,7 @@ PARTS = {"run", "growth", "variants"}
 
 @contextlib.contextmanager
 def memory_folder() -> Iterator[Path]:
-    """In memory where there is such a place: a unit's /tmp lies there, too."""
+    """In memory if there is such a place, as a unit's /tmp is."""
     memory = Path("/dev/shm")
     place = memory if os.access(memory, os.W_OK) else None
     with tempfile.TemporaryDirectory(prefix="orvane-bench-", dir=place) as folder:
@@ -51,7 +51,7 @@ def left_by(root: Path, command: str) -> dict[str, bytes]:
 
 
 def compare(root: Path) -> None:
-    """What does not do the same work is not worth timing."""
+    """Requires that all commands do the same work, or their times can't be compared."""
     expected = left_by(root, STATIC)
     if len(expected) != 6:
         raise SystemExit(f"bench: the tool left {sorted(expected)}")
@@ -63,7 +63,7 @@ def compare(root: Path) -> None:
             raise SystemExit(f"bench: {NAMES[command]} leaves other bytes in {differing}")
     if {name: len(content) for name, content in left_by(root, FLOOR).items()} != \
             {name: len(content) for name, content in expected.items()}:
-        raise SystemExit("bench: the floor writes other lengths than the tool")
+        raise SystemExit("bench: the floor writes files of other lengths than the tool")
 
 
 def whole_process(root: Path, runs: int) -> Table:
@@ -107,7 +107,7 @@ def main() -> int:
     if unknown:
         parser.error(f"no such part: {', '.join(sorted(unknown))}")
     if arguments.write and set(arguments.parts) != PARTS:
-        parser.error("the document's tables are all of one run: --write takes no parts")
+        parser.error("the document's tables come from one run: --write takes no parts")
 
     programs = build()
     with memory_folder() as folder:

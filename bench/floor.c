@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The floor of the benchmark: what `orvane -a`, `-i` or both ask of the system on the sample unit,
-// with no meaning. The same opens, maps and reads, in the same order, and one write a file. No run
-// of any program that does the job can cost less than the calls themselves.
+// The floor of the benchmark: the calls that `orvane -a`, `-i` or both make on the sample unit,
+// without their meaning. It makes the same opens, maps and reads, in the same order, and one write
+// per file. No program that does the job can cost less than these calls.
 #include <dirent.h>
 #include <fcntl.h>
 #include <string.h>
@@ -13,7 +13,7 @@ static const char IMAGE[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM";
 static const char DISK[] = "/dev/hd0";
 static const char VERSION_DIR[] = "/fs/rwdata/.Version/";
 
-// The longest file that is read or written here.
+// At least the size of the longest file that is read or written here.
 enum { BUFFER_SIZE = 8192 };
 static char buffer[BUFFER_SIZE];
 

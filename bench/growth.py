@@ -18,19 +18,19 @@ TEMPLATE_SIZES = tuple(4096 << (4 * step) for step in range(5))
 VERSION_COUNTS = (3, 30, 300, 3000, 10000)
 LONG_FILE_SIZES = (1 << 20, 1 << 23, 1 << 26)
 
-# What copies of a template are written with: bytes that no program may take for text.
+# The content of large templates: bytes that no program may treat as text.
 PATTERN = bytes(range(256)) * 16
 
 NANOSECONDS = 1e9
 
 
-# How fast a large file is copied depends on where its pages came to lie, by 20 % and more; so it is
-# written anew so often.
+# The speed of copying a large file varies by 20 % and more with the place of its pages in memory, so
+# the file is written anew this many times.
 PLACES = 7
 
 
 def runs_for(size: int) -> int:
-    """More runs where they are short."""
+    """More runs if they are short."""
     return max(5, min(40, (1 << 27) // size))
 
 
@@ -56,7 +56,7 @@ def beside_cat(root: Path, size: int, own_tmp: bool) -> tuple[Timing, Timing]:
 
 
 def templates(root: Path) -> Table:
-    """`orvane -a` with a template, beside `cat` of the same bytes."""
+    """`orvane -a` with a template, compared with `cat` of the same bytes."""
     table = Table("template", "`orvane -a`", "`cat`", "throughput, orvane to cat", "MiB/s",
                   "the same in one file system")
     for size in TEMPLATE_SIZES:
@@ -94,7 +94,7 @@ def version_files(root: Path) -> Table:
 
 
 def long_version_file(root: Path) -> Table:
-    """One long version file, in short lines and in one."""
+    """One long version file, in short lines and in a single line."""
     table = Table("one version file", "in short lines", "each byte", "in one line", "each byte")
     line = b"Release Notes = the same key, again and again, so that each line replaces the last\n"
     file = root / VERSIONS / "notes.inf"

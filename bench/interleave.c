@@ -2,9 +2,10 @@
 //
 // interleave ROOT RUNS WARM_UP COMMAND...: runs every COMMAND once a round, in ROOT, and prints a
 // line for each counted run: the command's index, wall time in nanoseconds, page faults, exit
-// status. Each round has an order of its own: what a run leaves in the caches serves or harms all.
-// A COMMAND is words with single blanks between them; "> FILE" at its end takes its output. Small
-// and static, so that to start a child costs the same little for every command.
+// status. Each round has a different order, so that the contents of the caches help or harm all
+// commands alike. A COMMAND is words with single blanks between them; "> FILE" at its end takes
+// its output. This program is small and static, so that starting a child costs the same little for
+// every command.
 #include <errno.h>
 #include <fcntl.h>
 #include <spawn.h>

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""One figure of one command in a unit: run in turn with others, or watched by a tool."""
+"""One figure of one command in a unit: the command takes turns with others, or a tool watches it."""
 
 from __future__ import annotations
 
@@ -16,13 +16,13 @@ from pathlib import Path
 from place import TOOLS, call
 
 ENVIRONMENT = {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin"}
-# Where Debian keeps valgrind's programs, and where other systems do.
+# Where Debian and other systems keep valgrind's programs.
 VALGRIND_FOLDERS = ("/usr/libexec/valgrind", "/usr/lib/x86_64-linux-gnu/valgrind")
 
 
 @dataclass(frozen=True)
 class Timing:
-    """Of all counted runs of one command."""
+    """The figures of all counted runs of one command."""
 
     wall: tuple[int, ...]  # nanoseconds
     faults: int  # median
@@ -35,17 +35,17 @@ class Timing:
         return statistics.median(self.wall)
 
     def ratio(self, other: Timing) -> float:
-        """Median of the ratios run by run: what slows the machine down slows both runs."""
+        """The median of the ratios run by run: a slow moment of the machine slows both runs."""
         return statistics.median(a / b for a, b in zip(self.wall, other.wall))
 
 
 def as_root() -> list[str]:
-    """The change of the root directory takes the privilege for it, or a user namespace."""
+    """To change the root directory needs the privilege to do so, or a user namespace."""
     return [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
 
 def with_own_tmp(root: Path) -> list[str | Path]:
-    """What is run behind these words sees a /tmp of its own, empty and in memory, in `root`."""
+    """A command after these words sees a /tmp of its own, empty and in memory, in `root`."""
     return [*(as_root() or ["unshare"]), "--mount", "sh", "-c",
             'mount -t tmpfs tmpfs "$0/tmp" && exec "$@"', root]
 
@@ -74,7 +74,7 @@ def peak(root: Path, command: str) -> int:
 
 
 def system_calls(root: Path, command: str) -> int:
-    """All calls of all processes of the command, from its start on, which is not counted."""
+    """The number of all calls of all the command's processes after its start, which is not counted."""
     with tempfile.NamedTemporaryFile("r") as log:
         call("strace", "-f", "-o", log.name, *as_root(), "chroot", root, *command.split(),
              env=ENVIRONMENT)
@@ -86,7 +86,7 @@ def system_calls(root: Path, command: str) -> int:
 
 
 def instructions(root: Path, command: str) -> int:
-    """What callgrind counts. It runs inside the unit, so its program has to lie there."""
+    """The count of callgrind, which runs inside the unit, so that its program must be there."""
     folder = next(Path(name) for name in VALGRIND_FOLDERS if Path(name).is_dir())
     inside = root / "valgrind"
     inside.mkdir(exist_ok=True)
@@ -107,13 +107,13 @@ def instructions(root: Path, command: str) -> int:
 
 
 def size(root: Path, command: str) -> int:
-    """Bytes of the command's program."""
+    """The size of the command's program in bytes."""
     return (root / command.split()[0].lstrip("/")).stat().st_size
 
 
 def emulated(root: Path, command: str) -> tuple[int, int]:
-    """Instructions and system calls of an ARM program: the emulator runs one at a time, and logs
-    each."""
+    """Instructions and system calls of an ARM program: the emulator runs the instructions one by one
+    and logs each."""
     log = root / "log"
     chroot = [*as_root(), "env", "-i", "PATH=/bin", shutil.which("chroot") or "chroot", root,
               "/bin/emulator"]

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // peak ROOT WORD...: runs the command in ROOT and prints the most memory, in KiB, that one of its
-// processes ever had resident. It asks the system when each of them ends: what is reported to a
-// parent afterwards also counts the parent's own pages, which a child has before it starts.
+// processes ever had resident. It asks the system just before each process ends: the figure that a
+// parent gets afterwards includes the parent's own pages, which a child has before it starts.
 #include <fcntl.h>
 #include <signal.h>
 #include <stdio.h>

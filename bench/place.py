@@ -13,7 +13,7 @@ PROJECT = Path(__file__).resolve().parents[1]
 BUILD = PROJECT / "build"
 TOOLS = BUILD / "bench-tools"
 
-# What the script calls, and cat.
+# The programs that the script calls, and cat.
 HOST_PROGRAMS = ("sh", "od", "dd", "awk", "sed", "cat", "wc")
 
 ARM = "arm-linux-gnueabihf"
@@ -27,7 +27,7 @@ def call(*words: str | Path, **options: object) -> str:
 
 @dataclass(frozen=True)
 class Programs:
-    """The binaries to be measured, stripped, by what they are."""
+    """The binaries to be measured, stripped."""
 
     static: Path
     dynamic: Path
@@ -37,7 +37,7 @@ class Programs:
 
 
 def configure(name: str, *options: str) -> Path:
-    """Builds the product alone, as a unit's build does, and returns a stripped copy of it."""
+    """Builds only the product, as a unit's build does, and returns a stripped copy of it."""
     folder = BUILD / f"bench-{name}"
     call("cmake", "-S", PROJECT, "-B", folder, "-G", "Ninja", "-DCMAKE_BUILD_TYPE=Release",
          "-DORVANE_KIT=OFF", "-DORVANE_TESTS=OFF", *options)
@@ -59,7 +59,7 @@ def build() -> Programs:
 
 
 def copy_with_libraries(program: Path, root: Path, name: str) -> None:
-    """The program as /bin/NAME, and the libraries that it asks for at their own places."""
+    """Copies the program to /bin/NAME, and the libraries that it needs to their own places."""
     (root / "bin").mkdir(exist_ok=True)
     shutil.copy(program, root / "bin" / name)
     needed = subprocess.run(["ldd", program], text=True, capture_output=True, check=False).stdout

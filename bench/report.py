@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Tables that read well as plain text and as Markdown, and the document that holds the last run's."""
+"""Tables that read well as plain text and as Markdown, and the document with those of the last run."""
 
 from __future__ import annotations
 

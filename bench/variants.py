@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Other ways to build the product: what each costs beside the one that is shipped."""
+"""Other ways to build the product: what each costs compared with the shipped one."""
 
 from __future__ import annotations
 
@@ -18,7 +18,7 @@ from report import Table, grouped
 SECTIONS = ("-ffunction-sections", "-fdata-sections", "-Wl,--gc-sections")
 HARDENED = ("-fstack-protector-strong", "-D_FORTIFY_SOURCE=2", "-Wl,-z,relro,-z,now",
             "-Wl,-z,noexecstack")
-# As cmake/Size.cmake and cmake/Hardening.cmake have them.
+# The options of cmake/Size.cmake and cmake/Hardening.cmake.
 SHIPPED = ("-Os", "-flto", *SECTIONS, *HARDENED, "-static")
 
 
@@ -30,8 +30,8 @@ class Variant:
 
 
 def buffers(output: int, template: int) -> Callable[[Path], None]:
-    """Other sizes of the two buffers; both must be found where they are changed. A stream reads one
-    byte less than the template's holds."""
+    """A change of the two buffers' sizes; both sizes must be found in the sources. A stream reads one
+    byte less than the template's buffer holds."""
     def change(tree: Path) -> None:
         for path, name, size in (("writers/template_merge.h", "OUTPUT_BUFFER_SIZE", output),
                                  ("writers/template_merge.cpp", "INPUT_BUFFER_SIZE", template + 1)):
