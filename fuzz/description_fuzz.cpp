@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The text of a unit's description. What is refused, is refused with its place; what is taken comes
-// back, to the byte, through the text that is made of it.
+// The text of a unit's description. A refusal names its place. An accepted text makes a unit that
+// is the same, to the byte, when its own text is parsed again.
 #include "fuzz/support.h"
 #include "kit/description/description_text.h"
 #include "kit/description/parse_description.h"
@@ -27,7 +27,8 @@ bool isNumberCharacter(char c) {
     return std::isxdigit(static_cast<unsigned char>(c)) != 0 || c == '_' || c == 'x' || c == 'o';
 }
 
-/// Whether the text may ask for so much repeated content that the run would show nothing but that.
+/// Whether the text may ask for so much repeated content that the run would spend all its time on
+/// it.
 bool repeatsMuch(std::string_view text) {
     constexpr std::ptrdiff_t LONG_NUMBER = 6;
     if (text.find("repeat") == std::string_view::npos) {
@@ -44,7 +45,7 @@ bool repeatsMuch(std::string_view text) {
     return false;
 }
 
-/// "unit.toml:LINE:COLUMN: " and something behind it, on one line.
+/// Requires "unit.toml:LINE:COLUMN: " and a text after it, on one line.
 void requirePlace(std::string_view message, std::string_view input) {
     std::string_view rest = message;
     bool isPlace = take(rest, sizeof NAME - 1) == NAME;
@@ -75,7 +76,7 @@ std::optional<kit::UnitDescription> parse(const std::string& text) {
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     using namespace orvane::fuzz;
     const std::string text(inputText(data, size));
-    // Host files have no place in a run that shall be the same again.
+    // A run with host files could not be repeated.
     if (repeatsMuch(text) || text.find("path") != std::string::npos) {
         return 0;
     }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A configuration image of any length. The input is the count that readAllParams is given, 32 bits
+// A configuration image of any length. The input is the count for readAllParams, 32 bits
 // little-endian, and the image, of which the first 5,000 bytes count.
 #include "config/config_store.h"
 #include "config/param_access.h"
@@ -36,7 +36,7 @@ bool isKnown(std::uint32_t number) {
     return number >= 1 && number <= LAST_NUMBER;
 }
 
-/// By number: the sizes of all lower-numbered parameters, added up.
+/// By number: the total size of all lower-numbered parameters.
 const std::vector<std::size_t>& offsets() {
     static const std::vector<std::size_t> sums = [] {
         std::vector<std::size_t> result = {0, 0};
@@ -48,7 +48,7 @@ const std::vector<std::size_t>& offsets() {
     return sums;
 }
 
-/// What a getter gave: its status, and its output with the bytes behind it.
+/// The result of a getter: its status, and its output with the bytes after it.
 struct Answer {
     std::uint32_t status = 0;
     std::array<std::uint8_t, 8> output{};
@@ -103,7 +103,7 @@ Answer foundAnswer(Getter getter, std::uint16_t number, const ConfigStore& store
     return answer;
 }
 
-/// `image` is what the store shows, or null where it is not open.
+/// `image` is the store's content, or null when it is not open.
 void checkGetters(const ConfigStore& store, std::uint16_t number, const std::uint8_t* image) {
     for (const Getter getter : {Getter::any, Getter::u8, Getter::u16}) {
         const Answer expected = expectedAnswer(getter, number, image);
@@ -121,14 +121,14 @@ std::size_t wholePages(std::size_t size) {
     return (size + page - 1) / page * page;
 }
 
-/// The image in memory as a mapping of a file shows it: zeros up to the end of its last page, and
-/// behind that a page that can't be read.
+/// The image in memory like a mapped file: zeros up to the end of its last page, and then a page
+/// that can't be read.
 struct MappedImage {
     std::size_t roomSize = wholePages(LONGEST_IMAGE);
     std::uint8_t* room = static_cast<std::uint8_t*>(
         ::mmap(nullptr, roomSize + wholePages(1), PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0));
 
-    /// Where the image begins now. An empty one can't be mapped, and counts as a page of zeros.
+    /// Returns where the image begins. An empty one can't be mapped, and counts as a page of zeros.
     std::uint8_t* hold(std::string_view image) const {
         const std::size_t size = wholePages(std::max<std::size_t>(image.size(), 1));
         std::uint8_t* start = room + roomSize - size;
@@ -163,8 +163,8 @@ std::vector<std::uint16_t> numbersIn(std::string_view image) {
     return numbers;
 }
 
-/// The getters on a store made by hand: with every number while it is open, with some in each of
-/// the states in which it is not.
+/// The getters on a hand-made store: every number while it is open, some numbers in each state in
+/// which it is not.
 void checkAllGetters(std::string_view image, const std::uint8_t* mapped) {
     std::vector<std::uint16_t> numbers = numbersIn(image);
     numbers.insert(numbers.end(), {0, 1, 22, 134, 171, 172, 65535});
@@ -186,7 +186,7 @@ void checkAllGetters(std::string_view image, const std::uint8_t* mapped) {
     for (const std::uint16_t number : numbers) {
         checkGetters(store, number, mapped);
     }
-    store.init(); // it owns neither
+    store.init(); // the store owns neither
 }
 
 void requireClosed(const ConfigStore& store) {
@@ -222,7 +222,7 @@ void checkBulk(std::string_view image, const std::uint8_t* mapped, std::uint32_t
     requireClosed(store);
 }
 
-/// A store that is open shows the image and the zeros behind it; closed, it holds nothing more.
+/// An open store shows the image and the zeros after it; a closed one holds nothing.
 void openAndClose(std::string_view image, const std::uint8_t* mapped) {
     ConfigStore store;
     requireSame("open", image.empty() ? -1 : 0, store.open());

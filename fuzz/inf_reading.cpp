@@ -11,7 +11,7 @@ namespace orvane::fuzz {
 
 namespace {
 
-/// A key and a value in the making, one character after the other.
+/// A key and a value, built one character after the other.
 struct Line {
     std::string key;
     std::string value;
@@ -50,7 +50,7 @@ bool bytewiseLess(const std::string& left, const std::string& right) {
         });
 }
 
-/// What stands before and behind the first `separator`; without one, the whole of it, both times.
+/// The parts before and after the first `separator`; without one, the whole text twice.
 std::pair<std::string, std::string> splitOrRepeat(const std::string& text, char separator) {
     std::string before;
     for (std::size_t at = 0; at < text.size(); ++at) {
@@ -67,8 +67,8 @@ bool isWhiteSpace(char character) {
     return character == ' ' || (character >= '\t' && character <= '\r');
 }
 
-/// A number as a formatted extraction of an int reads it: one out of range becomes the nearest, and
-/// what is none becomes 0.
+/// A number as a formatted extraction of an int reads it: out of range, it becomes the nearest;
+/// anything that is not a number becomes 0.
 std::int64_t leadingNumber(const std::string& text) {
     std::size_t at = 0;
     while (at < text.size() && isWhiteSpace(text[at])) {
@@ -111,7 +111,7 @@ PlainRecord plainRead(const std::string& text) {
             line.add(character);
         }
     }
-    enter(record, line); // a last line needs no end
+    enter(record, line); // the last line needs no end
     std::sort(record.begin(), record.end(), [](const auto& left, const auto& right) {
         return bytewiseLess(left.first, right.first);
     });

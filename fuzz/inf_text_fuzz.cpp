@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Version description files of any content. The input is the text of "a.inf"; a file separator
-// (0x1C) goes on to "b.inf.old", which counts as well, and a second one to "c.txt", which does not.
+// Version description files of any content. The input is the text of "a.inf"; after a file
+// separator (0x1C) comes "b.inf.old", which counts as well, and after a second one "c.txt", which
+// does not.
 #include "fuzz/inf_reading.h"
 #include "fuzz/support.h"
 #include "identity/inf_file.h"
@@ -65,7 +66,7 @@ Target& target() {
     return instance;
 }
 
-/// Every function on text alone, with a text as it may stand in a file.
+/// Every function on text alone, with a text as a file may hold it.
 void checkText(const std::string& text) {
     requireEqual("trimSpaces", plainTrim(text), trimSpaces(text));
     requireEqual("formatVersionByte", plainFormatByte(text), formatVersionByte(text));
@@ -119,7 +120,7 @@ void checkFiles() {
     requireEqual("softwareVersion", plainFormat(plainSelect(listed)), formatted);
 }
 
-/// Nothing is left of the last scan once the files have changed.
+/// A scan remembers nothing of the files' earlier content.
 void checkEmptied() {
     target().setTexts("");
     std::string version;

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The command line. The input is the arguments behind the program's name, each ended by a NUL as in
-// /proc/self/cmdline; at most 32, of at most 64 bytes each, and none from the one on that would
-// make it more than 16 letters that run a writer: those take nearly all of the time.
+// The command line. The input is the arguments after the program's name, each ended by a NUL as in
+// /proc/self/cmdline: at most 32, of at most 64 bytes each, and with at most 16 letters that run a
+// writer, since writers take nearly all of the time.
 #include "fuzz/support.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/kit_error.h"
@@ -30,7 +30,7 @@ constexpr std::size_t MOST_WORDS = 32;
 constexpr std::size_t LONGEST_WORD = 64; ///< bytes
 constexpr std::ptrdiff_t MOST_WRITERS = 16;
 constexpr char PROGRAM_NAME[] = "orvane";
-/// The last line of each output, so that one that is not written to its end shows.
+/// The last line of each output, so that an output that is not written to its end shows.
 constexpr std::string_view TEMPLATE = "end of template\n";
 
 struct OutputName {
@@ -57,7 +57,7 @@ struct Target {
         }
         const std::filesystem::path outputs = unit.hostPath("/tmp");
         std::filesystem::create_directory(outputs);
-        // Both, since equal events that follow each other become one.
+        // Both, since consecutive equal events become one.
         if (::inotify_add_watch(events.number(), outputs.c_str(), IN_OPEN | IN_CLOSE_WRITE) == -1) {
             throw kit::systemError("cannot watch " + outputs.string());
         }
@@ -107,14 +107,14 @@ std::vector<std::string> wordsOf(std::string_view input) {
     return words;
 }
 
-/// What is to come of a command line.
+/// What a command line must do.
 struct Outcome {
     std::string written;     ///< as of Target::takeWritten
     std::string diagnostics; ///< a line for each letter that is none, in the C library's words
 };
 
-/// POSIX utility syntax guidelines: letters follow a "-", alone or together; the first operand ends
-/// the options, which "-" alone is, and so does "--".
+/// POSIX utility syntax guidelines: letters follow a "-", alone or together; "--" or the first
+/// operand ends the options; "-" alone is an operand.
 Outcome expectedOutcome(const std::vector<std::string>& words) {
     Outcome outcome;
     for (const std::string& word : words) {
@@ -137,8 +137,7 @@ Outcome expectedOutcome(const std::vector<std::string>& words) {
     return outcome;
 }
 
-/// Every output that was to be written is there, to its last line, and no other file is; leaves
-/// none.
+/// Requires that exactly the written outputs are there, each to its last line, and removes them.
 void checkAndRemoveFiles(const std::string& written) {
     const std::filesystem::path folder = target().unit.hostPath("/tmp");
     std::ptrdiff_t count = 0;
@@ -181,7 +180,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const int count = static_cast<int>(arguments.size());
     arguments.push_back(nullptr);
 
-    ::optind = 0; // makes glibc begin anew, in the middle of a word as well
+    ::optind = 0; // makes glibc start again, even in the middle of a word
     int status = -1;
     const std::string said =
         target().unit.run([&] { status = orvane::runOptions(count, arguments.data()); });

@@ -21,7 +21,7 @@ namespace orvane::fuzz {
 
 namespace {
 
-/// The unit that the process is in, and the outputs that it had outside.
+/// The unit that the process is in, and the outputs from before it entered.
 struct Inside {
     std::optional<kit::EnteredRoot> root;
     int outerOutput = -1;
@@ -33,8 +33,8 @@ Inside& inside() {
     return state;
 }
 
-/// Safe at any time. Until this is done, the files that libFuzzer writes would land in the unit.
-void comeOut() {
+/// Safe at any time. Before this call, the files that libFuzzer writes would end up in the unit.
+void leaveUnit() {
     Inside& state = inside();
     if (state.root) {
         ::dup2(state.outerOutput, STDOUT_FILENO);
@@ -43,29 +43,29 @@ void comeOut() {
     }
 }
 
-struct sigaction& libFuzzersAbort() {
+struct sigaction& libFuzzerAbortAction() {
     static struct sigaction action;
     return action;
 }
 
-/// Hands over to libFuzzer: the signal, blocked as yet, arrives again on return from here.
+/// Hands over to libFuzzer: the signal is still blocked, and arrives again when this returns.
 void onAbort(int signal) {
-    comeOut();
-    ::sigaction(signal, &libFuzzersAbort(), nullptr);
+    leaveUnit();
+    ::sigaction(signal, &libFuzzerAbortAction(), nullptr);
     (void)std::raise(signal);
 }
 
-/// To be called when libFuzzer has installed its own handlers: from the first run on.
-void comeOutOnAbort() {
+/// Must be called after libFuzzer has installed its own handlers: from the first run on.
+void leaveUnitOnAbort() {
     static const bool once = [] {
         struct sigaction action = {};
         action.sa_handler = onAbort;
-        return ::sigaction(SIGABRT, &action, &libFuzzersAbort()) == 0;
+        return ::sigaction(SIGABRT, &action, &libFuzzerAbortAction()) == 0;
     }();
     (void)once;
 }
 
-/// The number that the next descriptor will get: it tells whether one was left open.
+/// The number that the next descriptor will get: it shows whether one was left open.
 int nextDescriptor() {
     return kit::Descriptor(::dup(STDOUT_FILENO)).number();
 }
@@ -103,11 +103,11 @@ std::string escaped(std::string_view text) {
 
 } // namespace
 
-Unit::Unit() : root_(makeUnitFolder()), said_(::memfd_create("outputs", MFD_CLOEXEC)) {
+Unit::Unit() : root_(makeUnitFolder()), output_(::memfd_create("outputs", MFD_CLOEXEC)) {
     Inside& state = inside();
     state.outerOutput = ::fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
     state.outerError = ::fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
-    if (!said_.isOpen() || state.outerOutput == -1 || state.outerError == -1) {
+    if (!output_.isOpen() || state.outerOutput == -1 || state.outerError == -1) {
         throw kit::systemError("cannot collect the outputs");
     }
     const kit::EnteredRoot once(root_);
@@ -134,22 +134,22 @@ kit::Descriptor Unit::makeFile(const std::string& path, std::string_view content
 }
 
 std::string Unit::run(const std::function<void()>& action) const {
-    comeOutOnAbort();
-    ::dup2(said_.number(), STDOUT_FILENO);
-    ::dup2(said_.number(), STDERR_FILENO);
+    leaveUnitOnAbort();
+    ::dup2(output_.number(), STDOUT_FILENO);
+    ::dup2(output_.number(), STDERR_FILENO);
     inside().root.emplace(root_);
     const int next = nextDescriptor();
     action();
     requireSame("the next free descriptor", next, nextDescriptor());
-    comeOut();
+    leaveUnit();
 
-    std::string said(static_cast<std::size_t>(::lseek(said_.number(), 0, SEEK_CUR)), '\0');
-    if (!said.empty()) {
-        const ssize_t got = ::pread(said_.number(), said.data(), said.size(), 0);
-        requireSame("bytes of the outputs", static_cast<std::int64_t>(said.size()), got);
-        ::lseek(said_.number(), 0, SEEK_SET);
+    std::string written(static_cast<std::size_t>(::lseek(output_.number(), 0, SEEK_CUR)), '\0');
+    if (!written.empty()) {
+        const ssize_t got = ::pread(output_.number(), written.data(), written.size(), 0);
+        requireSame("bytes of the outputs", static_cast<std::int64_t>(written.size()), got);
+        ::lseek(output_.number(), 0, SEEK_SET);
     }
-    return said;
+    return written;
 }
 
 void setContent(const kit::Descriptor& file, std::string_view bytes) {
@@ -163,7 +163,7 @@ std::string contentOf(const std::filesystem::path& path) {
     const kit::Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
     const off_t size = ::lseek(file.number(), 0, SEEK_END);
     if (size < 0) {
-        fail("a file that was to be there", path.string(), "none");
+        fail("an expected file", path.string(), "none");
     }
     std::string content(static_cast<std::size_t>(size), '\0');
     requireSame("bytes read", size, ::pread(file.number(), content.data(), content.size(), 0));
@@ -181,7 +181,7 @@ std::string_view take(std::string_view& input, std::size_t count) {
 }
 
 void fail(const std::string& what, std::string_view expected, std::string_view found) {
-    comeOut();
+    leaveUnit();
     (void)std::fprintf(stderr, "%s\nexpected: \"%s\"\nfound:    \"%s\"\n", what.c_str(),
                        escaped(expected).c_str(), escaped(found).c_str());
     std::abort();
@@ -201,13 +201,13 @@ void requireSame(const char* what, std::int64_t expected, std::int64_t found) {
 
 } // namespace orvane::fuzz
 
-/// Called by the sanitizers' runtimes when they have something to report.
+/// The sanitizers' runtimes call this before a report.
 void __asan_on_error() { // NOLINT(readability-identifier-naming): the runtime's name
-    orvane::fuzz::comeOut();
+    orvane::fuzz::leaveUnit();
 }
 
 extern "C" void
 __ubsan_on_report();       // NOLINT(bugprone-reserved-identifier,cert-dcl37-c,cert-dcl51-cpp)
 void __ubsan_on_report() { // NOLINT(bugprone-reserved-identifier,cert-dcl37-c,cert-dcl51-cpp)
-    orvane::fuzz::comeOut();
+    orvane::fuzz::leaveUnit();
 }

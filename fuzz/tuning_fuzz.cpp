@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A tuning area of any content. The first byte of the input chooses the block, by its remainder of
-// 12: 0 to 9, or 10 or 11, which are not there. The rest is the area from its start; where the
-// input ends there are zeros.
+// A tuning area of any content. The first byte of the input, modulo 12, chooses the block: 0 to 9,
+// or 10 or 11, which do not exist. The rest is the area from its start, filled up with zeros.
 #include "config/boot_disk.h"
 #include "fuzz/support.h"
 #include "fuzz/tuning_reading.h"
@@ -26,7 +25,7 @@ constexpr off_t DISK_SIZE = 0x100000; ///< bytes: the record area and nothing be
 constexpr off_t TUNING_AREA = DISK_SIZE - 0xFF000;
 constexpr int BLOCKS = 10;
 constexpr char TUNING_FILE[] = "/tmp/tuning.txt";
-/// Longer than any tuning file, so that what is not truncated shows.
+/// Longer than any tuning file, so that a missing truncation shows.
 const std::string OLD_CONTENT(4096, 'x');
 
 struct Target {
@@ -80,7 +79,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         std::copy(start, start + BLOCK_SIZE, block.begin());
         requireTuningOf(block, id, written);
     } else {
-        requireEqual("an older file, for no such block", OLD_CONTENT, written);
+        requireEqual("older file of a block that does not exist", OLD_CONTENT, written);
     }
     return 0;
 }

@@ -12,32 +12,32 @@ namespace orvane::fuzz {
 
 namespace {
 
-/// How a value is held.
-enum class Holds { twoBits, byte, half };
+/// How a value is stored.
+enum class Storage { twoBits, byte, half };
 
-/// Whether its line shows a word, and which.
+/// Whether the line of a row shows a word, and which.
 enum class Words { none, ofSwitch, ofMode };
 
 struct Row {
     const char* key;
     int offset;
-    Holds holds;
+    Storage storage;
     Words words;
     int lowerBit; ///< of two bits
     int elements; ///< of a list; 0 for what is none
 };
 
 constexpr Row bits(const char* key, int offset, int lowerBit, Words words = Words::ofSwitch) {
-    return {key, offset, Holds::twoBits, words, lowerBit, 0};
+    return {key, offset, Storage::twoBits, words, lowerBit, 0};
 }
 constexpr Row byte(const char* key, int offset, Words words = Words::none) {
-    return {key, offset, Holds::byte, words, 0, 0};
+    return {key, offset, Storage::byte, words, 0, 0};
 }
 constexpr Row half(const char* key, int offset, Words words = Words::none) {
-    return {key, offset, Holds::half, words, 0, 0};
+    return {key, offset, Storage::half, words, 0, 0};
 }
 constexpr Row list(const char* key, int offset, int elements) {
-    return {key, offset, Holds::half, Words::none, 0, elements};
+    return {key, offset, Storage::half, Words::none, 0, elements};
 }
 
 constexpr std::array<Row, 44> ROWS = {
@@ -87,7 +87,7 @@ constexpr std::array<Row, 44> ROWS = {
     list("qwaMEQEnable", 171, 4),
 };
 
-/// Takes all before the first `end` from the front of `text`, and `end` itself.
+/// Removes the part of `text` up to and including the first `end`, and returns it without `end`.
 std::string_view takeUntil(std::string_view& text, char end, const char* what) {
     const std::size_t size = text.find(end);
     if (size == std::string_view::npos) {
@@ -98,7 +98,7 @@ std::string_view takeUntil(std::string_view& text, char end, const char* what) {
     return taken;
 }
 
-/// The number that `text` is in plain decimal, and nothing besides.
+/// The number in `text`, which must be plain decimal and nothing else.
 int numberOf(const char* what, std::string_view text) {
     const std::string digits(text);
     const auto number = static_cast<int>(std::strtol(digits.c_str(), nullptr, 10));
@@ -106,7 +106,7 @@ int numberOf(const char* what, std::string_view text) {
     return number;
 }
 
-/// The code of `word`; none for the empty text, which every code without a word has.
+/// The code of `word`; none for the empty text, which stands for every code without a word.
 std::optional<int> codeOf(const Row& row, std::string_view word) {
     const bool isMode = row.words == Words::ofMode;
     if (word.empty()) {
@@ -122,9 +122,9 @@ std::optional<int> codeOf(const Row& row, std::string_view word) {
     return 3;
 }
 
-/// The bytes that hold `value`, low byte first. Two bits count as a byte of their own.
+/// The bytes that hold `value`, low byte first. Two bits count as a byte.
 std::string bytesOf(const Row& row, int value) {
-    if (row.holds != Holds::half) {
+    if (row.storage != Storage::half) {
         requireSame(row.key, std::clamp(value, 0, 0xFF), value);
         return {static_cast<char>(value)};
     }
@@ -136,12 +136,12 @@ std::string bytesOf(const Row& row, int value) {
 /// The bytes of `block` that `row` is about.
 std::string bytesIn(const Block& block, const Row& row) {
     const std::uint8_t* first = block.data() + row.offset;
-    switch (row.holds) {
-    case Holds::twoBits:
+    switch (row.storage) {
+    case Storage::twoBits:
         return {static_cast<char>(*first >> row.lowerBit & 3)};
-    case Holds::byte:
+    case Storage::byte:
         return std::string(inputText(first, 1));
-    case Holds::half:
+    case Storage::half:
         break;
     }
     return std::string(inputText(first, 2 * static_cast<std::size_t>(std::max(row.elements, 1))));
@@ -160,7 +160,7 @@ void requireWord(const Row& row, std::string_view word, const std::string& held)
     }
 }
 
-/// The bytes behind the decimal numbers of `value`.
+/// The bytes that the decimal numbers in `value` stand for.
 std::string bytesShown(const Row& row, std::string_view value) {
     if (row.elements == 0) {
         return bytesOf(row, numberOf(row.key, value));
@@ -169,7 +169,7 @@ std::string bytesShown(const Row& row, std::string_view value) {
     for (int left = row.elements; left > 0; --left) {
         bytes += bytesOf(row, numberOf(row.key, takeUntil(value, ' ', row.key)));
     }
-    requireEqual(row.key, "", value); // nothing behind the last element's blank
+    requireEqual(row.key, "", value); // nothing after the last element's blank
     return bytes;
 }
 
@@ -187,7 +187,7 @@ void requireTuningOf(const Block& block, int id, std::string_view text) {
             requireWord(row, value, bytesIn(block, row));
         }
     }
-    requireEqual("behind the last line", "", text);
+    requireEqual("after the last line", "", text);
 }
 
 } // namespace orvane::fuzz

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Reads a tuning file back into the bytes of the block that it was made of, with a table of its
-// own, so that a fault in the product's layout is not repeated here.
+// Reads a tuning file back into the bytes of its block, with a separate table, so that a fault in
+// the product's layout is not repeated here.
 #pragma once
 
 #include <array>

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The text of a tuning file, read back into a block. The tool writes the same text of that block
-// again; what it would not write is refused, with the place of the first fault. The first byte of
-// the input chooses how the text begins: 0 for what the input says, any other for a whole tuning
-// file in which a line, by the remainder, is replaced by the rest of the input.
+// The text of a tuning file, read back into a block. For an accepted text, the tool writes the same
+// text from that block; any other text is refused with the place of the first fault. If the first
+// byte of the input is 0, the rest is the text. Otherwise the text is a whole tuning file in which
+// the rest of the input replaces the line that the first byte chooses.
 #include "fuzz/support.h"
 #include "kit/host/kit_error.h"
 #include "kit/tuning/tuning_text.h"
@@ -31,7 +31,7 @@ std::string textOf(const DpsBlock& block, std::int32_t id) {
     return text.str();
 }
 
-/// A whole file of zeros with `line` in the place of one of its lines, the line's end included.
+/// The tuning file of zeros with `line` in place of one of its lines and that line's end.
 std::string withLine(std::size_t number, std::string_view line) {
     std::string text = textOf({}, 3);
     std::size_t begin = 0;
@@ -41,7 +41,7 @@ std::string withLine(std::size_t number, std::string_view line) {
     return text.replace(begin, text.find('\n', begin) + 1 - begin, line);
 }
 
-/// Whether the tool writes `text` of `block`, for whichever block id.
+/// Whether the tool writes `text` for `block`, with any block id.
 bool isWritten(const std::string& text, const DpsBlock& block) {
     for (std::int32_t id = 0; isTuningBlock(id); ++id) {
         if (textOf(block, id) == text) {
@@ -51,7 +51,7 @@ bool isWritten(const std::string& text, const DpsBlock& block) {
     return false;
 }
 
-/// "a.txt:LINE:COLUMN: ", and no second line, of a text of so many lines.
+/// Requires "a.txt:LINE:COLUMN: " and no second line, for a text of this many lines.
 void requirePlace(std::string_view line, std::size_t lines) {
     std::string_view rest = line;
     bool isPlace = take(rest, sizeof NAME) == std::string(NAME) + ":";
