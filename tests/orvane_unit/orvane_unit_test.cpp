@@ -48,7 +48,7 @@ void expectRefused(const Words& words, const std::string& complaint) {
 const Words COMMANDS = {"new", "describe", "set",    "show",    "explain",
                         "run", "diff",     "impact", "capture", "check"};
 
-TEST(OrvaneUnitTest, EveryCommandHelpsWithAnExample) {
+TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
     const kit::RunResult help = start({"--help"});
     EXPECT_EQ(help.exitStatus, 0);
     EXPECT_EQ(help.standardError, "");
@@ -88,7 +88,7 @@ TEST(OrvaneUnitTest, NewMakesTheDescribedOrTheSampleUnit) {
     EXPECT_TRUE(exists(folder.path() / "two/fs/mp/etc/airplay_static.conf"));
 }
 
-TEST(OrvaneUnitTest, NewMakesNothingOfABadDescription) {
+TEST(OrvaneUnitTest, NewMakesNothingFromABadDescription) {
     const TemporaryFolder folder;
     const std::string description = folder.path() / "unit.toml";
     const std::string root = folder.path() / "unit";
@@ -98,7 +98,7 @@ TEST(OrvaneUnitTest, NewMakesNothingOfABadDescription) {
     EXPECT_FALSE(exists(root));
 }
 
-TEST(OrvaneUnitTest, DescribeMakesTheSameUnitAgain) {
+TEST(OrvaneUnitTest, DescriptionMakesTheSameUnitAgain) {
     const DescribedUnit described;
     const kit::RunResult result = start({"describe", described.root()});
     EXPECT_EQ(result.exitStatus, 0);
@@ -120,7 +120,7 @@ TEST(OrvaneUnitTest, SetChangesAllOrNothing) {
     EXPECT_NE(shown.standardOutput.find("serial=SN9"), std::string::npos);
 }
 
-TEST(OrvaneUnitTest, ExplainSaysNoWhereADefaultStandsIn) {
+TEST(OrvaneUnitTest, ExplainSaysNoForADefault) {
     const DescribedUnit described;
     EXPECT_EQ(start({"explain", described.root()}).exitStatus, 0);
     start({"set", described.root(), "param.139=0"});
@@ -128,7 +128,7 @@ TEST(OrvaneUnitTest, ExplainSaysNoWhereADefaultStandsIn) {
     EXPECT_EQ(start({"explain", described.root(), "-i", "--json"}).exitStatus, 1);
 }
 
-TEST(OrvaneUnitTest, DiffSaysNoWhereSomethingDiffers) {
+TEST(OrvaneUnitTest, DiffSaysNoForADifference) {
     const DescribedUnit first;
     const DescribedUnit second([](kit::UnitDescription& unit) { unit.image.params[50] = 1; });
     expectRan(start({"diff", first.root(), first.root()}), 0, "");
@@ -146,13 +146,13 @@ TEST(OrvaneUnitTest, RunShowsADiffOrOnlyNames) {
     expectRan(start({"run", root, "--", "-a"}), 0,
               "--- /tmp/airplay.conf\n+++ /tmp/airplay.conf\n@@ -1,1 +1,1 @@\n-older\n"
               "+airplay stock\n");
-    expectRan(start({"run", root, "--", "-a"}), 0, ""); // the same once more
+    expectRan(start({"run", root, "--", "-a"}), 0, ""); // the same again
     expectRan(start({"run", root, "--brief", "--", "-i"}), 0,
               "made /tmp/iap1.cfg, 254 bytes\nmade /tmp/iap2.cfg, 239 bytes\n"
               "made /tmp/iap2_device.cfg, 263 bytes\n");
 }
 
-TEST(OrvaneUnitTest, RunPassesOnWhatTheToolSays) {
+TEST(OrvaneUnitTest, RunPassesOnTheToolsMessages) {
     const DescribedUnit described;
     const kit::RunResult result = start({"run", described.root(), "--", "-x"});
     EXPECT_EQ(result.exitStatus, 0);
@@ -160,13 +160,13 @@ TEST(OrvaneUnitTest, RunPassesOnWhatTheToolSays) {
     EXPECT_NE(result.standardError.find("'x'"), std::string::npos);
 }
 
-TEST(OrvaneUnitTest, ToolThatEndsWithAnotherStatusIsANo) {
+TEST(OrvaneUnitTest, OtherExitStatusOfTheToolIsANo) {
     const DescribedUnit described;
     expectRan(start({"run", described.root(), "--orvane", "/bin/false"}), 1, "",
               "orvane-unit: orvane ended with exit status 1\n");
 }
 
-TEST(OrvaneUnitTest, RunWantsAToolThatIsThere) {
+TEST(OrvaneUnitTest, RunNeedsAnExistingTool) {
     const DescribedUnit described;
     const kit::RunResult result =
         start({"run", described.root(), "--orvane", described.folder() / "none"});
@@ -175,7 +175,7 @@ TEST(OrvaneUnitTest, RunWantsAToolThatIsThere) {
     EXPECT_NE(result.standardError, "");
 }
 
-TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramElseOnPath) {
+TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramOrOnPath) {
     const DescribedUnit described;
     const fs::path alone = described.folder() / "alone/orvane-unit";
     const fs::path tools = described.folder() / "tools";
@@ -196,11 +196,11 @@ TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramElseOnPath) {
     EXPECT_TRUE(exists(described.root() / "tmp/iap2.cfg"));
 }
 
-/// The privilege to change the root is gone for good, so the way leads through a user namespace; or
-/// nowhere, with the remedy told, where the host allows none.
+/// The privilege to change the root is gone for good, so the program needs a user namespace; if the
+/// host allows none, the program names the remedy.
 TEST(OrvaneUnitTest, RunNeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
     const DescribedUnit described;
-    const bool isAllowed = buildCommand("").size() == 1 && // an emulator has threads of its own
+    const bool isAllowed = buildCommand("").size() == 1 && // an emulator has its own threads
                            kit::runCaptured([] {
                                _exit(unshare(CLONE_NEWUSER) == 0 && chroot("/") == 0 ? 0 : 1);
                            }).exitStatus == 0;
@@ -225,7 +225,7 @@ TEST(OrvaneUnitTest, RunNeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
     EXPECT_NE(result.standardError.find("allow user namespaces"), std::string::npos);
 }
 
-TEST(OrvaneUnitTest, CommandsThatWriteRefuseWhatIsNoUnitOfOurs) {
+TEST(OrvaneUnitTest, CommandsThatWriteRefuseFoldersWithoutTheMark) {
     const DescribedUnit described;
     const std::string root = described.root();
     fs::remove(described.root() / kit::MARKER_NAME);
@@ -278,12 +278,12 @@ kit::RunResult startAsOnATerminal(const std::string& noColour, const Words& word
     return runOnHost(command);
 }
 
-TEST(OrvaneUnitTest, NothingIsColouredButOnATerminal) {
+TEST(OrvaneUnitTest, OutputIsColouredOnlyOnATerminal) {
     const DescribedUnit described;
     const Words words = {"explain", described.root()};
     EXPECT_FALSE(isColoured(start(words)));
     if (buildCommand(ORVANE_UNIT_BINARY).size() > 1) {
-        return; // through an emulator, which the native builds' tests do not need
+        return; // in a cross build; the native builds test this
     }
     EXPECT_TRUE(isColoured(startAsOnATerminal("NO_COLOR", words)));
     EXPECT_FALSE(isColoured(startAsOnATerminal("NO_COLOR=1", words)));

@@ -18,7 +18,7 @@ using Words = std::vector<std::string>;
 
 constexpr char PROGRAM[] = "orvane-unit: ";
 
-/// The complaint that the program makes instead of doing anything.
+/// The program's complaint; requires exit status 2 and no other output.
 std::string refusalOf(const Words& words) {
     Words command = buildCommand(ORVANE_UNIT_BINARY);
     command.insert(command.end(), words.begin(), words.end());
@@ -31,7 +31,7 @@ std::string refusalOf(const Words& words) {
     return result.standardError;
 }
 
-/// Below /proc, where nobody can make a folder: nothing of this name is there on any host.
+/// The root is below /proc, where nobody can make a folder, so it exists on no host.
 class MissingRootTest : public ::testing::TestWithParam<Words> {};
 
 TEST_P(MissingRootTest, IsBadInput) {
@@ -78,12 +78,12 @@ TEST(RefusalTest, RootThatIsAFileIsBadInput) {
     EXPECT_EQ(readFile(file), "text");
 }
 
-TEST(RefusalTest, ComplaintsEscapeWhatIsNoText) {
+TEST(RefusalTest, ComplaintsEscapeAnythingThatIsNotText) {
     EXPECT_NE(refusalOf({"show", "/proc/none/\x1b[2J\xff"}).find("/proc/none/\\x1b[2J\\xff"),
               std::string::npos);
 }
 
-TEST(RefusalTest, MarkThatSaysSomethingElseIsNoMark) {
+TEST(RefusalTest, OtherContentIsNotAMark) {
     const DescribedUnit described;
     writeFile(described.root() / kit::MARKER_NAME, "made by someone else\n");
     refusalOf({"run", described.root(), "--", "-a"});
@@ -91,7 +91,7 @@ TEST(RefusalTest, MarkThatSaysSomethingElseIsNoMark) {
     EXPECT_TRUE(fs::is_empty(described.root() / "tmp"));
 }
 
-TEST(RefusalTest, BinaryThatIsNoProgramIsBadInput) {
+TEST(RefusalTest, BinaryThatIsNotAProgramIsBadInput) {
     const DescribedUnit described;
     const std::string binary = described.folder() / "orvane";
     writeFile(binary, "#!/bin/sh\n");

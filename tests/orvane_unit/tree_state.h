@@ -21,14 +21,14 @@ inline std::int64_t nanoseconds(const timespec& time) {
     return std::int64_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
 }
 
-/// A file system's times grow in ticks of up to 10 ms: what is written before and after this call
-/// has different times.
+/// Writes before and after this call get different times: a file system's clock ticks every 10 ms
+/// or more often.
 inline void letTimePass() {
     std::this_thread::sleep_for(std::chrono::milliseconds(20));
 }
 
-/// A folder and every entry below it with what a change in passing would leave behind. A write of
-/// the same bytes counts: the time of the last change of state can't be set back.
+/// A folder and every entry below it, with every trace that a temporary change would leave. Even a
+/// write of the same bytes shows: the time of the last change of state can't be set back.
 inline std::map<std::string, FileState> treeStates(const std::filesystem::path& root) {
     std::map<std::string, FileState> tree;
     const auto add = [&tree](const std::filesystem::path& path) {

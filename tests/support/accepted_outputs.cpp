@@ -60,7 +60,7 @@ void fillWholeUnit() {
                           "Type = Application\nVersion Number = ") +
                   LONG_VERSION + "\n");
     std::string image(179, '\0');
-    image[133] = image[134] = '\xFF'; // a generated audio profile
+    image[133] = image[134] = '\xFF'; // the generated audio profile
     image[139] = 41;                  // LONG_MODEL
     writeFile(IMAGE_PATH, image);
     std::string disk(MEBIBYTE, '\0');

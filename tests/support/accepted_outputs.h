@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What the tool may leave when it runs short of something: whole files only, made of true values
-// and of defaults.
+// What the tool may leave when a resource runs out: only whole files, made of true values and
+// defaults.
 #pragma once
 
 #include <set>
@@ -9,13 +9,13 @@
 
 namespace orvane::test {
 
-constexpr char LONG_MODEL[] = "Marl Kolvenda Cargo"; // code 41: needs memory of its own
+constexpr char LONG_MODEL[] = "Marl Kolvenda Cargo"; // code 41: too long for a string's own buffer
 constexpr char LONG_VERSION[] = "3.10.2.a-version-that-needs-memory-of-its-own";
 
 /// Fills the entered unit with everything that a whole run of "-a -i" needs.
 void fillWholeUnit();
 
-/// The texts of one output that are acceptable, by its name in /tmp.
+/// The acceptable texts of the output with this name in /tmp.
 std::set<std::string> acceptedTexts(const std::string& name);
 
 /// The names of all outputs, in the order in which they are written.

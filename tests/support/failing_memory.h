@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Memory that runs out at a chosen moment: the tests' binary brings its own operator new.
+// Memory that runs out at a chosen moment: the tests' binary has its own operator new.
 #pragma once
 
 namespace orvane::test {
 
-/// How many allocations fail once the first has.
+/// How many allocations fail.
 enum class Shortage { once, forGood };
 
-/// While it lives, allocation number `first` (from 1) fails, alone or with all later ones.
+/// While it lives, allocation number `first` (from 1) fails, either alone or with all later ones.
 class FailingMemory {
 public:
     FailingMemory(int first, Shortage shortage);

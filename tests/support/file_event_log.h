@@ -17,14 +17,14 @@
 
 namespace orvane::test {
 
-/// What the kernel sees happen to some files, in its order.
+/// What happens to some files, in the order that the kernel reports.
 class FileEventLog {
 public:
     /// Logs one kind of event from now on: IN_OPEN, IN_CLOSE, or IN_MODIFY, which is a write or a
     /// truncation. The files must exist.
     ///
-    /// The kernel merges an event with an equal one before it. A watch of the folder as well puts
-    /// an event of its own between any two of a file.
+    /// The kernel merges an event with an equal one before it. Also watching the folder puts an
+    /// event between any two of a file.
     FileEventLog(std::uint32_t event, const std::vector<std::string>& paths)
         : events_(inotify_init1(IN_NONBLOCK | IN_CLOEXEC)) {
         for (const std::string& path : paths) {

@@ -11,11 +11,11 @@
 
 namespace orvane::test {
 
-/// While it lives, permission bits hold for this process too, which as a superuser, or as the
-/// superuser of its own user namespace, would pass over them.
-class PermissionsHold {
+/// While it lives, permission bits apply to this process even if it is a superuser, or the
+/// superuser of its own user namespace.
+class EnforcedPermissions {
 public:
-    PermissionsHold() {
+    EnforcedPermissions() {
         if (syscall(SYS_capget, &header_, former_.data()) != 0) {
             throw kit::systemError("capget");
         }
@@ -25,9 +25,9 @@ public:
             throw kit::systemError("capset");
         }
     }
-    ~PermissionsHold() { syscall(SYS_capset, &header_, former_.data()); }
-    PermissionsHold(const PermissionsHold&) = delete;
-    PermissionsHold& operator=(const PermissionsHold&) = delete;
+    ~EnforcedPermissions() { syscall(SYS_capset, &header_, former_.data()); }
+    EnforcedPermissions(const EnforcedPermissions&) = delete;
+    EnforcedPermissions& operator=(const EnforcedPermissions&) = delete;
 
 private:
     using Sets = std::array<__user_cap_data_struct, _LINUX_CAPABILITY_U32S_3>;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Limits of the kernel, for faults that come from outside the product and hit a superuser as well.
+// Limits of the kernel, for faults that come from outside the product and affect a superuser as
+// well.
 #pragma once
 
 #include "kit/host/kit_error.h"

@@ -11,8 +11,8 @@
 
 namespace orvane::test {
 
-/// Keeps what the process says on its standard output and standard error, from its making until
-/// `stop`. A pipe and no temporary file, so that it works inside any unit; at most 64 KiB.
+/// Captures standard output and standard error of this process from construction until `stop`. Uses
+/// a pipe, not a temporary file, so that it works inside any unit; at most 64 KiB.
 class StandardStreams {
 public:
     StandardStreams() {
@@ -36,7 +36,7 @@ public:
     StandardStreams(const StandardStreams&) = delete;
     StandardStreams& operator=(const StandardStreams&) = delete;
 
-    /// Lets the process speak again and returns what it said.
+    /// Ends the capture and returns what was written.
     std::string stop() {
         if (formerOutput_ != -1) {
             static_cast<void>(std::fflush(stdout));

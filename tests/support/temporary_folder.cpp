@@ -18,7 +18,7 @@ TemporaryFolder::TemporaryFolder() {
     if (mkdtemp(name.data()) == nullptr) {
         throw kit::systemError("no temporary folder " + name);
     }
-    path_ = fs::canonical(name); // as the system tells the working directory
+    path_ = fs::canonical(name); // as the system reports the working directory
 }
 
 TemporaryFolder::~TemporaryFolder() {

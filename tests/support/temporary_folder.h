@@ -5,7 +5,7 @@
 
 namespace orvane::test {
 
-/// A folder of a test's own. Removed at the end, but kept and named when the test has failed.
+/// A test's own folder. Removed at the end, but kept and named when the test has failed.
 class TemporaryFolder {
 public:
     TemporaryFolder();

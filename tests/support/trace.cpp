@@ -51,7 +51,7 @@ std::vector<std::string> readTraceLines(const fs::path& file) {
     return lines;
 }
 
-/// The lines of the process that changed its root, from the program that it then executed on.
+/// The lines of the process that changed its root, starting with the program that it then executed.
 std::vector<std::string> productLines(const fs::path& folder) {
     for (const fs::directory_entry& entry : fs::directory_iterator(folder)) {
         const std::vector<std::string> lines = readTraceLines(entry.path());
@@ -171,7 +171,7 @@ Trace traceRun(const fs::path& root, const std::vector<std::string>& arguments) 
     }
     command.insert(command.end(), {root.string(), std::string(ORVANE_BINARY)});
     command.insert(command.end(), arguments.begin(), arguments.end());
-    fs::create_directory(root / "proc"); // a sanitized product wants the host's there
+    fs::create_directory(root / "proc"); // a sanitized product needs the host's there
     const kit::RunResult result = runOnHost(command);
     EXPECT_EQ(result.exitStatus, 0) << result.standardError;
 

@@ -19,7 +19,7 @@ namespace orvane::test {
 ///   put PATH LENGTH                                     one write to any file
 ///   close PATH
 ///
-/// Only files with absolute paths count: what a loader or an emulator does for itself does not.
+/// Only files with absolute paths count, not what a loader or an emulator does for itself.
 struct Trace {
     std::vector<std::string> operations;
     std::vector<std::string> leftOpen; ///< paths that were never closed

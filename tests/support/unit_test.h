@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The fixture of every test that touches the unit: a root of its own, entered. Inside a test all
+// The fixture of every test that touches the unit: it makes a root and enters it. Inside a test all
 // absolute paths are the unit's, for the product and for the test alike.
 #pragma once
 
@@ -21,13 +21,13 @@ constexpr char IMAGE_PATH[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM";
 constexpr char DISK_PATH[] = "/dev/hd0";
 constexpr std::uint64_t MEBIBYTE = std::uint64_t{1024} * 1024;
 
-/// Files of the unit, as bytes. Parents must exist. A failure is a test failure.
+/// Files of the unit, as bytes. Parents must exist. An error fails the test.
 std::string readFile(const std::string& path);
 void writeFile(const std::string& path, const std::string& content);
 bool exists(const std::string& path);
 
-/// Starts every test inside a fresh unit: the folders, an image of 179 zero bytes, a disk of 2 MiB
-/// of zeros, nothing else. The unit is removed afterwards, but kept and named when the test failed.
+/// Starts every test inside a new unit: the folders, an image of 179 zero bytes, a disk of 2 MiB of
+/// zeros, nothing else. The unit is removed afterwards, but kept and named when the test failed.
 class UnitTest : public ::testing::Test {
 protected:
     UnitTest();
@@ -42,16 +42,16 @@ protected:
     /// Sets / gives bytes of the disk, counted back from its end.
     static void setDiskFromEnd(std::uint64_t bytesBeforeEnd, const std::string& bytes);
     static std::string diskFromEnd(std::uint64_t bytesBeforeEnd, std::size_t length);
-    /// Puts a folder in the place of `path`, whatever stood there.
+    /// Replaces whatever is at `path` by a folder.
     static void putFolder(const std::string& path);
     static void remove(const std::string& path);
 
     /// Number of descriptors that this process has open.
     static int openDescriptors();
 
-    /// Where the unit lies on the host, for a program that is run in it from outside (leave first).
+    /// Where the unit is on the host, for a program that is run in it from outside (leave first).
     const std::filesystem::path& hostRoot() const { return folder_.path(); }
-    /// Leaves the unit for the rest of the test: absolute paths are the host's again.
+    /// Leaves the unit for the rest of the test: absolute paths are then the host's.
     void leave();
 
 private:

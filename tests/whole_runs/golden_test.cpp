@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A unit in, its /tmp out: golden/CASE holds the unit, the arguments and what must be left.
+// A unit in, its /tmp out: golden/CASE holds the unit, the arguments and the expected /tmp.
 #include "kit/description/parse_description.h"
 #include "kit/enter/entered_root.h"
 #include "kit/enter/run_inside.h"
@@ -44,7 +44,7 @@ std::vector<std::string> readLines(const fs::path& file) {
     return lines;
 }
 
-/// Every entry of a unit's /tmp, folders with a slash behind, or "(absent)".
+/// Every entry of a unit's /tmp, folders with a trailing slash, or "(absent)".
 std::set<std::string> listTmp(const fs::path& tmp) {
     if (!fs::exists(tmp)) {
         return {"(absent)"};
@@ -89,7 +89,7 @@ private:
     fs::path root_;
 };
 
-TEST_P(GoldenTest, BinaryLeavesWhatIsExpected) {
+TEST_P(GoldenTest, BinaryLeavesTheExpectedFiles) {
     const kit::RunResult result =
         kit::runInside(root(), {ORVANE_BINARY, readLines(caseFolder() / "arguments")});
     EXPECT_EQ(result.exitStatus, 0);
@@ -98,8 +98,8 @@ TEST_P(GoldenTest, BinaryLeavesWhatIsExpected) {
     expectOutputs();
 }
 
-/// The same without a program of its own, for tools that watch this process.
-TEST_P(GoldenTest, OptionLoopLeavesWhatIsExpected) {
+/// The same inside this process, for tools that watch it.
+TEST_P(GoldenTest, OptionLoopLeavesTheExpectedFiles) {
     std::vector<std::string> words = {"orvane"};
     for (const std::string& argument : readLines(caseFolder() / "arguments")) {
         words.push_back(argument);
@@ -113,7 +113,7 @@ TEST_P(GoldenTest, OptionLoopLeavesWhatIsExpected) {
     {
         const kit::EnteredRoot entered(root());
         StandardStreams streams;
-        optind = 0; // glibc's getopt begins anew
+        optind = 0; // makes glibc's getopt start again
         EXPECT_EQ(runOptions(static_cast<int>(words.size()), argv.data()), 0);
         said = streams.stop();
     }
@@ -121,7 +121,7 @@ TEST_P(GoldenTest, OptionLoopLeavesWhatIsExpected) {
     expectOutputs();
 }
 
-/// An expected file that no list names would never be compared.
+/// An expected file that is on no list would never be compared.
 TEST(GoldenCases, CompareEveryExpectedFile) {
     for (const std::string& name : goldenCases()) {
         SCOPED_TRACE(name);
@@ -144,7 +144,7 @@ std::string caseName(const ::testing::TestParamInfo<std::string>& parameter) {
 
 INSTANTIATE_TEST_SUITE_P(Golden, GoldenTest, ::testing::ValuesIn(goldenCases()), caseName);
 
-TEST(GoldenCases, AreThere) {
+TEST(GoldenCases, AreFound) {
     EXPECT_GE(goldenCases().size(), 25U);
 }
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A system that lets a process map nothing: Linux does not, so strace answers for it.
+// A system that allows mappings of length 0: Linux does not, so strace answers instead.
 #include "kit/enter/captured_run.h"
 #include "tests/support/host_command.h"
 #include "tests/support/temporary_folder.h"
@@ -16,17 +16,17 @@ namespace orvane::test {
 
 namespace {
 
-constexpr char NOTHING_THERE[] = "0x1000"; // the first page is nobody's
+constexpr char NOTHING_THERE[] = "0x1000"; // the first page is never mapped
 
 class MappedNothingTest : public UnitTest {
 protected:
-    /// Runs `orvane -a`, whose attempts to map the image are told that they succeeded.
+    /// Runs `orvane -a`, and reports success to its attempts to map the image.
     std::string run() {
         leave();
         const TemporaryFolder folder;
         const std::string report = (folder.path() / "report").string();
         const std::string image = hostRoot().string() + IMAGE_PATH;
-        std::filesystem::create_directory(hostRoot() / "proc"); // a sanitized product wants it
+        std::filesystem::create_directory(hostRoot() / "proc"); // a sanitized product needs it
         const kit::RunResult result =
             runOnHost({"strace", "-E", "ASAN_OPTIONS=detect_leaks=0", "-f", "-qq", "-o", report,
                        "-P", image, "-e", "trace=mmap,mmap2", "-e",
@@ -37,7 +37,7 @@ protected:
     }
 };
 
-TEST_F(MappedNothingTest, EmptyImageCountsAsNone) {
+TEST_F(MappedNothingTest, EmptyImageCountsAsMissing) {
     if (sizeof ORVANE_EMULATOR != 1) {
         GTEST_SKIP() << "an emulator maps whole pages of its own accord";
     }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The order of the file operations of whole runs, and that nothing stays open.
+// Whole runs do their file operations in order, and leave nothing open.
 #include "tests/support/trace.h"
 #include "tests/support/unit_test.h"
 
@@ -16,7 +16,7 @@ namespace {
 
 using Operations = std::vector<std::string>;
 
-/// One operation a line, so that a difference is shown as one.
+/// One operation a line, so that a failure shows the difference by lines.
 std::string lines(const Operations& operations) {
     std::string text;
     for (const std::string& operation : operations) {
@@ -25,7 +25,7 @@ std::string lines(const Operations& operations) {
     return text;
 }
 
-/// What one write carries.
+/// One write.
 std::string put(const std::string& path, const std::string& text) {
     return "put " + path + " " + std::to_string(text.size());
 }
@@ -38,10 +38,10 @@ void append(Operations& operations, const Operations& more) {
     operations.insert(operations.end(), more.begin(), more.end());
 }
 
-/// Bytes that one lookup maps. An emulator asks its own system for whole pages.
+/// The bytes that one lookup maps. An emulator asks its own system for whole pages.
 const std::string MAPPED_BYTES = sizeof ORVANE_EMULATOR == 1 ? "179" : "4096";
 
-/// One lookup of a parameter: its own descriptor and its own mapping, both given back.
+/// One lookup of a parameter: its own descriptor and its own mapping, both released.
 Operations lookup() {
     const std::string image = IMAGE_PATH;
     return {"read " + image,
@@ -76,7 +76,7 @@ Operations versionScan() {
             "close /fs/rwdata/.Version/app.inf", "close /fs/rwdata/.Version/"};
 }
 
-/// The serial, the model, the version, and the fuel type that nothing uses.
+/// The serial, the model, the version, and the unused fuel type.
 Operations iapValues() {
     Operations operations = diskRead("-1048447", "8");
     append(operations, lookup());
@@ -85,7 +85,7 @@ Operations iapValues() {
     return operations;
 }
 
-/// A file that fits into the stream's buffer: written when it is closed, after the template is.
+/// A file that fits into the stream's buffer: written when it is closed, after the template.
 Operations generated(const std::string& output, const std::string& templateFile,
                      const std::string& text) {
     return {"create " + output, "read " + templateFile, "close " + templateFile, put(output, text),
@@ -132,7 +132,7 @@ protected:
     }
 };
 
-TEST_F(TraceTest, AirplayGathersThenWritesFlushingTheLastLines) {
+TEST_F(TraceTest, AirplayGathersThenWritesAndFlushesTheLastLines) {
     setImage(133, {3, 0});
     Operations expected;
     for (int value = 0; value < 4; ++value) { // model, brand, drive side, audio profile

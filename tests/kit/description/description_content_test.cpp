@@ -35,7 +35,7 @@ std::string contentOf(const std::string& toml) {
 }
 
 TEST(DescriptionContent, FileIsATextHexOrARepeatedPart) {
-    EXPECT_EQ(contentOf("\"\"\"a\\\n  \xC3\xA9\"\"\""), "a\xC3\xA9"); // a line goes on
+    EXPECT_EQ(contentOf("\"\"\"a\\\n  \xC3\xA9\"\"\""), "a\xC3\xA9"); // a continued line
     EXPECT_EQ(contentOf("\"a\\u0000\\n\""), std::string("a\0\n", 3));
     EXPECT_EQ(contentOf("\"hex:41\""), "hex:41"); // the content of a file has no prefix
     EXPECT_EQ(contentOf("{ hex = \"00 fF\\n0A\" }"), std::string("\0\xFF\n", 3));
@@ -70,7 +70,7 @@ TEST(DescriptionContent, LinkHasATarget) {
                               {"/a", "b/../c"}, {"/d", "\xFF/"}, {"/\xFF", "/e"}}));
 }
 
-TEST(DescriptionContent, PathMayBeInHexWhereverOneStands) {
+TEST(DescriptionContent, EveryPathMayBeInHex) {
     const kit::UnitDescription unit =
         parse("folders = [\"hex:2f61\", \"/hex:62\"]\nabsent = [\"hex:2fFE\"]\n"
               "[files]\n\"hex:2ffd\" = \"x\"\n\"hex:2f6a\" = { size = 1 }\n");
@@ -80,7 +80,7 @@ TEST(DescriptionContent, PathMayBeInHexWhereverOneStands) {
     EXPECT_EQ(unit.sparseFiles.count("/j"), 1U);
 }
 
-TEST(DescriptionContent, ErrorIsOneLineWhateverPathItIsAbout) {
+TEST(DescriptionContent, ErrorIsOneLineForAnyPath) {
     try {
         parse("[files]\n\"/a\\nb\" = 1\n");
         ADD_FAILURE() << "accepted";
@@ -101,7 +101,7 @@ protected:
 
     const fs::path& folder() const { return folder_.path(); }
 
-    /// Reads a description that lies at `file` and takes the content of /x from `path`.
+    /// Reads a description at `file` that takes the content of /x from `path`.
     static kit::UnitDescription read(const fs::path& file, const std::string& path) {
         writeFile(file, "[files]\n\"/x\" = { path = \"" + path + "\" }\n");
         return kit::readDescription(file);
@@ -133,21 +133,21 @@ TEST_F(HostContentTest, PathIsRelativeToTheFolderOfTheDescription) {
     EXPECT_EQ(read("below/unit.toml", "../content").files.at("/x"), CONTENT);
 }
 
-TEST_F(HostContentTest, ParsedTextTakesThemFromTheFolderOfItsName) {
+TEST_F(HostContentTest, PathInAParsedTextIsRelativeToTheFolderOfItsName) {
     const std::string text = "[files]\n\"/x\" = { path = \"content\" }\n";
     EXPECT_EQ(kit::parseDescription(text, folder() / "any").files.at("/x"), CONTENT);
     fs::current_path(folder());
     EXPECT_EQ(kit::parseDescription(text, "any").files.at("/x"), CONTENT);
 }
 
-TEST_F(HostContentTest, EmptyFileAndALinkAreTaken) {
+TEST_F(HostContentTest, EmptyFileAndLinkAreAccepted) {
     writeFile(folder() / "empty", "");
     fs::create_symlink("content", folder() / "link");
     EXPECT_EQ(read(folder() / "unit.toml", "empty").files.at("/x"), "");
     EXPECT_EQ(read(folder() / "unit.toml", "link").files.at("/x"), CONTENT);
 }
 
-TEST_F(HostContentTest, WhatIsNoFileIsRefusedWithItsPlace) {
+TEST_F(HostContentTest, AnythingButAFileIsRefusedWithItsPlace) {
     const fs::path file = folder() / "unit.toml";
     const std::string place = file.string() + ":2:17: the content of /x: ";
     EXPECT_EQ(refusalOf(file, "missing"), place + "cannot read " + (folder() / "missing").string() +
@@ -163,7 +163,7 @@ TEST_F(HostContentTest, WhatIsNoFileIsRefusedWithItsPlace) {
                                            " has 1073741825 bytes: at most 1073741824 are taken");
 }
 
-TEST_F(HostContentTest, DescriptionItselfMayComeThroughAPipeAndLate) {
+TEST_F(HostContentTest, DescriptionMayComeLateThroughAPipe) {
     const std::string text = "[files]\n\"/x\" = \"through\"\n";
     int ends[2];
     ASSERT_EQ(::pipe(ends), 0);

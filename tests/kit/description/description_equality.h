@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Descriptions are the same when all their parts are. Only tests ask.
+// Descriptions are equal when all their parts are. Only tests compare them.
 #pragma once
 
 #include "kit/description/unit_description.h"

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What a description must not say of paths and their contents, and what is said of it.
+// What a description must not contain about paths and their contents, and the messages.
 #include "tests/kit/description/description_refusal.h"
 
 #include <gtest/gtest.h>

@@ -10,7 +10,7 @@
 
 namespace orvane::test {
 
-/// A text that is no description, and the whole of what is said of it.
+/// A text that is not a description, and the whole message about it.
 struct DescriptionRefusal {
     const char* text;
     const char* message;

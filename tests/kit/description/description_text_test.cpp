@@ -13,7 +13,7 @@ namespace orvane::test {
 
 namespace {
 
-/// A unit with one of each, and the text that a reader gets to see.
+/// A unit with an entry of each kind, and its text.
 kit::UnitDescription wholeUnit() {
     kit::UnitDescription unit;
     unit.folders = {"/new", "/\xFF"};
@@ -121,11 +121,11 @@ TEST(DescriptionText, IsWhatAReaderWouldWrite) {
     EXPECT_EQ(kit::descriptionText(wholeUnit()), WHOLE_TEXT);
 }
 
-TEST(DescriptionText, GivesTheSameUnitAgain) {
+TEST(DescriptionText, GivesTheSameUnitWhenParsed) {
     EXPECT_TRUE(parse(WHOLE_TEXT) == wholeUnit());
 }
 
-TEST(DescriptionText, OfNothingIsTheTwoSizes) {
+TEST(DescriptionText, OfAnEmptyUnitIsTheTwoSizes) {
     const std::string text = kit::descriptionText({});
     EXPECT_EQ(text, "[image]\nsize = 179\n\n[disk]\nsize = 2097152\n");
     EXPECT_TRUE(parse(text) == kit::UnitDescription());
@@ -158,7 +158,7 @@ TEST(DescriptionText, EveryDifferenceMakesUnitsUnequal) {
     }
 }
 
-TEST(DescriptionText, RandomUnitsComeBack) {
+TEST(DescriptionText, RandomUnitsSurviveTheRoundTrip) {
     for (std::uint32_t seed = 0; seed < 400; ++seed) {
         const kit::UnitDescription unit = RandomUnit(seed).unit();
         const std::string text = kit::descriptionText(unit);
@@ -166,7 +166,7 @@ TEST(DescriptionText, RandomUnitsComeBack) {
     }
 }
 
-TEST(DescriptionText, EveryCharacterComesBackInEveryPlace) {
+TEST(DescriptionText, EveryCharacterSurvivesInEveryPlace) {
     std::string all;
     for (int c = 0; c < 0x80; ++c) {
         all += static_cast<char>(c);
@@ -188,7 +188,7 @@ TEST(DescriptionText, EveryCharacterComesBackInEveryPlace) {
     }
 }
 
-TEST(DescriptionText, QuotesComeBackWhereverTheyStand) {
+TEST(DescriptionText, QuotesSurviveInEveryPlace) {
     for (int bits = 0; bits < 256; ++bits) {
         std::string text = "\n";
         for (int bit = 0; bit < 8; ++bit) {

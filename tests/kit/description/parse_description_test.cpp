@@ -16,7 +16,7 @@ namespace orvane::test {
 
 namespace {
 
-/// The TOML block of the document, as a reader would copy it.
+/// The document's TOML block, as a reader would copy it.
 std::string documentedExample() {
     const std::string text = readFile(ORVANE_DOCS_DIR "/unit-description.md");
     const std::string open = "```toml\n";
@@ -24,7 +24,7 @@ std::string documentedExample() {
     return text.substr(begin, text.find("```", begin) - begin);
 }
 
-TEST(UnitDescription, ExampleOfTheDocumentIsAUnit) {
+TEST(UnitDescription, DocumentedExampleIsAUnit) {
     const TemporaryFolder folder;
     const std::filesystem::path root = folder.path() / "unit";
     kit::makeUnit(kit::parseDescription(documentedExample(), "example"), root);

@@ -27,7 +27,7 @@ public:
         return *(std::begin(choices) + static_cast<std::ptrdiff_t>(below(std::size(choices))));
     }
 
-    /// Any bytes, or text, or mostly zeros, or one byte again and again.
+    /// Any bytes, or text, or mostly zeros, or one repeated byte.
     std::string bytes(std::size_t size) {
         const std::size_t kind = below(5);
         const char same = static_cast<char>(engine_());
@@ -63,12 +63,12 @@ public:
         return result;
     }
 
-    /// A whole unit that makeUnit takes. Its disk's raw bytes lie anywhere, between the records,
-    /// too.
+    /// A whole unit that makeUnit accepts. Its disk has raw bytes anywhere, even between the
+    /// records.
     kit::UnitDescription unit();
 
 private:
-    /// A folder of a standard unit, or one of its own, or one below one that is there by now.
+    /// A folder of a standard unit, or another one, or one below a folder that `unit` already has.
     std::string folder(const kit::UnitDescription& unit) {
         const std::vector<std::string> folders = {
             "",     "/tmp", "/fs/mp/etc", "/fs/mp/etc/mm",        "/fs/rwdata/.Version", "/fs",
@@ -92,7 +92,7 @@ inline kit::UnitDescription RandomUnit::unit() {
                                    1048575, 1048576, 1048577, 1500000, 2097152};
     unit.disk.size = any(disks);
     for (std::size_t run = below(12); run > 0 && unit.disk.size > 0; --run) {
-        // Most of them around the records, which stand at the begin of the last mebibyte.
+        // Most of them around the records, which are at the start of the last mebibyte.
         const std::uint64_t base = unit.disk.size > 0x100000 ? unit.disk.size - 0x100000 : 0;
         const std::uint64_t at =
             oneIn(4) ? below(unit.disk.size) : (base + below(6200)) % unit.disk.size;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The built-in sample unit: one that shows every input of the tool at work.
+// The built-in sample unit: it shows every input of the tool at work.
 #include "config/config_store.h"
 #include "config/param_access.h"
 #include "config/record_area.h"
@@ -49,7 +49,7 @@ bool isZero(const DpsBlock& block) {
     return block.bytes == DpsBlock{}.bytes;
 }
 
-TEST_F(SampleUnitTest, IsTheFileThatOneMayCopy) {
+TEST_F(SampleUnitTest, IsTheSampleFile) {
     EXPECT_EQ(kit::sampleDescriptionText(),
               readFile(ORVANE_DOCS_DIR "/../kit/description/sample_unit.toml"));
 }
@@ -98,7 +98,7 @@ TEST_F(SampleUnitTest, EverySwitchAndModeOfItsTuningHasAWord) {
     }
 }
 
-TEST_F(SampleUnitTest, HasThreeVersionFilesOneOfThemOfTheApplication) {
+TEST_F(SampleUnitTest, HasThreeVersionFilesOneForTheApplication) {
     int applications = 0;
     const std::set<std::string> names = folderNames(root() / "fs/rwdata/.Version");
     EXPECT_EQ(names.size(), 3U);
@@ -121,7 +121,7 @@ TEST_F(SampleUnitTest, HasTemplatesAndStockFilesOfSomeDozenLines) {
     }
 }
 
-TEST_F(SampleUnitTest, ItsSixFilesAreMadeOfItsOwnValues) {
+TEST_F(SampleUnitTest, ItsSixFilesHoldItsOwnValues) {
     const kit::RunResult result = kit::runInside(root(), {ORVANE_BINARY, {"-a", "-i"}});
     EXPECT_EQ(result.exitStatus, 0);
     EXPECT_EQ(result.standardOutput + result.standardError, "");

@@ -52,7 +52,7 @@ TEST(ValueKeyTest, EveryKindIsPrintedAndParsedAgain) {
     EXPECT_EQ(kinds.size(), static_cast<std::size_t>(ValueKey::Kind::absent) + 1);
 }
 
-TEST(ValueKeyTest, KeysDifferInEachOfTheirParts) {
+TEST(ValueKeyTest, KeysDifferByEachOfTheirParts) {
     EXPECT_TRUE(kit::slotByteKey(9, 7) != kit::slotByteKey(9, 6));
     EXPECT_TRUE(kit::slotByteKey(9, 7) != kit::slotByteKey(8, 7));
     EXPECT_TRUE(kit::fileKey("/tmp/x") != kit::fileKey("/tmp/y"));
@@ -67,7 +67,7 @@ TEST(ValueKeyTest, NumbersMayBeHexadecimal) {
     EXPECT_TRUE(kit::parseKey("tuning.0x3.qwaNRAtten").key == kit::tuningFieldKey(3, "qwaNRAtten"));
 }
 
-TEST(ValueKeyTest, WhatAUnitDoesNotHaveIsRefused) {
+TEST(ValueKeyTest, KeyThatAUnitLacksIsRefused) {
     struct Refusal {
         const char* text;
         ValueKey::Kind kind;

@@ -42,7 +42,7 @@ TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
     }
 }
 
-TEST(ValuePlacesTest, BlockIsWhatItsFieldsAre) {
+TEST(ValuePlacesTest, BlockIsAllOfItsFields) {
     const kit::ValuePlace block = kit::valuePlace(kit::tuningBlockKey(3));
     EXPECT_EQ(block.offsetIn(DISK_SIZE), BASE + 4096 + 3 * 188);
     std::string mask(188, '\0');
@@ -63,7 +63,7 @@ TEST(ValuePlacesTest, OneSlotRepeatsNineOthers) {
     }
 }
 
-TEST(ValuePlacesTest, ValueThatDoesNotFitIsNamedWithWhatItTakes) {
+TEST(ValuePlacesTest, ValueThatDoesNotFitIsNamedWithTheSizeItNeeds) {
     EXPECT_EQ(kit::placeFault(kit::paramKey(134), 135), "");
     EXPECT_EQ(kit::placeFault(kit::paramKey(134), 134),
               "parameter 134 ends at byte 135 of an image of 134 bytes");

@@ -20,7 +20,7 @@ void say(int descriptor, const std::string& text) {
     ASSERT_EQ(write(descriptor, text.data(), text.size()), static_cast<ssize_t>(text.size()));
 }
 
-TEST(CapturedRunTest, OutputOfMebibytesIsWhole) {
+TEST(CapturedRunTest, LargeOutputIsWhole) {
     const std::string text(3 << 20U, 'x');
     const kit::RunResult result = kit::runCaptured([&text] {
         say(STDOUT_FILENO, text);
@@ -42,14 +42,14 @@ TEST(CapturedRunTest, ZerosOfASparseOutputAreKept) {
         << result.standardOutput.size() << " bytes";
 }
 
-TEST(CapturedRunTest, OutputThatIsOpenedByItsNameHasNoHole) {
+TEST(CapturedRunTest, OutputOpenedByNameHasNoHole) {
     const kit::RunResult result =
         runOnHost({"sh", "-c", "echo first >&2; echo second >/dev/stderr; echo third >&2"});
     EXPECT_EQ(result.standardError, "second\nthird\n");
 }
 
-/// The first loop goes on until this process has waited for the shell.
-TEST(CapturedRunTest, WhatOutlivesTheProgramIsHeardToItsEnd) {
+/// The first loop runs until this process has waited for the shell.
+TEST(CapturedRunTest, OutputOfSurvivingChildrenIsReadToItsEnd) {
     const kit::RunResult result = runOnHost(
         {"sh", "-c",
          "(while kill -0 $$; do :; done 2>/dev/null; echo late; echo later >&2) & echo early"});
@@ -58,13 +58,13 @@ TEST(CapturedRunTest, WhatOutlivesTheProgramIsHeardToItsEnd) {
     EXPECT_EQ(result.standardError, "later\n");
 }
 
-TEST(CapturedRunTest, WhatKeepsNoOutputIsNotWaitedFor) {
+TEST(CapturedRunTest, ChildWithoutTheOutputsIsNotWaitedFor) {
     const kit::RunResult result = runOnHost({"sh", "-c", "sleep 600 >/dev/null 2>&1 & echo $!"});
     const pid_t sleeper = std::stoi(result.standardOutput);
     EXPECT_EQ(kill(sleeper, SIGKILL), 0) << "it has ended before";
 }
 
-TEST(CapturedRunTest, FailedStartIsThrownAndNotTakenForOutput) {
+TEST(CapturedRunTest, FailedStartIsThrownNotCaptured) {
     const std::size_t before = openDescriptors();
     try {
         kit::runCaptured([] {
@@ -78,7 +78,7 @@ TEST(CapturedRunTest, FailedStartIsThrownAndNotTakenForOutput) {
     EXPECT_EQ(openDescriptors(), before);
 }
 
-TEST(CapturedRunTest, ProgramMayEndAsAFailedStartDoes) {
+TEST(CapturedRunTest, ProgramMayExitLikeAFailedStart) {
     EXPECT_EQ(runOnHost({"sh", "-c", "exit 127"}).exitStatus, 127);
 }
 

@@ -26,7 +26,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// A folder by what the kernel knows it by, wherever the root is.
+/// A folder by its identity in the kernel, whatever the root is.
 struct FolderIdentity {
     dev_t device;
     ino_t inode;
@@ -41,7 +41,7 @@ FolderIdentity identityOf(const char* path) {
     return {state.st_dev, state.st_ino};
 }
 
-/// The open descriptors, also where there is no /proc.
+/// The open descriptors, found without /proc.
 std::set<int> descriptorNumbers() {
     std::set<int> numbers;
     for (int number = 0; number < 1024; ++number) {
@@ -52,7 +52,7 @@ std::set<int> descriptorNumbers() {
     return numbers;
 }
 
-/// What entering `root` is refused with; empty when it is not.
+/// The refusal to enter `root`; empty when there is none.
 std::string refusalOf(const fs::path& root) {
     try {
         const kit::EnteredRoot entered(root);
@@ -62,8 +62,8 @@ std::string refusalOf(const fs::path& root) {
     return "";
 }
 
-/// In a child process: this thread may no longer change its root, nor may any of the process enter
-/// a user namespace, which a process with a second thread is refused.
+/// For a child process: this thread may no longer change its root, and no thread may enter a user
+/// namespace, since the kernel refuses that to a process with a second thread.
 void forbidChangeOfRoot() {
     std::thread([] { pause(); }).detach();
     __user_cap_header_struct header{_LINUX_CAPABILITY_VERSION_3, 0};
@@ -90,7 +90,7 @@ protected:
         EXPECT_TRUE(fs::exists(root() / "marker")); // a path of the host
     }
 
-    /// For a child process, in which no expectation would be seen.
+    /// For a child process, whose expectations nobody would see.
     void expectHostRootAt(const char* workingDirectory) const {
         if (!(identityOf("/") == hostRoot_) || fs::current_path() != workingDirectory) {
             throw std::runtime_error("elsewhere");
@@ -124,7 +124,7 @@ TEST_F(EnteredRootTest, RootAndWorkingDirectoryAreTheHostsAfterwards) {
     expectHost();
 }
 
-TEST_F(EnteredRootTest, AbsoluteLinkOfTheUnitLeadsIntoTheUnit) {
+TEST_F(EnteredRootTest, AbsoluteLinkStaysInsideTheUnit) {
     fs::create_symlink("/marker", root() / "inner/link");
     const kit::EnteredRoot entered(root());
     EXPECT_EQ(readFile("/inner/link"), "of the unit");
@@ -138,7 +138,7 @@ TEST_F(EnteredRootTest, ChangeOfTheWorkingDirectoryInsideEndsWithTheUnit) {
     expectHost();
 }
 
-TEST_F(EnteredRootTest, FolderThatIsTheHostsWorkingDirectoryCanBeEntered) {
+TEST_F(EnteredRootTest, HostsWorkingDirectoryCanBeEntered) {
     fs::current_path(root());
     const FolderIdentity before = identityOf(".");
     {
@@ -148,7 +148,7 @@ TEST_F(EnteredRootTest, FolderThatIsTheHostsWorkingDirectoryCanBeEntered) {
     EXPECT_TRUE(identityOf(".") == before);
 }
 
-TEST_F(EnteredRootTest, RelativePathIsOfTheHostsWorkingDirectory) {
+TEST_F(EnteredRootTest, RelativePathStartsAtTheHostsWorkingDirectory) {
     fs::current_path(root().parent_path());
     const kit::EnteredRoot entered(root().filename());
     expectInside();
@@ -170,7 +170,7 @@ TEST_F(EnteredRootTest, ExceptionInsideLeavesTheUnit) {
     }
 }
 
-TEST_F(EnteredRootTest, WhatIsNotAFolderIsRefusedByName) {
+TEST_F(EnteredRootTest, AnythingButAFolderIsRefusedByName) {
     fs::create_symlink("missing", root() / "dangling");
     for (const char* name : {"marker", "missing", "dangling", "marker/below"}) {
         const std::string path = (root() / name).string();
@@ -182,18 +182,18 @@ TEST_F(EnteredRootTest, WhatIsNotAFolderIsRefusedByName) {
 
 TEST_F(EnteredRootTest, FolderWithoutPermissionIsRefusedWithTheReason) {
     const fs::path locked = root() / "inner";
-    refusalOf(root()); // permissions hold for the last user namespace that is entered
+    refusalOf(root()); // permissions apply to the last user namespace that is entered
     fs::permissions(locked, fs::perms::owner_read);
     std::string refusal;
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         refusal = refusalOf(locked);
     }
     EXPECT_EQ(refusal, "cannot make " + locked.string() + " the root directory: Permission denied");
     expectHost();
 }
 
-TEST_F(EnteredRootTest, SystemThatAllowsNeitherWayIsNamedWithTheRemedy) {
+TEST_F(EnteredRootTest, RefusalOfBothWaysNamesTheRemedy) {
     try {
         kit::runCaptured([this] {
             forbidChangeOfRoot();
@@ -212,7 +212,7 @@ TEST_F(EnteredRootTest, SystemThatAllowsNeitherWayIsNamedWithTheRemedy) {
     }
 }
 
-TEST_F(EnteredRootTest, PresentRootTakesNoPrivilegeAndChangesTheWorkingDirectory) {
+TEST_F(EnteredRootTest, CurrentRootNeedsNoPrivilegeAndChangesTheWorkingDirectory) {
     fs::create_directory_symlink("/", root() / "up");
     const kit::RunResult result = kit::runCaptured([this] {
         forbidChangeOfRoot();
@@ -233,7 +233,7 @@ TEST_F(EnteredRootTest, PresentRootTakesNoPrivilegeAndChangesTheWorkingDirectory
     expectHost();
 }
 
-TEST_F(EnteredRootTest, ManyUnitsInARowLeaveNoDescriptor) {
+TEST_F(EnteredRootTest, ManyUnitsInARowLeaveNoDescriptorOpen) {
     const std::size_t before = openDescriptors();
     for (int round = 0; round < 500; ++round) {
         const kit::EnteredRoot entered(root());
@@ -243,7 +243,7 @@ TEST_F(EnteredRootTest, ManyUnitsInARowLeaveNoDescriptor) {
     expectHost();
 }
 
-TEST_F(EnteredRootTest, RefusalLeavesNoDescriptor) {
+TEST_F(EnteredRootTest, RefusalLeavesNoDescriptorOpen) {
     const std::size_t before = openDescriptors();
     EXPECT_NE(refusalOf(root() / "missing"), "");
     EXPECT_NE(refusalOf(root() / "marker"), "");

@@ -21,7 +21,7 @@ namespace fs = std::filesystem;
 
 constexpr char STOCK_FILE[] = "stock, no line end";
 
-/// A unit of nothing but what `orvane -a` needs to leave a stock file, and no program at all.
+/// A unit with only what `orvane -a` needs to leave a stock file, and without any program.
 class RunInsideTest : public ::testing::Test {
 protected:
     RunInsideTest() {
@@ -37,7 +37,7 @@ protected:
         return kit::runInside(root(), {ORVANE_BINARY, arguments});
     }
 
-    /// A dynamic program of the host, which can end in any way.
+    /// A dynamic program of the host that can end in any way.
     kit::RunResult runShell(const std::string& script) const {
         return kit::runInside(root(), {"/bin/sh", {"-c", script}});
     }
@@ -58,7 +58,7 @@ private:
     fs::path hostCwd_ = fs::current_path();
 };
 
-TEST_F(RunInsideTest, ToolOfThisBuildTakesTheUnitForItsRoot) {
+TEST_F(RunInsideTest, ToolOfThisBuildHasTheUnitAsItsRoot) {
     const kit::RunResult result = runTool({"-a"});
     EXPECT_EQ(result.exitStatus, 0);
     EXPECT_EQ(result.standardOutput, "");
@@ -66,13 +66,13 @@ TEST_F(RunInsideTest, ToolOfThisBuildTakesTheUnitForItsRoot) {
     EXPECT_EQ(readFile(root() / "tmp/airplay.conf"), STOCK_FILE);
 }
 
-TEST_F(RunInsideTest, NothingButTheToolsFilesIsLeftInTheUnit) {
+TEST_F(RunInsideTest, OnlyTheToolsFilesAreLeftInTheUnit) {
     runTool({"-a"});
     EXPECT_EQ(folderNames(root()), (std::set<std::string>{"fs", "tmp"}));
     EXPECT_EQ(folderNames(root() / "tmp"), (std::set<std::string>{"airplay.conf"}));
 }
 
-TEST_F(RunInsideTest, UnknownLetterIsToldOnStandardErrorUnderTheToolsName) {
+TEST_F(RunInsideTest, UnknownLetterIsReportedOnStandardErrorUnderTheToolsName) {
     const kit::RunResult result = runTool({"-x"});
     EXPECT_EQ(result.exitStatus, 0);
     EXPECT_EQ(result.standardOutput, "");
@@ -103,7 +103,7 @@ TEST_F(RunInsideTest, StatusOfASignalIsItsNumberAbove128) {
     EXPECT_EQ(runShell("kill -TERM $$").exitStatus, 128 + 15);
 }
 
-TEST_F(RunInsideTest, DynamicProgramTakesTheUnitForItsRoot) {
+TEST_F(RunInsideTest, DynamicProgramHasTheUnitAsItsRoot) {
     const kit::RunResult result = runShell("for name in /fs/mp/etc/*; do echo $name; done");
     EXPECT_EQ(result.standardOutput, "/fs/mp/etc/airplay.conf\n");
     EXPECT_EQ(folderNames(root()), (std::set<std::string>{"fs", "tmp"}));
@@ -116,7 +116,7 @@ TEST_F(RunInsideTest, ProcOfTheUnitIsKept) {
     EXPECT_EQ(readFile(root() / "proc/mine"), "kept");
 }
 
-TEST_F(RunInsideTest, StandardInputIsAtItsEnd) {
+TEST_F(RunInsideTest, StandardInputIsEmpty) {
     EXPECT_EQ(runShell("read line; echo $?").standardOutput, "1\n");
 }
 
@@ -132,19 +132,19 @@ TEST_F(RunInsideTest, BothOutputsAreKeptWholeAndApart) {
     }
     EXPECT_GT(output.size(), 65536U); // more than a pipe holds
     EXPECT_TRUE(result.standardOutput == output) << result.standardOutput.size() << " bytes";
-    // A shell may first say that it misses its working directory.
+    // A shell may first complain that its working directory is missing.
     const std::size_t length = std::min(error.size(), result.standardError.size());
     EXPECT_TRUE(result.standardError.substr(result.standardError.size() - length) == error)
         << result.standardError.size() << " bytes";
 }
 
-TEST_F(RunInsideTest, BinaryThatIsNotThereIsNamed) {
+TEST_F(RunInsideTest, MissingBinaryIsNamed) {
     const std::string missing = (root() / "no-program").string();
     EXPECT_EQ(refusalOf(missing), "cannot read " + missing + ": No such file or directory");
 }
 
-TEST_F(RunInsideTest, PathOfTheUnitNamesNoBinary) {
-    // The host can't have this path: it leads through the test's own folder.
+TEST_F(RunInsideTest, PathInsideTheUnitIsNotABinary) {
+    // The host can't have this path: it contains the test's own folder.
     const fs::path path = root() / "orvane";
     const fs::path inUnit = root() / path.relative_path();
     fs::create_directories(inUnit.parent_path());
@@ -152,7 +152,7 @@ TEST_F(RunInsideTest, PathOfTheUnitNamesNoBinary) {
     EXPECT_EQ(refusalOf(path), "cannot read " + path.string() + ": No such file or directory");
 }
 
-TEST_F(RunInsideTest, FileThatIsNoProgramIsNamed) {
+TEST_F(RunInsideTest, FileThatIsNotAProgramIsNamed) {
     const std::string tool = readFile(ORVANE_BINARY);
     const std::string otherByteOrder = tool.substr(0, 5) + '\2' + tool.substr(6, 500);
     const std::string otherClass = tool.substr(0, 4) + '\3' + tool.substr(5, 500);
@@ -166,7 +166,7 @@ TEST_F(RunInsideTest, FileThatIsNoProgramIsNamed) {
     EXPECT_EQ(refusalOf(folder), folder + " is not a little-endian ELF program");
 }
 
-TEST_F(RunInsideTest, ProgramThatIsCutShortIsNamed) {
+TEST_F(RunInsideTest, TruncatedProgramIsNamed) {
     const std::string tool = readFile(ORVANE_BINARY);
     const std::string file = (root() / "file").string();
     for (const std::size_t length : {16U, 40U, 80U}) { // in the file header, in the first segment's
@@ -175,7 +175,7 @@ TEST_F(RunInsideTest, ProgramThatIsCutShortIsNamed) {
     }
 }
 
-TEST_F(RunInsideTest, RootThatIsNoFolderIsNamed) {
+TEST_F(RunInsideTest, RootThatIsNotAFolderIsNamed) {
     for (const char* name : {"missing", "fs/mp/etc/airplay.conf"}) {
         const std::string bad = (root() / name).string();
         try {

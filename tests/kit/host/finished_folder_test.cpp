@@ -51,7 +51,7 @@ private:
     fs::path hostCwd_;
 };
 
-TEST_F(FinishedFolderTest, NothingIsThereUntilAllIsThere) {
+TEST_F(FinishedFolderTest, FolderAppearsOnlyWhenComplete) {
     fs::path seen;
     kit::makeFinishedFolder(place(), [&](const fs::path& folder) {
         seen = folder;
@@ -67,7 +67,7 @@ TEST_F(FinishedFolderTest, NothingIsThereUntilAllIsThere) {
     EXPECT_EQ(folderNames(above()), Names{"unit"});
 }
 
-TEST_F(FinishedFolderTest, EmptyFolderStaysUntilAllIsThere) {
+TEST_F(FinishedFolderTest, EmptyFolderStaysUntilTheNewOneIsComplete) {
     fs::create_directory(place());
     kit::makeFinishedFolder(place(), [&](const fs::path& folder) {
         putFile(folder);
@@ -98,7 +98,7 @@ TEST_F(FinishedFolderTest, FailureLeavesNothingAndNamesTheFinalPath) {
     }
 }
 
-TEST_F(FinishedFolderTest, FailureAboutAnotherPathOrNoneIsToldAsItIs) {
+TEST_F(FinishedFolderTest, FailureAboutAnotherPathOrNoneIsReportedAsItIs) {
     for (const fs::path& path : {fs::path("/proc/none"), above(), fs::path()}) {
         EXPECT_EQ(
             refusalOf(place(), [&](const fs::path&) { throw kit::KitError("no ", path, " here"); }),
@@ -108,7 +108,7 @@ TEST_F(FinishedFolderTest, FailureAboutAnotherPathOrNoneIsToldAsItIs) {
               "no luck");
 }
 
-TEST_F(FinishedFolderTest, LinkThatCannotBeMadeIsNamedAndNotItsTarget) {
+TEST_F(FinishedFolderTest, FailedLinkIsNamedNotItsTarget) {
     EXPECT_EQ(refusalOf(place(),
                         [](const fs::path& folder) {
                             fs::create_symlink("/target", folder / "none/link");
@@ -135,11 +135,11 @@ TEST_F(FinishedFolderTest, AnyOtherExceptionLeavesNothing) {
     EXPECT_TRUE(fs::is_empty(place()));
 }
 
-TEST_F(FinishedFolderTest, LeftoverOfAnotherRunIsNoHindranceAndIsLeft) {
+TEST_F(FinishedFolderTest, LeftoverOfAnotherRunIsHarmlessAndStays) {
     fs::path first;
     kit::makeFinishedFolder(place(), [&](const fs::path& folder) { first = folder; });
     fs::remove(place());
-    fs::create_directory(first); // as a run that was ended half-way with the same process number
+    fs::create_directory(first); // as left by a killed run with the same process number
     kit::makeFinishedFolder(place(), [&](const fs::path& folder) {
         EXPECT_NE(folder, first);
         putFile(folder);
@@ -148,7 +148,7 @@ TEST_F(FinishedFolderTest, LeftoverOfAnotherRunIsNoHindranceAndIsLeft) {
     EXPECT_TRUE(fs::is_empty(first));
 }
 
-TEST_F(FinishedFolderTest, WhatAppearsMeanwhileIsNotReplaced) {
+TEST_F(FinishedFolderTest, FolderThatAppearsMeanwhileIsNotReplaced) {
     EXPECT_EQ(refusalOf(place(),
                         [this](const fs::path& folder) {
                             putFile(folder);
@@ -192,7 +192,7 @@ TEST_F(FinishedFolderTest, WorkingDirectoryAndLinksToEmptyFoldersAreReplaced) {
     EXPECT_TRUE(fs::is_symlink(above() / "link"));
 }
 
-TEST_F(FinishedFolderTest, LongestNameIsTaken) {
+TEST_F(FinishedFolderTest, LongestNameIsAccepted) {
     const std::string name(255, 'n');
     EXPECT_EQ(refusalOf(above() / name), "");
     EXPECT_EQ(folderNames(above()), Names{name});
@@ -201,7 +201,7 @@ TEST_F(FinishedFolderTest, LongestNameIsTaken) {
     EXPECT_EQ(folderNames(above()), Names{name});
 }
 
-TEST_F(FinishedFolderTest, PlaceThatCannotBeIsRefused) {
+TEST_F(FinishedFolderTest, ImpossiblePathIsRefused) {
     EXPECT_EQ(refusalOf(""), "cannot make : No such file or directory");
     EXPECT_EQ(refusalOf("/"), "/ is there already and is not an empty folder");
     writeFile(above() / "file", "");
@@ -215,7 +215,7 @@ TEST_F(FinishedFolderTest, FolderAboveWithoutPermissionIsRefused) {
     fs::permissions(above(), fs::perms::owner_read | fs::perms::owner_exec);
     std::string refusal;
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         refusal = refusalOf(place());
     }
     fs::permissions(above(), fs::perms::owner_all);

@@ -7,7 +7,7 @@
 
 namespace orvane::test {
 
-/// How many descriptors this process has open, told by the host's /proc: not from inside a unit.
+/// How many descriptors this process has open. Reads the host's /proc: not for use inside a unit.
 inline std::size_t openDescriptors() {
     return folderNames("/proc/self/fd").size();
 }

@@ -15,7 +15,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Every answer is that of the system itself, asked afterwards.
+/// Every answer must be the one that the system itself gives afterwards.
 class OutputPlaceTest : public UnitTest {
 protected:
     static bool systemOpens(const std::string& path) {
@@ -40,7 +40,7 @@ protected:
     }
 };
 
-TEST_F(OutputPlaceTest, FilesAndWhatIsNotThereCanBeWrittenAndFoldersNot) {
+TEST_F(OutputPlaceTest, FilesAndFreePathsCanBeWrittenAndFoldersCannot) {
     writeFile("/tmp/file", "x");
     fs::create_directory("/tmp/folder");
     expectAnswer(true, "/tmp/file");
@@ -51,7 +51,7 @@ TEST_F(OutputPlaceTest, FilesAndWhatIsNotThereCanBeWrittenAndFoldersNot) {
     expectAnswer(false, "/tmp/" + std::string(256, 'n'));
 }
 
-TEST_F(OutputPlaceTest, LinksAreFollowedToWhereTheyLead) {
+TEST_F(OutputPlaceTest, LinksAreFollowed) {
     writeFile("/tmp/file", "x");
     fs::create_directory("/tmp/folder");
     fs::create_directory_symlink("folder", "/tmp/into");
@@ -84,7 +84,7 @@ TEST_F(OutputPlaceTest, LinksToLinksAreFollowed) {
     EXPECT_TRUE(fs::exists("/fs/tmpfs/d"));
 }
 
-TEST_F(OutputPlaceTest, LongChainsEndAsTheyDoInTheSystem) {
+TEST_F(OutputPlaceTest, LinkChainsHaveTheSystemsLimit) {
     for (int link = 0; link < 45; ++link) {
         fs::create_symlink("l" + std::to_string(link + 1), "/tmp/l" + std::to_string(link));
     }
@@ -93,7 +93,7 @@ TEST_F(OutputPlaceTest, LongChainsEndAsTheyDoInTheSystem) {
     expectAnswer(false, "/tmp/l4"); // 41
 }
 
-TEST_F(OutputPlaceTest, AskingMakesAndChangesNothing) {
+TEST_F(OutputPlaceTest, AskingCreatesAndChangesNothing) {
     writeFile("/tmp/file", "kept");
     fs::create_symlink("fresh", "/tmp/link");
     EXPECT_TRUE(kit::canBeWritten("/tmp/file"));

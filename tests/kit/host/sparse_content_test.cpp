@@ -41,13 +41,13 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(NonZeroRunsTest, NothingHasNoRuns) {
+TEST_F(NonZeroRunsTest, EmptyContentHasNoRuns) {
     expectRuns("", {});
     expectRuns(zeros(1), {});
     expectRuns(zeros(100000), {});
 }
 
-TEST_F(NonZeroRunsTest, RunBeginsAndEndsWithBytesThatAreNotZero) {
+TEST_F(NonZeroRunsTest, RunStartsAndEndsWithNonZeroBytes) {
     expectRuns("a", {{0, "a"}});
     expectRuns(zeros(3) + "ab" + zeros(40), {{3, "ab"}});
     expectRuns(zeros(5000) + "\xFF", {{5000, "\xFF"}});
@@ -60,7 +60,7 @@ TEST_F(NonZeroRunsTest, FifteenZerosArePartOfARunAndSixteenEndIt) {
                {{0, "a" + zeros(10) + "b" + zeros(10) + "c"}});
 }
 
-TEST_F(NonZeroRunsTest, RunGoesOverTheEdgesOfPagesAndReads) {
+TEST_F(NonZeroRunsTest, RunCrossesTheEdgesOfPagesAndReads) {
     for (const std::size_t edge : {std::size_t{4096}, std::size_t{0x40000}}) {
         expectRuns(zeros(edge - 2) + "abcd" + zeros(9), {{edge - 2, "abcd"}});
         expectRuns(zeros(edge - 1) + "a" + zeros(15) + "b", {{edge - 1, "a" + zeros(15) + "b"}});
@@ -68,7 +68,7 @@ TEST_F(NonZeroRunsTest, RunGoesOverTheEdgesOfPagesAndReads) {
     }
 }
 
-TEST_F(NonZeroRunsTest, OffsetsCountFromWhereTheBytesStand) {
+TEST_F(NonZeroRunsTest, OffsetsStartAtThePlaceOfTheBytes) {
     EXPECT_EQ(kit::sparseContent(zeros(2) + "a", 1000), (kit::SparseContent{{1002, "a"}}));
 }
 
@@ -90,7 +90,7 @@ TEST_F(NonZeroRunsTest, RunsPutBackGiveTheSameBytes) {
     }
 }
 
-/// To look at these zeros one by one would take longer than a test may.
+/// Reading these zeros one by one would take longer than a test may.
 TEST_F(NonZeroRunsTest, HolesAreSkipped) {
     constexpr std::uint64_t SIZE = std::uint64_t{1} << 40U;
     const kit::Descriptor made = kit::makeSparseFile(file(), SIZE);
@@ -99,13 +99,13 @@ TEST_F(NonZeroRunsTest, HolesAreSkipped) {
     EXPECT_EQ(runsOfFile(), (kit::SparseContent{{SIZE / 2 - 1, "ab"}, {SIZE - 1, "c"}}));
 }
 
-TEST_F(NonZeroRunsTest, OnlyTheBytesAskedForAreLookedAt) {
+TEST_F(NonZeroRunsTest, OnlyTheRequestedBytesAreRead) {
     writeFile(file(), "abcd");
     EXPECT_EQ(kit::sparseContent(kit::openForReading(file()), file(), 2),
               (kit::SparseContent{{0, "ab"}}));
 }
 
-TEST_F(NonZeroRunsTest, WhatCannotBeReadIsNamed) {
+TEST_F(NonZeroRunsTest, UnreadablePathIsNamed) {
     const fs::path folder = file().parent_path();
     try {
         kit::sparseContent(kit::openForReading(folder), folder, 1);

@@ -9,7 +9,7 @@ namespace orvane::test {
 
 namespace {
 
-TEST(TextTest, PrintableEscapesWhatIsNoText) {
+TEST(TextTest, PrintableEscapesAnythingThatIsNotText) {
     struct Row {
         std::string bytes;
         std::string text;
@@ -22,7 +22,7 @@ TEST(TextTest, PrintableEscapesWhatIsNoText) {
         {std::string("\0", 1), "\\x00"},
         {"\x7f", "\\x7f"},
         {"M\xc3\xbcller", "M\xc3\xbcller"},
-        {"\xc3", "\\xc3"},                   // cut short
+        {"\xc3", "\\xc3"},                   // truncated
         {"\xc0\xaf", "\\xc0\\xaf"},          // longer than needed
         {"\xed\xa0\x80", "\\xed\\xa0\\x80"}, // a surrogate
         {"\xc2\x85", "\\xc2\\x85"},          // a control character
@@ -36,7 +36,7 @@ TEST(TextTest, PrintableEscapesWhatIsNoText) {
     }
 }
 
-TEST(TextTest, CountedTakesTheRightNumber) {
+TEST(TextTest, CountedUsesSingularAndPlural) {
     EXPECT_EQ(kit::counted(0, "line"), "0 lines");
     EXPECT_EQ(kit::counted(1, "line"), "1 line");
     EXPECT_EQ(kit::counted(2, "byte"), "2 bytes");

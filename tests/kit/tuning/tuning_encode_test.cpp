@@ -22,7 +22,7 @@ DpsBlock blockOf(std::uint8_t byte) {
     return block;
 }
 
-/// The bits of `field`, set.
+/// A block in which exactly the bits of `field` are set.
 DpsBlock bitsOf(const DpsField& field) {
     DpsBlock mask{};
     if (field.encoding == DpsEncoding::code2) {
@@ -42,7 +42,7 @@ void expectOthersUntouched(const DpsBlock& before, const DpsBlock& after, const 
     }
 }
 
-/// Numbers that tell every bit of an element, and its sign, from its neighbours.
+/// Numbers that distinguish every bit of an element, and its sign, from its neighbours.
 Numbers numbersFor(DpsEncoding encoding) {
     switch (encoding) {
     case DpsEncoding::code2:
@@ -55,7 +55,7 @@ Numbers numbersFor(DpsEncoding encoding) {
     return {0, 1, -1, 255, 256, -256, 0x1234, 0x5A5A, -0x1235, 32767, -32768};
 }
 
-/// As many elements as the field has, all of them different where there are enough numbers.
+/// `count` elements, all different if there are enough numbers.
 Numbers listFrom(const Numbers& numbers, std::size_t first, std::size_t count) {
     Numbers list;
     for (std::size_t i = 0; i < count; ++i) {
@@ -159,7 +159,7 @@ const Refusal REFUSALS[] = {
      "qwaNCParams takes -32768 to 32767: 32768 does not fit"},
 };
 
-TEST(TuningEncode, RefusalNamesWhatWouldBeRightAndLeavesTheBlock) {
+TEST(TuningEncode, RefusalNamesWhatWouldBeRightAndKeepsTheBlock) {
     for (const Refusal& refusal : REFUSALS) {
         SCOPED_TRACE(refusal.message);
         DpsBlock block = blockOf(0xA5);
@@ -187,7 +187,7 @@ TEST(TuningEncode, BlockIsItsRawBytesThenZerosThenItsFields) {
     EXPECT_EQ(block.bytes, expected.bytes);
 }
 
-TEST(TuningEncode, BlockOfNothingIsZeros) {
+TEST(TuningEncode, EmptyBlockIsZeros) {
     EXPECT_EQ(kit::encodeTuningBlock({}).bytes, blockOf(0).bytes);
 }
 
@@ -196,7 +196,7 @@ TEST(TuningEncode, RawBytesFillAWholeBlockAndNoMore) {
     EXPECT_THROW(kit::encodeTuningBlock({std::string(189, '\x7F'), {}}), kit::KitError);
 }
 
-TEST(TuningEncode, BlockRefusesAFieldAsTheFieldItselfDoes) {
+TEST(TuningEncode, BlockRefusesWhatItsFieldsRefuse) {
     EXPECT_THROW(kit::encodeTuningBlock({"", {{"qwaNone", std::int64_t{1}}}}), kit::KitError);
     EXPECT_THROW(kit::encodeTuningBlock({"", {{"qwaRecvGain", "qwaOn"}}}), kit::KitError);
 }

@@ -41,7 +41,7 @@ std::string replaced(std::string text, const std::string& part, const std::strin
     return text.replace(at, part.size(), other);
 }
 
-/// What a code without a word becomes, and what no field reads.
+/// The block as its file shows it: codes without a word and unread bits are 0.
 DpsBlock asTheFileShowsIt(const DpsBlock& block) {
     DpsBlock shown{};
     for (const DpsField& field : DPS_LAYOUT) {
@@ -60,7 +60,7 @@ DpsBlock asTheFileShowsIt(const DpsBlock& block) {
     return shown;
 }
 
-TEST(TuningText, WhatTheToolWritesIsReadBack) {
+TEST(TuningText, OutputOfTheToolIsReadBack) {
     for (std::uint32_t seed = 0; seed < 300; ++seed) {
         const DpsBlock block = RandomUnit(seed).block();
         const std::string text = textOf(block, static_cast<std::int32_t>(seed % 10));
@@ -95,7 +95,7 @@ TEST(TuningText, HeaderMayBeOfAnyBlock) {
 
 constexpr char HEADER[] = "; Genereated config from DPS (blockId 3)";
 
-/// A first line in place of the header, where it differs, and what the tool would write.
+/// A first line in place of the header, the column where it differs, and what the tool would write.
 struct HeaderRefusal {
     const char* line;
     const char* column;
@@ -129,7 +129,7 @@ TEST(TuningText, HeaderOfAnotherFormIsRefused) {
                   "\" here, not \"qwaAECSwitch \"");
 }
 
-/// A part of the zero text that is replaced, and what is said of the result.
+/// A replaced part of the zero text, and the message about the result.
 struct Refusal {
     const char* part;
     const char* other;
@@ -221,14 +221,14 @@ const Refusal REFUSALS[] = {
      "a.txt:46:1: orvane writes no further line, not \"more\""},
 };
 
-TEST(TuningText, WhatTheToolDoesNotWriteIsRefusedWithItsPlace) {
+TEST(TuningText, TextThatTheToolWouldNotWriteIsRefusedWithItsPlace) {
     for (const Refusal& refusal : REFUSALS) {
         SCOPED_TRACE(refusal.message);
         EXPECT_EQ(refusalOf(replaced(zeroText(), refusal.part, refusal.other)), refusal.message);
     }
 }
 
-TEST(TuningText, FirstFaultIsTold) {
+TEST(TuningText, FirstFaultIsReported) {
     std::string text = replaced(zeroText(), "qwaHFEExtent 0\n", "qwaHFEExtent 256\nqwaNone 1\n");
     text = replaced(text, "qwaNRAtten 0\n", "");
     EXPECT_EQ(refusalOf(text), "a.txt:22:16: qwaHFEExtent takes 0 to 255: 256 does not fit");

@@ -21,7 +21,7 @@ namespace fs = std::filesystem;
 
 class CaptureUnitTest : public SourceUnitTest {
 protected:
-    /// Captures; the source is not touched.
+    /// Captures, and requires that the source is unchanged.
     void capture(bool redactsSerial = false) const {
         const auto before = state();
         kit::captureUnit(source(), root(), redactsSerial);
@@ -30,7 +30,8 @@ protected:
 
     std::string disk() const { return readFile(root() / "dev/hd0"); }
 
-    /// A disk of a mebibyte and a bit with this in slot 9, and more by offset from the base.
+    /// A disk of slightly more than a mebibyte with this in slot 9, and `more` by offset from the
+    /// base.
     void putDisk(const std::string& serial,
                  const std::map<std::size_t, std::string>& more = {}) const {
         std::string content(MEBIBYTE + 50, '\0');
@@ -41,7 +42,7 @@ protected:
         put("/dev/hd0", content);
     }
 
-    /// What becomes of slot 9.
+    /// Slot 9 after redaction.
     std::string redacted(const std::string& serial) const {
         putDisk(serial);
         fs::remove_all(root());
@@ -76,7 +77,7 @@ TEST_F(CaptureUnitTest, CapturedUnitHasTheSameInputs) {
     EXPECT_FALSE(fs::exists(root() / "tmp"));
 }
 
-TEST_F(CaptureUnitTest, PresentRootCanBeCapturedIntoAFolderOfItsOwn) {
+TEST_F(CaptureUnitTest, CurrentRootCanBeCapturedIntoItsOwnFolder) {
     putDisk("SN004217");
     const kit::EnteredRoot entered(source());
     fs::create_directory("/bench");
@@ -85,7 +86,7 @@ TEST_F(CaptureUnitTest, PresentRootCanBeCapturedIntoAFolderOfItsOwn) {
     EXPECT_TRUE(kit::isKitUnit("/bench/unit"));
 }
 
-TEST_F(CaptureUnitTest, SerialBecomesAsManyX) {
+TEST_F(CaptureUnitTest, SerialBecomesAnXForEachByte) {
     EXPECT_EQ(redacted("SN004217"), "XXXXXXXX");
     EXPECT_EQ(redacted("SN"), std::string("XX\0\0\0\0\0\0", 8));
     EXPECT_EQ(redacted("\xFF\n"), std::string("XX\0\0\0\0\0\0", 8));
@@ -94,15 +95,15 @@ TEST_F(CaptureUnitTest, SerialBecomesAsManyX) {
     EXPECT_EQ(redacted(""), std::string(8, '\0'));
 }
 
-TEST_F(CaptureUnitTest, SerialIsLeftWhereItIsNotToBeRedacted) {
+TEST_F(CaptureUnitTest, SerialIsKeptUnlessRedactionIsRequested) {
     putDisk(std::string("AB\0CDEFG", 8));
     capture();
     EXPECT_EQ(disk().substr(129, 8), std::string("AB\0CDEFG", 8));
 }
 
-TEST_F(CaptureUnitTest, SerialIsRedactedWhereverElseItStands) {
+TEST_F(CaptureUnitTest, SerialIsRedactedEverywhereElse) {
     putDisk("SN004217", {{1, "SN004217 again"},
-                         {134, "2SN004217"}, // over the end of slot 9 and in the gap
+                         {134, "2SN004217"}, // across the end of slot 9, and in the gap
                          {3072, "aux SN004217SN004217"},
                          {4096, "SN004217"},
                          {MEBIBYTE - 8, "SN004217"}});
@@ -125,7 +126,7 @@ TEST_F(CaptureUnitTest, SerialIsRedactedWhereverElseItStands) {
     EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.inf"), "N=XXXXXXXX");
 }
 
-TEST_F(CaptureUnitTest, SerialOfFourBytesIsToldElsewhereAndAShorterOneIsNot) {
+TEST_F(CaptureUnitTest, SerialOfFourBytesIsRedactedElsewhereAndAShorterOneIsNot) {
     put("/fs/mp/etc/airplay.conf", "AB12 AB1 AB12");
     putDisk("AB12");
     capture(true);
@@ -152,7 +153,7 @@ TEST_F(CaptureUnitTest, DiskWithoutRoomForTheSerialHasNoneToRedact) {
     EXPECT_FALSE(fs::exists(root() / "dev/hd0"));
 }
 
-TEST_F(CaptureUnitTest, RootThatIsThereIsRefusedAndLeft) {
+TEST_F(CaptureUnitTest, ExistingRootIsRefusedAndKept) {
     fs::create_directory(root());
     writeFile(root() / "mine", "kept");
     EXPECT_THROW(capture(), kit::KitError);

@@ -27,7 +27,7 @@ using Files = std::map<std::string, std::string>;
 
 class DescribeInputsTest : public SourceUnitTest {
 protected:
-    /// What is found; the source is not touched.
+    /// The description; requires that the source is unchanged.
     kit::UnitDescription found() const {
         const auto before = state();
         kit::UnitDescription unit = kit::describeInputs(source());
@@ -56,7 +56,7 @@ TEST_F(DescribeInputsTest, EmptySourceLacksImageAndDisk) {
     EXPECT_TRUE(found() == expected);
 }
 
-TEST_F(DescribeInputsTest, ImageIsTaken) {
+TEST_F(DescribeInputsTest, ImageIsDescribed) {
     std::string image(181, '\0');
     image[21] = 1;
     image[180] = 'x';
@@ -76,7 +76,7 @@ TEST_F(DescribeInputsTest, LongImageIsAFile) {
               (kit::SparseFile{std::uint64_t{3} << 30U, {{0, "x"}}}));
 }
 
-TEST_F(DescribeInputsTest, LastMebibyteOfTheDiskIsTaken) {
+TEST_F(DescribeInputsTest, LastMebibyteOfTheDiskIsDescribed) {
     put("/dev/hd0", std::string(700, 'x') + std::string(129, '\0') + "SN004217" +
                         std::string(MEBIBYTE - 137, '\0'));
     kit::DiskDescription expected;
@@ -85,7 +85,7 @@ TEST_F(DescribeInputsTest, LastMebibyteOfTheDiskIsTaken) {
     EXPECT_TRUE(found().disk == expected);
 }
 
-TEST_F(DescribeInputsTest, ShorterDiskIsTakenWhole) {
+TEST_F(DescribeInputsTest, ShorterDiskIsDescribedWhole) {
     put("/dev/hd0", std::string(1000, '\0') + "x");
     kit::DiskDescription expected;
     expected.size = 1001;
@@ -93,7 +93,7 @@ TEST_F(DescribeInputsTest, ShorterDiskIsTakenWhole) {
     EXPECT_TRUE(found().disk == expected);
 }
 
-TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolTakes) {
+TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolReads) {
     const std::string folder = "/fs/rwdata/.Version/";
     put("/fs/rwdata/elsewhere", "Type=Application\n");
     put(folder + "a.inf", "a");
@@ -117,7 +117,7 @@ TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolTakes) {
     EXPECT_TRUE(unit.links.empty());
 }
 
-TEST_F(DescribeInputsTest, VersionFolderMayBeMissingOrNoFolder) {
+TEST_F(DescribeInputsTest, VersionFolderMayBeMissingOrNotAFolder) {
     fs::remove_all(at("/fs/rwdata/.Version"));
     EXPECT_TRUE(found().files.empty());
     put("/fs/rwdata/.Version", "no folder");
@@ -130,7 +130,7 @@ const std::string PRODUCT_FILES[] = {
     "/fs/mp/etc/mm/iap2_static.cfg",     "/fs/mp/etc/mm/iap2.cfg",
     "/fs/mp/etc/mm/iap1_static.cfg",     "/fs/mp/etc/mm/iap1.cfg"};
 
-TEST_F(DescribeInputsTest, TemplatesAndStockFilesAreTakenAndNoOthers) {
+TEST_F(DescribeInputsTest, OnlyTemplatesAndStockFilesAreDescribed) {
     Files expected;
     for (const std::string& path : PRODUCT_FILES) {
         put(path, "content of " + path + std::string("\0\xFF", 2));
@@ -141,7 +141,7 @@ TEST_F(DescribeInputsTest, TemplatesAndStockFilesAreTakenAndNoOthers) {
     EXPECT_EQ(found().files, expected);
 }
 
-TEST_F(DescribeInputsTest, FolderInTheirPlaceIsAFolder) {
+TEST_F(DescribeInputsTest, FolderInPlaceOfAnInputIsDescribedAsAFolder) {
     Paths expected = {"/dev/hd0", IMAGE_PATH};
     putFolder("/dev/hd0");
     putFolder(std::string(IMAGE_PATH) + "/below");
@@ -171,7 +171,7 @@ TEST_F(DescribeInputsTest, LinksAreFollowedInsideTheSource) {
     EXPECT_EQ(unit.folders, Paths{"/fs/mp/etc/mm/iap1.cfg"});
 }
 
-TEST_F(DescribeInputsTest, OutputsAreLeftOutButForThoseThatCannotBeWritten) {
+TEST_F(DescribeInputsTest, OnlyOutputsThatCannotBeWrittenAreDescribed) {
     put("/tmp/airplay.conf", "left by a run");
     putFolder("/tmp/iap2_device.cfg");
     putLink("/tmp/iap2.cfg", "/none/at/all");
@@ -184,7 +184,7 @@ TEST_F(DescribeInputsTest, OutputsAreLeftOutButForThoseThatCannotBeWritten) {
     EXPECT_TRUE(unit.files.empty());
 }
 
-TEST_F(DescribeInputsTest, OutputFolderThatIsNoneIsAbsent) {
+TEST_F(DescribeInputsTest, OutputFolderThatIsNotAFolderIsAbsent) {
     fs::remove(at("/tmp"));
     EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0", "/tmp"}));
     put("/tmp", "no folder");
@@ -197,8 +197,8 @@ TEST_F(DescribeInputsTest, OutputFolderThatIsNoneIsAbsent) {
     EXPECT_EQ(found().folders, Paths{"/tmp/iap1.cfg"});
 }
 
-TEST_F(DescribeInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
-    kit::describeInputs(source()); // permissions hold for the last user namespace that is entered
+TEST_F(DescribeInputsTest, InputThatCannotBeReadIsRefusedByName) {
+    kit::describeInputs(source()); // permissions apply to the last user namespace that is entered
     for (const std::string& path :
          {std::string("/fs/mp/etc/airplay.conf"), std::string(IMAGE_PATH), std::string("/dev/hd0"),
           std::string("/fs/rwdata/.Version/a.inf")}) {
@@ -206,7 +206,7 @@ TEST_F(DescribeInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
         fs::permissions(at(path), fs::perms::none);
         std::string said;
         {
-            const PermissionsHold permissions;
+            const EnforcedPermissions permissions;
             said = refusal();
         }
         EXPECT_EQ(said, "cannot read " + path + ": Permission denied");
@@ -214,12 +214,12 @@ TEST_F(DescribeInputsTest, WhatIsThereAndCannotBeReadIsRefusedByName) {
     }
 }
 
-TEST_F(DescribeInputsTest, WhatIsNeitherFileNorFolderIsRefusedByName) {
+TEST_F(DescribeInputsTest, InputThatIsNeitherFileNorFolderIsRefusedByName) {
     ASSERT_EQ(::mkfifo(at("/fs/mp/etc/airplay.conf").c_str(), 0600), 0);
     EXPECT_EQ(refusal(), "/fs/mp/etc/airplay.conf is neither a file nor a folder");
 }
 
-TEST_F(DescribeInputsTest, SourceThatIsNoFolderIsRefused) {
+TEST_F(DescribeInputsTest, SourceThatIsNotAFolderIsRefused) {
     fs::remove_all(source());
     try {
         kit::describeInputs(source());
@@ -229,7 +229,7 @@ TEST_F(DescribeInputsTest, SourceThatIsNoFolderIsRefused) {
     }
 }
 
-TEST_F(DescribeInputsTest, PresentRootIsASourceLikeAnyOther) {
+TEST_F(DescribeInputsTest, CurrentRootIsASourceLikeAnyOther) {
     put(IMAGE_PATH, std::string(179, 'i'));
     put("/fs/mp/etc/airplay.conf", "stock");
     const kit::UnitDescription fromOutside = found();

@@ -27,7 +27,7 @@ TEST(DescribeImage, ValuesAreParametersAndTheRestIsBytes) {
     content[134] = '\xAB';
     content[143] = 1;      // the high byte of parameter 142
     content[178] = '\xFF'; // parameter 171, the last
-    content[179] = 'x';    // behind the catalogue
+    content[179] = 'x';    // after the catalogue
     content[184] = 'y';
     const kit::ImageDescription image = kit::describeImage(content);
     EXPECT_EQ(image.size, 185U);
@@ -37,14 +37,14 @@ TEST(DescribeImage, ValuesAreParametersAndTheRestIsBytes) {
               (std::map<std::uint32_t, kit::Bytes>{{179, std::string("x\0\0\0\0y", 6)}}));
 }
 
-TEST(DescribeImage, FirstByteOfAParameterThatIsCutOffIsABytes) {
+TEST(DescribeImage, FirstByteOfACutOffParameterIsABytesEntry) {
     const kit::ImageDescription image = kit::describeImage(std::string(133, '\0') + "a");
     EXPECT_EQ(image.size, 134U);
     EXPECT_TRUE(image.params.empty());
     EXPECT_EQ(image.bytes, (std::map<std::uint32_t, kit::Bytes>{{133, "a"}}));
 }
 
-TEST(DescribeImage, ZerosAreTheirSizeAlone) {
+TEST(DescribeImage, ZerosAreOnlyTheirSize) {
     for (const std::size_t size : {0U, 1U, 179U, 5000U}) {
         kit::ImageDescription expected;
         expected.size = static_cast<std::uint32_t>(size);
@@ -52,7 +52,7 @@ TEST(DescribeImage, ZerosAreTheirSizeAlone) {
     }
 }
 
-/// A disk whose last mebibyte begins with the given bytes, at offsets from its base.
+/// A disk with the given bytes in its last mebibyte, by offset from the base.
 std::string diskWith(const std::map<std::size_t, std::string>& parts, std::size_t before = 0) {
     std::string disk(before + RECORD_AREA, '\0');
     for (const auto& [offset, bytes] : parts) {
@@ -66,14 +66,14 @@ TEST(DescribeDisk, RecordsAreNamedAndTheRestIsBytes) {
         kit::describeDisk(diskWith({{0, "0"},                      // slot 0
                                     {1, std::string("1\0one", 5)}, // slot 1
                                     {129, "SN004217"},             // slot 9
-                                    {137, "gap"},                  // behind slot 9
+                                    {137, "gap"},                  // after slot 9
                                     {2184, "GABCDE16"}, // the gap's last byte, slots 10 to 14, 16
                                     {2214, std::string("\0z", 2)}, // slot 17
-                                    {2216, "behind"},              // behind slot 17
+                                    {2216, "behind"},              // after slot 17
                                     {3072, "aux"},                 // the auxiliary area
                                     {4096 + 3 * 188, "\x02"}, // block 3: its first switch is on
                                     {4096 + 1879, "\x07"},    // the last byte of block 9
-                                    {4096 + 1880, "rest"},    // behind the tenth block
+                                    {4096 + 1880, "rest"},    // after the tenth block
                                     {RECORD_AREA - 1, "e"}},
                                    100));
     EXPECT_EQ(disk.size, RECORD_AREA + 100);
@@ -116,7 +116,7 @@ TEST(DescribeDisk, ShorterThanTheRecordAreaIsBytesOnly) {
               (std::map<std::uint64_t, kit::Bytes>{{129, std::string(RECORD_AREA - 130, 'x')}}));
 }
 
-TEST(DescribeDisk, OfZerosIsItsSizeAlone) {
+TEST(DescribeDisk, OfZerosIsOnlyItsSize) {
     for (const std::size_t size : {std::size_t{0}, std::size_t{5}, RECORD_AREA, 2 * RECORD_AREA}) {
         kit::DiskDescription expected;
         expected.size = size;

@@ -32,7 +32,7 @@ protected:
     fs::path root() const { return folder_.path() / "unit"; }
     fs::path other() const { return folder_.path() / "other"; }
 
-    /// What is found in a unit made of `unit`.
+    /// The description of a unit made from `unit`.
     kit::UnitDescription described(const kit::UnitDescription& unit) const {
         kit::makeUnit(unit, root());
         return kit::describeUnit(root());
@@ -51,11 +51,11 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(DescribeUnitTest, UnitOfNothingIsFoundAsThat) {
+TEST_F(DescribeUnitTest, EmptyUnitIsDescribedAsEmpty) {
     EXPECT_TRUE(described({}) == kit::UnitDescription());
 }
 
-TEST_F(DescribeUnitTest, EachKindOfEntryIsFound) {
+TEST_F(DescribeUnitTest, EachKindOfEntryIsDescribed) {
     kit::UnitDescription unit;
     unit.image.params[22] = 1;
     unit.disk.slots[9] = "SN004217";
@@ -66,7 +66,7 @@ TEST_F(DescribeUnitTest, EachKindOfEntryIsFound) {
     EXPECT_TRUE(described(unit) == unit);
 }
 
-TEST_F(DescribeUnitTest, WhatIsMissingIsAbsentByItsTopmostPath) {
+TEST_F(DescribeUnitTest, MissingEntriesAreAbsentByTheirTopmostPath) {
     kit::UnitDescription unit;
     unit.absent = {"/dev/hd0", "/fs/mp", "/fs/tmpfs", "/tmp"};
     EXPECT_EQ(described(unit).absent, unit.absent);
@@ -76,7 +76,7 @@ TEST_F(DescribeUnitTest, WhatIsMissingIsAbsentByItsTopmostPath) {
     EXPECT_EQ(kit::describeUnit(root()).absent, (Paths{"/dev", "/fs", "/tmp"}));
 }
 
-TEST_F(DescribeUnitTest, WhatGaveWayIsNotAbsent) {
+TEST_F(DescribeUnitTest, ReplacedEntriesAreNotAbsent) {
     kit::UnitDescription unit;
     unit.links = {{"/fs/mp", "x"}, {"/dev/hd0", "disk0"}};
     unit.files = {{"/tmp", "no folder"}};
@@ -93,7 +93,7 @@ TEST_F(DescribeUnitTest, LongImageIsDescribedAsAFile) {
     EXPECT_EQ(fs::file_size(other() / std::string(IMAGE_PATH).substr(1)), std::uint64_t{5} << 30U);
 }
 
-TEST_F(DescribeUnitTest, LongDiskTakesNoTime) {
+TEST_F(DescribeUnitTest, LongDiskCostsAlmostNothing) {
     kit::UnitDescription unit;
     unit.disk.size = std::uint64_t{1} << 40U;
     unit.disk.slots[9] = "SN004217";
@@ -101,7 +101,7 @@ TEST_F(DescribeUnitTest, LongDiskTakesNoTime) {
     EXPECT_TRUE(described(unit) == unit);
 }
 
-TEST_F(DescribeUnitTest, MarkIsNoPartOfIt) {
+TEST_F(DescribeUnitTest, MarkIsNotPartOfIt) {
     kit::makeUnit({}, root());
     writeFile(root() / "tmp/.orvane-unit", "a file like any other");
     const kit::UnitDescription unit = kit::describeUnit(root());
@@ -109,21 +109,21 @@ TEST_F(DescribeUnitTest, MarkIsNoPartOfIt) {
               (std::map<std::string, std::string>{{"/tmp/.orvane-unit", "a file like any other"}}));
 }
 
-TEST_F(DescribeUnitTest, WhatIsNoUnitIsRefused) {
+TEST_F(DescribeUnitTest, AnythingButAUnitIsRefused) {
     EXPECT_EQ(refusal(), root().string() + " is not a folder");
     fs::create_directories(root() / "fs");
     EXPECT_EQ(refusal(), root().string() +
                              " is not a unit that orvane-unit made: it has no file .orvane-unit");
 }
 
-TEST_F(DescribeUnitTest, WhatCannotBeDescribedIsRefusedByName) {
+TEST_F(DescribeUnitTest, EntryThatCannotBeDescribedIsRefusedByName) {
     kit::makeUnit({}, root());
     const fs::path pipe = root() / "tmp/pipe";
     ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
     EXPECT_EQ(refusal(), pipe.string() + " is neither a file, a folder nor a link");
 }
 
-TEST_F(DescribeUnitTest, WhatCannotBeReadIsRefusedByName) {
+TEST_F(DescribeUnitTest, EntryThatCannotBeReadIsRefusedByName) {
     kit::makeUnit({}, root());
     const fs::path locked = root() / "tmp/locked";
     for (const bool isFolder : {false, true}) {
@@ -136,7 +136,7 @@ TEST_F(DescribeUnitTest, WhatCannotBeReadIsRefusedByName) {
         fs::permissions(locked, fs::perms::none);
         std::string said;
         {
-            const PermissionsHold permissions;
+            const EnforcedPermissions permissions;
             said = refusal();
         }
         EXPECT_EQ(said, "cannot read " + locked.string() + ": Permission denied");
@@ -144,8 +144,8 @@ TEST_F(DescribeUnitTest, WhatCannotBeReadIsRefusedByName) {
     }
 }
 
-/// Once more over the text, and made again: the same tree, and the same description of it.
-TEST_F(DescribeUnitTest, RandomUnitsAreMadeAgainAsTheyWere) {
+/// A unit made again from its description's text has the same tree and the same description.
+TEST_F(DescribeUnitTest, RandomUnitsSurviveTheRoundTrip) {
     for (std::uint32_t seed = 0; seed < 200; ++seed) {
         SCOPED_TRACE(seed);
         const kit::UnitDescription found = described(RandomUnit(seed).unit());

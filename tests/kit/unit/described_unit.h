@@ -32,8 +32,7 @@ constexpr char WHOLE_UNIT[] = R"(
 "/fs/mp/etc/mm/iap1.cfg" = "iap1 stock\n"
 )";
 
-/// A unit of its own in a temporary folder. What `change` does to the description of WHOLE_UNIT is
-/// made as well.
+/// A unit in its own temporary folder, made from the description of WHOLE_UNIT after `change`.
 class DescribedUnit {
 public:
     template <class Change>

@@ -18,7 +18,7 @@
 
 namespace orvane::test {
 
-/// A unit with something everywhere, to be changed.
+/// A unit with something everywhere.
 class EditTest : public ::testing::Test {
 protected:
     EditTest() { make(wholeUnit()); }
@@ -37,7 +37,7 @@ protected:
         return unit;
     }
 
-    /// In the place of the unit that is there.
+    /// Replaces the present unit.
     void make(const kit::UnitDescription& unit) const {
         std::filesystem::remove_all(root());
         kit::makeUnit(unit, root());
@@ -49,7 +49,7 @@ protected:
 
     kit::UnitDescription found() const { return kit::describeUnit(root()); }
 
-    /// What an assignment is refused with, all of the unit untouched.
+    /// The refusal of these assignments; requires that the whole unit is unchanged.
     std::string refusalOf(const std::vector<std::string>& assignments) const {
         const auto before = treeOf(root());
         std::string refusal;

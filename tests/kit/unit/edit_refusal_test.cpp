@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What setValues refuses, and that nothing is changed by then.
+// What setValues refuses, with nothing changed.
 #include "kit/host/kit_error.h"
 #include "tests/kit/unit/edit_fixture.h"
 
@@ -15,7 +15,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// An assignment, and what is said behind it and a colon.
+/// An assignment, and the message after it and a colon.
 struct Refusal {
     const char* assignment;
     const char* message;
@@ -68,7 +68,7 @@ TEST_F(EditTest, WrongAssignmentIsNamedWithWhatWouldBeRight) {
     }
 }
 
-TEST_F(EditTest, UnknownKeyIsNamedWithThoseThatAreKnown) {
+TEST_F(EditTest, UnknownKeyIsNamedWithTheKnownOnes) {
     for (const std::string key :
          {"", "x", "Serial", "serial ", "params.22", "slot", "param", "disk"}) {
         const std::string assignment = key + "=1";
@@ -78,7 +78,7 @@ TEST_F(EditTest, UnknownKeyIsNamedWithThoseThatAreKnown) {
     EXPECT_EQ(refusalOf({"serial"}), "\"serial\" is no assignment: it takes KEY=VALUE");
 }
 
-TEST_F(EditTest, WrongAssignmentBehindGoodOnesLeavesThoseUndone) {
+TEST_F(EditTest, WrongAssignmentAfterGoodOnesChangesNothing) {
     EXPECT_NE(refusalOf({"param.22=9", "serial=x", "tuning.3.qwaSendGain=1", "param.22=256"}), "");
     fs::resize_file(root() / std::string(IMAGE_PATH).substr(1), 100);
     EXPECT_EQ(refusalOf({"param.22=9", "serial=x", "param.134=1"}),
@@ -102,7 +102,7 @@ TEST_F(EditTest, ValueThatIsSetTwiceIsRefused) {
               "\"tuning.3.qwaSendGain=1\" already");
 }
 
-TEST_F(EditTest, FaultOfATuningFileStandsAtItsPlace) {
+TEST_F(EditTest, FaultOfATuningFileNamesItsPlace) {
     const std::string file = hostFile().string();
     writeFile(file, "qwaAECSwitch on\n");
     EXPECT_EQ(refusalOf({"tuning.3=" + file}),
@@ -114,7 +114,6 @@ TEST_F(EditTest, FaultOfATuningFileStandsAtItsPlace) {
                      "a code 0 to 3");
 }
 
-/// An image and disk that a value can't be set in.
 TEST_F(EditTest, MissingImageAndDiskAreRefused) {
     kit::UnitDescription unit;
     unit.absent = {"/dev/hd0", IMAGE_PATH};
@@ -127,7 +126,7 @@ TEST_F(EditTest, MissingImageAndDiskAreRefused) {
     }
 }
 
-TEST_F(EditTest, FoldersInTheirPlaceAreRefused) {
+TEST_F(EditTest, FoldersInPlaceOfImageAndDiskAreRefused) {
     kit::UnitDescription unit;
     unit.folders = {"/dev/hd0", IMAGE_PATH};
     make(unit);
@@ -161,7 +160,7 @@ TEST_F(EditTest, DiskThatIsTooShortIsRefused) {
               "takes 1044480");
 }
 
-TEST_F(EditTest, WhatTheKitDidNotMakeIsRefused) {
+TEST_F(EditTest, FolderThatTheKitDidNotMakeIsRefused) {
     fs::remove(root() / ".orvane-unit");
     EXPECT_EQ(refusalOf({"serial=x"}),
               root().string() +

@@ -142,7 +142,7 @@ TEST_F(EditTest, ShortestImageAndDiskThatHoldAValueAreEnough) {
     EXPECT_EQ(disk.substr(0, 9), std::string("12345678\0", 9));
 }
 
-TEST_F(EditTest, NothingToSetIsNothingDone) {
+TEST_F(EditTest, NoAssignmentsChangeNothing) {
     EXPECT_EQ(refusalOf({}), "");
 }
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What gives way to what when a unit is made: standard folders, image and disk to files, links,
-// folders and absent paths.
+// Which entries replace others when a unit is made: files, links, folders and absent paths replace
+// standard folders, image and disk.
 #include "kit/description/unit_description.h"
 #include "kit/unit/make_unit.h"
 #include "tests/kit/unit/unit_tree.h"
@@ -41,7 +41,7 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(MakeUnitPlacesTest, LinksHoldTheirTargetsWhateverTheseAre) {
+TEST_F(MakeUnitPlacesTest, LinksHoldAnyTarget) {
     kit::UnitDescription unit;
     unit.links = {{"/tmp/a", "nowhere"},        {"/tmp/b", "/etc/hostname"},
                   {"/new/deep/c", "../../tmp"}, {"/tmp/d", "d"},
@@ -52,7 +52,7 @@ TEST_F(MakeUnitPlacesTest, LinksHoldTheirTargetsWhateverTheseAre) {
     }
 }
 
-TEST_F(MakeUnitPlacesTest, LinkTakesThePlaceOfImageAndDiskAndIsNotFollowed) {
+TEST_F(MakeUnitPlacesTest, LinkReplacesImageAndDiskAndIsNotFollowed) {
     kit::UnitDescription unit;
     unit.image.params[22] = 1;
     unit.disk.slots[9] = "unused";
@@ -62,7 +62,7 @@ TEST_F(MakeUnitPlacesTest, LinkTakesThePlaceOfImageAndDiskAndIsNotFollowed) {
     EXPECT_EQ(paths.count("/dev/disk0") + paths.count("/tmp/image"), 0U);
 }
 
-TEST_F(MakeUnitPlacesTest, ValuesOfWhatIsNotMadeNeedNotFit) {
+TEST_F(MakeUnitPlacesTest, ValuesOfAReplacedImageOrDiskNeedNotFit) {
     kit::UnitDescription unit;
     unit.image.size = 0;
     unit.image.params[22] = 1;
@@ -74,7 +74,7 @@ TEST_F(MakeUnitPlacesTest, ValuesOfWhatIsNotMadeNeedNotFit) {
     EXPECT_NO_THROW(kit::makeUnit(unit, root()));
 }
 
-TEST_F(MakeUnitPlacesTest, NothingIsMadeBelowALinkInThePlaceOfAFolder) {
+TEST_F(MakeUnitPlacesTest, NothingIsMadeBelowALinkInPlaceOfAFolder) {
     const TemporaryFolder elsewhere;
     kit::UnitDescription unit;
     unit.links = {{"/fs", elsewhere.path()}, {"/dev", elsewhere.path()}, {"/tmp", "."}};
@@ -82,7 +82,7 @@ TEST_F(MakeUnitPlacesTest, NothingIsMadeBelowALinkInThePlaceOfAFolder) {
     EXPECT_TRUE(fs::is_empty(elsewhere.path()));
 }
 
-TEST_F(MakeUnitPlacesTest, FileInThePlaceOfAFolderIsMadeAndItsFoldersAbove) {
+TEST_F(MakeUnitPlacesTest, FileInPlaceOfAFolderIsMadeWithItsParents) {
     kit::UnitDescription unit;
     unit.files = {{"/fs/mp/etc", "no folder"}, {"/dev", ""}, {"/fs/tmpfs", "x"}};
     unit.sparseFiles = {{"/tmp", {5, {}}}};
@@ -92,14 +92,14 @@ TEST_F(MakeUnitPlacesTest, FileInThePlaceOfAFolderIsMadeAndItsFoldersAbove) {
     EXPECT_EQ(readFile(root() / "tmp"), std::string(5, '\0'));
 }
 
-TEST_F(MakeUnitPlacesTest, FolderThatAnotherEntryNeedsTakesThePlaceOfTheDisk) {
+TEST_F(MakeUnitPlacesTest, FolderThatAnotherEntryNeedsReplacesTheDisk) {
     kit::UnitDescription unit;
     unit.files = {{"/dev/hd0/deep/file", "x"}};
     make(unit);
     EXPECT_EQ(readFile(root() / "dev/hd0/deep/file"), "x");
 }
 
-TEST_F(MakeUnitPlacesTest, AbsentPathBehindALinkReachesNothingOutside) {
+TEST_F(MakeUnitPlacesTest, AbsentPathBelowALinkReachesNothingOutside) {
     const TemporaryFolder elsewhere;
     writeFile(elsewhere.path() / "mine", "kept");
     kit::UnitDescription unit;
@@ -109,7 +109,7 @@ TEST_F(MakeUnitPlacesTest, AbsentPathBehindALinkReachesNothingOutside) {
     EXPECT_EQ(readFile(elsewhere.path() / "mine"), "kept");
 }
 
-TEST_F(MakeUnitPlacesTest, AbsentPathTakesAwayFilesLinksAndFoldersButNotWhatIsAbove) {
+TEST_F(MakeUnitPlacesTest, AbsentPathRemovesFilesLinksAndFoldersButNotParents) {
     kit::UnitDescription unit;
     unit.files = {{"/a/b/file", "x"}, {"/a/b-side", "x"}};
     unit.links = {{"/a/b/link", "x"}};
@@ -118,7 +118,7 @@ TEST_F(MakeUnitPlacesTest, AbsentPathTakesAwayFilesLinksAndFoldersButNotWhatIsAb
     EXPECT_EQ(make(unit), (Paths{"/a", "/a/b-side", "/c"}));
 }
 
-TEST_F(MakeUnitPlacesTest, SparseFileHoldsItsBytesAndTakesNoRoomForItsZeros) {
+TEST_F(MakeUnitPlacesTest, SparseFileHoldsItsBytesAndNeedsNoRoomForZeros) {
     kit::UnitDescription unit;
     unit.sparseFiles = {{"/new/disk0", {64 * MEBIBYTE, {{0, "begin"}, {64 * MEBIBYTE - 1, "e"}}}},
                         {"/empty", {0, {}}}};
@@ -135,14 +135,14 @@ TEST_F(MakeUnitPlacesTest, SparseFileHoldsItsBytesAndTakesNoRoomForItsZeros) {
     EXPECT_EQ(fs::file_size(root() / "empty"), 0U);
 }
 
-TEST_F(MakeUnitPlacesTest, NameOfAnyBytesIsTaken) {
+TEST_F(MakeUnitPlacesTest, NameOfAnyBytesIsAccepted) {
     const std::string name = "/tmp/\x01\xFF \"\\\n\t'=#[";
     kit::UnitDescription unit;
     unit.files = {{name, "x"}};
     EXPECT_EQ(make(unit).count(name), 1U);
 }
 
-TEST_F(MakeUnitPlacesTest, FolderThatIsNamedTwiceIsMadeOnce) {
+TEST_F(MakeUnitPlacesTest, FolderNamedTwiceIsMadeOnce) {
     kit::UnitDescription unit;
     unit.folders = {"/x", "/x", "/x/y"};
     EXPECT_EQ(make(unit).count("/x/y"), 1U);

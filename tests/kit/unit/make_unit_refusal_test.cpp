@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What makeUnit refuses, and that nothing is left of it.
+// What makeUnit refuses, with nothing left behind.
 #include "kit/description/unit_description.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/make_unit.h"
@@ -21,7 +21,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// What turns a good unit into one that is refused, and the reason that is given.
+/// A change that makes a good unit refused, and the message.
 struct Refusal {
     void (*spoil)(kit::UnitDescription&);
     const char* message;
@@ -114,7 +114,7 @@ protected:
     const fs::path& folder() const { return folder_.path(); }
     fs::path root() const { return folder() / "unit"; }
 
-    /// What makes a difference when it is left behind.
+    /// A unit with entries of every kind, so that anything left behind shows.
     static kit::UnitDescription wholeUnit() {
         kit::UnitDescription unit;
         unit.image.params[22] = 1;
@@ -133,7 +133,7 @@ protected:
         return "";
     }
 
-    /// Refused, and nothing left, whether `root` was absent or an empty folder.
+    /// Requires a refusal with nothing left, whether `root` was absent or an empty folder.
     void expectNothingLeft(const kit::UnitDescription& unit, const std::string& message) const {
         const std::size_t before = openDescriptors();
         const fs::path hostCwd = fs::current_path();
@@ -151,7 +151,7 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(MakeUnitRefusalTest, WhatDoesNotFitIsNamedAndLeavesNothing) {
+TEST_F(MakeUnitRefusalTest, ValueThatDoesNotFitIsNamedAndLeavesNothing) {
     for (const Refusal& refusal : REFUSALS) {
         SCOPED_TRACE(refusal.message);
         kit::UnitDescription unit = wholeUnit();
@@ -182,13 +182,13 @@ TEST_F(MakeUnitRefusalTest, PathThatIsNotPlainIsNamedAndLeavesNothing) {
     }
 }
 
-TEST_F(MakeUnitRefusalTest, SystemThatDoesNotTakeTheDiskIsRefusedAndLeavesNothing) {
+TEST_F(MakeUnitRefusalTest, DiskThatTheSystemRefusesIsNamedAndLeavesNothing) {
     const ResourceLimit limit(RLIMIT_FSIZE, 4096);
     expectNothingLeft(wholeUnit(),
                       "cannot make " + (root() / "dev/hd0").string() + ": File too large");
 }
 
-TEST_F(MakeUnitRefusalTest, SystemThatDoesNotTakeAFileIsRefusedAndLeavesNothing) {
+TEST_F(MakeUnitRefusalTest, FileThatTheSystemRefusesIsNamedAndLeavesNothing) {
     const ResourceLimit limit(RLIMIT_FSIZE, 4096);
     kit::UnitDescription unit = wholeUnit();
     unit.absent = {"/dev/hd0"};

@@ -27,14 +27,14 @@ namespace fs = std::filesystem;
 constexpr std::size_t TUNING_OFFSET = 0x200000 - 0xFF000;
 constexpr std::size_t AUX_OFFSET = 0x200000 - 0xFF400;
 
-/// The slot's content from inside the unit, and what the read leaves of a longer buffer.
+/// The slot's content, read inside the unit into a buffer of `length` bytes.
 std::string slotContent(std::uint32_t slot, std::uint32_t length) {
     std::string buffer(length, '?');
     EXPECT_EQ(readRecordSlot(slot, buffer.data(), length), 0) << slot;
     return buffer;
 }
 
-/// All of a unit's entries, files with their size.
+/// All entries of a unit, files with their size.
 std::set<std::string> entriesOf(const fs::path& root) {
     std::set<std::string> entries;
     for (const fs::directory_entry& entry : fs::recursive_directory_iterator(root)) {
@@ -70,7 +70,7 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(MakeUnitTest, UnitOfNothingHasItsFoldersAnImageAndADiskOfZeros) {
+TEST_F(MakeUnitTest, EmptyUnitHasItsFoldersAnImageAndADiskOfZeros) {
     make({});
     EXPECT_EQ(entriesOf(root()), EMPTY_UNIT);
     EXPECT_EQ(readFile(image()), std::string(179, '\0'));
@@ -94,7 +94,7 @@ TEST_F(MakeUnitTest, RootMayBeNamedRelativeToTheWorkingDirectory) {
     EXPECT_EQ(slotContent(9, 8), "SN004217");
 }
 
-TEST_F(MakeUnitTest, DiskTakesNoRoomForItsZeros) {
+TEST_F(MakeUnitTest, DiskNeedsNoRoomForItsZeros) {
     kit::UnitDescription unit;
     unit.disk.size = 256 * MEBIBYTE;
     unit.disk.slots[9] = "x";
@@ -109,7 +109,7 @@ TEST_F(MakeUnitTest, SlotsAreWhereTheProductReadsThem) {
     const std::set<std::uint32_t> oneByte = {0, 10, 11, 12, 13, 14};
     kit::UnitDescription unit;
     for (std::uint32_t slot = 0; slot < 18; ++slot) {
-        if (slot != 15) { // covers slots 1 to 9
+        if (slot != 15) { // slot 15 covers slots 1 to 9
             unit.disk.slots[slot] =
                 std::string(oneByte.count(slot) == 1 ? 1 : 2, static_cast<char>('A' + slot));
         }
@@ -236,7 +236,7 @@ TEST_F(MakeUnitTest, FilesAreMadeWithTheirFoldersAndAnyBytes) {
     EXPECT_TRUE(fs::is_directory(root() / "other/deep"));
 }
 
-TEST_F(MakeUnitTest, AFileOrFolderTakesThePlaceOfImageAndDisk) {
+TEST_F(MakeUnitTest, FileOrFolderReplacesImageAndDisk) {
     kit::UnitDescription unit;
     unit.disk.slots[9] = "unused";
     unit.files["/dev/hd0"] = "no disk";
@@ -246,7 +246,7 @@ TEST_F(MakeUnitTest, AFileOrFolderTakesThePlaceOfImageAndDisk) {
     EXPECT_TRUE(fs::is_directory(image()));
 }
 
-TEST_F(MakeUnitTest, WhatIsAbsentIsGoneWithAllBelowIt) {
+TEST_F(MakeUnitTest, AbsentPathsAreGoneWithAllBelowThem) {
     kit::UnitDescription unit;
     unit.disk.slots[9] = "unused";
     unit.files = {{"/fs/mp/etc/mm/iap2.cfg", "x"}, {"/tmp/gone", "x"}, {"/tmp/kept", "x"}};
@@ -257,14 +257,14 @@ TEST_F(MakeUnitTest, WhatIsAbsentIsGoneWithAllBelowIt) {
                                      "fs/rwdata/.Version", "fs/tmpfs", "tmp", "tmp/kept=1"}));
 }
 
-TEST_F(MakeUnitTest, AbsentNameIsNoPrefixOfAnother) {
+TEST_F(MakeUnitTest, AbsentNameIsNotMatchedAsAPrefix) {
     kit::UnitDescription unit;
     unit.absent = {"/de", "/dev/hd", "/dev/hd0.old"};
     make(unit);
     EXPECT_EQ(entriesOf(root()), EMPTY_UNIT);
 }
 
-TEST_F(MakeUnitTest, MakingLeavesRootFolderAndDescriptorsAsTheyWere) {
+TEST_F(MakeUnitTest, RootFolderAndDescriptorsAreAsBefore) {
     const std::size_t before = openDescriptors();
     const fs::path hostCwd = fs::current_path();
     kit::UnitDescription unit;

@@ -58,7 +58,7 @@ TEST_F(MarkerTest, MarkIsThereWhateverElseIsAbsent) {
     EXPECT_TRUE(kit::isKitUnit(root()));
 }
 
-TEST_F(MarkerTest, UnitIsKnownByALinkToIt) {
+TEST_F(MarkerTest, UnitIsRecognisedThroughALink) {
     kit::makeUnit({}, root());
     const fs::path link = root().parent_path() / "link";
     fs::create_directory_symlink("unit", link);
@@ -66,12 +66,12 @@ TEST_F(MarkerTest, UnitIsKnownByALinkToIt) {
     EXPECT_EQ(refusalOf(link), "");
 }
 
-TEST_F(MarkerTest, FolderWithoutTheMarkIsNoUnit) {
+TEST_F(MarkerTest, FolderWithoutTheMarkIsNotAUnit) {
     fs::create_directories(root() / "fs");
     expectNoUnit();
 }
 
-TEST_F(MarkerTest, OtherMarkIsNone) {
+TEST_F(MarkerTest, OtherContentIsNotAMark) {
     fs::create_directory(root());
     for (const std::string& text : {std::string(), std::string("made by orvane-unit, layout 1"),
                                     std::string("made by orvane-unit, layout 2\n"),
@@ -82,7 +82,7 @@ TEST_F(MarkerTest, OtherMarkIsNone) {
     }
 }
 
-TEST_F(MarkerTest, MarkThatIsAFolderOrALinkIsNone) {
+TEST_F(MarkerTest, FolderOrLinkIsNotAMark) {
     fs::create_directories(mark());
     expectNoUnit();
     fs::remove(mark());
@@ -91,7 +91,7 @@ TEST_F(MarkerTest, MarkThatIsAFolderOrALinkIsNone) {
     expectNoUnit();
 }
 
-TEST_F(MarkerTest, WhatIsNoFolderIsRefused) {
+TEST_F(MarkerTest, AnythingButAFolderIsRefused) {
     EXPECT_FALSE(kit::isKitUnit(root()));
     EXPECT_EQ(refusalOf(root()), root().string() + " is not a folder");
     writeFile(root(), MARK);

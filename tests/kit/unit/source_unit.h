@@ -15,7 +15,7 @@
 
 namespace orvane::test {
 
-/// A unit that the kit has not made, to be looked at from outside.
+/// A unit that the kit has not made.
 class SourceUnitTest : public ::testing::Test {
 protected:
     SourceUnitTest() {
@@ -38,7 +38,7 @@ protected:
     }
     void putFolder(const std::string& path) const { std::filesystem::create_directories(at(path)); }
 
-    /// Everything of the source, and when it changed.
+    /// Everything in the source, and when it last changed.
     std::map<std::string, std::string> state() const {
         std::map<std::string, std::string> tree = treeOf(source());
         for (auto& [path, content] : tree) {

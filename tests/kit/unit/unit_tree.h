@@ -9,8 +9,8 @@
 
 namespace orvane::test {
 
-/// Every entry below a unit's root but the kit's mark: "folder", "link " and its target, or "file "
-/// and its content.
+/// Every entry below a unit's root except the kit's mark: "folder", "link " and its target, or
+/// "file " and its content.
 inline std::map<std::string, std::string> treeOf(const std::filesystem::path& root) {
     std::map<std::string, std::string> tree;
     for (const auto& entry : std::filesystem::recursive_directory_iterator(root)) {

@@ -57,8 +57,8 @@ TEST(UnitValuesTest, EveryKindHasItsKey) {
                  {"tuning.4.qwaAECSwitch", {"0", "qwaIdle"}}}));
 }
 
-TEST(UnitValuesTest, FilesAreToldBySizeAndChecksum) {
-    // By zlib: "map\n", "map 3743\n" and "airplay template\n".
+TEST(UnitValuesTest, FilesAreComparedBySizeAndChecksum) {
+    // Computed with zlib: "map\n", "map 3743\n" and "airplay template\n".
     EXPECT_EQ(
         changesOf([](UnitDescription& unit) {
             unit.files["/fs/rwdata/.Version/map.inf"] = "map\n";
@@ -73,7 +73,7 @@ TEST(UnitValuesTest, FilesAreToldBySizeAndChecksum) {
             {"folder./fs/mp/etc/airplay_static.conf", {"(missing)", "a folder"}}}));
 }
 
-TEST(UnitValuesTest, BytesOfASparseFileAreNotThoseOfAFileWithANumberAtItsEnd) {
+TEST(UnitValuesTest, OffsetInASparseFileIsNotTheEndOfAFileName) {
     UnitDescription first;
     first.sparseFiles["/fs/x"] = {5000, {{5, "x"}}};
     UnitDescription second = first;
@@ -86,7 +86,7 @@ TEST(UnitValuesTest, BytesOfASparseFileAreNotThoseOfAFileWithANumberAtItsEnd) {
     EXPECT_EQ(changes[0].after, "4 bytes, CRC-32 6ef7c13d");
 }
 
-TEST(UnitValuesTest, WhatTheToolDoesNotReadIsNoDifference) {
+TEST(UnitValuesTest, UnreadInputIsNotADifference) {
     EXPECT_EQ(changesOf([](UnitDescription& unit) {
                   unit.files["/fs/rwdata/notes"] = "not read\n";
                   unit.files["/fs/rwdata/.Version/readme.txt"] = "no version file\n";
@@ -96,7 +96,7 @@ TEST(UnitValuesTest, WhatTheToolDoesNotReadIsNoDifference) {
               Changes{});
 }
 
-TEST(UnitValuesTest, MissingDiskTakesAllItsValuesAlong) {
+TEST(UnitValuesTest, MissingDiskChangesAllItsValues) {
     const Changes changes =
         changesOf([](UnitDescription& unit) { unit.absent.push_back(BOOT_DISK); });
     // 17 slots, the auxiliary area, ten blocks of 44 fields and the bytes that no field reads.
@@ -106,7 +106,7 @@ TEST(UnitValuesTest, MissingDiskTakesAllItsValuesAlong) {
     EXPECT_EQ(changes.at(std::string("absent.") + BOOT_DISK).first, "(missing)");
 }
 
-TEST(UnitValuesTest, DifferencesComeInTheOrderOfTheFirstThenTheSecond) {
+TEST(UnitValuesTest, DifferencesAreInTheOrderOfTheFirstThenTheSecond) {
     const auto key = kit::paramKey;
     const UnitValues before = {{key(3), "1"}, {key(1), "1"}, {key(2), "1"}};
     const UnitValues after = {{key(4), "2"}, {key(2), "2"}, {key(3), "1"}};

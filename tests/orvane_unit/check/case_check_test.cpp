@@ -30,7 +30,7 @@ std::string refusalOf(const Action& action) {
     return "";
 }
 
-/// A folder with one case, whose only output is its stock file.
+/// A folder with one case that has one output, a stock file.
 class CaseCheckTest : public ::testing::Test {
 protected:
     CaseCheckTest() {
@@ -54,7 +54,7 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(CaseCheckTest, WhatIsAsExpectedHasNoDifference) {
+TEST_F(CaseCheckTest, ExpectedRunHasNoDifference) {
     const CheckReport report = check();
     ASSERT_EQ(report.cases.size(), 1U);
     EXPECT_EQ(report.cases[0].name, "one");
@@ -66,29 +66,29 @@ TEST_F(CaseCheckTest, WhatIsAsExpectedHasNoDifference) {
     EXPECT_EQ(report.unreached.size(), desk::REASON_COUNT - 3);
 }
 
-TEST_F(CaseCheckTest, ChangedContentIsTold) {
+TEST_F(CaseCheckTest, ChangedContentIsReported) {
     writeFile(expected() / "tmp/airplay.conf", "other\n");
     EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
 }
 
-TEST_F(CaseCheckTest, MissingFileOfTheExpectationIsTold) {
+TEST_F(CaseCheckTest, MissingFileOfTheExpectationIsReported) {
     fs::remove(expected() / "tmp/airplay.conf");
     EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
 }
 
-TEST_F(CaseCheckTest, MissingAndFurtherEntriesAreTold) {
+TEST_F(CaseCheckTest, MissingAndAdditionalEntriesAreReported) {
     writeFile(expected() / "tmp.list", "other\n");
     EXPECT_EQ(differences(), (Lines{"/tmp/other is missing", "/tmp/airplay.conf is not expected"}));
 }
 
-TEST_F(CaseCheckTest, EntryIsNotExpectedForThePrefixOfAnother) {
+TEST_F(CaseCheckTest, EntryIsNotMatchedAsAPrefix) {
     writeFile(expected() / "tmp.list", "airplay.conf.old\n");
     writeFile(expected() / "tmp/airplay.conf", "other\n");
     EXPECT_EQ(differences(),
               (Lines{"/tmp/airplay.conf.old is missing", "/tmp/airplay.conf is not expected"}));
 }
 
-TEST_F(CaseCheckTest, MissingListIsNoExpectation) {
+TEST_F(CaseCheckTest, MissingListIsNotAnExpectation) {
     fs::remove(expected() / "tmp.list");
     EXPECT_EQ(differences(), Lines{"there is no expectation: no expected/tmp.list"});
 }
@@ -104,7 +104,7 @@ TEST_F(CaseCheckTest, MissingTmpIsAnExpectationToo) {
     EXPECT_EQ(differences(), Lines{});
 }
 
-TEST_F(CaseCheckTest, UpdateWritesWhatThenPasses) {
+TEST_F(CaseCheckTest, UpdateWritesAnExpectationThatPasses) {
     fs::remove_all(expected());
     fs::create_directories(expected() / "tmp");
     writeFile(expected() / "tmp/left_over", "of before\n");
@@ -117,7 +117,7 @@ TEST_F(CaseCheckTest, UpdateWritesWhatThenPasses) {
     EXPECT_EQ(differences(), Lines{});
 }
 
-TEST_F(CaseCheckTest, UpdateLeavesAllElseAsItIs) {
+TEST_F(CaseCheckTest, UpdateChangesNothingElse) {
     writeFile(folder() / "one/notes", "of a person\n");
     fs::create_directory(folder() / "no_case");
     const std::string unit = readFile(folder() / "one/unit.toml");
@@ -140,8 +140,8 @@ TEST_F(CaseCheckTest, FoldersInTmpAreExpectedByTheirNames) {
     EXPECT_EQ(differences(), Lines{});
 }
 
-/// A binary that is not the tool: it leaves nothing, and ends with 1.
-TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
+/// The binary is not the tool: it leaves nothing, and its exit status is 1.
+TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsReported) {
     for (const bool updates : {false, true}) {
         const CaseResult result = desk::checkCases(folder(), "/bin/false", updates).cases.at(0);
         EXPECT_EQ(result.surprises, Lines{"/tmp/airplay.conf is not what the explanation says"});
@@ -151,11 +151,11 @@ TEST_F(CaseCheckTest, RunThatIsNotAsExplainedIsTold) {
     }
 }
 
-/// A file that its maker may not read itself.
-TEST_F(CaseCheckTest, OutputThatCannotBeReadIsBadInputAndNotRecorded) {
+/// The run makes a file that its owner may not read.
+TEST_F(CaseCheckTest, UnreadableOutputIsBadInputAndNotRecorded) {
     writeFile(folder() / "one/arguments", "-c\numask 777; echo > /tmp/closed\n");
-    { const kit::EnteredRoot once(folder()); } // a namespace gives privileges back
-    const PermissionsHold hold;
+    { const kit::EnteredRoot once(folder()); } // a user namespace restores privileges
+    const EnforcedPermissions hold;
     for (const bool updates : {false, true}) {
         EXPECT_EQ(refusalOf([&] { desk::checkCases(folder(), "/bin/sh", updates); }),
                   "cannot read /tmp/closed: Permission denied");
@@ -165,7 +165,7 @@ TEST_F(CaseCheckTest, OutputThatCannotBeReadIsBadInputAndNotRecorded) {
 
 TEST_F(CaseCheckTest, CaseThatCannotBeReadIsBadInput) {
     { const kit::EnteredRoot once(folder()); }
-    const PermissionsHold hold;
+    const EnforcedPermissions hold;
     const fs::path paths[] = {expected() / "tmp.list", folder() / "one/arguments", folder() / "one",
                               folder()};
     for (const fs::path& path : paths) {
@@ -179,14 +179,14 @@ TEST_F(CaseCheckTest, CaseThatCannotBeReadIsBadInput) {
 
 TEST_F(CaseCheckTest, ExpectationThatCannotBeReplacedIsBadInput) {
     { const kit::EnteredRoot once(folder()); }
-    const PermissionsHold hold;
+    const EnforcedPermissions hold;
     fs::permissions(expected(), fs::perms::owner_read | fs::perms::owner_exec);
     EXPECT_EQ(refusalOf([&] { check(true); }),
               "cannot write " + expected().string() + ": Permission denied");
     fs::permissions(expected(), fs::perms::owner_all);
 }
 
-TEST_F(CaseCheckTest, NothingIsWrittenUnasked) {
+TEST_F(CaseCheckTest, NothingIsWrittenWithoutUpdate) {
     fs::remove_all(expected());
     check();
     EXPECT_FALSE(fs::exists(expected()));

@@ -36,10 +36,10 @@ protected:
         return "";
     }
 
-    /// What is refused while `path` has no permissions.
+    /// The refusal while `path` has no permissions.
     std::string refusalWithout(const fs::path& path) const {
-        { const kit::EnteredRoot once(root()); } // a namespace gives privileges back
-        const PermissionsHold hold;
+        { const kit::EnteredRoot once(root()); } // a user namespace restores privileges
+        const EnforcedPermissions hold;
         fs::permissions(path, fs::perms::none);
         std::string text = refusal();
         fs::permissions(path, fs::perms::owner_all);
@@ -50,7 +50,7 @@ private:
     TemporaryFolder folder_;
 };
 
-TEST_F(TmpTreeTest, EntriesOfAllKindsAreThere) {
+TEST_F(TmpTreeTest, EntriesOfAllKindsAreListed) {
     fs::create_directories(tmp() / "a/b");
     writeFile(tmp() / "a/b/file", "text");
     writeFile(tmp() / "empty", "");
@@ -66,7 +66,7 @@ TEST_F(TmpTreeTest, EntriesOfAllKindsAreThere) {
     EXPECT_EQ(tree.entries, expected);
 }
 
-TEST_F(TmpTreeTest, WithoutAFolderThereIsNoTmp) {
+TEST_F(TmpTreeTest, TmpThatIsNotAFolderIsNone) {
     fs::remove(tmp());
     EXPECT_FALSE(desk::readTmp(root()).isThere);
     writeFile(tmp(), "");
@@ -81,14 +81,14 @@ TEST_F(TmpTreeTest, TmpThatCannotBeListedIsRefused) {
     EXPECT_EQ(refusalWithout(tmp()), "cannot read /tmp: Permission denied");
 }
 
-TEST_F(TmpTreeTest, FolderInItThatCannotBeListedIsRefused) {
+TEST_F(TmpTreeTest, SubfolderThatCannotBeListedIsRefused) {
     fs::create_directories(tmp() / "b/closed");
     writeFile(tmp() / "a", "text");
     writeFile(tmp() / "c", "text");
     EXPECT_EQ(refusalWithout(tmp() / "b/closed"), "cannot read /tmp/b/closed: Permission denied");
 }
 
-TEST_F(TmpTreeTest, FileInItThatCannotBeReadIsRefused) {
+TEST_F(TmpTreeTest, FileThatCannotBeReadIsRefused) {
     writeFile(tmp() / "closed", "text");
     EXPECT_EQ(refusalWithout(tmp() / "closed"), "cannot read /tmp/closed: Permission denied");
 }

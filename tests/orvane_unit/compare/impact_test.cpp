@@ -38,18 +38,18 @@ std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
     return impacts;
 }
 
-TEST(ImpactTest, SampleUnitMovesByFourParametersTheSerialAndTwoBlocks) {
+TEST(ImpactTest, FourParametersTheSerialAndTwoBlocksChangeTheSample) {
     const TemporaryFolder folder;
     const std::filesystem::path root = folder.path() / "unit";
     kit::makeUnit(kit::parseDescription(kit::sampleDescriptionText(), "sample"), root);
     const kit::UnitDescription before = kit::describeUnit(root);
-    // All of them take long where everything is watched; the guide shows a run of all.
+    // All of them would take long in an instrumented build; the guide shows a run of all.
     const std::map<std::string, Impact> impacts =
         impactsOf(root, {"param.22", "param.36", "param.5", "param.134", "param.139", "param.140",
                          "slot.0", "slot.8", "slot.9", "slot.16", "tuning.1.qwaN", "tuning.2.qwaN",
                          "tuning.3.qwaM", "tuning.4.qwaN"});
-    // Parameters 5 and 50 to 59 besides; slots of 1, 16, 8 and 24 bytes; three fields begin with
-    // qwaN, and three with qwaM.
+    // The prefixes also match parameters 5 and 50 to 59; slots of 1, 16, 8 and 24 bytes; three
+    // fields that begin with qwaN, and three with qwaM.
     EXPECT_EQ(impacts.size(), 16U + (1 + 16 + 8 + 24) + 4 * 3);
     for (const auto& [key, impact] : impacts) {
         const bool isRead = key == "param.22" || key == "param.36" || key == "param.134" ||
@@ -68,7 +68,7 @@ TEST(ImpactTest, SampleUnitMovesByFourParametersTheSerialAndTwoBlocks) {
     EXPECT_EQ(kit::describeUnit(root), before);
 }
 
-TEST(ImpactTest, BytesBehindTheSerialsEndAndUnaskedBlocksMoveNothing) {
+TEST(ImpactTest, BytesAfterTheSerialAndUnusedBlocksChangeNothing) {
     const DescribedUnit described(
         [](kit::UnitDescription& unit) { unit.disk.slots[9] = std::string("AB\0CD", 5); });
     const std::map<std::string, Impact> impacts =
@@ -86,7 +86,7 @@ TEST(ImpactTest, WithoutImageAndDiskNothingIsTried) {
     EXPECT_TRUE(impactsOf(described.root()).empty());
 }
 
-TEST(ImpactTest, KeyThatNoInputBeginsWithIsBadInput) {
+TEST(ImpactTest, PrefixOfNoKeyIsBadInput) {
     const DescribedUnit described;
     EXPECT_THROW(impactsOf(described.root(), {"param.172"}), kit::KitError);
 }

@@ -23,7 +23,7 @@ using kit::UnitDescription;
 
 using Change = std::function<void(UnitDescription&)>;
 
-/// What comes of the change, by the key of each value that differs. Both units begin with `common`.
+/// The consequences of `change`, by the key of each value that differs. Both units have `common`.
 std::map<std::string, Consequence> consequencesOf(
     const Change& change, const Change& common = [](UnitDescription&) {}) {
     const DescribedUnit first(common);
@@ -68,11 +68,11 @@ using Paths = std::set<std::string>;
 
 const Paths IAP_OUTPUTS = {IAP2_DEVICE_FILE.output, IAP2_FILE.output, IAP1_FILE.output};
 
-TEST(OutputDifferencesTest, SameUnitsDifferInNothing) {
+TEST(OutputDifferencesTest, EqualUnitsHaveNoDifferences) {
     EXPECT_TRUE(consequencesOf([](UnitDescription&) {}).empty());
 }
 
-TEST(OutputDifferencesTest, ParameterMovesItsLines) {
+TEST(OutputDifferencesTest, ParameterChangesItsLines) {
     const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[139] = 1; });
     ASSERT_EQ(found.size(), 1U);
     const Consequence& consequence = found.at("param.139");
@@ -83,13 +83,13 @@ TEST(OutputDifferencesTest, ParameterMovesItsLines) {
     EXPECT_EQ(consequence.outputs.size(), 4U);
 }
 
-TEST(OutputDifferencesTest, ParameterThatIsNotReadMovesNothing) {
+TEST(OutputDifferencesTest, UnreadParameterChangesNothing) {
     const auto found = consequencesOf([](UnitDescription& unit) { unit.image.params[50] = 3; });
     ASSERT_EQ(found.size(), 1U);
     EXPECT_TRUE(found.at("param.50").outputs.empty());
 }
 
-TEST(OutputDifferencesTest, SlotsAndAuxiliaryAreaAreTold) {
+TEST(OutputDifferencesTest, SlotsAndAuxiliaryAreaAreReported) {
     const auto found = consequencesOf([](UnitDescription& unit) {
         unit.disk.slots[9] = "SN9";
         unit.disk.slots[1] = std::string("\x01\x02", 2);
@@ -104,7 +104,7 @@ TEST(OutputDifferencesTest, SlotsAndAuxiliaryAreaAreTold) {
     EXPECT_EQ(found.size(), 3U);
 }
 
-TEST(OutputDifferencesTest, GeneratedProfileBringsTheTuningFiles) {
+TEST(OutputDifferencesTest, GeneratedProfileAddsTheTuningFiles) {
     const auto found = consequencesOf([](UnitDescription& unit) {
         unit.image.params[134] = 0xFFFF;
         unit.disk.tuning[3].fields["qwaNRAtten"] = std::int64_t{-40};
@@ -113,13 +113,13 @@ TEST(OutputDifferencesTest, GeneratedProfileBringsTheTuningFiles) {
     EXPECT_EQ(linesOf(profile, AIRPLAY_FILE.output),
               (Lines{"-audioProfile = 3\n", "+audioProfile = 65535\n"}));
     EXPECT_EQ(linesOf(profile, SPEECHREC_TUNING_FILE).size(), 45U);
-    // A field that differs has its own line to itself.
+    // A field that differs has its own line.
     EXPECT_EQ(linesOf(profile, TELEPHONY_TUNING_FILE).size(), 44U);
     EXPECT_EQ(linesOf(found.at("tuning.3.qwaNRAtten"), TELEPHONY_TUNING_FILE),
               Lines{"+qwaNRAtten -40\n"});
 }
 
-TEST(OutputDifferencesTest, VersionFileMovesTheFirmwareVersions) {
+TEST(OutputDifferencesTest, VersionFileChangesTheFirmwareVersions) {
     const std::string path = "/fs/rwdata/.Version/app.inf";
     const auto found = consequencesOf([&path](UnitDescription& unit) {
         unit.files[path] = "Type=Application\nVersion Number=4.5.6\n";
@@ -129,7 +129,7 @@ TEST(OutputDifferencesTest, VersionFileMovesTheFirmwareVersions) {
               (Lines{"-firmware_version=030a02\n", "+firmware_version=040506\n"}));
 }
 
-TEST(OutputDifferencesTest, VersionFileThatIsGoneIsTheCause) {
+TEST(OutputDifferencesTest, MissingVersionFileIsTheCause) {
     const std::string path = "/fs/rwdata/.Version/app.inf";
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
     EXPECT_EQ(pathsOf(found.at("file." + path)), IAP_OUTPUTS);
@@ -137,7 +137,7 @@ TEST(OutputDifferencesTest, VersionFileThatIsGoneIsTheCause) {
     EXPECT_EQ(found.size(), 1U);
 }
 
-TEST(OutputDifferencesTest, TemplateMovesItsOwnLines) {
+TEST(OutputDifferencesTest, TemplateChangesItsOwnLines) {
     const std::string path = AIRPLAY_FILE.templateFile;
     const auto found =
         consequencesOf([&path](UnitDescription& unit) { unit.files[path] = "another template\n"; });
@@ -163,7 +163,7 @@ TEST(OutputDifferencesTest, EmptyTemplateOfIap2IsTheCauseOfTheStockFileOfIap1) {
     EXPECT_EQ(pathsOf(found.at("file." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
 }
 
-TEST(OutputDifferencesTest, BytesOfASparseTemplateMoveItsLine) {
+TEST(OutputDifferencesTest, BytesOfASparseTemplateChangeItsLine) {
     const std::string path = AIRPLAY_FILE.templateFile;
     const auto found = consequencesOf(
         [&path](UnitDescription& unit) { unit.sparseFiles[path].bytes[4998] = "B\n"; },
@@ -177,25 +177,25 @@ TEST(OutputDifferencesTest, BytesOfASparseTemplateMoveItsLine) {
     EXPECT_EQ(linesOf(consequence, AIRPLAY_FILE.output).size(), 2U);
 }
 
-TEST(OutputDifferencesTest, StockFileThatIsNotUsedMovesNothing) {
+TEST(OutputDifferencesTest, UnusedStockFileChangesNothing) {
     const std::string path = AIRPLAY_FILE.stockFile;
     const auto found = consequencesOf([&path](UnitDescription& unit) { unit.files.erase(path); });
     ASSERT_EQ(found.size(), 1U);
     EXPECT_TRUE(found.at("file." + path).outputs.empty());
 }
 
-TEST(OutputDifferencesTest, MissingImageMovesEveryValueUnderItsOwnKey) {
+TEST(OutputDifferencesTest, MissingImageChangesEveryValueUnderItsOwnKey) {
     const auto found =
         consequencesOf([](UnitDescription& unit) { unit.absent.push_back(CONFIG_SHM_NAME); });
     EXPECT_EQ(found.at("param.139").change.after, "(missing)");
     EXPECT_EQ(found.at("param.139").outputs.size(), 4U);
     EXPECT_EQ(pathsOf(found.at("param.22")), Paths{AIRPLAY_FILE.output});
-    // The two lines of the value itself, its comment and the empty line behind it.
+    // The two lines of the value itself, its comment and the empty line after it.
     EXPECT_EQ(linesOf(found.at("param.134"), AIRPLAY_FILE.output).size(), 3U);
     EXPECT_EQ(found.count(""), 0U);
 }
 
-TEST(OutputDifferencesTest, MissingDiskMovesTheSerial) {
+TEST(OutputDifferencesTest, MissingDiskChangesTheSerial) {
     const auto found =
         consequencesOf([](UnitDescription& unit) { unit.absent.push_back(BOOT_DISK); });
     EXPECT_EQ(linesOf(found.at("slot.9"), IAP2_FILE.output),
@@ -203,7 +203,7 @@ TEST(OutputDifferencesTest, MissingDiskMovesTheSerial) {
     EXPECT_EQ(found.count(""), 0U);
 }
 
-TEST(OutputDifferencesTest, FolderInThePlaceOfAnOutputIsTheCause) {
+TEST(OutputDifferencesTest, FolderInPlaceOfAnOutputIsTheCause) {
     const std::string path = IAP2_FILE.output;
     const auto found =
         consequencesOf([&path](UnitDescription& unit) { unit.folders.push_back(path); });
@@ -211,8 +211,8 @@ TEST(OutputDifferencesTest, FolderInThePlaceOfAnOutputIsTheCause) {
     EXPECT_EQ(pathsOf(found.at("folder." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
 }
 
-/// An output that is a link to a template of a later one: no single input accounts for that.
-TEST(OutputDifferencesTest, LinesOfNoValueComeLast) {
+/// An output is a link to the template of a later one: no single input explains that.
+TEST(OutputDifferencesTest, LinesWithoutAValueComeLast) {
     const DescribedUnit first;
     const DescribedUnit second([](UnitDescription& unit) {
         unit.links[IAP2_FILE.output] = IAP1_FILE.templateFile;

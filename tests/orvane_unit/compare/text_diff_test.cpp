@@ -14,7 +14,7 @@ namespace {
 
 using Text = std::optional<std::string>;
 
-/// Without colours: the tests' standard output is no terminal, or NO_COLOR is set for them.
+/// Without colours: the tests' standard output is not a terminal, or NO_COLOR is set for them.
 std::string diffOf(const Text& before, const Text& after) {
     std::ostringstream out;
     desk::printUnifiedDiff(out, "/tmp/x", before, after);
@@ -27,13 +27,13 @@ TEST(TextDiffTest, SameTextsHaveNoDiff) {
     EXPECT_EQ(diffOf(std::nullopt, std::nullopt), "");
 }
 
-TEST(TextDiffTest, ChangedLineStandsBetweenThreeCommonOnes) {
+TEST(TextDiffTest, ChangedLineHasThreeLinesOfContextOnEachSide) {
     EXPECT_EQ(diffOf("1\n2\n3\n4\n5\n6\n7\n8\n9\n", "1\n2\n3\n4\nfive\n6\n7\n8\n9\n"),
               "--- /tmp/x\n+++ /tmp/x\n@@ -2,7 +2,7 @@\n"
               " 2\n 3\n 4\n-5\n+five\n 6\n 7\n 8\n");
 }
 
-TEST(TextDiffTest, ChangesFarApartAreHunksOfTheirOwn) {
+TEST(TextDiffTest, DistantChangesAreSeparateHunks) {
     std::string before;
     for (int i = 1; i <= 20; ++i) {
         before += std::to_string(i) + "\n";
@@ -46,7 +46,7 @@ TEST(TextDiffTest, ChangesFarApartAreHunksOfTheirOwn) {
                                      "@@ -18,3 +17,4 @@\n 18\n 19\n 20\n+21\n");
 }
 
-TEST(TextDiffTest, SixCommonLinesJoinTwoChangesAndSevenPartThem) {
+TEST(TextDiffTest, SixCommonLinesJoinTwoChangesAndSevenSeparateThem) {
     EXPECT_EQ(diffOf("x\n1\n2\n3\n4\n5\n6\ny\n", "X\n1\n2\n3\n4\n5\n6\nY\n"),
               "--- /tmp/x\n+++ /tmp/x\n@@ -1,8 +1,8 @@\n"
               "-x\n+X\n 1\n 2\n 3\n 4\n 5\n 6\n-y\n+Y\n");
@@ -55,10 +55,10 @@ TEST(TextDiffTest, SixCommonLinesJoinTwoChangesAndSevenPartThem) {
               "@@ -6,4 +6,4 @@\n 5\n 6\n 7\n-y\n+Y\n");
 }
 
-/// The text that the hunks make of `before`, by their numbers alone, as a patch does.
+/// Applies the hunks to `before` by their line numbers alone, like a patch.
 std::string patched(const std::vector<std::string>& before, const std::vector<desk::Hunk>& hunks) {
     std::string text;
-    std::size_t next = 1; // the line of `before` that comes next
+    std::size_t next = 1; // the next line of `before`
     for (const desk::Hunk& hunk : hunks) {
         const std::size_t first = hunk.beforeCount == 0 ? hunk.before + 1 : hunk.before;
         while (next < first) {
@@ -79,12 +79,12 @@ std::string patched(const std::vector<std::string>& before, const std::vector<de
     return text;
 }
 
-/// The same numbers each time.
+/// The same numbers in every run.
 std::mt19937 numbersFrom(std::mt19937::result_type seed) {
     return std::mt19937(seed);
 }
 
-TEST(TextDiffTest, HunksMakeTheSecondTextOfTheFirst) {
+TEST(TextDiffTest, HunksTurnTheFirstTextIntoTheSecond) {
     std::mt19937 random = numbersFrom(20090213);
     const auto textOf = [&random] {
         std::vector<std::string> lines(random() % 40);
@@ -103,20 +103,20 @@ TEST(TextDiffTest, HunksMakeTheSecondTextOfTheFirst) {
     }
 }
 
-TEST(TextDiffTest, NewAndRemovedFilesCountFromNothing) {
+TEST(TextDiffTest, NewAndRemovedFilesAreDiffedAgainstNothing) {
     EXPECT_EQ(diffOf(std::nullopt, "a\nb\n"),
               "--- /dev/null\n+++ /tmp/x\n@@ -0,0 +1,2 @@\n+a\n+b\n");
     EXPECT_EQ(diffOf("a\n", std::nullopt), "--- /tmp/x\n+++ /dev/null\n@@ -1,1 +0,0 @@\n-a\n");
     EXPECT_EQ(diffOf(std::nullopt, ""), "--- /dev/null\n+++ /tmp/x\n");
 }
 
-TEST(TextDiffTest, MissingLineEndIsTold) {
+TEST(TextDiffTest, MissingLineEndIsReported) {
     EXPECT_EQ(
         diffOf("a\nb", "a\nb\n"),
         "--- /tmp/x\n+++ /tmp/x\n@@ -1,2 +1,2 @@\n a\n-b\n\\ No newline at end of file\n+b\n");
 }
 
-TEST(TextDiffTest, BytesThatAreNoTextAreEscaped) {
+TEST(TextDiffTest, BytesThatAreNotTextAreEscaped) {
     EXPECT_EQ(diffOf("", "\x1b[2J\xff\n"),
               "--- /tmp/x\n+++ /tmp/x\n@@ -0,0 +1,1 @@\n+\\x1b[2J\\xff\n");
 }
@@ -146,7 +146,7 @@ TEST(TextDiffTest, LinesKnowTheirNumbersWhenTheSecondTextIsShorter) {
     }
 }
 
-TEST(TextDiffTest, LargeTextsWithNothingInCommonTakeNoTime) {
+TEST(TextDiffTest, LargeTextsWithNothingInCommonCostAlmostNothing) {
     std::string before;
     std::string after;
     for (int i = 0; i < 3000; ++i) {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Every reason by a unit that lays it, and the same unit run by the real binary.
+// Every reason, in a unit made to give it; the real binary runs in the same unit.
 #include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "kit/enter/run_inside.h"
@@ -150,7 +150,7 @@ protected:
     static const Row& row() { return rows().at(GetParam()); }
 };
 
-TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
+TEST_P(ExplainReasonsTest, FaultGivesItsReasonAtItsOutput) {
     const DescribedUnit described(row().change);
     const desk::Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
     const auto output =
@@ -163,7 +163,7 @@ TEST_P(ExplainReasonsTest, ReasonStandsWhereItsFaultIsLaid) {
               reasonInfo(row().reason).isIntended);
 }
 
-TEST_P(ExplainReasonsTest, RunLeavesWhatIsExplained) {
+TEST_P(ExplainReasonsTest, RunAgreesWithTheExplanation) {
     const DescribedUnit described(row().change);
     const desk::Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, {"-a", "-i"}}).exitStatus, 0);
@@ -208,7 +208,7 @@ TEST(ReasonsTest, EveryReasonHasARow) {
     }
 }
 
-TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoEnd) {
+TEST(ReasonsTest, CodesAreDifferentWordsAndSentencesHaveNoFullStop) {
     std::set<std::string> codes;
     for (const desk::ReasonInfo& info : desk::reasons()) {
         const std::string code = info.code;

@@ -46,7 +46,7 @@ std::string placeOf(const Output& output, const std::string& key) {
     return desk::placeText(lineOf(output, key).origin);
 }
 
-/// What the real binary leaves at the outputs that the explanation names.
+/// The content that the real binary leaves at the outputs of the explanation.
 void expectRunLeaves(const DescribedUnit& described, const Explanation& explanation,
                      const std::vector<std::string>& arguments) {
     ASSERT_EQ(kit::runInside(described.root(), {ORVANE_BINARY, arguments}).exitStatus, 0);
@@ -55,7 +55,7 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
         if (output.kindAfter == desk::PathKind::file) {
             EXPECT_EQ(readFile(output.path), output.contentAfter) << output.path;
         } else {
-            std::error_code ignored; // of a link to itself
+            std::error_code ignored; // for a link to itself
             EXPECT_FALSE(fs::is_regular_file(output.path, ignored)) << output.path;
         }
     }
@@ -75,7 +75,7 @@ TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
 
     const Output& iap1 = outputOf(explanation, IAP1_FILE.output);
     EXPECT_EQ(lineOf(iap1, "slot.9").text, "serial=SN004217\n");
-    // 2 MiB less 1 MiB, and slot 9 at 129 behind it.
+    // 2 MiB minus 1 MiB, plus 129 for slot 9.
     EXPECT_EQ(placeOf(iap1, "slot.9"),
               "record slot 9, disk bytes from 1048705: 53 4e 30 30 34 32 31 37");
     EXPECT_EQ(lineOf(iap1, "file./fs/rwdata/.Version/app.inf").text, "firmware_version=030a02\n");
@@ -137,7 +137,7 @@ TEST(ExplainTest, ReadsArgumentsAsTheRealBinaryDoes) {
     }
 }
 
-TEST(ExplainTest, SaysNothingOfUnknownOptions) {
+TEST(ExplainTest, IgnoresUnknownOptions) {
     const DescribedUnit described;
     testing::internal::CaptureStderr();
     EXPECT_EQ(desk::explainUnit(described.root(), {"-xi", "-a"}).size(), 6U);
@@ -163,11 +163,11 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
         const char* to;
     };
     const Link links[] = {
-        {IAP2_DEVICE_FILE.output, IAP1_FILE.output},       // an output written later
-        {IAP1_FILE.output, IAP2_FILE.output},              // one written before
+        {IAP2_DEVICE_FILE.output, IAP1_FILE.output},       // an output that is written later
+        {IAP1_FILE.output, IAP2_FILE.output},              // one that is written before
         {IAP2_DEVICE_FILE.output, IAP2_FILE.templateFile}, // another file's template
         {IAP2_FILE.output, IAP1_FILE.stockFile},
-        {AIRPLAY_FILE.output, "fresh"}, // a file that is not there yet
+        {AIRPLAY_FILE.output, "fresh"}, // a file that does not exist yet
         {AIRPLAY_FILE.output, "/none/at/all"},
         {AIRPLAY_FILE.output, AIRPLAY_FILE.output},
     };
@@ -180,7 +180,7 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
     }
 }
 
-TEST(ExplainTest, OutputThatStaysKeepsItsContent) {
+TEST(ExplainTest, OutputThatIsNotWrittenKeepsItsContent) {
     const DescribedUnit described(
         [](UnitDescription& unit) { unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n"; });
     const Explanation explanation = desk::explainUnit(described.root(), {"-a"});

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The lines of an explanation, one behind the other, are the file that the golden units expect.
+// The lines of an explanation, joined, are the file that the golden unit expects.
 #include "kit/description/parse_description.h"
 #include "kit/unit/make_unit.h"
 #include "orvane_unit/check/case_check.h"
@@ -28,7 +28,7 @@ std::vector<std::string> argumentsOf(const fs::path& folder) {
     return arguments;
 }
 
-/// How many lines' texts were compared.
+/// Returns how many lines were compared.
 std::size_t compareLines(const fs::path& folder) {
     const TemporaryFolder made;
     kit::makeUnit(kit::readDescription(folder / "unit.toml"), made.path() / "unit");
@@ -52,7 +52,7 @@ std::size_t compareLines(const fs::path& folder) {
     return compared;
 }
 
-TEST(GoldenLinesTest, LinesAreTheExpectedFiles) {
+TEST(GoldenLinesTest, LinesMakeUpTheExpectedFiles) {
     std::size_t compared = 0;
     for (const fs::directory_entry& entry : fs::directory_iterator(ORVANE_GOLDEN_DIR)) {
         SCOPED_TRACE(entry.path().filename().string());

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The commands that only read, on a unit that orvane-unit has not made: a real one.
+// The commands that only read, on a unit that orvane-unit has not made, like a real one.
 #include "kit/description/unit_layout.h"
 #include "kit/enter/captured_run.h"
 #include "kit/unit/marker.h"
@@ -16,7 +16,7 @@ namespace {
 namespace fs = std::filesystem;
 using Words = std::vector<std::string>;
 
-/// Every tuning file and every output is asked for, and one stands there already.
+/// The unit asks for every tuning file and every output, and already has one of them.
 void asMuchAsCanBeWritten(kit::UnitDescription& unit) {
     unit.image.params[134] = 0xFFFF;
     unit.files["/tmp/iap2.cfg"] = "of an earlier run\n";
@@ -31,7 +31,7 @@ protected:
 
     fs::path root() const { return described_.root(); }
 
-    /// The words, with ROOT for the unit and NEW for a folder that is not there.
+    /// Runs the words, in which ROOT stands for the unit and NEW for a folder that does not exist.
     kit::RunResult start(const Words& words) const {
         Words command = buildCommand(ORVANE_UNIT_BINARY);
         for (const std::string& word : words) {
@@ -78,7 +78,7 @@ TEST(ReadOnlyCommandTest, DescribeChangesNothingInAUnitOfOurs) {
     EXPECT_EQ(treeStates(described.root()), before);
 }
 
-/// The state that the tests above compare does tell of a write.
+/// The state that the tests above compare does show a write.
 TEST(TreeStateTest, WriteOfTheSameBytesIsSeen) {
     const DescribedUnit described;
     const auto before = treeStates(described.root());

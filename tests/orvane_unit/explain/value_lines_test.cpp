@@ -53,7 +53,7 @@ TEST(ValueLinesTest, ValueWithLineEndsHasAllItsLines) {
 }
 
 TEST(ValueLinesTest, ValueThatLeavesItsLinesOutStandsBetweenTheOthers) {
-    // The lines that are left out begin like the one behind them.
+    // The lines that are left out begin like the one after them.
     const std::string text = "one\n# two\n";
     EXPECT_EQ(pieces(text, {changedLines(text, "one\n# more\nx\n\n# two\n", originOf(1))}),
               (Pieces{"|one\n", "param.1|", "|# two\n"}));
@@ -66,7 +66,7 @@ TEST(ValueLinesTest, TextWithoutALastLineEndIsWhole) {
               (Pieces{"|a=1\n", "param.2|b=2"}));
 }
 
-TEST(ValueLinesTest, BytesAreNoMoreThanWhatChanges) {
+TEST(ValueLinesTest, OnlyTheBytesThatChangeBelongToAValue) {
     const std::string text = "head\ntemplate\nend\n";
     EXPECT_EQ(pieces(text, {changedBytes(text, "head\nxend\n", originOf(1))}),
               (Pieces{"|head\n", "param.1|template\n", "|end\n"}));
@@ -75,7 +75,7 @@ TEST(ValueLinesTest, BytesAreNoMoreThanWhatChanges) {
               (Pieces{"|head\n", "param.1|800", "|\n", "|[end]\n"}));
 }
 
-TEST(ValueLinesTest, ValuesNeedNoOrderAndMayShareALine) {
+TEST(ValueLinesTest, ValuesMayComeInAnyOrderAndShareALine) {
     const std::string text = "a=1 b=2\nc=3\n";
     EXPECT_EQ(pieces(text, {changedLines(text, "a=1 b=2\nc=x\n", originOf(3)),
                             changedLines(text, "a=x b=2\nc=3\n", originOf(1)),
@@ -83,12 +83,12 @@ TEST(ValueLinesTest, ValuesNeedNoOrderAndMayShareALine) {
               (Pieces{"param.1|", "param.2|a=1 b=2\n", "param.3|c=3\n"}));
 }
 
-TEST(ValueLinesTest, ValueThatNoLineCarriesIsAnErrorOfTheProgram) {
+TEST(ValueLinesTest, ValueOnNoLineIsAProgramError) {
     EXPECT_THROW(changedLines("a\n", "a\n", originOf(139)), std::logic_error);
     EXPECT_THROW(changedBytes("a\n", "a\n", originOf(139)), std::logic_error);
 }
 
-TEST(ValueLinesTest, OtherTextBeginsAndEndsOtherwise) {
+TEST(ValueLinesTest, OtherTextStartsAndEndsDifferently) {
     std::string allBytes;
     for (int byte = 0; byte < 256; ++byte) {
         allBytes += static_cast<char>(byte);

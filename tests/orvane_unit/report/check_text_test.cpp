@@ -15,7 +15,7 @@ std::string printed(const desk::CheckReport& report) {
     return out.str();
 }
 
-TEST(CheckTextTest, CasesStandInALineWithWhatIsWrongBelow) {
+TEST(CheckTextTest, EachCaseIsALineWithItsFaultsBelow) {
     desk::CheckReport report;
     report.cases = {{"one", {}, {}, {}},
                     {"second", {"/tmp/x differs", "/tmp/\xff is missing"}, {"/tmp/y"}, {}},
@@ -28,7 +28,7 @@ TEST(CheckTextTest, CasesStandInALineWithWhatIsWrongBelow) {
                                "reasons reached: 33 of 33\n");
 }
 
-TEST(CheckTextTest, ReasonsThatNoCaseReachesAreNamed) {
+TEST(CheckTextTest, UnreachedReasonsAreNamed) {
     desk::CheckReport report;
     report.cases = {{"one", {}, {}, {}}};
     report.unreached = {"disk-missing", "serial-blank"};

@@ -27,7 +27,7 @@ std::string printed(const std::vector<Impact>& impacts) {
     return out.str();
 }
 
-TEST(ComparisonTextTest, ConsequencesStandBelowTheirValues) {
+TEST(ComparisonTextTest, ConsequencesFollowTheirValues) {
     const desk::DifferingLine removed = {{DiffLine::Kind::removed, "a\n", 1, 0}, kit::slotKey(9)};
     const desk::DifferingLine added = {{DiffLine::Kind::added, "\xff", 0, 1}, kit::slotKey(9)};
     EXPECT_EQ(printed(std::vector<Consequence>{
@@ -43,7 +43,7 @@ TEST(ComparisonTextTest, ConsequencesStandBelowTheirValues) {
               "of no value that differs:\n  /tmp/z: kept -> empty\n");
 }
 
-TEST(ComparisonTextTest, ImpactsThatMoveNothingAreGatheredInRanges) {
+TEST(ComparisonTextTest, InputsThatChangeNothingAreGroupedInRanges) {
     EXPECT_EQ(printed(std::vector<Impact>{{kit::paramKey(1), 3, 0, {}},
                                           {kit::paramKey(2), 3, 0, {}},
                                           {kit::paramKey(3), 13, 12, {"/tmp/x:1", "/tmp/y"}},
@@ -72,14 +72,14 @@ TEST(ComparisonTextTest, WholeTuningBlocksAreOneWord) {
                                 "  tuning.4-5\n  tuning.7\n  tuning.8.qwa0\n");
 }
 
-TEST(ComparisonTextTest, ProgressIsDrawnWhereItGrowsAndWipedOutAtItsEnd) {
+TEST(ComparisonTextTest, ProgressIsDrawnWhenItGrowsAndErasedAtTheEnd) {
     std::ostringstream terminal;
     for (std::size_t done = 1; done <= 80; ++done) {
         desk::printProgress(terminal, done, 80);
     }
     const std::string text = terminal.str();
     EXPECT_EQ(text.substr(0, 53), "\r[#" + std::string(39, ' ') + "] 2 of 80" + "\r[");
-    EXPECT_EQ(std::count(text.begin(), text.end(), '['), 39 + 1); // the last one wipes
+    EXPECT_EQ(std::count(text.begin(), text.end(), '['), 39 + 1); // the last one erases
     EXPECT_EQ(text.substr(text.size() - 4), "\r\033[K");
 }
 

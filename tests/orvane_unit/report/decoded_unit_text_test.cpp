@@ -35,7 +35,7 @@ TEST(DecodedUnitTextTest, ParametersAreATable) {
               "  139     3    139    1      -      -       0 0x7ffffffe   49  model VOXA\n");
 }
 
-TEST(DecodedUnitTextTest, MissingImageIsTold) {
+TEST(DecodedUnitTextTest, MissingImageIsReported) {
     DecodedUnit unit;
     unit.image.found.reason = Reason::imageMissing;
     EXPECT_EQ(printed(unit, "params"),
@@ -63,7 +63,7 @@ TEST(DecodedUnitTextTest, RecordsAreATableAndTheCrc) {
                                         "CRC over slots 1 to 9: 0x0000abcd, computed\n");
 }
 
-TEST(DecodedUnitTextTest, DiskThatCannotBeReadIsTold) {
+TEST(DecodedUnitTextTest, DiskThatCannotBeReadIsReported) {
     DecodedUnit unit;
     unit.records.diskTrouble = Reason::diskMissing;
     unit.records.crc = 0xFFFFFFFF;
@@ -110,7 +110,7 @@ TEST(DecodedUnitTextTest, VersionFilesSayWhetherTheyWereChosen) {
               "version: \"1\", as digits 010101\n");
 }
 
-TEST(DecodedUnitTextTest, MissingVersionFolderIsTold) {
+TEST(DecodedUnitTextTest, MissingVersionFolderIsReported) {
     DecodedUnit unit;
     unit.versions.digits = "000000";
     EXPECT_EQ(printed(unit, "versions"),
@@ -118,7 +118,7 @@ TEST(DecodedUnitTextTest, MissingVersionFolderIsTold) {
               "version: \"\", as digits 000000\n");
 }
 
-TEST(DecodedUnitTextTest, FilesTellTheirKind) {
+TEST(DecodedUnitTextTest, FilesShowTheirKind) {
     DecodedUnit unit;
     unit.files = {{"/tmp/a", "output", PathKind::nothing, 0},
                   {"/tmp/b", "output", PathKind::folder, 0},

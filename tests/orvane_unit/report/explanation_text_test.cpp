@@ -30,7 +30,7 @@ Line fieldLine(const std::string& text, const std::string& field, Reason reason,
     return {text, {{reason}, kit::tuningFieldKey(3, field), place}};
 }
 
-TEST(ExplanationTextTest, ValuesStandBesideTheirPlaces) {
+TEST(ExplanationTextTest, ValuesHaveTheirPlacesBesideThem) {
     const desk::Explanation explanation = {output(
         Outcome::generated, {Reason::generated},
         {{"# comment\n", desk::fixedText()},
@@ -48,7 +48,7 @@ TEST(ExplanationTextTest, ValuesStandBesideTheirPlaces) {
                                           "  ... 2 lines, 7 bytes  /t\n");
 }
 
-TEST(ExplanationTextTest, WhatIsNotIntendedIsSaidOnceForEachOutput) {
+TEST(ExplanationTextTest, FaultIsExplainedOncePerOutput) {
     const Line line = {"v=1\n",
                        {{Reason::versionIncomplete, Reason::versionOutOfRange},
                         kit::fileKey("/v"),
@@ -67,7 +67,7 @@ TEST(ExplanationTextTest, WhatIsNotIntendedIsSaidOnceForEachOutput) {
         "  w=0  /v; version-incomplete\n");
 }
 
-TEST(ExplanationTextTest, OutcomeTellsItsReasons) {
+TEST(ExplanationTextTest, OutcomeShowsItsReasons) {
     EXPECT_EQ(printed({output(Outcome::empty, {Reason::templateMissing, Reason::stockMissing}, {}),
                        output(Outcome::kept, {Reason::outputNotOpenable}, {})}),
               "/tmp/x: empty\n"
@@ -78,7 +78,7 @@ TEST(ExplanationTextTest, OutcomeTellsItsReasons) {
               "stays\n");
 }
 
-TEST(ExplanationTextTest, LineThatIsLeftOutIsTold) {
+TEST(ExplanationTextTest, OmittedLineIsReported) {
     EXPECT_EQ(printed({output(
                   Outcome::generated, {Reason::generated},
                   {{"", {{Reason::imageMissing}, kit::paramKey(134), desk::DefaultStandsIn()}}})}),
@@ -88,7 +88,7 @@ TEST(ExplanationTextTest, LineThatIsLeftOutIsTold) {
               "opened\n");
 }
 
-TEST(ExplanationTextTest, FieldsAsTheyShouldBeAreCountedUnlessAllAreWanted) {
+TEST(ExplanationTextTest, IntendedFieldsAreCountedUnlessAllAreShown) {
     const desk::Explanation explanation = {
         output(Outcome::generated, {Reason::generated},
                {{"; head\n", desk::fixedText()},

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The one place that parses the reports again.
+// The reports, parsed by a JSON library.
 #include "kit/enter/captured_run.h"
 #include "kit/unit/describe_inputs.h"
 #include "orvane_unit/explain/explain.h"
@@ -68,7 +68,7 @@ TEST(JsonTest, DecodedUnitHasThePartsThatAreAskedFor) {
     EXPECT_EQ(all.at("files").at(0).at("kind"), "file");
 }
 
-TEST(JsonTest, RunTellsWhatWasBefore) {
+TEST(JsonTest, RunShowsTheContentBefore) {
     desk::TmpTree before;
     desk::TmpTree after;
     before.entries = {{"old", "1"}};
@@ -129,7 +129,7 @@ TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
     EXPECT_EQ(report.at("unreached"), json::array({"disk-missing"}));
 }
 
-TEST(JsonTest, TextsThatAreNoUtf8AreHexWhereverTheyStand) {
+TEST(JsonTest, TextThatIsNotUtf8IsHexEverywhere) {
     desk::CheckReport check;
     check.cases = {{"\xff", {"/tmp/\xfe is missing"}, {"\x80"}, {}}};
     const json report = parsed(desk::checkJson("\xc0", check), "check");
@@ -150,7 +150,7 @@ TEST(JsonTest, TextsThatAreNoUtf8AreHexWhereverTheyStand) {
     EXPECT_NE(shown.dump().find(R"({"key":{"hex":"fd"},"value":"1"})"), std::string::npos);
 }
 
-/// The report of the program itself: one line on standard output, nothing beside it.
+/// The report of the program itself: one line on standard output, and nothing else.
 json started(const std::vector<std::string>& words, int exitStatus) {
     std::vector<std::string> command = buildCommand(ORVANE_UNIT_BINARY);
     command.insert(command.end(), words.begin(), words.end());

@@ -36,7 +36,7 @@ TEST(NamesTest, PathsHaveWordsForPeople) {
     EXPECT_STREQ(wordOf(PathKind::other), "device");
 }
 
-TEST(NamesTest, ValueWithoutANameIsAnErrorOfTheProgram) {
+TEST(NamesTest, ValueWithoutANameIsAProgramError) {
     EXPECT_THROW(nameOf(static_cast<Outcome>(99)), std::logic_error);
 }
 

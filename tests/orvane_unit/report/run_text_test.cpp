@@ -19,13 +19,13 @@ std::string printed(bool isBrief) {
     return out.str();
 }
 
-TEST(RunTextTest, FilesThatWereMadeOrChangedHaveADiff) {
+TEST(RunTextTest, NewAndChangedFilesHaveADiff) {
     EXPECT_EQ(printed(false), "--- /dev/null\n+++ /tmp/new\\x01\n@@ -0,0 +1,1 @@\n+a\n"
                               "\\ No newline at end of file\n"
                               "--- /tmp/old\n+++ /tmp/old\n@@ -1,1 +1,1 @@\n-1\n+2\n");
 }
 
-TEST(RunTextTest, BrieflyTheyAreNamed) {
+TEST(RunTextTest, BriefReportOnlyNamesThem) {
     EXPECT_EQ(printed(true), "made /tmp/new\\x01, 1 byte\nchanged /tmp/old, 2 bytes\n");
 }
 

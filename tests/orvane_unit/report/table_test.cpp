@@ -9,7 +9,7 @@ namespace orvane::test {
 
 namespace {
 
-TEST(TableTest, TitlesAndValuesEndWhereTheirColumnsEnd) {
+TEST(TableTest, TitlesAndValuesAreAlignedRight) {
     constexpr desk::Column COLUMNS[] = {{"a", 2}, {"name", 6}, {"n", 4}};
     std::ostringstream out;
     printTitles(out, COLUMNS);

@@ -49,7 +49,7 @@ TEST(DecodedUnitTest, ParametersPastTheImageHaveNoValue) {
     EXPECT_EQ(unit.image.params[138].raw, std::nullopt);
 }
 
-TEST(DecodedUnitTest, MissingImageAndDiskAreTold) {
+TEST(DecodedUnitTest, MissingImageAndDiskAreReported) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.absent = {CONFIG_SHM_NAME, BOOT_DISK};
     });
@@ -85,18 +85,18 @@ TEST(DecodedUnitTest, BlankRecordsHaveABlankCrc) {
     const DescribedUnit described([](UnitDescription& unit) { unit.disk.slots.clear(); });
     const DecodedUnit unit = desk::decodeUnit(described.root());
     EXPECT_EQ(unit.records.crcVerdict, CrcVerdict::blank);
-    // The complement of the usual CRC-32 of 136 zero bytes; that value by zlib.
+    // The complement of zlib's CRC-32 of 136 zero bytes.
     EXPECT_EQ(~unit.records.crc, 0x773333E6U);
 }
 
-TEST(DecodedUnitTest, CrcIsThatOfSlots1To9) {
+TEST(DecodedUnitTest, CrcCoversSlots1To9) {
     // The complement of zlib's CRC-32 of 128 zero bytes and the serial.
     EXPECT_EQ(desk::decodeUnit(DescribedUnit().root()).records.crc, 0xC44C7586U);
 }
 
 TEST(DecodedUnitTest, CrcOfAllOnesIsAmbiguous) {
     const DescribedUnit described([](UnitDescription& unit) {
-        // Of 128 zero bytes and these, zlib's CRC-32 is 0.
+        // zlib's CRC-32 of 128 zero bytes and these is 0.
         unit.disk.slots[9] = "SN00\x5a\x89\x73\xf2";
     });
     const DecodedUnit unit = desk::decodeUnit(described.root());
@@ -104,7 +104,7 @@ TEST(DecodedUnitTest, CrcOfAllOnesIsAmbiguous) {
     EXPECT_EQ(unit.records.crcVerdict, CrcVerdict::ambiguous);
 }
 
-TEST(DecodedUnitTest, DiskThatIsTooShortIsTold) {
+TEST(DecodedUnitTest, DiskThatIsTooShortIsReported) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.disk = {};
         unit.disk.size = MEBIBYTE - 1;
@@ -113,7 +113,7 @@ TEST(DecodedUnitTest, DiskThatIsTooShortIsTold) {
     EXPECT_EQ(unit.records.diskSize, 1'048'575U);
     EXPECT_EQ(unit.records.diskTrouble, desk::Reason::diskTooShort);
     EXPECT_EQ(unit.records.slots[0].bytes, std::nullopt);
-    // Slot 1 begins one byte behind the base, so it and all others are there.
+    // Slot 1 begins one byte after the base, so it and all others are there.
     EXPECT_EQ(unit.records.slots[1].bytes, std::string(16, '\0'));
     EXPECT_EQ(unit.records.crcVerdict, CrcVerdict::blank);
     EXPECT_EQ(unit.tuning.reason, desk::Reason::fromTuningBlock);
@@ -125,14 +125,14 @@ TEST(DecodedUnitTest, OfTwoApplicationsOnlyOneIsChosen) {
     });
     const DecodedUnit unit = desk::decodeUnit(described.root());
     ASSERT_EQ(unit.versions.found.files.size(), 2U);
-    // Which one is the first is the file system's business.
+    // The file system decides which one is first.
     EXPECT_EQ(unit.versions.found.chosen, 0U);
     const bool isOther = unit.versions.found.files[0].path == "/fs/rwdata/.Version/other.inf";
     EXPECT_EQ(unit.versions.version, isOther ? "7.8.9" : "3.10.2_rc");
     EXPECT_EQ(unit.versions.digits, isOther ? "070809" : "030a02");
 }
 
-TEST(DecodedUnitTest, MissingVersionFolderIsTold) {
+TEST(DecodedUnitTest, MissingVersionFolderIsReported) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.files.erase("/fs/rwdata/.Version/app.inf");
         unit.absent = {"/fs/rwdata/.Version"};
@@ -156,7 +156,7 @@ TEST(DecodedUnitTest, VersionFilesAreChosenOrNot) {
     EXPECT_EQ(unit.versions.digits, "030a02");
 }
 
-TEST(DecodedUnitTest, FilesTellTheirKind) {
+TEST(DecodedUnitTest, FilesShowTheirKind) {
     const DescribedUnit described([](UnitDescription& unit) {
         unit.folders.push_back("/tmp/airplay.conf");
         unit.files.erase("/fs/mp/etc/mm/iap1.cfg");

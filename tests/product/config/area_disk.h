@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A boot disk on which every byte of the record area tells its place, for the tests of all
+// A boot disk on which every byte of the record area depends on its place, for the tests of all
 // operations on that area.
 #pragma once
 
@@ -49,19 +49,18 @@ constexpr std::size_t BASE_FROM_END = 0x100000;
 constexpr std::size_t AUX_FROM_END = 0xFF400;
 constexpr std::size_t TUNING_FROM_END = 0xFF000;
 
-/// The byte at `offset` of the area: never 0, and no two places near each other look alike.
+/// The byte at `offset` of the area: never 0, and different at neighbouring places.
 inline char markedAreaByte(std::size_t offset) {
     return static_cast<char>(1 + (offset * 37 + (offset >> 8) * 11) % 255);
 }
 
-/// The length of `bytes` as the operations take it.
+/// The length of `bytes` in the operations' type.
 template <class Bytes>
 std::uint32_t lengthOf(const Bytes& bytes) {
     return static_cast<std::uint32_t>(bytes.size());
 }
 
-/// A buffer that ends with the last byte the kernel may touch: a transfer that goes on fails or
-/// comes out short.
+/// A buffer that ends with the last accessible byte: a transfer beyond it fails or is short.
 class EdgeOfMemory {
 public:
     explicit EdgeOfMemory(std::size_t usable)
@@ -105,7 +104,7 @@ protected:
         return content.replace(offset, bytes.size(), bytes);
     }
 
-    /// Nothing differs on the whole disk from zeros and `content` behind them.
+    /// The whole disk is zeros, followed by `content`.
     static void expectArea(const std::string& content) {
         ASSERT_EQ(2 * MEBIBYTE, std::filesystem::file_size(DISK_PATH));
         const std::string disk = diskFromEnd(2 * MEBIBYTE, 2 * MEBIBYTE);

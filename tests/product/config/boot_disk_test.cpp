@@ -21,12 +21,12 @@ protected:
     BootDiskTest() { writeFile(DISK_PATH, "0123456789"); }
 };
 
-TEST_F(BootDiskTest, IsNotCopied) {
+TEST_F(BootDiskTest, CannotBeCopied) {
     EXPECT_FALSE(std::is_copy_constructible_v<BootDisk>);
     EXPECT_FALSE(std::is_copy_assignable_v<BootDisk>);
 }
 
-TEST_F(BootDiskTest, ReadsWhereTheSeekFromTheEndWent) {
+TEST_F(BootDiskTest, ReadsAtTheOffsetFromTheEnd) {
     BootDisk disk(O_RDONLY);
     ASSERT_TRUE(disk.isOpen());
     std::string buffer = "....";
@@ -38,7 +38,7 @@ TEST_F(BootDiskTest, ReadsWhereTheSeekFromTheEndWent) {
     EXPECT_EQ("078.", buffer);
 }
 
-TEST_F(BootDiskTest, WritesWhereTheSeekFromTheEndWentAndKeepsTheRest) {
+TEST_F(BootDiskTest, WritesAtTheOffsetFromTheEndAndKeepsTheRest) {
     BootDisk disk(O_WRONLY);
     ASSERT_TRUE(disk.isOpen());
     ASSERT_TRUE(disk.seekFromEnd(4));
@@ -46,14 +46,14 @@ TEST_F(BootDiskTest, WritesWhereTheSeekFromTheEndWentAndKeepsTheRest) {
     EXPECT_EQ("012345ab89", readFile(DISK_PATH));
 }
 
-TEST_F(BootDiskTest, PlaceBeforeTheStartIsNone) {
+TEST_F(BootDiskTest, SeekBeforeTheStartFails) {
     BootDisk disk(O_RDONLY);
     EXPECT_TRUE(disk.seekFromEnd(10));
     EXPECT_FALSE(disk.seekFromEnd(11));
     EXPECT_FALSE(disk.seekFromEnd(0x7FFFFFFF));
 }
 
-TEST_F(BootDiskTest, ShortReadIsNoFailure) {
+TEST_F(BootDiskTest, ShortReadSucceeds) {
     BootDisk disk(O_RDONLY);
     std::string buffer = "......";
     ASSERT_TRUE(disk.seekFromEnd(4));
@@ -63,7 +63,7 @@ TEST_F(BootDiskTest, ShortReadIsNoFailure) {
     EXPECT_EQ("6789..", buffer);
 }
 
-TEST_F(BootDiskTest, ShortWriteIsNoFailureButARefusedOneIs) {
+TEST_F(BootDiskTest, ShortWriteSucceedsAndRefusedWriteFails) {
     BootDisk disk(O_WRONLY);
     ASSERT_TRUE(disk.seekFromEnd(4));
     bool isShortWritten = false;
@@ -78,7 +78,7 @@ TEST_F(BootDiskTest, ShortWriteIsNoFailureButARefusedOneIs) {
     EXPECT_EQ("012345ab89", readFile(DISK_PATH));
 }
 
-TEST_F(BootDiskTest, FlagsDecideOnTheDirection) {
+TEST_F(BootDiskTest, FlagsChooseTheDirection) {
     std::string buffer = "....";
     BootDisk forReading(O_RDONLY);
     ASSERT_TRUE(forReading.seekFromEnd(4));
@@ -90,8 +90,8 @@ TEST_F(BootDiskTest, FlagsDecideOnTheDirection) {
     EXPECT_EQ("0123456789", readFile(DISK_PATH));
 }
 
-TEST_F(BootDiskTest, DiskNeedsNoOtherRightThanItsFlags) {
-    const PermissionsHold hold;
+TEST_F(BootDiskTest, NeedsOnlyThePermissionsOfItsFlags) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     EXPECT_TRUE(BootDisk(O_RDONLY).isOpen());
     EXPECT_FALSE(BootDisk(O_WRONLY).isOpen());
@@ -100,7 +100,7 @@ TEST_F(BootDiskTest, DiskNeedsNoOtherRightThanItsFlags) {
     EXPECT_TRUE(BootDisk(O_WRONLY).isOpen());
 }
 
-TEST_F(BootDiskTest, AbsentDiskIsNotOpenAndNotMade) {
+TEST_F(BootDiskTest, AbsentDiskIsNeitherOpenNorCreated) {
     remove(DISK_PATH);
     for (const int flags : {O_RDONLY, O_WRONLY}) {
         SCOPED_TRACE(flags);
@@ -115,7 +115,7 @@ TEST_F(BootDiskTest, AbsentDiskIsNotOpenAndNotMade) {
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
-TEST_F(BootDiskTest, LinkThatLeadsNowhereIsNotOpen) {
+TEST_F(BootDiskTest, DanglingLinkIsNotOpen) {
     remove(DISK_PATH);
     ASSERT_EQ(0, symlink(DISK_PATH, DISK_PATH));
     EXPECT_FALSE(BootDisk(O_RDONLY).isOpen());
@@ -124,7 +124,7 @@ TEST_F(BootDiskTest, LinkThatLeadsNowhereIsNotOpen) {
     EXPECT_FALSE(BootDisk(O_RDONLY).isOpen());
 }
 
-TEST_F(BootDiskTest, NoFreeDescriptorIsNotOpen) {
+TEST_F(BootDiskTest, IsNotOpenWithoutAFreeDescriptor) {
     const ResourceLimit none(RLIMIT_NOFILE, 0);
     EXPECT_FALSE(BootDisk(O_RDONLY).isOpen());
 }
@@ -153,14 +153,14 @@ TEST_F(BootDiskTest, DescriptorZeroIsHeldAndReleasedLikeAnyOther) {
 }
 
 TEST_F(BootDiskTest, ClosedDiskReleasesNothing) {
-    // Descriptor 0 would be hit by an owner that takes its own failure for a number.
+    // An owner that takes its failure for a number would close descriptor 0.
     const int before = openDescriptors();
     remove(DISK_PATH);
     { const BootDisk disk(O_RDONLY); }
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST_F(BootDiskTest, DiskLongerThan4GiBIsReachedOnBothEnds) {
+TEST_F(BootDiskTest, DiskLongerThan4GiBIsReachedAtBothEnds) {
     constexpr std::int64_t LENGTH = 5LL << 30;
     resetDisk(LENGTH);
     {

@@ -46,7 +46,7 @@ TEST_F(ConfigStoreLifecycleTest, SecondCloseDoesNothing) {
     ASSERT_EQ(0, store.open());
     const std::int32_t formerNumber = store.descriptor;
     store.close();
-    // The number is free again, so a second release of it would hit this one.
+    // This gets the same number, so a second release of it would close this.
     const int bystander = open(IMAGE_PATH, O_RDONLY | O_CLOEXEC);
     EXPECT_EQ(formerNumber, bystander);
     store.close();
@@ -140,7 +140,7 @@ TEST_F(ConfigStoreLifecycleTest, DescriptorOneIsHeldAndReleasedLikeAnyOther) {
     static_cast<void>(std::fflush(stdout));
     const int formerOutput = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, 3);
     close(STDOUT_FILENO);
-    // Nothing may be said, nor expected, until the standard output is back.
+    // Nothing may be printed, not even by an expectation, until the standard output is back.
     ConfigStore store;
     const std::int32_t opened = store.open();
     const std::int32_t descriptor = store.descriptor;

@@ -31,7 +31,7 @@ protected:
     }
 };
 
-TEST_F(ConfigStoreTest, ThreeFieldsInOrder) {
+TEST_F(ConfigStoreTest, HasThreeFieldsInOrder) {
     EXPECT_EQ(0U, offsetof(ConfigStore, descriptor));
     EXPECT_LT(offsetof(ConfigStore, descriptor), offsetof(ConfigStore, data));
     EXPECT_LT(offsetof(ConfigStore, data), offsetof(ConfigStore, length));
@@ -40,7 +40,7 @@ TEST_F(ConfigStoreTest, ThreeFieldsInOrder) {
     EXPECT_TRUE((std::is_same_v<std::uint32_t, decltype(ConfigStore::length)>));
 }
 
-TEST_F(ConfigStoreTest, IsNotCopied) {
+TEST_F(ConfigStoreTest, CannotBeCopied) {
     EXPECT_FALSE(std::is_copy_constructible_v<ConfigStore>);
     EXPECT_FALSE(std::is_copy_assignable_v<ConfigStore>);
 }
@@ -92,7 +92,7 @@ TEST_F(ConfigStoreTest, OpenMapsTheWholeImage) {
 }
 
 TEST_F(ConfigStoreTest, ContentIsNotValidated) {
-    // Longer than the catalogue addresses, over several pages, and nothing but 0xFF.
+    // Longer than the catalogue, several pages, all 0xFF.
     writeImage(std::string(20000, '\xFF') + "\x5A");
     ConfigStore store;
     ASSERT_EQ(0, store.open());
@@ -101,7 +101,7 @@ TEST_F(ConfigStoreTest, ContentIsNotValidated) {
     EXPECT_EQ(0x5A, store.data[20000]);
 }
 
-TEST_F(ConfigStoreTest, MappingIsPrivateAndReadOnlyAndGoesAtClose) {
+TEST_F(ConfigStoreTest, MappingIsPrivateReadOnlyAndGoneAfterClose) {
     writeImage(std::string(20000, '\x01'));
     ConfigStore store;
     ASSERT_EQ(0, store.open());
@@ -122,22 +122,22 @@ TEST_F(ConfigStoreTest, ObjectIsOpenedForReadingOnlyAndRewound) {
     EXPECT_EQ(0, lseek(store.descriptor, 0, SEEK_CUR));
 }
 
-TEST_F(ConfigStoreTest, ObjectNeedsNoRightToWrite) {
-    const PermissionsHold hold;
+TEST_F(ConfigStoreTest, ObjectNeedsNoWritePermission) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(IMAGE_PATH, 0444));
     ConfigStore store;
     EXPECT_EQ(0, store.open());
 }
 
 TEST_F(ConfigStoreTest, UnreadableObjectIsMinus2) {
-    const PermissionsHold hold;
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(IMAGE_PATH, 0222));
     ConfigStore store;
     EXPECT_EQ(-2, store.open());
     expectClosed(store);
 }
 
-TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndTheHandleUntouched) {
+TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndKeepsTheHandle) {
     remove(IMAGE_PATH);
     const int before = openDescriptors();
     ConfigStore store;
@@ -154,7 +154,7 @@ TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndTheHandleUntouched) {
     EXPECT_EQ(0xA5, value);
 }
 
-TEST_F(ConfigStoreTest, CalibrationFileIsNoFallback) {
+TEST_F(ConfigStoreTest, CalibrationFileIsNotAFallback) {
     remove(IMAGE_PATH);
     std::filesystem::create_directories("/fs/rwdata/CALS");
     writeFile("/fs/rwdata/CALS/cal_active.bin", std::string(179, '\x01'));
@@ -205,7 +205,7 @@ TEST_F(ConfigStoreTest, ObjectWithoutASizeIsMinus2AndItsDescriptorStaysUntilClos
     EXPECT_FALSE(isOpenDescriptor(descriptor));
 }
 
-TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndTheHandleClosed) {
+TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndClosesTheHandle) {
     writeImage("");
     const int before = openDescriptors();
     ConfigStore store;
@@ -216,9 +216,9 @@ TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndTheHandleClosed) {
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndTheHandleClosed) {
-    // More than a 32-bit process has, and than the limit leaves a 64-bit one. They take no space.
-    // In 32 bits the second has length 0.
+TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndClosesTheHandle) {
+    // More than a 32-bit process has, and more than the limit leaves a 64-bit one. The files are
+    // sparse. In 32 bits the second has length 0.
     for (const std::uint64_t size : {std::uint64_t{0xFFFFF000U}, std::uint64_t{1} << 32}) {
         SCOPED_TRACE(size);
         std::filesystem::resize_file(IMAGE_PATH, size);
@@ -245,7 +245,7 @@ TEST_F(ConfigStoreTest, ObjectOfOneByteIsMapped) {
     EXPECT_EQ(0x5A, store.data[0]);
 }
 
-TEST_F(ConfigStoreTest, BeyondAShorterObjectTheRestOfItsPageIsRead) {
+TEST_F(ConfigStoreTest, ShortObjectIsReadToTheEndOfItsPage) {
     writeImage(std::string(134, '\x5A'));
     ConfigStore store;
     ASSERT_EQ(0, store.open());
@@ -269,7 +269,7 @@ TEST_F(ConfigStoreTest, CloseReleasesAndKeepsTheLength) {
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST_F(ConfigStoreTest, LengthOfAnEarlierImageOutlivesAFailedOpen) {
+TEST_F(ConfigStoreTest, FailedOpenKeepsTheLengthOfAnEarlierImage) {
     ConfigStore store;
     ASSERT_EQ(0, store.open());
     store.close();

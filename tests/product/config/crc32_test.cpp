@@ -11,7 +11,7 @@ namespace orvane::test {
 
 namespace {
 
-/// The register after one more byte by the polynomial itself, a bit at a time.
+/// The register after one more byte, from the polynomial itself, a bit at a time.
 std::uint32_t bitwiseStep(std::uint32_t crc, std::uint8_t byte) {
     crc ^= byte;
     for (int bit = 0; bit < 8; ++bit) {
@@ -31,25 +31,25 @@ std::uint32_t usualCrc(const std::string& text) {
 
 } // namespace
 
-TEST(Crc32Test, RegisterBeginsWithAllOnes) {
+TEST(Crc32Test, RegisterStartsWithAllOnes) {
     EXPECT_EQ(0xFFFFFFFFU, CRC32_INITIAL);
 }
 
-TEST(Crc32Test, TableIsThatOfThePolynomial) {
+TEST(Crc32Test, TableFollowsFromThePolynomial) {
     ASSERT_EQ(256U, CRC32_TABLE.size());
     for (std::uint32_t byte = 0; byte < 256; ++byte) {
         EXPECT_EQ(bitwiseStep(byte, 0), CRC32_TABLE.at(byte)) << byte;
     }
 }
 
-TEST(Crc32Test, PublishedTableEntries) {
+TEST(Crc32Test, TableHasThePublishedEntries) {
     EXPECT_EQ(0x00000000U, CRC32_TABLE[0]);
     EXPECT_EQ(0x77073096U, CRC32_TABLE[1]);
     EXPECT_EQ(0xEDB88320U, CRC32_TABLE[128]);
     EXPECT_EQ(0x2D02EF8DU, CRC32_TABLE[255]);
 }
 
-TEST(Crc32Test, PublishedCheckValues) {
+TEST(Crc32Test, GivesThePublishedCheckValues) {
     EXPECT_EQ(0xCBF43926U, usualCrc("123456789"));
     EXPECT_EQ(0xE8B7BE43U, usualCrc("a"));
     EXPECT_EQ(0x352441C2U, usualCrc("abc"));
@@ -57,7 +57,7 @@ TEST(Crc32Test, PublishedCheckValues) {
     EXPECT_EQ(0x00000000U, usualCrc(""));
 }
 
-TEST(Crc32Test, StepIsThePolynomialsForEveryByteInEveryRegister) {
+TEST(Crc32Test, StepFollowsThePolynomialForEveryByte) {
     std::uint32_t crc = CRC32_INITIAL;
     for (std::uint32_t round = 0; round < 64; ++round) {
         for (std::uint32_t byte = 0; byte < 256; ++byte) {

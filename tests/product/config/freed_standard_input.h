@@ -6,8 +6,8 @@
 
 namespace orvane::test {
 
-/// While it lives, descriptor 0 is free, so that the next open gets it: a program may be started
-/// without standard input, and 0 is a descriptor like any other.
+/// While it lives, descriptor 0 is free and the next open gets it: a program may be started without
+/// standard input.
 class FreedStandardInput {
 public:
     FreedStandardInput() : former_(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 3)) { close(STDIN_FILENO); }

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // What the system says about the memory of this process. Needs the host's /proc: a test inside a
-// unit leaves it first.
+// unit leaves the unit first.
 #pragma once
 
 #include <cstdint>
@@ -12,7 +12,7 @@
 namespace orvane::test {
 
 /// The rights of the mapping that holds `address`, as in /proc/self/maps ("r--p": readable,
-/// private); "none" when no mapping does, "unreadable" when the system does not say.
+/// private); "none" without such a mapping, "unreadable" when the system does not say.
 inline std::string mappingRights(const volatile void* address) {
     const auto wanted = reinterpret_cast<std::uintptr_t>(address);
     std::ifstream maps("/proc/self/maps");

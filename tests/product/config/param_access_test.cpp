@@ -37,7 +37,8 @@ std::string markedImage() {
     return image;
 }
 
-/// What is read of a parameter of the marked image, at the place that the widths below it give.
+/// The value of a parameter in the marked image; its place follows from the widths of those before
+/// it.
 std::uint16_t markedValue(std::uint16_t number) {
     std::uint32_t offset = 0;
     for (std::uint16_t lower = 1; lower < number; ++lower) {
@@ -47,7 +48,7 @@ std::uint16_t markedValue(std::uint16_t number) {
     return static_cast<std::uint16_t>(markedByte(offset) | high << 8);
 }
 
-/// A handle on memory of the test: open as far as a getter can tell. Nothing is released.
+/// A handle on the test's own memory: it looks open to a getter, and nothing is released.
 class LentStore : public ConfigStore {
 public:
     LentStore(std::int32_t lentDescriptor, const std::uint8_t* lentData, std::uint32_t lentLength) {
@@ -141,7 +142,7 @@ TEST_F(ParamAccessTest, LowByteOfAWordComesFirstInTheImage) {
     EXPECT_EQ(0x1234, value);
 }
 
-TEST_F(ParamAccessTest, WordOfHighBytesIsNotExtendedBySign) {
+TEST_F(ParamAccessTest, WordIsNotSignExtended) {
     setImage(133, "\xFF\xFF");
     openStore();
     std::uint16_t value = 0;
@@ -160,7 +161,7 @@ TEST_F(ParamAccessTest, LastParameterIsTheLastByteOfTheImage) {
     EXPECT_EQ(0x5A, value);
 }
 
-TEST_F(ParamAccessTest, UnknownNumberIsStatus1AndLeavesTheOutput) {
+TEST_F(ParamAccessTest, UnknownNumberIsStatus1AndKeepsTheOutput) {
     openStore();
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);
@@ -174,7 +175,7 @@ TEST_F(ParamAccessTest, UnknownNumberIsStatus1AndLeavesTheOutput) {
     }
 }
 
-TEST_F(ParamAccessTest, GetterOfTheWrongWidthIsStatus2AndLeavesTheOutput) {
+TEST_F(ParamAccessTest, GetterOfTheWrongWidthIsStatus2AndKeepsTheOutput) {
     openStore();
     std::uint8_t byte = 0xA5;
     std::uint16_t word = 0xA5A5;
@@ -184,7 +185,7 @@ TEST_F(ParamAccessTest, GetterOfTheWrongWidthIsStatus2AndLeavesTheOutput) {
     EXPECT_EQ(0xA5A5, word);
 }
 
-TEST_F(ParamAccessTest, StoreThatWasNeverOpenedIsStatus3AndLeavesTheOutput) {
+TEST_F(ParamAccessTest, StoreThatWasNeverOpenedIsStatus3AndKeepsTheOutput) {
     std::uint8_t byte = 0xA5;
     std::uint16_t word = 0xA5A5;
     EXPECT_EQ(PARAM_STORE_NOT_OPEN, getParamU8(store, 22, &byte));
@@ -215,7 +216,7 @@ TEST_F(ParamAccessTest, WidthIsCheckedBeforeTheStore) {
     EXPECT_EQ(PARAM_WRONG_SIZE, getParamU16(store, 22, &word));
 }
 
-TEST_F(ParamAccessTest, StoreThatWasClosedAgainIsStatus3) {
+TEST_F(ParamAccessTest, ClosedStoreIsStatus3) {
     openStore();
     store.close();
     std::uint8_t value = 0xA5;

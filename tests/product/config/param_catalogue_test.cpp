@@ -37,7 +37,7 @@ TEST(ParamCatalogueTest, RowIsSevenWordsInIssuedOrder) {
     EXPECT_TRUE((std::is_same_v<std::uint32_t, decltype(ParamDescriptor::mask)>));
 }
 
-TEST(ParamCatalogueTest, IsNineSizesAndTheRowsImmediatelyBehind) {
+TEST(ParamCatalogueTest, IsNineSizesDirectlyFollowedByTheRows) {
     EXPECT_EQ(4824U, sizeof(ParamCatalogue));
     const auto* bytes = reinterpret_cast<const unsigned char*>(&ParamCatalogue);
     std::uint32_t word = 0;
@@ -61,7 +61,7 @@ TEST(ParamCatalogueTest, LiesInReadOnlyMemory) {
     }
 }
 
-TEST(ParamCatalogueTest, ReadOnlyMemoryIsToldFromWritable) {
+TEST(ParamCatalogueTest, ReadOnlyMemoryIsDistinguishedFromWritable) {
     static int writable = 1;
     EXPECT_EQ("rw", mappingRights(&writable).substr(0, 2));
 }
@@ -90,7 +90,7 @@ TEST(LookupParamTest, KnownNumberGivesIndexAndWholeRow) {
     }
 }
 
-TEST(LookupParamTest, UnknownNumberClearsTheIndexAndLeavesTheRow) {
+TEST(LookupParamTest, UnknownNumberClearsTheIndexAndKeepsTheRow) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);
         std::int32_t index = 77;
@@ -159,7 +159,7 @@ TEST(DescribeParamTest, InfoIsFourHalfWordsInIssuedOrder) {
     EXPECT_EQ(6U, offsetof(ParamInfo, group));
 }
 
-TEST(DescribeParamTest, UnknownNumberLeavesTheInfo) {
+TEST(DescribeParamTest, UnknownNumberKeepsTheInfo) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);
         ParamInfo info = MARKED_INFO;

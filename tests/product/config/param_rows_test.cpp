@@ -159,7 +159,7 @@ TEST(ParamRowsTest, OffsetsOfKnownParameters) {
     }
 }
 
-TEST(ParamRowsTest, GroupsAreRunsOfNumbers) {
+TEST(ParamRowsTest, GroupsAreRangesOfNumbers) {
     for (std::uint32_t number = 1; number <= 171; ++number) {
         EXPECT_EQ(issuedGroup(number), rowOf(number).group) << "parameter " << number;
     }
@@ -173,7 +173,7 @@ TEST(ParamRowsTest, IdIsTheIssuedCodeAboveTheCommonLowHalf) {
     }
 }
 
-TEST(ParamRowsTest, OnlyCode86StandsTwice) {
+TEST(ParamRowsTest, OnlyCode86OccursTwice) {
     std::multiset<std::uint32_t> codes;
     for (const ParamDescriptor& row : ParamCatalogue.rows) {
         codes.insert(row.id >> 16);

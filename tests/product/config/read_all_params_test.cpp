@@ -20,12 +20,12 @@ namespace {
 
 constexpr std::uint16_t UNTOUCHED = 0xA5C3;
 
-/// Room beyond what the reader may touch at most, so that a touch shows.
+/// Longer than the most that the reader may write, so that a write past it shows.
 std::vector<std::uint16_t> untouchedValues() {
     return std::vector<std::uint16_t>(180, UNTOUCHED);
 }
 
-/// No byte of it is 0, so that a zeroed slot shows.
+/// No byte is 0, so that a zeroed slot shows.
 std::string imageWithoutZeros() {
     std::string image;
     for (int offset = 0; offset < 179; ++offset) {
@@ -34,7 +34,8 @@ std::string imageWithoutZeros() {
     return image;
 }
 
-/// What parameter `number` of that image is: one byte, but two at 134, 142-144, 152-154 and 158.
+/// The value of parameter `number` in that image: one byte, but two at 134, 142-144, 152-154 and
+/// 158.
 std::uint16_t valueOf(std::uint16_t number) {
     const auto word = [](unsigned offset) {
         return static_cast<std::uint16_t>((offset + 1) | (offset + 2) << 8);
@@ -77,8 +78,8 @@ class ReadAllParamsTest : public UnitTest {
 protected:
     ReadAllParamsTest() { writeImage(imageWithoutZeros()); }
 
-    /// The first `count` slots hold their parameters; those behind `zeroed` further ones are as
-    /// they were.
+    /// The first `count` slots hold their parameters, the next `zeroed` are 0, and the others are
+    /// as they were.
     void expectValues(std::size_t count, std::size_t zeroed) const {
         for (std::size_t slot = 0; slot < values.size(); ++slot) {
             SCOPED_TRACE(slot);
@@ -94,7 +95,7 @@ protected:
     std::vector<std::uint16_t> values = untouchedValues();
 };
 
-TEST_F(ReadAllParamsTest, AllParametersArriveOneASlot) {
+TEST_F(ReadAllParamsTest, EachSlotGetsOneParameter) {
     EXPECT_EQ(0, readAllParams(store, values.data(), 171));
     expectValues(171, 0);
     expectClosed(store);
@@ -123,7 +124,7 @@ TEST_F(ReadAllParamsTest, CountZeroOpensAndClosesAndReadsNothing) {
     EXPECT_EQ(179U, store.length) << "the store was not opened";
 }
 
-TEST_F(ReadAllParamsTest, CountBeyondTheCatalogueFillsAllZeroesOneMoreAndIsStatus1) {
+TEST_F(ReadAllParamsTest, CountBeyondTheCatalogueFillsAllThenZeroesOneAndIsStatus1) {
     for (const std::uint32_t count : {172U, 173U, 200U, 65535U}) {
         SCOPED_TRACE(count);
         values = untouchedValues();
@@ -133,7 +134,7 @@ TEST_F(ReadAllParamsTest, CountBeyondTheCatalogueFillsAllZeroesOneMoreAndIsStatu
     }
 }
 
-TEST_F(ReadAllParamsTest, CountIsNotCutTo16Bits) {
+TEST_F(ReadAllParamsTest, CountIsNotTruncatedTo16Bits) {
     for (const std::uint32_t count : {0x10000U, 0x10001U, 0x100ABU, 0x80000000U, 0xFFFFFFFFU}) {
         SCOPED_TRACE(count);
         values = untouchedValues();
@@ -176,7 +177,7 @@ TEST_F(ReadAllParamsTest, FailedOpenLeavesTheStoreAsOpenLeftIt) {
     EXPECT_EQ(nullptr, store.data);
 }
 
-TEST_F(ReadAllParamsTest, ImageThatIsShorterReadsTheRestOfItsPage) {
+TEST_F(ReadAllParamsTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(imageWithoutZeros().substr(0, 100));
     EXPECT_EQ(0, readAllParams(store, values.data(), 171));
     EXPECT_EQ(100, values[99]);
@@ -185,7 +186,7 @@ TEST_F(ReadAllParamsTest, ImageThatIsShorterReadsTheRestOfItsPage) {
     }
 }
 
-TEST_F(ReadAllParamsTest, HoldsNoDescriptorAfterwards) {
+TEST_F(ReadAllParamsTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     for (const std::uint32_t count : {0U, 171U, 200U}) {
         readAllParams(store, values.data(), count);

@@ -48,18 +48,18 @@ TEST_F(RecordAreaCrcTest, ReferenceGivesThePublishedCheckValue) {
     EXPECT_EQ(0xCBF43926U, usualCrc("123456789"));
 }
 
-TEST_F(RecordAreaCrcTest, OfZerosIsTheComplementOfTheirUsualCrc) {
+TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForZeros) {
     resetDisk(2 * MEBIBYTE);
     EXPECT_EQ(~usualCrc(std::string(136, '\0')), recordAreaCrc());
 }
 
-TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcOfSlot15) {
+TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForSlot15) {
     EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
     expectUntouchedDisk();
 }
 
-TEST_F(RecordAreaCrcTest, OfAKnownRecordIsAKnownRegister) {
-    // Both figures are the complement of what zlib's crc32 says of the 136 bytes.
+TEST_F(RecordAreaCrcTest, IsAKnownRegisterForAKnownRecord) {
+    // Both figures are the complement of zlib's crc32 of the 136 bytes.
     resetDisk(2 * MEBIBYTE);
     EXPECT_EQ(0x88CCCC19U, recordAreaCrc());
     setDiskFromEnd(BASE_FROM_END - 1, "123456789");
@@ -76,7 +76,7 @@ TEST_F(RecordAreaCrcTest, EveryByteOfSlot15Counts) {
     EXPECT_EQ(before, recordAreaCrc());
 }
 
-TEST_F(RecordAreaCrcTest, BytesBesideSlot15DoNotCount) {
+TEST_F(RecordAreaCrcTest, BytesOutsideSlot15DoNotCount) {
     const std::uint32_t before = recordAreaCrc();
     setDiskFromEnd(BASE_FROM_END, std::string(1, '\0'));
     setDiskFromEnd(BASE_FROM_END - 137, std::string(1, '\0'));
@@ -89,12 +89,12 @@ TEST_F(RecordAreaCrcTest, AbsentDiskIsAllOnes) {
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
-TEST_F(RecordAreaCrcTest, FolderInThePlaceOfTheDiskIsAllOnes) {
+TEST_F(RecordAreaCrcTest, FolderInPlaceOfTheDiskIsAllOnes) {
     putFolder(DISK_PATH);
     expectFailure();
 }
 
-TEST_F(RecordAreaCrcTest, PipeInThePlaceOfTheDiskIsAllOnes) {
+TEST_F(RecordAreaCrcTest, PipeInPlaceOfTheDiskIsAllOnes) {
     remove(DISK_PATH);
     ASSERT_EQ(0, mkfifo(DISK_PATH, 0600));
     const kit::Descriptor otherEnd(open(DISK_PATH, O_RDWR | O_CLOEXEC));
@@ -107,12 +107,12 @@ TEST_F(RecordAreaCrcTest, NoFreeDescriptorIsAllOnes) {
     EXPECT_EQ(FAILED, recordAreaCrc());
 }
 
-TEST_F(RecordAreaCrcTest, DiskThatBeginsBehindSlot15IsAllOnes) {
+TEST_F(RecordAreaCrcTest, DiskTooShortForSlot15IsAllOnes) {
     writeFile(DISK_PATH, area().substr(2));
     expectFailure();
 }
 
-TEST_F(RecordAreaCrcTest, DiskThatBeginsWithSlot15HasACrc) {
+TEST_F(RecordAreaCrcTest, DiskThatStartsAtSlot15HasACrc) {
     writeFile(DISK_PATH, area().substr(1));
     EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
 }
@@ -123,15 +123,15 @@ TEST_F(RecordAreaCrcTest, DiskLongerThan4GiBIsReadFromItsEnd) {
     EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
 }
 
-TEST_F(RecordAreaCrcTest, DiskNeedsNoRightToWrite) {
-    const PermissionsHold hold;
+TEST_F(RecordAreaCrcTest, DiskNeedsNoWritePermission) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
     expectFailure();
 }
 
-TEST_F(RecordAreaCrcTest, HoldsNoDescriptorAfterwards) {
+TEST_F(RecordAreaCrcTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     EXPECT_NE(FAILED, recordAreaCrc());
     EXPECT_EQ(before, openDescriptors());

@@ -54,7 +54,7 @@ protected:
         return fixed.write(bytes.data(), lengthOf(bytes));
     }
 
-    /// Neither direction works; the buffer of the read is as it was, no descriptor is held.
+    /// Neither direction works; the buffer of the read is unchanged, no descriptor stays open.
     void expectFailure(std::uint32_t length) const {
         SCOPED_TRACE(length);
         const int before = openDescriptors();
@@ -116,24 +116,24 @@ TEST_P(FixedAreaTest, LengthAboveTheAreaFailsAndTouchesNothing) {
     expectUntouchedDisk();
 }
 
-TEST_P(FixedAreaTest, AbsentDiskFailsAndIsNotMade) {
+TEST_P(FixedAreaTest, AbsentDiskFailsAndIsNotCreated) {
     remove(DISK_PATH);
     expectFailure(8);
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
-TEST_P(FixedAreaTest, FolderInThePlaceOfTheDiskFails) {
+TEST_P(FixedAreaTest, FolderInPlaceOfTheDiskFails) {
     putFolder(DISK_PATH);
     expectFailure(8);
 }
 
-TEST_P(FixedAreaTest, LinkToAMissingFolderInThePlaceOfTheDiskFails) {
+TEST_P(FixedAreaTest, LinkToAMissingFolderInPlaceOfTheDiskFails) {
     remove(DISK_PATH);
     ASSERT_EQ(0, symlink("/missing/disk", DISK_PATH));
     expectFailure(8);
 }
 
-TEST_P(FixedAreaTest, PipeInThePlaceOfTheDiskCannotBeSought) {
+TEST_P(FixedAreaTest, PipeInPlaceOfTheDiskFailsAtTheSeek) {
     remove(DISK_PATH);
     ASSERT_EQ(0, mkfifo(DISK_PATH, 0600));
     const kit::Descriptor otherEnd(open(DISK_PATH, O_RDWR | O_CLOEXEC | O_NONBLOCK));
@@ -145,7 +145,7 @@ TEST_P(FixedAreaTest, PipeInThePlaceOfTheDiskCannotBeSought) {
 }
 
 TEST_P(FixedAreaTest, NoFreeDescriptorFails) {
-    const FixedArea target = fixed; // a sanitizer wants a descriptor to look at the fixture
+    const FixedArea target = fixed; // a sanitizer needs a descriptor to look at the fixture
     std::string buffer = "####";
     std::int32_t readResult = 0;
     std::int32_t writeResult = 0;
@@ -159,14 +159,14 @@ TEST_P(FixedAreaTest, NoFreeDescriptorFails) {
     EXPECT_EQ("####", buffer);
 }
 
-TEST_P(FixedAreaTest, DiskThatBeginsBehindTheAreaFails) {
+TEST_P(FixedAreaTest, DiskTooShortForTheAreaFails) {
     const std::size_t size = fixed.fromEnd - 1;
     resetDisk(size);
     expectFailure(8);
     EXPECT_EQ(std::string(size, '\0'), diskFromEnd(size, size));
 }
 
-TEST_P(FixedAreaTest, DiskThatBeginsWithTheAreaHasIt) {
+TEST_P(FixedAreaTest, DiskThatStartsAtTheAreaIsEnough) {
     resetDisk(fixed.fromEnd);
     const std::string bytes = lettersOfLength(fixed.size);
     EXPECT_EQ(0, write(bytes));
@@ -216,7 +216,7 @@ TEST_P(FixedAreaTest, RefusedReadFails) {
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST_P(FixedAreaTest, ReadThatComesOutShortIsSuccess) {
+TEST_P(FixedAreaTest, ShortReadIsSuccess) {
     // The kernel fills what it may and stops at the edge; an emulator refuses the whole transfer.
     const EdgeOfMemory edge(100);
     ASSERT_TRUE(edge.isMade());
@@ -228,8 +228,8 @@ TEST_P(FixedAreaTest, ReadThatComesOutShortIsSuccess) {
     }
 }
 
-TEST_P(FixedAreaTest, DiskNeedsNoOtherRightThanTheDirections) {
-    const PermissionsHold hold;
+TEST_P(FixedAreaTest, DiskNeedsOnlyThePermissionOfTheDirection) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     std::string buffer = "....";
     EXPECT_EQ(0, fixed.read(buffer.data(), 4));
@@ -239,7 +239,7 @@ TEST_P(FixedAreaTest, DiskNeedsNoOtherRightThanTheDirections) {
     EXPECT_EQ(-1, fixed.read(buffer.data(), 4));
 }
 
-TEST_P(FixedAreaTest, HoldsNoDescriptorAfterwards) {
+TEST_P(FixedAreaTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     std::string buffer = "....";
     EXPECT_EQ(0, fixed.read(buffer.data(), 4));
@@ -247,7 +247,7 @@ TEST_P(FixedAreaTest, HoldsNoDescriptorAfterwards) {
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST(FixedAreaSizeTest, LongestTransfers) {
+TEST(FixedAreaSizeTest, SizesAreAsPublished) {
     EXPECT_EQ(1024U, AUX_AREA_SIZE);
     EXPECT_EQ(4096U, TUNING_AREA_SIZE);
 }

@@ -19,12 +19,12 @@ namespace orvane::test {
 
 class ReadRecordSlotTest : public AreaDiskTest {
 protected:
-    /// Reads `length` bytes into the front of `buffer`.
+    /// Reads `length` bytes into the start of `buffer`.
     static std::int32_t read(std::uint32_t slot, std::string& buffer, std::uint32_t length) {
         return readRecordSlot(slot, buffer.data(), length);
     }
 
-    /// The read fails, zeroes the `length` bytes it was lent, and holds no descriptor.
+    /// The read fails, zeroes its `length` bytes, and leaves no descriptor open.
     static void expectFailure(std::uint32_t slot, std::uint32_t length) {
         const int before = openDescriptors();
         std::string buffer(length + 4, '#');
@@ -44,7 +44,7 @@ TEST_F(ReadRecordSlotTest, EverySlotIsReadWhole) {
     expectUntouchedDisk();
 }
 
-TEST_F(ReadRecordSlotTest, LongerBufferKeepsZerosBehindTheSlot) {
+TEST_F(ReadRecordSlotTest, LongerBufferIsPaddedWithZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         std::string buffer(place.size + 9, '#');
@@ -78,14 +78,14 @@ TEST_F(ReadRecordSlotTest, SerialSlotInto4BytesIsItsFirstFour) {
     EXPECT_EQ("SERI###", buffer);
 }
 
-TEST_F(ReadRecordSlotTest, SlotOfZerosIsNoFailure) {
+TEST_F(ReadRecordSlotTest, SlotOfZerosIsSuccess) {
     resetDisk(2 * MEBIBYTE);
     std::string buffer = "########";
     EXPECT_EQ(0, read(9, buffer, 8));
     EXPECT_EQ(std::string(8, '\0'), buffer);
 }
 
-TEST_F(ReadRecordSlotTest, LargestLengthOnlyZeroesWhatItSays) {
+TEST_F(ReadRecordSlotTest, LengthLimitsWhatIsZeroed) {
     std::string buffer(100000, '#');
     EXPECT_EQ(0, read(0, buffer, 99999));
     EXPECT_EQ(area().substr(0, 1) + std::string(99998, '\0') + "#", buffer);
@@ -98,7 +98,7 @@ TEST_F(ReadRecordSlotTest, NullBufferFails) {
     EXPECT_EQ(before, openDescriptors());
 }
 
-TEST_F(ReadRecordSlotTest, LengthZeroFailsAndLeavesTheBuffer) {
+TEST_F(ReadRecordSlotTest, LengthZeroFailsAndKeepsTheBuffer) {
     std::string buffer = "####";
     EXPECT_EQ(-1, read(9, buffer, 0));
     EXPECT_EQ("####", buffer);
@@ -118,18 +118,18 @@ TEST_F(ReadRecordSlotTest, AbsentDiskFailsAndLeavesZeros) {
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
-TEST_F(ReadRecordSlotTest, FolderInThePlaceOfTheDiskFailsAndLeavesZeros) {
+TEST_F(ReadRecordSlotTest, FolderInPlaceOfTheDiskFailsAndLeavesZeros) {
     putFolder(DISK_PATH);
     expectFailure(9, 8);
 }
 
-TEST_F(ReadRecordSlotTest, LinkLoopInThePlaceOfTheDiskFailsAndLeavesZeros) {
+TEST_F(ReadRecordSlotTest, LinkLoopInPlaceOfTheDiskFailsAndLeavesZeros) {
     remove(DISK_PATH);
     ASSERT_EQ(0, symlink(DISK_PATH, DISK_PATH));
     expectFailure(9, 8);
 }
 
-TEST_F(ReadRecordSlotTest, PipeInThePlaceOfTheDiskCannotBeSoughtAndLeavesZeros) {
+TEST_F(ReadRecordSlotTest, PipeInPlaceOfTheDiskFailsAtTheSeekAndLeavesZeros) {
     remove(DISK_PATH);
     ASSERT_EQ(0, mkfifo(DISK_PATH, 0600));
     const kit::Descriptor otherEnd(open(DISK_PATH, O_RDWR | O_CLOEXEC));
@@ -148,7 +148,7 @@ TEST_F(ReadRecordSlotTest, NoFreeDescriptorFailsAndLeavesZeros) {
     EXPECT_EQ(std::string(8, '\0'), buffer);
 }
 
-TEST_F(ReadRecordSlotTest, DiskThatBeginsBehindTheSlotFailsAndLeavesZeros) {
+TEST_F(ReadRecordSlotTest, DiskTooShortForTheSlotFailsAndLeavesZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         resetDisk(BASE_FROM_END - place.offset - 1);
@@ -156,7 +156,7 @@ TEST_F(ReadRecordSlotTest, DiskThatBeginsBehindTheSlotFailsAndLeavesZeros) {
     }
 }
 
-TEST_F(ReadRecordSlotTest, DiskThatBeginsWithTheSlotHasIt) {
+TEST_F(ReadRecordSlotTest, DiskThatStartsAtTheSlotIsEnough) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         resetDisk(BASE_FROM_END - place.offset);
@@ -168,7 +168,7 @@ TEST_F(ReadRecordSlotTest, DiskThatBeginsWithTheSlotHasIt) {
     }
 }
 
-TEST_F(ReadRecordSlotTest, OnADiskOfOneMebibyteTheBaseIsItsFirstByte) {
+TEST_F(ReadRecordSlotTest, BaseOfAOneMebibyteDiskIsItsFirstByte) {
     writeFile(DISK_PATH, area());
     std::string buffer = "##";
     EXPECT_EQ(0, read(0, buffer, 2));
@@ -183,8 +183,8 @@ TEST_F(ReadRecordSlotTest, DiskLongerThan4GiBIsReadFromItsEnd) {
     EXPECT_EQ(area().substr(129, 8), buffer);
 }
 
-TEST_F(ReadRecordSlotTest, DiskNeedsNoRightToWrite) {
-    const PermissionsHold hold;
+TEST_F(ReadRecordSlotTest, DiskNeedsNoWritePermission) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     std::string buffer(8, '#');
     EXPECT_EQ(0, read(9, buffer, 8));
@@ -193,7 +193,7 @@ TEST_F(ReadRecordSlotTest, DiskNeedsNoRightToWrite) {
     expectFailure(9, 8);
 }
 
-TEST_F(ReadRecordSlotTest, HoldsNoDescriptorAfterwards) {
+TEST_F(ReadRecordSlotTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     std::string buffer(8, '#');
     EXPECT_EQ(0, read(9, buffer, 8));

@@ -21,7 +21,7 @@ namespace orvane::test {
 class WriteRecordSlotTest : public AreaDiskTest {
 protected:
     static std::int32_t write(std::uint32_t slot, const std::string& bytes) {
-        // A block of its own, so that a memory checker sees every byte read beyond it.
+        // Its own block, so that a memory checker sees every byte read beyond it.
         const std::vector<char> block(bytes.begin(), bytes.end());
         return writeRecordSlot(slot, block.data(), lengthOf(block));
     }
@@ -32,7 +32,7 @@ protected:
         EXPECT_EQ(before, openDescriptors());
     }
 
-    /// Bytes of which none is on the disk at the place where they will be.
+    /// Bytes that all differ from those on the disk at that place.
     static std::string newBytes(std::size_t offset, std::size_t length) {
         std::string bytes;
         for (std::size_t i = 0; i < length; ++i) {
@@ -55,7 +55,7 @@ TEST_F(WriteRecordSlotTest, EverySlotIsWrittenWholeAndNothingElse) {
 TEST_F(WriteRecordSlotTest, ShorterBufferIsPaddedWithZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         if (place.size == 1) {
-            continue; // has no shorter buffer
+            continue; // cannot have a shorter buffer
         }
         SCOPED_TRACE(place.slot);
         for (const std::uint32_t length : {1U, place.size - 1}) {
@@ -67,7 +67,7 @@ TEST_F(WriteRecordSlotTest, ShorterBufferIsPaddedWithZeros) {
     }
 }
 
-TEST_F(WriteRecordSlotTest, LongerBufferLosesItsExcess) {
+TEST_F(WriteRecordSlotTest, ExcessOfALongerBufferIsIgnored) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         setDiskFromEnd(BASE_FROM_END, area());
@@ -87,7 +87,7 @@ TEST_F(WriteRecordSlotTest, TwentyBytesIntoSlot0WriteOne) {
     expectArea(areaWith(0, "a"));
 }
 
-TEST_F(WriteRecordSlotTest, CallersBufferIsNotTouched) {
+TEST_F(WriteRecordSlotTest, CallersBufferIsNotChanged) {
     const std::string bytes = "AB";
     EXPECT_EQ(0, writeRecordSlot(1, bytes.data(), 2));
     EXPECT_EQ("AB", bytes);
@@ -121,18 +121,18 @@ TEST_F(WriteRecordSlotTest, UnknownSlotFailsAndWritesNothing) {
     expectUntouchedDisk();
 }
 
-TEST_F(WriteRecordSlotTest, AbsentDiskFailsAndIsNotMade) {
+TEST_F(WriteRecordSlotTest, AbsentDiskFailsAndIsNotCreated) {
     remove(DISK_PATH);
     expectFailure(9, "ABCDEFGH");
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
-TEST_F(WriteRecordSlotTest, FolderInThePlaceOfTheDiskFails) {
+TEST_F(WriteRecordSlotTest, FolderInPlaceOfTheDiskFails) {
     putFolder(DISK_PATH);
     expectFailure(9, "ABCDEFGH");
 }
 
-TEST_F(WriteRecordSlotTest, PipeInThePlaceOfTheDiskCannotBeSought) {
+TEST_F(WriteRecordSlotTest, PipeInPlaceOfTheDiskFailsAtTheSeek) {
     remove(DISK_PATH);
     ASSERT_EQ(0, mkfifo(DISK_PATH, 0600));
     const kit::Descriptor otherEnd(open(DISK_PATH, O_RDWR | O_CLOEXEC | O_NONBLOCK));
@@ -152,7 +152,7 @@ TEST_F(WriteRecordSlotTest, NoFreeDescriptorFails) {
     expectUntouchedDisk();
 }
 
-TEST_F(WriteRecordSlotTest, DiskThatBeginsBehindTheSlotFails) {
+TEST_F(WriteRecordSlotTest, DiskTooShortForTheSlotFails) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         const std::size_t size = BASE_FROM_END - place.offset - 1;
@@ -162,7 +162,7 @@ TEST_F(WriteRecordSlotTest, DiskThatBeginsBehindTheSlotFails) {
     }
 }
 
-TEST_F(WriteRecordSlotTest, DiskThatBeginsWithTheSlotTakesIt) {
+TEST_F(WriteRecordSlotTest, DiskThatStartsAtTheSlotIsEnough) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
         const std::size_t size = BASE_FROM_END - place.offset;
@@ -182,7 +182,7 @@ TEST_F(WriteRecordSlotTest, DiskLongerThan4GiBIsWrittenAtItsEnd) {
 }
 
 TEST_F(WriteRecordSlotTest, ShortWriteIsSuccess) {
-    // The limit lies three bytes behind the start of slot 2.
+    // The limit lies three bytes after the start of slot 2.
     std::int32_t whole = -1;
     {
         const ResourceLimit limit(RLIMIT_FSIZE, MEBIBYTE + 20);
@@ -217,8 +217,8 @@ TEST_F(WriteRecordSlotTest, RefusedWriteFails) {
     expectUntouchedDisk();
 }
 
-TEST_F(WriteRecordSlotTest, DiskNeedsNoRightToRead) {
-    const PermissionsHold hold;
+TEST_F(WriteRecordSlotTest, DiskNeedsNoReadPermission) {
+    const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
     expectFailure(9, "hgfedcba");
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
@@ -227,7 +227,7 @@ TEST_F(WriteRecordSlotTest, DiskNeedsNoRightToRead) {
     expectArea(areaWith(129, "ABCDEFGH"));
 }
 
-TEST_F(WriteRecordSlotTest, HoldsNoDescriptorAfterwards) {
+TEST_F(WriteRecordSlotTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     EXPECT_EQ(0, write(9, "ABCDEFGH"));
     EXPECT_EQ(0, write(9, "AB"));

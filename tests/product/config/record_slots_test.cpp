@@ -27,7 +27,7 @@ TEST(RecordSlotsTest, EverySlotHasItsSizeAndOffset) {
     }
 }
 
-TEST(RecordSlotsTest, LongestSlotIsAsLongAsNamed) {
+TEST(RecordSlotsTest, LongestSlotHasTheMaximumSize) {
     std::uint32_t longest = 0;
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
         std::uint32_t size = 0;
@@ -38,7 +38,7 @@ TEST(RecordSlotsTest, LongestSlotIsAsLongAsNamed) {
     EXPECT_EQ(RECORD_SLOT_MAX_SIZE, longest);
 }
 
-TEST(RecordSlotsTest, UnknownSlotLeavesBothOutputs) {
+TEST(RecordSlotsTest, UnknownSlotKeepsBothOutputs) {
     for (const std::uint32_t slot : UNKNOWN_SLOTS) {
         SCOPED_TRACE(slot);
         std::uint32_t size = 77;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The one read past the end: an image that is shorter than the catalogue's layout.
+// The only read past the end: an image that is shorter than the catalogue's layout.
 #include "config/param_access.h"
 #include "config/param_catalogue.h"
 #include "tests/support/unit_test.h"
@@ -13,7 +13,7 @@ namespace {
 
 class ShortImageTest : public UnitTest {};
 
-TEST_F(ShortImageTest, EveryParameterOfEveryLengthStaysInTheMappedPage) {
+TEST_F(ShortImageTest, EveryReadAtEveryLengthStaysInTheMappedPage) {
     ASSERT_GE(sysconf(_SC_PAGESIZE), long{CONFIG_IMAGE_SIZE});
     for (std::size_t length = 1; length <= CONFIG_IMAGE_SIZE; ++length) {
         SCOPED_TRACE(length);
@@ -25,7 +25,7 @@ TEST_F(ShortImageTest, EveryParameterOfEveryLengthStaysInTheMappedPage) {
             const ParamDescriptor& row = ParamCatalogue.rows[number - 1U];
             std::uint16_t value = 0;
             ASSERT_EQ(getParam(store, number, &value), PARAM_OK);
-            // Behind the last byte of the image, the page holds zeros.
+            // After the last byte of the image, the page holds zeros.
             std::uint32_t expected = row.offset < length ? 0xA5U : 0U;
             if (paramTypeSize(row.type) == 2 && row.offset + 1 < length) {
                 expected |= 0xA500U;

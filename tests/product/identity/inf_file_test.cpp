@@ -17,7 +17,7 @@ protected:
     }
 };
 
-TEST(TrimSpacesTest, OnlySpacesAtTheEndsGo) {
+TEST(TrimSpacesTest, OnlySpacesAtTheEndsAreRemoved) {
     constexpr const char* TABLE[][2] = {
         {"", ""},    {" ", ""},        {"     ", ""},  {"a", "a"},           {" a", "a"},
         {"a ", "a"}, {"   a   ", "a"}, {"a b", "a b"}, {"  a  b  ", "a  b"}, {" = ", "="},
@@ -27,7 +27,7 @@ TEST(TrimSpacesTest, OnlySpacesAtTheEndsGo) {
     }
 }
 
-TEST(TrimSpacesTest, OtherWhiteSpaceStays) {
+TEST(TrimSpacesTest, OtherWhiteSpaceIsKept) {
     for (const char c : {'\t', '\r', '\n', '\v', '\f', '\0', '\xA0'}) {
         SCOPED_TRACE(static_cast<int>(c));
         EXPECT_EQ(trimSpaces(std::string{c}), std::string({c}));
@@ -51,7 +51,7 @@ TEST(InfValueTest, EmptyKeyIsAKeyLikeAnyOther) {
     EXPECT_EQ(infValue({{"", "nameless"}}, ""), "nameless");
 }
 
-TEST(InfDataTest, KeysStandInByteWiseOrder) {
+TEST(InfDataTest, KeysAreInByteOrder) {
     const Inf_Data record = {{"\x80", "4"}, {"b", "3"}, {"B", "1"}, {"a", "2"}, {"", "0"}};
     std::string values;
     for (const auto& entry : record) {
@@ -74,7 +74,7 @@ TEST_F(InfFileTest, LastLineNeedsNoLineEnd) {
     EXPECT_EQ(parse("A=1\nB=2"), (Inf_Data{{"A", "1"}, {"B", "2"}}));
 }
 
-TEST_F(InfFileTest, SpacesAroundKeyAndValueGo) {
+TEST_F(InfFileTest, SpacesAroundKeyAndValueAreRemoved) {
     EXPECT_EQ(parse("   Type   =   Main Application   \n"),
               (Inf_Data{{"Type", "Main Application"}}));
 }
@@ -95,20 +95,20 @@ TEST_F(InfFileTest, LineWithoutEqualsSignIsSkipped) {
     EXPECT_EQ(parse("Type\n\n   \n[section]\nA=1\n; comment\n"), (Inf_Data{{"A", "1"}}));
 }
 
-TEST_F(InfFileTest, LineWithNothingBehindTheEqualsSignIsSkipped) {
+TEST_F(InfFileTest, LineWithNothingAfterTheEqualsSignIsSkipped) {
     EXPECT_EQ(parse("A=\nB=2\n=\n  =\nC="), (Inf_Data{{"B", "2"}}));
 }
 
-TEST_F(InfFileTest, SkippedEmptyValueLeavesTheEarlierOne) {
+TEST_F(InfFileTest, SkippedEmptyValueKeepsTheEarlierOne) {
     EXPECT_EQ(parse("A=1\nA=\n"), (Inf_Data{{"A", "1"}}));
 }
 
-TEST_F(InfFileTest, ValueOfSpacesIsAnEntryWithoutText) {
+TEST_F(InfFileTest, ValueOfSpacesIsAnEmptyEntry) {
     EXPECT_EQ(parse("A= \n"), (Inf_Data{{"A", ""}}));
     EXPECT_EQ(parse("A=1\nA=   \n"), (Inf_Data{{"A", ""}}));
 }
 
-TEST_F(InfFileTest, LineBeginningWithTheEqualsSignHasTheEmptyKey) {
+TEST_F(InfFileTest, LineStartingWithTheEqualsSignHasTheEmptyKey) {
     EXPECT_EQ(parse("=1\n"), (Inf_Data{{"", "1"}}));
     EXPECT_EQ(parse("   =2\n"), (Inf_Data{{"", "2"}}));
 }
@@ -118,11 +118,11 @@ TEST_F(InfFileTest, CarriageReturnBelongsToTheValue) {
               (Inf_Data{{"A", "1\r"}, {"B", "\r"}, {"C", "2 \r"}}));
 }
 
-TEST_F(InfFileTest, CarriageReturnAloneEndsNoLine) {
+TEST_F(InfFileTest, CarriageReturnAloneDoesNotEndALine) {
     EXPECT_EQ(parse("A=1\rB=2\n"), (Inf_Data{{"A", "1\rB=2"}}));
 }
 
-TEST_F(InfFileTest, TabsStay) {
+TEST_F(InfFileTest, TabsAreKept) {
     EXPECT_EQ(parse("\tA\t=\t1\t\n \tB = 2\n"), (Inf_Data{{"\tA\t", "\t1\t"}, {"\tB", "2"}}));
 }
 
@@ -136,7 +136,7 @@ TEST_F(InfFileTest, BytesAbove127AreTextLikeAnyOther) {
     EXPECT_EQ(parse("\xFF\xFE=\x80\n"), (Inf_Data{{"\xFF\xFE", "\x80"}}));
 }
 
-TEST_F(InfFileTest, LongLinesAreWhole) {
+TEST_F(InfFileTest, LongLinesAreReadWhole) {
     const std::string longKey(70000, 'k');
     const std::string longValue(200000, 'v');
     EXPECT_EQ(parse(longKey + "=" + longValue + "\nA=1\n" + std::string(70000, 'x') + "\nB=2\n"),
@@ -171,10 +171,10 @@ TEST_F(InfFileTest, FileThatCannotBeOpenedOrReadAddsNothing) {
     }
 }
 
-TEST_F(InfFileTest, FileThatMayNotBeReadAddsNothing) {
+TEST_F(InfFileTest, FileWithoutReadPermissionAddsNothing) {
     writeFile(INF_FILE, "A=1\n");
     std::filesystem::permissions(INF_FILE, std::filesystem::perms::none);
-    const PermissionsHold permissionsHold;
+    const EnforcedPermissions permissionsHold;
     Inf_Data record;
     readInfFile(INF_FILE, record);
     EXPECT_TRUE(record.empty());
@@ -188,7 +188,7 @@ TEST_F(InfFileTest, FileIsOnlyRead) {
     EXPECT_FALSE(exists("/tmp/missing.inf"));
 }
 
-TEST_F(InfFileTest, NoDescriptorOutlivesTheReading) {
+TEST_F(InfFileTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     parse("A=1\n");
     EXPECT_EQ(openDescriptors(), before);

@@ -52,7 +52,7 @@ TEST(ModelNamesTest, BrandWordOfEachNameFollowsTheCode) {
     }
 }
 
-TEST(ModelNamesTest, EachNameHasAModelBehindTheBrandWord) {
+TEST(ModelNamesTest, EachNameHasAModelAfterTheBrandWord) {
     for (std::size_t code = 1; code <= 47; ++code) {
         SCOPED_TRACE(nameOfCode(code));
         const std::string model = nameOfCode(code).substr(nameOfCode(code).find(' ') + 1);
@@ -76,14 +76,14 @@ TEST(ModelNamesTest, AllOtherNamesDiffer) {
     EXPECT_EQ(names.size(), 46U);
 }
 
-TEST(ModelNamesTest, NamesStandAtTheirCodes) {
+TEST(ModelNamesTest, NamesMatchTheirCodes) {
     EXPECT_EQ(nameOfCode(1), "Marl Tulvari");
     EXPECT_EQ(nameOfCode(26), "Quarion Velmira");
     EXPECT_EQ(nameOfCode(47), "Marl Quillon");
 }
 
-/// The product data as a list of its own, which the model reads as well.
-TEST(ModelNamesTest, AreThoseOfTheProductData) {
+/// The product data as a separate list, which the model reads as well.
+TEST(ModelNamesTest, NamesMatchTheProductData) {
     std::ifstream list(ORVANE_MODEL_NAMES);
     std::size_t code = 0;
     for (std::string name; std::getline(list, name);) {

@@ -23,7 +23,7 @@ TEST_F(SoftwareVersionTest, MissingFolderGivesNoVersion) {
     EXPECT_EQ(softwareVersion(), "000000");
 }
 
-TEST_F(SoftwareVersionTest, FileInThePlaceOfTheFolderGivesNoVersion) {
+TEST_F(SoftwareVersionTest, FileInPlaceOfTheFolderGivesNoVersion) {
     remove(VERSION_FOLDER);
     writeFile(VERSION_FOLDER, description("Application", "1.2.3"));
     EXPECT_EQ(findApplicationVersion(), "");
@@ -63,7 +63,7 @@ TEST_F(SoftwareVersionTest, PrefixBeforeTheFirstUnderscoreIsDropped) {
     }
 }
 
-TEST_F(SoftwareVersionTest, WholeWayFromFileToDigits) {
+TEST_F(SoftwareVersionTest, VersionInTheFileBecomesDigits) {
     constexpr const char* TABLE[][2] = {
         {"3.10.2", "030a02"},  {"ABC_1.2.3_45", "010203"}, {"V_2.0.1", "020001"},
         {"N/A", "000000"},     {"1.2", "010202"},          {"7", "070707"},
@@ -76,11 +76,11 @@ TEST_F(SoftwareVersionTest, WholeWayFromFileToDigits) {
     }
 }
 
-TEST_F(SoftwareVersionTest, CarriageReturnsAndTabsStayInTheText) {
+TEST_F(SoftwareVersionTest, CarriageReturnsAndTabsAreKept) {
     EXPECT_EQ(versionOf("Type=Application\r\nVersion Number=\t1.2.3\r\n"), "\t1.2.3\r");
 }
 
-TEST_F(SoftwareVersionTest, ZeroBytesStayInTheText) {
+TEST_F(SoftwareVersionTest, ZeroBytesAreKept) {
     EXPECT_EQ(versionOf(description("Application", std::string("1.2\0.3", 6))),
               std::string("1.2\0.3", 6));
 }
@@ -91,7 +91,7 @@ TEST_F(SoftwareVersionTest, LongLinesDoNotHideTheOthers) {
               "1.2." + tail);
 }
 
-TEST_F(SoftwareVersionTest, EachCallScansAfresh) {
+TEST_F(SoftwareVersionTest, EachCallScansAgain) {
     put("app.inf", description("Application", "1.2.3"));
     EXPECT_EQ(findApplicationVersion(), "1.2.3");
     EXPECT_EQ(findApplicationVersion(), "1.2.3");
@@ -128,7 +128,7 @@ TEST_F(SoftwareVersionTest, OnlyTheListingAndOneFileAreOpenAtATime) {
     EXPECT_EQ(findApplicationVersion(), "1.2.3");
 }
 
-TEST_F(SoftwareVersionTest, NoDescriptorOutlivesTheScan) {
+TEST_F(SoftwareVersionTest, LeavesNoDescriptorOpen) {
     put("app.inf", description("Application", "1.2.3"));
     std::filesystem::create_directory(pathOf("x.inf"));
     const int before = openDescriptors();

@@ -11,7 +11,7 @@ constexpr std::uint64_t SERIAL_BEFORE_END = MEBIBYTE - 129;
 class UnitSerialTest : public UnitTest {
 protected:
     static std::string serial() {
-        std::string text = "what stood here before";
+        std::string text = "earlier content";
         getUnitSerial(text);
         return text;
     }
@@ -36,7 +36,7 @@ TEST_F(UnitSerialTest, RecordOfZerosGivesTheEmptyTextAndNotTheDefault) {
     EXPECT_EQ(serialOf(std::string(8, '\0')), "");
 }
 
-TEST_F(UnitSerialTest, BytesAreTakenAsTheyAre) {
+TEST_F(UnitSerialTest, BytesAreKeptAsTheyAre) {
     EXPECT_EQ(serialOf("  a\t\n\r= "), "  a\t\n\r= ");
     EXPECT_EQ(serialOf("\xFF\x80\x7F\x01\xC3\xA4\xFE\x1B"), "\xFF\x80\x7F\x01\xC3\xA4\xFE\x1B");
 }
@@ -52,7 +52,7 @@ TEST_F(UnitSerialTest, DiskOfOneMebibyteHoldsTheRecord) {
     EXPECT_EQ(serialOf("12345678"), "12345678");
 }
 
-TEST_F(UnitSerialTest, DeviceMayBeginWithTheRecord) {
+TEST_F(UnitSerialTest, DeviceMayStartAtTheRecord) {
     resetDisk(SERIAL_BEFORE_END);
     EXPECT_EQ(serialOf("87654321"), "87654321");
 }
@@ -85,14 +85,14 @@ TEST_F(UnitSerialTest, DefaultIsLongerThanAnySerial) {
     EXPECT_EQ(serialOf(std::string(16, 'S')).size(), 8U);
 }
 
-TEST_F(UnitSerialTest, EachCallReadsTheDeviceAfresh) {
+TEST_F(UnitSerialTest, EachCallReadsTheDeviceAgain) {
     EXPECT_EQ(serialOf("11111111"), "11111111");
     EXPECT_EQ(serialOf("22222222"), "22222222");
     remove(DISK_PATH);
     EXPECT_EQ(serial(), "ABCD1234abc");
 }
 
-TEST_F(UnitSerialTest, NoDescriptorOutlivesTheLookup) {
+TEST_F(UnitSerialTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     EXPECT_EQ(serialOf("SN004217"), "SN004217");
     EXPECT_EQ(openDescriptors(), before);

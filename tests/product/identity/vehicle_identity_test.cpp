@@ -8,8 +8,8 @@
 
 namespace orvane::test {
 
-/// What stands in the caller's string before: longer than any result, so a rest of it would show.
-constexpr char OLD_TEXT[] = "what stood here before, longer than any result";
+/// The caller's string before: longer than any result, so that a remainder shows.
+constexpr char OLD_TEXT[] = "earlier content, longer than any of the results";
 
 /// Where the four one-byte values lie in the image, in bytes.
 constexpr std::uint32_t DRIVE_SIDE_OFFSET = 21;
@@ -39,7 +39,7 @@ protected:
         setImage(offset, std::string(1, static_cast<char>(value)));
     }
 
-    /// An image of `filler` bytes, but for the one at `offset`.
+    /// An image of `filler` bytes, except for the one at `offset`.
     static void writeImageBut(int filler, std::uint32_t offset, int value) {
         writeImage(std::string(179, static_cast<char>(filler)));
         setByte(offset, value);
@@ -52,7 +52,7 @@ protected:
         EXPECT_EQ(model(), "VOXA");
     }
 
-    /// Parts of the image that are mapped now, by the system's own account. Leaves the unit.
+    /// How many parts of the image the system says are mapped. Leaves the unit.
     int mappingsOfTheImage() {
         leave();
         std::ifstream maps("/proc/self/maps");
@@ -190,7 +190,7 @@ TEST_F(VehicleIdentityTest, ZerosInTheImageGiveTheDefaults) {
     expectDefaults();
 }
 
-TEST_F(VehicleIdentityTest, ShortImageIsReadPastItsEndAsItsPageStands) {
+TEST_F(VehicleIdentityTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(std::string(36, '\x02'));
     EXPECT_EQ(getRightHandDrive(), 2U);
     EXPECT_EQ(brand(), "QUARION");
@@ -198,14 +198,14 @@ TEST_F(VehicleIdentityTest, ShortImageIsReadPastItsEndAsItsPageStands) {
     EXPECT_EQ(model(), "VOXA");
 }
 
-TEST_F(VehicleIdentityTest, CalibrationFileIsNoSubstituteForTheImage) {
+TEST_F(VehicleIdentityTest, CalibrationFileDoesNotReplaceTheImage) {
     remove(IMAGE_PATH);
     std::filesystem::create_directories("/fs/rwdata/CALS");
     writeFile("/fs/rwdata/CALS/cal_active.bin", std::string(179, '\x02'));
     expectDefaults();
 }
 
-TEST_F(VehicleIdentityTest, EachCallReadsTheImageAfresh) {
+TEST_F(VehicleIdentityTest, EachCallReadsTheImageAgain) {
     writeImage(std::string(179, '\x02'));
     EXPECT_EQ(brand(), "QUARION");
     EXPECT_EQ(fuelType(), "cng");
@@ -216,7 +216,7 @@ TEST_F(VehicleIdentityTest, EachCallReadsTheImageAfresh) {
     EXPECT_EQ(fuelType(), "electric");
 }
 
-TEST_F(VehicleIdentityTest, NoDescriptorOutlivesALookup) {
+TEST_F(VehicleIdentityTest, LookupsLeaveNoDescriptorOpen) {
     const int before = openDescriptors();
     for (const char* state : {"whole", "empty", "folder", "missing"}) {
         SCOPED_TRACE(state);
@@ -232,12 +232,12 @@ TEST_F(VehicleIdentityTest, NoDescriptorOutlivesALookup) {
     }
 }
 
-TEST_F(VehicleIdentityTest, NoMappingOutlivesALookup) {
+TEST_F(VehicleIdentityTest, LookupsLeaveNoMapping) {
     expectDefaults();
     EXPECT_EQ(mappingsOfTheImage(), 0);
 }
 
-TEST_F(VehicleIdentityTest, MappingOfAnOpenStoreWouldBeSeen) {
+TEST_F(VehicleIdentityTest, MappingOfAnOpenStoreIsSeen) {
     ConfigStore store;
     ASSERT_EQ(store.open(), 0);
     EXPECT_EQ(mappingsOfTheImage(), 1);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Tests on the folder of the version description files, and on the order in which the file system
+// For tests of the folder of version description files, and of the order in which the file system
 // lists it.
 #pragma once
 
@@ -28,7 +28,7 @@ protected:
     static std::string description(const std::string& type, const std::string& version) {
         return "Type=" + type + "\nVersion Number=" + version + "\n";
     }
-    /// The version text that one file with this content leads to.
+    /// The version text that one file with this content gives.
     static std::string versionOf(const std::string& content) {
         put("app.inf", content);
         return findApplicationVersion();
@@ -52,8 +52,8 @@ protected:
         return names;
     }
 
-    /// Makes empty files of these names and gives their names in listing order, in which a test
-    /// then fills them.
+    /// Makes empty files of these names and returns the names in listing order; the test then fills
+    /// them in that order.
     static std::vector<std::string> makeFiles(const std::vector<std::string>& names) {
         for (const std::string& name : names) {
             put(name, "");

@@ -50,7 +50,7 @@ TEST(FormatVersionByteTest, AllBytesHaveTheirDigits) {
     }
 }
 
-TEST(FormatVersionByteTest, NumbersFrom256OnLoseTheirHigherPart) {
+TEST(FormatVersionByteTest, NumbersFrom256OnAreReducedModulo256) {
     expectBytes({{"256", "00"},
                  {"257", "01"},
                  {"300", "2c"},
@@ -61,7 +61,7 @@ TEST(FormatVersionByteTest, NumbersFrom256OnLoseTheirHigherPart) {
                  {"2147483392", "00"}});
 }
 
-TEST(FormatVersionByteTest, NegativeRemaindersAreTheirTwosComplementOf32Bits) {
+TEST(FormatVersionByteTest, NegativeRemaindersAreTwosComplementIn32Bits) {
     expectBytes({{"-1", "ffffffff"},
                  {"-2", "fffffffe"},
                  {"-16", "fffffff0"},
@@ -74,7 +74,7 @@ TEST(FormatVersionByteTest, NegativeRemaindersAreTheirTwosComplementOf32Bits) {
                  {"-0", "00"}});
 }
 
-TEST(FormatVersionByteTest, NumbersPastTheRangeCountAsTheNearestInIt) {
+TEST(FormatVersionByteTest, NumbersOutOfRangeCountAsTheNearestInRange) {
     expectBytes({{"2147483646", "fe"},
                  {"2147483647", "ff"},
                  {"2147483648", "ff"},
@@ -161,7 +161,7 @@ TEST(FormatVersionByteTest, NumberEndsAtTheFirstNonDigit) {
                  {"1:2", "01"}});
 }
 
-TEST(FormatVersionByteTest, TextThatIsNoNumberIsZero) {
+TEST(FormatVersionByteTest, TextThatIsNotANumberIsZero) {
     expectBytes({{"", "00"},
                  {" ", "00"},
                  {"x", "00"},
@@ -183,7 +183,7 @@ TEST(FormatVersionByteTest, ZeroByteIsANonDigit) {
     EXPECT_EQ(formatVersionByte({'-', '\0', '5'}), "00");
 }
 
-TEST(FormatVersionTest, NoVersionIsTheDefault) {
+TEST(FormatVersionTest, MissingVersionGivesTheDefault) {
     EXPECT_STREQ(DEFAULT_SOFTWARE_VERSION, "000000");
     expectVersions({{"", "000000"}, {"N/A", "000000"}});
 }
@@ -223,7 +223,7 @@ TEST(FormatVersionTest, UnderscoreEndsAComponentsNumberOnly) {
     expectVersions({{"1_9.2.3", "010203"}, {"1.2_9.3", "010203"}, {"_1.2.3", "000203"}});
 }
 
-TEST(FormatVersionTest, TextThatIsNoVersionGivesZeros) {
+TEST(FormatVersionTest, TextThatIsNotAVersionGivesZeros) {
     expectVersions({{"unknown", "000000"},
                     {"n/a", "000000"},
                     {"N/A.1", "000101"},
@@ -240,7 +240,7 @@ TEST(FormatVersionTest, NegativeComponentsTakeEightDigits) {
                     {"-256.-512.-0", "000000"}});
 }
 
-TEST(FormatVersionTest, WhiteSpaceAndCarriageReturnsAreNoPartOfTheNumbers) {
+TEST(FormatVersionTest, WhiteSpaceAndCarriageReturnsAreNotPartOfTheNumbers) {
     expectVersions({{" 1 . 2 . 3 ", "010203"}, {"1.2.3\r", "010203"}, {"\t1.\t2.\t3\t", "010203"}});
 }
 
@@ -249,7 +249,7 @@ TEST(FormatVersionTest, ZeroByteEndsANumberAndNotTheText) {
     EXPECT_EQ(formatVersion({'1', '.', '2', '\0', '9', '.', '3', '\0', '9'}), "010203");
 }
 
-TEST(FormatVersionTest, LongTextsAreWhole) {
+TEST(FormatVersionTest, LongTextsAreReadWhole) {
     const std::string tail(100000, 'x');
     const std::string text = "1" + tail + ".2" + tail + ".3" + tail;
     EXPECT_EQ(formatVersion(text), "010203");

@@ -25,7 +25,7 @@ TEST_F(VersionSelectionTest, NamesWithoutTheMarkerAreIgnored) {
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
-TEST_F(VersionSelectionTest, FilesInSubfoldersAreNotLookedAt) {
+TEST_F(VersionSelectionTest, FilesInSubfoldersAreIgnored) {
     std::filesystem::create_directories(pathOf("sub"));
     put("sub/app.inf", description("Application", "1.2.3"));
     EXPECT_EQ(findApplicationVersion(), "");
@@ -100,7 +100,7 @@ TEST_F(VersionSelectionTest, ListingOrderHoldsForNamesInAscendingAndDescendingOr
     }
 }
 
-TEST_F(VersionSelectionTest, LowerVersionListedFirstWinsAllTheSame) {
+TEST_F(VersionSelectionTest, LowerVersionWinsWhenListedFirst) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), description("Application", "1.0.0"));
     put(listed.at(1), description("Application", "9.0.0"));
@@ -110,7 +110,7 @@ TEST_F(VersionSelectionTest, LowerVersionListedFirstWinsAllTheSame) {
     EXPECT_EQ(findApplicationVersion(), "9.0.0");
 }
 
-TEST_F(VersionSelectionTest, FilesOfOtherTypesArePassedOver) {
+TEST_F(VersionSelectionTest, FilesOfOtherTypesAreSkipped) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf", "z.inf"});
     put(listed.at(0), description("Bootloader", "1.0.0"));
     put(listed.at(1), "Version Number=2.0.0\n");
@@ -118,7 +118,7 @@ TEST_F(VersionSelectionTest, FilesOfOtherTypesArePassedOver) {
     EXPECT_EQ(findApplicationVersion(), "3.0.0");
 }
 
-TEST_F(VersionSelectionTest, FirstMatchEndsTheWalkEvenWithoutAVersion) {
+TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithoutAVersion) {
     for (const char* content :
          {"Type=Application\n", "Type=Application\nVersion Number=\n",
           "Type=Application\nVersion Number=   \n", "Type=Application\nVersion Number=TAG_\n"}) {
@@ -132,7 +132,7 @@ TEST_F(VersionSelectionTest, FirstMatchEndsTheWalkEvenWithoutAVersion) {
     }
 }
 
-TEST_F(VersionSelectionTest, FirstMatchEndsTheWalkEvenWithThePlaceholder) {
+TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithThePlaceholder) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), description("Application", "N/A"));
     put(listed.at(1), description("Application", "1.2.3"));
@@ -140,7 +140,7 @@ TEST_F(VersionSelectionTest, FirstMatchEndsTheWalkEvenWithThePlaceholder) {
     EXPECT_EQ(softwareVersion(), "000000");
 }
 
-TEST_F(VersionSelectionTest, EachFileHasARecordOfItsOwn) {
+TEST_F(VersionSelectionTest, EachFileHasItsOwnRecord) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), "Version Number=1.2.3\n");
     put(listed.at(1), "Type=Application\n");
@@ -150,7 +150,7 @@ TEST_F(VersionSelectionTest, EachFileHasARecordOfItsOwn) {
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
-TEST_F(VersionSelectionTest, FoldersAndDanglingLinksOfTheMarkerAreHarmless) {
+TEST_F(VersionSelectionTest, FoldersAndDanglingLinksWithTheMarkerAreHarmless) {
     std::filesystem::create_directory(pathOf("x.inf"));
     std::filesystem::create_symlink("/tmp/nowhere", pathOf("y.inf"));
     std::filesystem::create_symlink(pathOf("z.inf"), pathOf("z.inf"));

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Memory that runs out, at every moment of a run: the defaults stand in, and nothing is said.
+// Memory runs out at every moment of a run: defaults are used, and nothing is printed.
 #include "main/options.h"
 #include "tests/support/accepted_outputs.h"
 #include "tests/support/failing_memory.h"
@@ -23,12 +23,12 @@ protected:
         char name[] = "orvane";
         char both[] = "-ai";
         char* arguments[] = {name, both, nullptr};
-        optind = 0; // glibc's getopt begins anew
+        optind = 0; // makes glibc's getopt start again
         return runOptions(2, arguments);
     }
 
-    /// Whether a stream takes memory before it is opened, as libc++'s does. Then a file may be left
-    /// out when there is none.
+    /// Whether a stream allocates memory before it is opened, as libc++'s does. Then a file may be
+    /// left out when there is none.
     static bool streamsNeedMemory() {
         const FailingMemory memory(1, Shortage::once);
         try {
@@ -80,7 +80,7 @@ TEST_F(MemoryTest, MemoryMayRunOutForGoodAtEveryMoment) {
     failAtEveryMoment(Shortage::forGood);
 }
 
-TEST_F(MemoryTest, WithEnoughMemoryNoDefaultStandsIn) {
+TEST_F(MemoryTest, NoDefaultIsUsedWithEnoughMemory) {
     EXPECT_EQ(runEverything(), 0);
     EXPECT_NE(readFile("/tmp/airplay.conf").find(LONG_MODEL), std::string::npos);
     EXPECT_NE(readFile("/tmp/iap2.cfg").find(LONG_VERSION), std::string::npos);

@@ -29,8 +29,8 @@ protected:
         writeFile(AIRPLAY_STOCK, "stock = 1\n");
     }
 
-    /// Runs the program's options with these arguments behind its name,
-    /// expects the result 0, and returns what was said.
+    /// Runs the program's options with these arguments, expects the result 0, and returns what was
+    /// printed.
     static std::string run(std::vector<std::string> arguments) {
         arguments.insert(arguments.begin(), "orvane");
         std::vector<char*> pointers;
@@ -39,7 +39,7 @@ protected:
         }
         pointers.push_back(nullptr);
         const std::vector<char*> asGiven = pointers;
-        optind = 0; // glibc's getopt starts anew
+        optind = 0; // makes glibc's getopt start again
         StandardStreams streams;
         const int result = runOptions(static_cast<int>(arguments.size()), pointers.data());
         std::string said = streams.stop();
@@ -64,7 +64,7 @@ protected:
 
 } // namespace
 
-TEST_F(OptionsTest, NoneDoesNothing) {
+TEST_F(OptionsTest, NoOptionsDoNothing) {
     EXPECT_EQ(expectFiles({}, NOTHING), "");
 }
 
@@ -90,7 +90,7 @@ TEST_F(OptionsTest, BothLettersRunBothWriters) {
 }
 
 TEST_F(OptionsTest, WritersRunInTheOrderOfTheLetters) {
-    // Two outputs are one file, so that the last writer's stays.
+    // Two outputs are one file, so that the last writer's content stays.
     std::filesystem::create_symlink(IAP1_OUTPUT, AIRPLAY_OUTPUT);
     for (const std::vector<std::string>& airplayFirst :
          std::vector<std::vector<std::string>>{{"-ai"}, {"-a", "-i"}, {"-iai"}}) {
@@ -107,8 +107,8 @@ TEST_F(OptionsTest, WritersRunInTheOrderOfTheLetters) {
 TEST_F(OptionsTest, RepeatedLetterARunsItsWriterAgain) {
     for (const std::vector<std::string>& arguments :
          std::vector<std::vector<std::string>>{{"-aa"}, {"-a", "-a"}}) {
-        // The output is the image, so that the second run reads its values from the first's text:
-        // the drive side from a blank, the profile from a line end and a '#'.
+        // The output is the image, so that the second run reads its values from the text of the
+        // first: the drive side from a blank, the profile from a line end and a '#'.
         writeImage(std::string(179, '\0'));
         remove(AIRPLAY_OUTPUT);
         std::filesystem::create_symlink(IMAGE_PATH, AIRPLAY_OUTPUT);
@@ -123,7 +123,7 @@ TEST_F(OptionsTest, RepeatedLetterARunsItsWriterAgain) {
 TEST_F(OptionsTest, RepeatedLetterIRunsItsWriterAgain) {
     for (const std::vector<std::string>& arguments :
          std::vector<std::vector<std::string>>{{"-ii"}, {"-i", "-i"}}) {
-        // One output is the version file, so that the second run finds the first's text there.
+        // One output is the version file, so that the second run finds the text of the first there.
         setVersion("1.2.3");
         remove(IAP2_OUTPUT);
         std::filesystem::create_symlink(VERSION_FILE, IAP2_OUTPUT);
@@ -134,7 +134,7 @@ TEST_F(OptionsTest, RepeatedLetterIRunsItsWriterAgain) {
     }
 }
 
-TEST_F(OptionsTest, UnknownLetterIsTheLibrarysToName) {
+TEST_F(OptionsTest, UnknownLetterIsNamedByTheLibrary) {
     const std::string said = expectFiles({"-x"}, NOTHING);
     EXPECT_EQ(said.rfind("orvane: ", 0), 0U) << said;
     EXPECT_NE(said.find('x', 8), std::string::npos) << said;
@@ -152,7 +152,7 @@ TEST_F(OptionsTest, EveryOtherCharacterIsUnknown) {
     }
 }
 
-TEST_F(OptionsTest, UnknownLetterStopsNoLaterOne) {
+TEST_F(OptionsTest, UnknownLetterDoesNotStopLaterOnes) {
     EXPECT_NE(expectFiles({"-x", "-a"}, AIRPLAY_FILE), "");
     EXPECT_NE(expectFiles({"-xa"}, AIRPLAY_FILE), "");
     EXPECT_NE(expectFiles({"-xi"}, IAP_FILES), "");
@@ -183,7 +183,7 @@ TEST_F(OptionsTest, DoubleDashEndsTheOptions) {
     EXPECT_EQ(expectFiles({"-i", "--", "-a"}, IAP_FILES), "");
 }
 
-TEST_F(OptionsTest, NameOfTheProgramIsNoOption) {
+TEST_F(OptionsTest, ProgramNameIsNotAnOption) {
     putFolder("/tmp");
     char name[] = "-a";
     char* const arguments[] = {name, nullptr};
@@ -199,7 +199,7 @@ TEST_F(OptionsTest, NoArgumentVectorDoesNothing) {
     EXPECT_EQ(folderNames("/tmp"), NOTHING);
 }
 
-TEST_F(OptionsTest, FailureOfTheWritersIsNoneOfTheProgram) {
+TEST_F(OptionsTest, FailureOfTheWritersIsNotAFailureOfTheProgram) {
     for (const char* path : {"/fs", "/dev", "/tmp"}) {
         remove(path);
     }
@@ -207,7 +207,7 @@ TEST_F(OptionsTest, FailureOfTheWritersIsNoneOfTheProgram) {
     EXPECT_TRUE(std::filesystem::is_empty("/"));
 }
 
-TEST_F(OptionsTest, StockFilesAreInstalledInSilence) {
+TEST_F(OptionsTest, StockFilesAreInstalledSilently) {
     remove(AIRPLAY_TEMPLATE);
     remove(DEVICE_TEMPLATE);
     remove(IAP2_TEMPLATE);

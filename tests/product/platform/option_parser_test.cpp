@@ -14,25 +14,25 @@ namespace orvane::test {
 
 namespace {
 
-/// Holds back what goes to the standard error stream while it lives.
-class HeldStandardError {
+/// Captures the standard error stream while it lives.
+class CapturedStandardError {
 public:
-    HeldStandardError() : former_(dup(STDERR_FILENO)) {
+    CapturedStandardError() : former_(dup(STDERR_FILENO)) {
         if (former_ == -1 || pipe2(ends_.data(), O_CLOEXEC | O_NONBLOCK) != 0 ||
             dup2(ends_[1], STDERR_FILENO) == -1) {
             std::abort();
         }
     }
-    ~HeldStandardError() {
+    ~CapturedStandardError() {
         dup2(former_, STDERR_FILENO);
         close(former_);
         close(ends_[0]);
         close(ends_[1]);
     }
-    HeldStandardError(const HeldStandardError&) = delete;
-    HeldStandardError& operator=(const HeldStandardError&) = delete;
+    CapturedStandardError(const CapturedStandardError&) = delete;
+    CapturedStandardError& operator=(const CapturedStandardError&) = delete;
 
-    /// What has come since the last call.
+    /// What was written since the last call.
     std::string text() const {
         std::string said(4096, '\0');
         const ssize_t length = read(ends_[0], said.data(), said.size());
@@ -45,7 +45,7 @@ private:
     std::array<int, 2> ends_{};
 };
 
-/// A command line as main gets it.
+/// A command line as `main` gets it.
 class CommandLine {
 public:
     explicit CommandLine(std::vector<std::string> words) : words_(std::move(words)) {
@@ -57,7 +57,7 @@ public:
     int argc() const { return static_cast<int>(words_.size()); }
     char* const* argv() const { return argv_.data(); }
 
-    /// The words in the order in which the parser has left them.
+    /// The words in the order in which the parser left them.
     std::vector<std::string> words() const { return {argv_.begin(), argv_.end() - 1}; }
 
 private:
@@ -81,7 +81,7 @@ protected:
     }
     ~OptionParserTest() override { reset(); }
 
-    /// Begins anew: 0 makes this C library forget where it was, inside a word as well.
+    /// Starts again: 0 makes this C library forget its position, even inside a word.
     static void reset() {
         optind = 0;
         opterr = 1;
@@ -90,8 +90,8 @@ protected:
     static Parsed parse(const CommandLine& line, const char* letters = "ia") {
         reset();
         Parsed parsed;
-        const HeldStandardError held;
-        while (parsed.letters.size() < 100) { // a parser that never ends is a failure, not a hang
+        const CapturedStandardError held;
+        while (parsed.letters.size() < 100) { // a parser that never ends fails and does not hang
             const int letter = platform::nextOption(line.argc(), line.argv(), letters);
             if (letter == -1) {
                 break;
@@ -171,7 +171,7 @@ TEST_F(OptionParserTest, EmptyWordIsAnOperand) {
     EXPECT_EQ(1, parsed.next);
 }
 
-TEST_F(OptionParserTest, EndStaysTheEnd) {
+TEST_F(OptionParserTest, EndIsFinal) {
     const CommandLine line({"orvane", "-a", "word", "-i"});
     EXPECT_EQ('a', platform::nextOption(line.argc(), line.argv(), "ia"));
     for (int call = 0; call < 3; ++call) {
@@ -197,7 +197,7 @@ TEST_F(OptionParserTest, DiagnosticIsTheCLibrarysOwn) {
         std::string expected;
         {
             reset();
-            const HeldStandardError held;
+            const CapturedStandardError held;
             while (getopt(line.argc(), line.argv(), "ia") != -1) {
             }
             expected = held.text();
@@ -209,7 +209,7 @@ TEST_F(OptionParserTest, DiagnosticIsTheCLibrarysOwn) {
 
 TEST_F(OptionParserTest, DiagnosticComesWithTheLetterItIsAbout) {
     const CommandLine line({"orvane", "-x", "-a", "-y"});
-    const HeldStandardError held;
+    const CapturedStandardError held;
     EXPECT_EQ('?', platform::nextOption(line.argc(), line.argv(), "ia"));
     EXPECT_NE("", held.text());
     EXPECT_EQ('a', platform::nextOption(line.argc(), line.argv(), "ia"));
@@ -227,7 +227,7 @@ TEST_F(OptionParserTest, SignsThatSteerTheCLibraryAreUnknownLetters) {
     }
 }
 
-TEST_F(OptionParserTest, LettersAreTheCallers) {
+TEST_F(OptionParserTest, LettersAreChosenByTheCaller) {
     EXPECT_EQ("x??x", parse(CommandLine({"orvane", "-xaix"}), "x").letters);
     EXPECT_EQ("?", parse(CommandLine({"orvane", "-a"}), "").letters);
     EXPECT_EQ("abcdefghijklmn?",
@@ -241,7 +241,7 @@ TEST_F(OptionParserTest, ClusterIsFollowedAcrossCalls) {
     }
 }
 
-TEST_F(OptionParserTest, AnswersWithTheEnvironmentAskingForPosixAsWell) {
+TEST_F(OptionParserTest, WorksWithPosixlyCorrectSetToo) {
     ASSERT_EQ(0, setenv("POSIXLY_CORRECT", "1", 1));
     EXPECT_EQ("a", parse(CommandLine({"orvane", "-a", "word", "-i"})).letters);
     unsetenv("POSIXLY_CORRECT");

@@ -51,7 +51,7 @@ TEST_F(SharedMemoryTest, NameWithInnerSlashesIsOpenedAsThatPath) {
     EXPECT_EQ("0123456789", content);
 }
 
-TEST_F(SharedMemoryTest, AbsentObjectFailsAndIsNotMade) {
+TEST_F(SharedMemoryTest, AbsentObjectFailsAndIsNotCreated) {
     remove(OBJECT);
     EXPECT_EQ(-1, platform::openSharedMemory(OBJECT, O_RDONLY, 0640));
     EXPECT_EQ(ENOENT, errno);
@@ -63,26 +63,26 @@ TEST_F(SharedMemoryTest, AbsentFolderFails) {
     EXPECT_EQ(ENOENT, errno);
 }
 
-TEST_F(SharedMemoryTest, FileInThePlaceOfAFolderFails) {
+TEST_F(SharedMemoryTest, FileInPlaceOfAFolderFails) {
     EXPECT_EQ(-1, platform::openSharedMemory("/fs/tmpfs/an/object/inner", O_RDONLY, 0640));
     EXPECT_EQ(ENOTDIR, errno);
 }
 
 // A name without inner slashes is where the C library keeps such objects.
 
-TEST_F(SharedMemoryTest, ObjectThatTheCLibraryMadeIsFound) {
+TEST_F(SharedMemoryTest, ObjectMadeByTheCLibraryIsFound) {
     std::filesystem::create_directories("/dev/shm");
     const kit::Descriptor made(shm_open("/flat", O_RDWR | O_CREAT | O_EXCL, 0640));
     ASSERT_TRUE(made.isOpen());
     ASSERT_EQ(3, write(made.number(), "abc", 3));
-    errno = EINVAL; // of an earlier failure, which has no say here
+    errno = EINVAL; // from an earlier failure, which must not matter
     const kit::Descriptor object(platform::openSharedMemory("/flat", O_RDONLY, 0640));
     std::string content = "....";
     EXPECT_EQ(3, read(object.number(), content.data(), content.size()));
     EXPECT_EQ("abc.", content);
 }
 
-TEST_F(SharedMemoryTest, ObjectThatTheCLibraryHasNotFails) {
+TEST_F(SharedMemoryTest, ObjectUnknownToTheCLibraryFails) {
     std::filesystem::create_directories("/dev/shm");
     writeFile("/flat", "a file of the same name");
     EXPECT_EQ(-1, platform::openSharedMemory("/flat", O_RDONLY, 0640));
@@ -101,7 +101,7 @@ TEST_F(SharedMemoryTest, NoFreeDescriptorFails) {
     EXPECT_EQ(EMFILE, error);
 }
 
-TEST_F(SharedMemoryTest, FlagsDecideOnTheDirection) {
+TEST_F(SharedMemoryTest, FlagsChooseTheDirection) {
     const kit::Descriptor forReading = openObject(OBJECT, O_RDONLY);
     EXPECT_EQ(O_RDONLY, fcntl(forReading.number(), F_GETFL) & O_ACCMODE);
     EXPECT_EQ(-1, write(forReading.number(), "x", 1));
@@ -111,7 +111,7 @@ TEST_F(SharedMemoryTest, FlagsDecideOnTheDirection) {
     EXPECT_EQ("x123456789", readFile(OBJECT));
 }
 
-TEST_F(SharedMemoryTest, NewObjectIsMadeWithTheMode) {
+TEST_F(SharedMemoryTest, NewObjectHasTheGivenMode) {
     remove(OBJECT);
     ASSERT_TRUE(openObject(OBJECT, O_RDWR | O_CREAT, 0640).isOpen());
     struct stat made {};
@@ -123,18 +123,18 @@ TEST_F(SharedMemoryTest, NewObjectIsMadeWithTheMode) {
     EXPECT_EQ(0604U, made.st_mode & 07777U);
 }
 
-TEST_F(SharedMemoryTest, ExclusiveMakingOfAnObjectThatIsThereFails) {
+TEST_F(SharedMemoryTest, ExclusiveCreationOfAnExistingObjectFails) {
     EXPECT_EQ(-1, platform::openSharedMemory(OBJECT, O_RDWR | O_CREAT | O_EXCL, 0640));
     EXPECT_EQ(EEXIST, errno);
     EXPECT_EQ("0123456789", readFile(OBJECT));
 }
 
-TEST_F(SharedMemoryTest, TruncationIsAskedFor) {
+TEST_F(SharedMemoryTest, ObjectIsTruncatedOnRequest) {
     EXPECT_TRUE(openObject(OBJECT, O_RDWR | O_TRUNC).isOpen());
     EXPECT_EQ("", readFile(OBJECT));
 }
 
-TEST_F(SharedMemoryTest, EveryOpenIsADescriptorOfItsOwn) {
+TEST_F(SharedMemoryTest, EveryOpenHasItsOwnDescriptor) {
     const int before = openDescriptors();
     const kit::Descriptor first = openObject(OBJECT, O_RDONLY);
     const kit::Descriptor second = openObject(OBJECT, O_RDONLY);

@@ -94,7 +94,7 @@ TEST_F(AudioProfileTest, PatternInBlockTwoShowsInTheSpeechFileOnly) {
 }
 
 TEST_F(AudioProfileTest, TelephonyFileIsWrittenFirst) {
-    // Both names lead to one file: the later writer's content is what remains.
+    // Both names lead to one file: the later writer's content remains.
     std::filesystem::create_symlink("/tmp/both", TELEPHONY_FILE);
     std::filesystem::create_symlink("/tmp/both", SPEECHREC_FILE);
     setProfile(0xFFFF);
@@ -102,8 +102,8 @@ TEST_F(AudioProfileTest, TelephonyFileIsWrittenFirst) {
     EXPECT_EQ(headerOf("/tmp/both"), SPEECHREC_HEADER);
 }
 
-TEST_F(AudioProfileTest, TelephonyFileIsCompleteAndTheDiskReadAgainForTheNext) {
-    // The first file takes the place of the disk, which is too short for any block then.
+TEST_F(AudioProfileTest, TelephonyFileIsCompleteBeforeTheDiskIsReadAgain) {
+    // The first file replaces the disk, which is then too short for any block.
     setBlock(3, 10, "\x33");
     setBlock(2, 10, "\x22");
     std::filesystem::create_symlink(DISK_PATH, TELEPHONY_FILE);
@@ -128,7 +128,7 @@ TEST_F(AudioProfileTest, ImageThatCannotBeMappedIsAnUnknownProfile) {
     expectUnknownProfile();
 }
 
-TEST_F(AudioProfileTest, ShortImageIsReadPastItsEndAsItsPageStands) {
+TEST_F(AudioProfileTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(std::string(134, '\xFF'));
     EXPECT_EQ(getAudioProfile(), 255);
     expectNoTuningFiles();
@@ -144,7 +144,7 @@ TEST_F(AudioProfileTest, ProfileIsKnownEvenWhenNeitherFileCanBeWritten) {
     EXPECT_FALSE(exists("/tmp"));
 }
 
-TEST_F(AudioProfileTest, OneFileThatCannotBeWrittenDoesNotKeepTheOther) {
+TEST_F(AudioProfileTest, FileThatCannotBeWrittenDoesNotStopTheOther) {
     setProfile(0xFFFF);
     putFolder(TELEPHONY_FILE);
     EXPECT_EQ(getAudioProfile(), 65535);
@@ -185,7 +185,7 @@ TEST_F(AudioProfileTest, FilesOfAnEarlierRunStayWithAnyOtherProfile) {
     EXPECT_EQ(readFile(SPEECHREC_FILE), "speech");
 }
 
-TEST_F(AudioProfileTest, EachCallReadsTheImageAfresh) {
+TEST_F(AudioProfileTest, EachCallReadsTheImageAgain) {
     setProfile(5);
     EXPECT_EQ(getAudioProfile(), 5);
     remove(IMAGE_PATH);
@@ -206,7 +206,7 @@ TEST_F(AudioProfileTest, ImageIsClosedBeforeTheDiskAndTheFilesAreOpened) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 34");
 }
 
-TEST_F(AudioProfileTest, NoDescriptorOutlivesTheLookup) {
+TEST_F(AudioProfileTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     setProfile(0xFFFF);
     EXPECT_EQ(getAudioProfile(), 65535);

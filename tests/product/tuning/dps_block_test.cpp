@@ -13,7 +13,7 @@
 namespace orvane::test {
 namespace {
 
-/// A block of these bytes from `offset` on, the others zero.
+/// A block with these bytes from `offset` on and zeros elsewhere.
 DpsBlock blockWith(std::size_t offset, std::initializer_list<std::uint8_t> bytes) {
     DpsBlock block{};
     std::size_t place = offset;
@@ -78,7 +78,7 @@ TEST(DpsBlockTest, ElementsTakeOneByteOrTwo) {
     EXPECT_EQ(dpsElementSize(DpsEncoding::i16), 2U);
 }
 
-TEST(DpsLayoutTest, RowsAreTheExpectedOnes) {
+TEST(DpsLayoutTest, RowsAreAsExpected) {
     ASSERT_EQ(DPS_FIELD_COUNT, 44U);
     ASSERT_EQ(DPS_LAYOUT.size(), EXPECTED_FIELD_COUNT);
     for (std::size_t row = 0; row < EXPECTED_FIELD_COUNT; ++row) {
@@ -138,8 +138,8 @@ std::size_t longestWord(const std::array<QwaWord, 3>& words) {
     return longest;
 }
 
-/// Key, blank, value, line end: what tuning_file.cpp has room for.
-TEST(DpsLayoutTest, NoLineIsLongerThanItsRoom) {
+/// Key, blank, value, line end: tuning_file.cpp has room for that much.
+TEST(DpsLayoutTest, EveryLineFitsItsBuffer) {
     std::size_t longest = 0;
     for (const DpsField& field : DPS_LAYOUT) {
         std::size_t value = std::strlen("-32768");
@@ -177,7 +177,7 @@ TEST(DecodeFieldTest, OnesDecodeToTheHighestCodeOrMinusOne) {
     }
 }
 
-TEST(DecodeFieldTest, FourCodesShareAByteFromItsLowestBitsOn) {
+TEST(DecodeFieldTest, FourCodesShareAByteFromTheLowestBitsUp) {
     const DpsBlock block = blockWith(0, {0xE4});
     EXPECT_EQ(decoded("qwaAECSwitch", block), 0);
     EXPECT_EQ(decoded("qwaAGCSwitch", block), 1);
@@ -252,7 +252,7 @@ TEST(QwaWordTest, CodesOneToThreeHaveAWord) {
     EXPECT_STREQ(qwaWord(qwaModeWords, 3), "qwaCombined");
 }
 
-TEST(QwaWordTest, OtherCodesHaveNone) {
+TEST(QwaWordTest, OtherCodesHaveNoWord) {
     for (const std::int32_t code :
          {0, 4, -1, -2, -3, 6, 255, 256, 257, 258, 259, 0x10001, INT_MAX, INT_MIN}) {
         EXPECT_STREQ(qwaWord(qwaSwitchWords, code), "") << code;

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The layout of a tuning block, written down a second time and in other words, for comparison with
-// the product's table.
+// A second, independent form of the layout of a tuning block, to compare with the product's table.
 #pragma once
 
 #include "tuning/dps_block.h"
@@ -70,7 +69,7 @@ constexpr DpsField EXPECTED_LAYOUT[] = {
 
 constexpr std::size_t EXPECTED_FIELD_COUNT = sizeof(EXPECTED_LAYOUT) / sizeof(EXPECTED_LAYOUT[0]);
 
-/// Bits of the block that no field has: by byte, a mask.
+/// Bits of the block that belong to no field: a mask for each byte.
 struct UnreadBits {
     std::size_t first;
     std::size_t last;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What each field of a block makes of its line.
+// The line that each field of a block gives.
 #include "tests/product/tuning/expected_layout.h"
 #include "tests/product/tuning/tuning_test.h"
 
@@ -32,7 +32,7 @@ protected:
         return kind == DpsKind::modeWord ? modes[code] : switches[code];
     }
 
-    /// The line of a field whose element `element` is `value`, all others zero.
+    /// The line of a field whose element `element` is `value`; all others are zero.
     static std::string expectedLine(const DpsField& field, std::size_t element,
                                     std::int32_t value) {
         std::string line = std::string(field.key) + " ";
@@ -46,8 +46,8 @@ protected:
                (field.kind == DpsKind::number ? std::to_string(value) : wordOf(field.kind, value));
     }
 
-    /// Fails unless setting these bytes of a block of zeros gives that field's line and leaves all
-    /// others as they are.
+    /// Fails unless setting these bytes in a block of zeros gives that field's line and changes no
+    /// other.
     static void expectOnlyLine(std::size_t row, const std::string& line, std::size_t offset,
                                const std::string& bytes) {
         std::vector<std::string> expected = splitLines(renderedWith(0, std::string(1, '\0')));
@@ -160,19 +160,19 @@ TEST_F(TuningFileFieldsTest, WideNumbersAreSignedAndBytesAreNot) {
     EXPECT_EQ(lineWith("qwaHFEExtent", 10, "\xFF"), "qwaHFEExtent 255");
 }
 
-TEST_F(TuningFileFieldsTest, NamesThatSayEnableAreNumbersAllTheSame) {
+TEST_F(TuningFileFieldsTest, FieldsNamedEnableAreNumbersToo) {
     EXPECT_EQ(lineWith("qwaDNSEnable", 167, "\x34\x12"), "qwaDNSEnable 4660");
     EXPECT_EQ(lineWith("qwaDNSEnable", 167, littleEndian(1)), "qwaDNSEnable 1");
     EXPECT_EQ(lineWith("qwaMEQEnable", 171, littleEndian(2)), "qwaMEQEnable 2 0 0 0 ");
 }
 
-TEST_F(TuningFileFieldsTest, ListElementsHaveOneSpaceBehindEach) {
+TEST_F(TuningFileFieldsTest, EachListElementIsFollowedByASpace) {
     const std::string bytes =
         littleEndian(1) + littleEndian(-2) + littleEndian(3) + littleEndian(0) + littleEndian(5);
     EXPECT_EQ(lineWith("qwaNCParams", 13, bytes), "qwaNCParams 1 -2 3 0 5 ");
 }
 
-TEST_F(TuningFileFieldsTest, ReceiveAndSendListsStandInTheirDifferentOrders) {
+TEST_F(TuningFileFieldsTest, ReceiveAndSendListsHaveDifferentOrders) {
     const std::vector<std::string> lines = splitLines(rendered(2));
     ASSERT_EQ(lines.size(), 45U);
     EXPECT_EQ(lines.at(25), "qwaRecvAGCAmpTgts 0 0 ");

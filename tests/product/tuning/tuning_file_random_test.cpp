@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Blocks of arbitrary bytes against a second decoder, which has no table: one statement for each
-// line of the file.
+// Compares blocks of arbitrary bytes with a second decoder, which has no table: one statement for
+// each line of the file.
 #include "tests/product/tuning/tuning_test.h"
 
 #include <random>
@@ -105,7 +105,7 @@ std::mt19937 numbersFrom(std::mt19937::result_type seed) {
     return std::mt19937(seed);
 }
 
-/// Arbitrary bytes; in every second block the wide switches have codes near their words.
+/// Arbitrary bytes; in every second block the wide switches have codes near those with words.
 std::string randomBlock(std::mt19937& engine, bool hasWords) {
     std::string block(BLOCK_SIZE, '\0');
     for (char& byte : block) {

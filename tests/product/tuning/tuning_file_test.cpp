@@ -12,7 +12,7 @@ namespace orvane::test {
 
 constexpr char OLD_CONTENT[] = "what an earlier run wrote\n";
 
-/// A whole file but for the number in its header: the lines of a block of zeros.
+/// A whole file except for the number in its header: the lines of a block of zeros.
 constexpr char LINES_OF_ZEROS[] = "qwaAECSwitch \n"
                                   "qwaAGCSwitch \n"
                                   "qwaDiagSwitch \n"
@@ -64,7 +64,7 @@ protected:
         return "; Genereated config from DPS (blockId " + std::to_string(blockId) + ")\n" +
                LINES_OF_ZEROS;
     }
-    /// Permission bits of a file that is made under `mask`.
+    /// Permission bits of a file that is created under `mask`.
     static mode_t modeUnder(mode_t mask) {
         remove(ANY_TUNING_FILE);
         const mode_t former = umask(mask);
@@ -145,7 +145,7 @@ TEST_F(TuningFileTest, DeviceThatCannotBeReadIsRenderedAsZeros) {
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
-TEST_F(TuningFileTest, EachCallReadsTheDeviceAfresh) {
+TEST_F(TuningFileTest, EachCallReadsTheDeviceAgain) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     EXPECT_EQ(lineOf(rendered(2), "qwaHFEExtent"), "qwaHFEExtent 85");
     setBlock(2, 10, "\x07");
@@ -181,7 +181,7 @@ TEST_F(TuningFileTest, RepeatedCallGivesTheSameFile) {
     EXPECT_EQ(rendered(2), first);
 }
 
-TEST_F(TuningFileTest, FileIsMadeForAllToReadAndWriteLessTheMask) {
+TEST_F(TuningFileTest, NewFileHasMode666LessTheMask) {
     EXPECT_EQ(modeUnder(0), 0666U);
     EXPECT_EQ(modeUnder(022), 0644U);
     EXPECT_EQ(modeUnder(077), 0600U);
@@ -193,7 +193,7 @@ TEST_F(TuningFileTest, LinkIsWrittenThrough) {
     EXPECT_EQ(readFile("/tmp/target.txt"), fileOfZeros(2));
 }
 
-TEST_F(TuningFileTest, FileThatCannotBeOpenedIsPassedOver) {
+TEST_F(TuningFileTest, FileThatCannotBeOpenedIsSkipped) {
     putFolder("/tmp/folder.txt");
     std::filesystem::create_symlink("/tmp/loop.txt", "/tmp/loop.txt");
     std::filesystem::create_symlink("/nowhere/target.txt", "/tmp/dangling.txt");
@@ -217,13 +217,13 @@ TEST_F(TuningFileTest, OlderFileStaysWhenItCannotBeOpened) {
     EXPECT_EQ(readFile(ANY_TUNING_FILE), OLD_CONTENT);
 }
 
-TEST_F(TuningFileTest, FolderThatMayNotBeWrittenGetsNoFile) {
+TEST_F(TuningFileTest, ReadOnlyFolderGetsNoFile) {
     writeFile("/tmp/old.txt", OLD_CONTENT);
     std::filesystem::permissions("/tmp/old.txt", std::filesystem::perms::owner_read);
     std::filesystem::permissions("/tmp", std::filesystem::perms::owner_read |
                                              std::filesystem::perms::owner_exec);
     {
-        const PermissionsHold permissionsHold;
+        const EnforcedPermissions permissionsHold;
         generateTuningFile(2, ANY_TUNING_FILE);
         generateTuningFile(2, "/tmp/old.txt");
     }
@@ -232,7 +232,7 @@ TEST_F(TuningFileTest, FolderThatMayNotBeWrittenGetsNoFile) {
     EXPECT_EQ(readFile("/tmp/old.txt"), OLD_CONTENT);
 }
 
-TEST_F(TuningFileTest, WriteErrorsAreNotNoticed) {
+TEST_F(TuningFileTest, WriteErrorsAreIgnored) {
     for (const std::size_t room : {0U, 1U, 39U, 40U, 100U, 800U}) {
         SCOPED_TRACE(room);
         const int before = openDescriptors();
@@ -254,7 +254,7 @@ TEST_F(TuningFileTest, OnlyOneFileIsOpenAtATime) {
     EXPECT_EQ(lineOf(readFile(ANY_TUNING_FILE), "qwaHFEExtent"), "qwaHFEExtent 7");
 }
 
-TEST_F(TuningFileTest, NoDescriptorOutlivesTheCall) {
+TEST_F(TuningFileTest, LeavesNoDescriptorOpen) {
     const int before = openDescriptors();
     EXPECT_EQ(rendered(2), fileOfZeros(2));
     generateTuningFile(2, "/nowhere/tuning.txt");

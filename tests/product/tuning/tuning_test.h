@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Tests on the disk's tuning blocks and on the tuning files made of them.
+// For tests of the disk's tuning blocks and of the tuning files made from them.
 #pragma once
 
 #include "tests/support/unit_test.h"
@@ -15,7 +15,7 @@ namespace orvane::test {
 constexpr std::uint64_t TUNING_AREA_BEFORE_END = 0xFF000;
 /// Bytes of one block.
 constexpr std::size_t BLOCK_SIZE = 188;
-/// Where a test that wants any output file has it written.
+/// The output file of tests to which its name does not matter.
 constexpr char ANY_TUNING_FILE[] = "/tmp/tuning.txt";
 
 inline std::vector<std::string> splitLines(const std::string& text) {
@@ -47,12 +47,12 @@ protected:
     static void setBlock(unsigned blockId, std::size_t offset, const std::string& bytes) {
         setDiskFromEnd(TUNING_AREA_BEFORE_END - blockId * BLOCK_SIZE - offset, bytes);
     }
-    /// The tuning file of a block as the disk stands.
+    /// The tuning file of a block on the disk.
     static std::string rendered(std::int32_t blockId) {
         generateTuningFile(blockId, ANY_TUNING_FILE);
         return readFile(ANY_TUNING_FILE);
     }
-    /// The tuning file of a block of these bytes, the others zero.
+    /// The tuning file of a block with these bytes and zeros elsewhere.
     static std::string renderedWith(std::size_t offset, const std::string& bytes) {
         setBlock(4, 0, std::string(BLOCK_SIZE, '\0'));
         setBlock(4, offset, bytes);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The AirPlay file where it can't be generated.
+// The AirPlay file when it can't be generated.
 #include "tests/product/writers/airplay_unit.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/permissions.h"
@@ -60,7 +60,7 @@ TEST_F(AirplayFallbackTest, StockFileGoesThroughASymlink) {
     EXPECT_EQ(readFile("/fs/rwdata/airplay"), "stock = 1\n");
 }
 
-TEST_F(AirplayFallbackTest, TemplateThatIsNoFileAtAllInstallsTheStockFile) {
+TEST_F(AirplayFallbackTest, DanglingLinkAsATemplateInstallsTheStockFile) {
     for (const char* target : {"/fs/mp/etc/airplay_static.conf", "/fs/missing/template"}) {
         SCOPED_TRACE(target);
         remove(AIRPLAY_TEMPLATE);
@@ -70,10 +70,10 @@ TEST_F(AirplayFallbackTest, TemplateThatIsNoFileAtAllInstallsTheStockFile) {
     }
 }
 
-TEST_F(AirplayFallbackTest, TemplateThatMayNotBeReadInstallsTheStockFile) {
+TEST_F(AirplayFallbackTest, TemplateWithoutReadPermissionInstallsTheStockFile) {
     ASSERT_EQ(chmod(AIRPLAY_TEMPLATE, 0), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateAirplayConfigFile();
     }
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "stock = 1\n");
@@ -94,7 +94,7 @@ TEST_F(AirplayFallbackTest, MissingTemplateAndStockFileEmptyAnOlderOutput) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
-TEST_F(AirplayFallbackTest, StockFileThatYieldsNothingLeavesAnEmptyOutput) {
+TEST_F(AirplayFallbackTest, StockFileWithoutContentLeavesAnEmptyOutput) {
     remove(AIRPLAY_TEMPLATE);
     writeFile(AIRPLAY_STOCK, "");
     updateAirplayConfigFile();
@@ -104,7 +104,7 @@ TEST_F(AirplayFallbackTest, StockFileThatYieldsNothingLeavesAnEmptyOutput) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
-TEST_F(AirplayFallbackTest, TuningFilesStayWrittenAsideTheStockFile) {
+TEST_F(AirplayFallbackTest, TuningFilesAreWrittenBesideTheStockFile) {
     remove(AIRPLAY_TEMPLATE);
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
     updateAirplayConfigFile();
@@ -113,7 +113,7 @@ TEST_F(AirplayFallbackTest, TuningFilesStayWrittenAsideTheStockFile) {
               (std::set<std::string>{"airplay.conf", "speechrec_FFFF.txt", "telephony_FFFF.txt"}));
 }
 
-TEST_F(AirplayFallbackTest, MissingTmpIsNotMade) {
+TEST_F(AirplayFallbackTest, MissingTmpIsNotCreated) {
     remove("/tmp");
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
     EXPECT_EQ(updateAirplayConfigFile(), 0);
@@ -124,7 +124,7 @@ TEST_F(AirplayFallbackTest, ReadOnlyTmpStaysEmpty) {
     ASSERT_EQ(chmod("/tmp", 0555), 0);
     int result = -1;
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         result = updateAirplayConfigFile();
     }
     EXPECT_EQ(result, 0);
@@ -135,13 +135,13 @@ TEST_F(AirplayFallbackTest, ReadOnlyOlderOutputStaysAsItIs) {
     writeFile(AIRPLAY_OUTPUT, "older");
     ASSERT_EQ(chmod(AIRPLAY_OUTPUT, 0444), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateAirplayConfigFile();
     }
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "older");
 }
 
-TEST_F(AirplayFallbackTest, NothingIsPutIntoAnOutputThatIsAFolder) {
+TEST_F(AirplayFallbackTest, OutputThatIsAFolderStaysEmpty) {
     putFolder(AIRPLAY_OUTPUT);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_TRUE(std::filesystem::is_empty(AIRPLAY_OUTPUT));
@@ -149,7 +149,7 @@ TEST_F(AirplayFallbackTest, NothingIsPutIntoAnOutputThatIsAFolder) {
     EXPECT_EQ(readFile(AIRPLAY_STOCK), "stock = 1\n");
 }
 
-TEST_F(AirplayFallbackTest, NothingIsWrittenThroughASymlinkThatLeadsNowhere) {
+TEST_F(AirplayFallbackTest, NothingIsWrittenThroughADanglingLink) {
     std::filesystem::create_symlink("/fs/missing/airplay", AIRPLAY_OUTPUT);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_FALSE(exists("/fs/missing"));
@@ -171,7 +171,7 @@ TEST_F(AirplayFallbackTest, FirstOutputStaysOpenBesideTheCopy) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
-TEST_F(AirplayFallbackTest, UnitWithNothingAtAllIsNoFailure) {
+TEST_F(AirplayFallbackTest, EmptyUnitIsNotAFailure) {
     for (const char* path : {"/fs", "/dev", "/tmp"}) {
         remove(path);
     }

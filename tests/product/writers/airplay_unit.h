@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A unit with the product data of the AirPlay file, and what that file is to hold.
+// A unit with the product data of the AirPlay file, and the expected content of that file.
 #pragma once
 
 #include "tests/support/unit_test.h"
@@ -31,7 +31,7 @@ inline std::string bytes(std::initializer_list<int> values) {
     return text;
 }
 
-/// The variable parts of a generated head, as an image of zeros gives them.
+/// The variable parts of a generated head, as they are with an image of zeros.
 struct AirplayValues {
     std::string model = "VOXA";
     std::string brand = "MARL";
@@ -76,7 +76,7 @@ inline std::string airplayHead(const AirplayValues& values) {
            "\n";
 }
 
-/// The head from an image of zeros, and from no image.
+/// The head with an image of zeros, and without an image.
 inline std::string plainAirplayHead() {
     return airplayHead({});
 }

@@ -17,7 +17,7 @@ namespace {
 
 using AirplayValuesTest = AirplayUnitTest;
 
-/// The head that the unit at hand gets.
+/// The head that a run in this unit generates.
 std::string generatedHead() {
     writeFile(AIRPLAY_TEMPLATE, "@");
     EXPECT_EQ(updateAirplayConfigFile(), 0);
@@ -57,7 +57,7 @@ TEST_F(AirplayValuesTest, WithoutAnImageLeavesTheAudioProfileOut) {
               "static = 1\n");
 }
 
-TEST_F(AirplayValuesTest, EmptyImageCountsAsNone) {
+TEST_F(AirplayValuesTest, EmptyImageCountsAsMissing) {
     writeImage("");
     EXPECT_EQ(generatedHead(), airplayHeadWithoutImage());
 }
@@ -115,7 +115,7 @@ TEST_F(AirplayValuesTest, ModelOutsideTheTableGetsTheWordOfTheIconLabel) {
     }
 }
 
-TEST_F(AirplayValuesTest, EveryValueStandsInItsOwnPlace) {
+TEST_F(AirplayValuesTest, EveryValueIsInItsOwnPlace) {
     setImage(DRIVE_SIDE_OFFSET, bytes({7}));
     setImage(BRAND_OFFSET, bytes({2}));
     setImage(FUEL_TYPE_OFFSET, bytes({1}));
@@ -125,7 +125,7 @@ TEST_F(AirplayValuesTest, EveryValueStandsInItsOwnPlace) {
               airplayHead({ModelNameTable[25], "QUARION", profileLines("5"), "7"}));
 }
 
-TEST_F(AirplayValuesTest, SecondRunGathersEverythingAfresh) {
+TEST_F(AirplayValuesTest, SecondRunGathersEverythingAgain) {
     updateAirplayConfigFile();
     setImage(DRIVE_SIDE_OFFSET, bytes({1}));
     setImage(BRAND_OFFSET, bytes({2}));
@@ -149,7 +149,7 @@ TEST_F(AirplayValuesTest, GathersItsValuesBeforeItOpensTheOutput) {
                   "static = 1\n");
 }
 
-TEST_F(AirplayValuesTest, EachIsLookedUpByItselfBeforeTheFilesAreOpened) {
+TEST_F(AirplayValuesTest, EachValueHasItsOwnLookupBeforeTheFilesAreOpened) {
     writeFile(AIRPLAY_OUTPUT, "older");
     writeFile("/tmp/telephony_FFFF.txt", "older");
     writeFile("/tmp/speechrec_FFFF.txt", "older");
@@ -192,7 +192,7 @@ TEST_F(AirplayValuesTest, TuningFilesAreCompleteBeforeTheOutputIsOpened) {
     }
 }
 
-TEST_F(AirplayValuesTest, GeneratedProfileIsWrittenWithoutItsTuningFilesToo) {
+TEST_F(AirplayValuesTest, GeneratedProfileIsWrittenEvenWithoutItsTuningFiles) {
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
     putFolder("/tmp/telephony_FFFF.txt");
     putFolder("/tmp/speechrec_FFFF.txt");

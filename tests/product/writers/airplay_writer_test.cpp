@@ -102,7 +102,7 @@ TEST_F(AirplayWriterTest, FolderAsATemplateLeavesTheHeadAlone) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead());
 }
 
-TEST_F(AirplayWriterTest, OlderLongerOutputLeavesNothingBehind) {
+TEST_F(AirplayWriterTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(AIRPLAY_OUTPUT, std::string(20000, 'o'));
     updateAirplayConfigFile();
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead() + "static = 1\n");
@@ -115,7 +115,7 @@ TEST_F(AirplayWriterTest, OutputThroughASymlinkReachesItsTarget) {
     EXPECT_EQ(readFile("/fs/rwdata/airplay"), plainAirplayHead() + "static = 1\n");
 }
 
-TEST_F(AirplayWriterTest, NewOutputIsForEveryoneButTheMask) {
+TEST_F(AirplayWriterTest, NewOutputHasMode666LessTheMask) {
     const mode_t former = umask(022);
     updateAirplayConfigFile();
     umask(former);
@@ -128,7 +128,7 @@ TEST_F(AirplayWriterTest, HeadIsFlushedBeforeTheTemplateIsRead) {
     remove(AIRPLAY_TEMPLATE);
     ASSERT_EQ(mkfifo(AIRPLAY_TEMPLATE, 0600), 0);
     const std::string head = plainAirplayHead();
-    // The other end of the pipe feeds as the template what the output holds by then.
+    // The other end of the pipe writes, as the template, what the output holds at that moment.
     const pid_t feeder = fork();
     ASSERT_NE(feeder, -1);
     if (feeder == 0) {
@@ -160,7 +160,7 @@ TEST_F(AirplayWriterTest, LineEndsOfTheLastTwoValuesAreFlushed) {
     EXPECT_EQ(changes.take().size(), 5U);
 }
 
-TEST_F(AirplayWriterTest, OutputThatCannotBeWrittenWholeIsLeftSo) {
+TEST_F(AirplayWriterTest, PartlyWrittenOutputIsLeftAsItIs) {
     for (const rlim_t size : {rlim_t{100}, rlim_t{plainAirplayHead().size() + 3}}) {
         SCOPED_TRACE(size);
         int result = -1;

@@ -17,7 +17,7 @@ namespace {
 
 class IapDeviceTest : public IapUnitTest {
 protected:
-    /// The other two files are generated, whatever becomes of the device file.
+    /// The other two files are generated, whatever happens to the device file.
     static void expectTransportFilesGenerated() {
         EXPECT_EQ(readFile(IAP2_OUTPUT), plainIap2());
         EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
@@ -48,7 +48,7 @@ TEST_F(IapDeviceTest, HoldsTheBlockTheTemplateAndTheVehicleSection) {
     expectTransportFilesGenerated();
 }
 
-TEST_F(IapDeviceTest, TemplateWithoutAFinalLineEndIsEndedByTheLineEndBehindIt) {
+TEST_F(IapDeviceTest, TemplateWithoutAFinalLineEndIsEndedByTheNextPart) {
     writeFile(DEVICE_TEMPLATE, "[features]\nusb=yes");
     updateIapConfigFiles();
     EXPECT_EQ(readFile(DEVICE_OUTPUT), iap2Head() + "[features]\n"
@@ -105,10 +105,10 @@ TEST_F(IapDeviceTest, MissingTemplateInstallsTheStockFile) {
     expectTransportFilesGenerated();
 }
 
-TEST_F(IapDeviceTest, TemplateThatMayNotBeReadInstallsTheStockFile) {
+TEST_F(IapDeviceTest, TemplateWithoutReadPermissionInstallsTheStockFile) {
     ASSERT_EQ(chmod(DEVICE_TEMPLATE, 0), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateIapConfigFiles();
     }
     EXPECT_EQ(readFile(DEVICE_OUTPUT), "device stock\n");
@@ -123,13 +123,13 @@ TEST_F(IapDeviceTest, StockFileLongerThanAnyBufferIsCopiedWhole) {
     EXPECT_TRUE(readFile(DEVICE_OUTPUT) == stock);
 }
 
-TEST_F(IapDeviceTest, OlderLongerOutputLeavesNothingBehind) {
+TEST_F(IapDeviceTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(DEVICE_OUTPUT, std::string(20000, 'o'));
     updateIapConfigFiles();
     EXPECT_EQ(readFile(DEVICE_OUTPUT), plainDevice());
 }
 
-TEST_F(IapDeviceTest, OlderLongerOutputLeavesNothingBehindTheStockFile) {
+TEST_F(IapDeviceTest, OlderLongerOutputIsReplacedWholeByTheStockFile) {
     remove(DEVICE_TEMPLATE);
     writeFile(DEVICE_OUTPUT, std::string(20000, 'o'));
     updateIapConfigFiles();
@@ -160,7 +160,7 @@ TEST_F(IapDeviceTest, FolderAsAStockFileLeavesAnEmptyOutput) {
     expectTransportFilesGenerated();
 }
 
-TEST_F(IapDeviceTest, NothingIsPutIntoAnOutputThatIsAFolder) {
+TEST_F(IapDeviceTest, OutputThatIsAFolderStaysEmpty) {
     putFolder(DEVICE_OUTPUT);
     EXPECT_EQ(updateIapConfigFiles(), 0);
     EXPECT_TRUE(std::filesystem::is_empty(DEVICE_OUTPUT));
@@ -185,14 +185,14 @@ TEST_F(IapDeviceTest, ReadOnlyOlderOutputStaysAsItIs) {
     writeFile(DEVICE_OUTPUT, "older");
     ASSERT_EQ(chmod(DEVICE_OUTPUT, 0444), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateIapConfigFiles();
     }
     EXPECT_EQ(readFile(DEVICE_OUTPUT), "older");
     expectTransportFilesGenerated();
 }
 
-TEST_F(IapDeviceTest, NewOutputIsForEveryoneButTheMask) {
+TEST_F(IapDeviceTest, NewOutputHasMode666LessTheMask) {
     const mode_t former = umask(022);
     updateIapConfigFiles();
     umask(former);
@@ -201,7 +201,7 @@ TEST_F(IapDeviceTest, NewOutputIsForEveryoneButTheMask) {
     EXPECT_EQ(status.st_mode & 07777U, 0644U);
 }
 
-TEST_F(IapDeviceTest, OutputThatCannotBeWrittenWholeStopsNoLaterFile) {
+TEST_F(IapDeviceTest, PartlyWrittenOutputDoesNotStopLaterFiles) {
     writeFile(DEVICE_TEMPLATE, std::string(2000, 'd'));
     int result = -1;
     {
@@ -228,7 +228,7 @@ TEST_F(IapDeviceTest, OutputStaysOpenAfterItsFallback) {
         const ResourceLimit limit(RLIMIT_NOFILE, roomForTwo);
         updateIapConfigFiles();
     }
-    // One is the device output's, the other the second output's, and no stage gets a third.
+    // The device output has one, the second output the other, and no stage gets a third.
     EXPECT_EQ(readFile(DEVICE_OUTPUT), "");
     EXPECT_EQ(readFile(IAP2_OUTPUT), "");
     EXPECT_FALSE(exists(IAP1_OUTPUT));

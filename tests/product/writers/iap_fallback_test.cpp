@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// When the transport files are replaced by their stock files. The third file follows the state of
-// the second one's output, not its own template.
+// When stock files replace the transport files. The third file depends on the state of the second
+// one's output, not on its own template.
 #include "tests/product/writers/iap_unit.h"
 #include "tests/support/file_event_log.h"
 #include "tests/support/permissions.h"
@@ -27,7 +27,7 @@ int updateWithDescriptors(int count) {
     return updateIapConfigFiles();
 }
 
-/// Runs the writer where no file can grow past `bytes`.
+/// Runs the writer with a limit of `bytes` for every file.
 int updateWithFileSize(rlim_t bytes) {
     const ResourceLimit limit(RLIMIT_FSIZE, bytes);
     return updateIapConfigFiles();
@@ -46,10 +46,10 @@ TEST_F(IapFallbackTest, MissingIap2TemplateInstallsTheIap2StockFileAlone) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
 }
 
-TEST_F(IapFallbackTest, Iap2TemplateThatMayNotBeReadInstallsTheIap2StockFileAlone) {
+TEST_F(IapFallbackTest, Iap2TemplateWithoutReadPermissionInstallsTheIap2StockFileAlone) {
     ASSERT_EQ(chmod(IAP2_TEMPLATE, 0), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateIapConfigFiles();
     }
     EXPECT_EQ(readFile(IAP2_OUTPUT), "iap2 stock\n");
@@ -125,7 +125,7 @@ TEST_F(IapFallbackTest, Iap2OutputThatIsAFolderInstallsTheIap1StockFile) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
-TEST_F(IapFallbackTest, Iap2OutputThatIsAFolderInstallsTheIap1StockFileWithoutATemplateToo) {
+TEST_F(IapFallbackTest, Iap2OutputThatIsAFolderInstallsTheIap1StockFileEvenWithoutATemplate) {
     remove(IAP2_TEMPLATE);
     putFolder(IAP2_OUTPUT);
     updateIapConfigFiles();
@@ -137,7 +137,7 @@ TEST_F(IapFallbackTest, ReadOnlyIap2OutputStaysAndInstallsTheIap1StockFile) {
     writeFile(IAP2_OUTPUT, "older");
     ASSERT_EQ(chmod(IAP2_OUTPUT, 0444), 0);
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         updateIapConfigFiles();
     }
     EXPECT_EQ(readFile(IAP2_OUTPUT), "older");
@@ -186,7 +186,7 @@ TEST_F(IapFallbackTest, Iap1OutputAloneThatIsAFolderStillTakesItsStockFile) {
 }
 
 TEST_F(IapFallbackTest, Iap2OutputWhoseCloseFailsInstallsTheIap1StockFile) {
-    // Short enough to be buffered whole, so that nothing is written before the close.
+    // Short enough for the buffer, so that nothing is written before the close.
     writeFile(IAP2_TEMPLATE, std::string(1000, '2'));
     EXPECT_EQ(updateWithFileSize(500), 0);
     EXPECT_EQ(readFile(DEVICE_OUTPUT), plainDevice());
@@ -238,7 +238,7 @@ TEST_F(IapFallbackTest, AllTemplatesMissingGeneratesIap1Alone) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head());
 }
 
-TEST_F(IapFallbackTest, MissingTmpIsNotMade) {
+TEST_F(IapFallbackTest, MissingTmpIsNotCreated) {
     remove("/tmp");
     EXPECT_EQ(updateIapConfigFiles(), 0);
     EXPECT_FALSE(exists("/tmp"));
@@ -248,14 +248,14 @@ TEST_F(IapFallbackTest, ReadOnlyTmpStaysEmpty) {
     ASSERT_EQ(chmod("/tmp", 0555), 0);
     int result = -1;
     {
-        const PermissionsHold permissions;
+        const EnforcedPermissions permissions;
         result = updateIapConfigFiles();
     }
     EXPECT_EQ(result, 0);
     EXPECT_TRUE(std::filesystem::is_empty("/tmp"));
 }
 
-TEST_F(IapFallbackTest, UnitWithNothingAtAllIsNoFailure) {
+TEST_F(IapFallbackTest, EmptyUnitIsNotAFailure) {
     for (const char* path : {"/fs", "/dev", "/tmp"}) {
         remove(path);
     }

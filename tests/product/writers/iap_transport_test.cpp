@@ -79,7 +79,7 @@ TEST_F(IapTransportTest, TemplatesLongerThanAnyBufferAreCopiedWhole) {
     EXPECT_TRUE(readFile(IAP1_OUTPUT) == iap1Head() + content);
 }
 
-TEST_F(IapTransportTest, OlderLongerOutputsLeaveNothingBehind) {
+TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWhole) {
     writeFile(IAP2_OUTPUT, std::string(20000, 'o'));
     writeFile(IAP1_OUTPUT, std::string(20000, 'o'));
     updateIapConfigFiles();
@@ -87,10 +87,10 @@ TEST_F(IapTransportTest, OlderLongerOutputsLeaveNothingBehind) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
 }
 
-TEST_F(IapTransportTest, OlderLongerOutputsLeaveNothingBehindTheStockFiles) {
+TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWholeByTheStockFiles) {
     writeFile(IAP2_OUTPUT, std::string(20000, 'o'));
     writeFile(IAP1_OUTPUT, std::string(20000, 'o'));
-    // An empty template fails the stage 2 output; the stock file is then stage 3's.
+    // An empty template fails the output of stage 2; stage 3 then installs its stock file.
     writeFile(IAP2_TEMPLATE, "");
     updateIapConfigFiles();
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
@@ -110,12 +110,12 @@ TEST_F(IapTransportTest, OutputsThroughSymlinksReachTheirTargets) {
 }
 
 TEST_F(IapTransportTest, FilesAreMadeInAFixedOrder) {
-    // All three outputs are one file, so that the last one made is what stays.
+    // All three outputs are one file, so that the last one made stays.
     std::filesystem::create_symlink(IAP1_OUTPUT, DEVICE_OUTPUT);
     std::filesystem::create_symlink(IAP1_OUTPUT, IAP2_OUTPUT);
     updateIapConfigFiles();
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
-    // With the third out of the way, the second is the last.
+    // Without the third, the second is the last.
     remove(DEVICE_OUTPUT);
     remove(IAP2_OUTPUT);
     putFolder(IAP1_OUTPUT);
@@ -154,7 +154,7 @@ TEST_F(IapTransportTest, FolderAsTheIap1TemplateEndsIap1AfterTheCertificateLine)
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head());
 }
 
-TEST_F(IapTransportTest, NewOutputsAreForEveryoneButTheMask) {
+TEST_F(IapTransportTest, NewOutputsHaveMode666LessTheMask) {
     const mode_t former = umask(022);
     updateIapConfigFiles();
     umask(former);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A unit with the product data of the three iAP files, and what those files are to hold.
+// A unit with the product data of the three iAP files, and the expected content of those files.
 #pragma once
 
 #include "tests/support/unit_test.h"
@@ -45,7 +45,7 @@ inline std::string accessoryBlock(const IapValues& values) {
            values.firmware + "\n";
 }
 
-/// What stands before the template in each file.
+/// The text before the template in each file.
 inline std::string iap2Head(const IapValues& values = {}) {
     return accessoryBlock(values) + "hardware_version=1.0.0\n"
                                     "\n";
@@ -56,7 +56,7 @@ inline std::string iap1Head(const IapValues& values = {"VOXA", "SN004217", "030a
                                     "\n";
 }
 
-/// What stands behind the template of the device file.
+/// The text after the template of the device file.
 constexpr char DEVICE_TAIL[] = "\n"
                                "[vehicle]\n"
                                "enable=no\n"

@@ -25,7 +25,7 @@ constexpr std::uint32_t MODEL_OFFSET = 139;
 
 class IapValuesTest : public IapUnitTest {
 protected:
-    /// Expects the files of a run to carry these values; `firmware` is the full version.
+    /// Expects these values in the files of a run; `firmware` is the full version.
     static void expectValues(const IapValues& values, const std::string& compactFirmware) {
         EXPECT_EQ(updateIapConfigFiles(), 0);
         EXPECT_EQ(readFile(DEVICE_OUTPUT), iap2Head(values) + "device=1\n" + DEVICE_TAIL);
@@ -67,7 +67,7 @@ TEST_F(IapValuesTest, BrandChangesNothing) {
     expectValues({"VOXA", "SN004217", "3.10.2"}, "030a02");
 }
 
-TEST_F(IapValuesTest, FuelTypeStandsNowhere) {
+TEST_F(IapValuesTest, FuelTypeIsWrittenNowhere) {
     for (const char fuelType : {'\0', '\1', '\2', '\3', '\4'}) {
         setImage(FUEL_TYPE_OFFSET, std::string(1, fuelType));
         expectValues({"VOXA", "SN004217", "3.10.2"}, "030a02");
@@ -115,7 +115,7 @@ TEST_F(IapValuesTest, SerialOnADiskWithoutRoomForTheRecordsIsTheDefault) {
     expectSerial("ABCD1234abc");
 }
 
-TEST_F(IapValuesTest, VersionStandsInFullAndInSixDigits) {
+TEST_F(IapValuesTest, VersionIsWrittenInFullAndInSixDigits) {
     expectVersion("3.10.2", "3.10.2", "030a02");
     expectVersion("ABC_3.10.2_rc", "3.10.2_rc", "030a02");
     expectVersion("V_2.0.1", "2.0.1", "020001");
@@ -155,7 +155,7 @@ TEST_F(IapValuesTest, AllSourcesMissingGivesAllDefaults) {
     expectValues({"VOXA", "ABCD1234abc", ""}, "000000");
 }
 
-TEST_F(IapValuesTest, SecondRunGathersEverythingAfresh) {
+TEST_F(IapValuesTest, SecondRunGathersEverythingAgain) {
     updateIapConfigFiles();
     setImage(MODEL_OFFSET, "\x1e");
     setDiskFromEnd(SERIAL_FROM_END, "OTHER\0\0\0"s);

@@ -53,7 +53,7 @@ TEST_F(StockFileTest, IsCopiedByteForByte) {
     }
 }
 
-TEST_F(StockFileTest, GoesThroughStreamsOfItsOwn) {
+TEST_F(StockFileTest, UsesItsOwnStreams) {
     {
         TemplateMerge merge;
         merge.open(ACCESSORY_FILE);
@@ -94,13 +94,13 @@ TEST_F(StockFileTest, FolderInItsPlaceLeavesAnEmptyOutput) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
-TEST_F(StockFileTest, IsNotPutIntoAnOutputThatIsAFolder) {
+TEST_F(StockFileTest, LeavesAnOutputThatIsAFolderEmpty) {
     putFolder(OUTPUT);
     installStockFile(ACCESSORY_FILE);
     EXPECT_TRUE(std::filesystem::is_empty(OUTPUT));
 }
 
-TEST_F(StockFileTest, GoesNowhereWithoutTheOutputsFolder) {
+TEST_F(StockFileTest, DoesNotCreateTheOutputsFolder) {
     remove("/tmp");
     installStockFile(ACCESSORY_FILE);
     EXPECT_FALSE(exists("/tmp"));

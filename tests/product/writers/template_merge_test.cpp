@@ -36,7 +36,7 @@ struct OpenMerge : TemplateMerge {
     MergeDecision decision() const { return decideMerge(templateFile, output); }
 };
 
-/// What a whole merge makes of the template.
+/// A whole merge, with text before and after the template.
 void mergeBetween(const std::string& before, const std::string& after) {
     OpenMerge merge;
     merge.output << before;
@@ -47,7 +47,7 @@ void mergeBetween(const std::string& before, const std::string& after) {
 
 } // namespace
 
-TEST_F(TemplateMergeTest, PutsTheTemplateBehindWhatWasWritten) {
+TEST_F(TemplateMergeTest, AppendsTheTemplateToWhatWasWritten) {
     mergeBetween("before\n", "after\n");
     EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\nafter\n");
 }
@@ -136,13 +136,13 @@ TEST_F(TemplateMergeTest, OutputIsTruncatedWithoutATemplateToo) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
-TEST_F(TemplateMergeTest, OlderLongerOutputLeavesNothingBehind) {
+TEST_F(TemplateMergeTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(OUTPUT, std::string(20000, 'o'));
     mergeBetween("before\n", "");
     EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\n");
 }
 
-TEST_F(TemplateMergeTest, NewOutputIsForEveryoneButTheMask) {
+TEST_F(TemplateMergeTest, NewOutputHasMode666LessTheMask) {
     for (const auto& [mask, mode] : {std::pair<mode_t, mode_t>{0, 0666}, {027, 0640}}) {
         remove(OUTPUT);
         const mode_t former = umask(mask);
@@ -152,7 +152,7 @@ TEST_F(TemplateMergeTest, NewOutputIsForEveryoneButTheMask) {
     }
 }
 
-TEST_F(TemplateMergeTest, OlderOutputIsTheSameFileAfterwards) {
+TEST_F(TemplateMergeTest, OlderOutputStaysTheSameFile) {
     writeFile(OUTPUT, "older");
     std::filesystem::create_hard_link(OUTPUT, "/tmp/other-name");
     ASSERT_EQ(chmod(OUTPUT, 0600), 0);
@@ -280,7 +280,7 @@ TEST_F(TemplateMergeTest, CloseFailsTheOutputThatCannotBeWrittenWhole) {
     EXPECT_EQ(readFile(OUTPUT), std::string(100, 'x'));
 }
 
-TEST_F(TemplateMergeTest, EndOfTheMergeClosesBoth) {
+TEST_F(TemplateMergeTest, DestructionClosesBoth) {
     const int before = openDescriptors();
     { const OpenMerge merge; }
     EXPECT_EQ(openDescriptors(), before);

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // Linked into a program, this makes its file streams ignore the buffers that they are given, as
-// some libraries do before a file is open. libstdc++'s own function of this name is a weak one.
+// some libraries do before a file is open. libstdc++'s own function of this name is weak.
 #include <ios>
 #include <streambuf>
 
