@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: Apache-2.0
 """Runs a driver: python3 tests/drivers differential|explain|faults|limits ARGUMENT...
 
---help behind the name of a driver lists its arguments.
+--help after the name of a driver lists its arguments.
 """
 
 from __future__ import annotations
@@ -18,7 +18,7 @@ def main() -> int:
     if len(sys.argv) < 2 or sys.argv[1] not in NAMES:
         print(__doc__, end="", file=sys.stderr)
         return 2
-    # Python looks in this folder first. The packages lie in the one above it.
+    # Python looks in this folder first. The packages are in the one above it.
     sys.path[0] = str(Path(__file__).resolve().parents[1])
     name = sys.argv[1]
     status: int = import_module(f"drivers.{name}.{name}").main(sys.argv[2:])

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // orvane-enter [--memory=BYTES] [--files=COUNT] ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with
-// "/" = ROOT, in this very process, so that a tracer of this process sees the program and no other.
+// "/" = ROOT, in this same process, so that a tracer of this process sees only the program.
 // The limits are those of the program (RLIMIT_AS, RLIMIT_NOFILE). Exits with 125 when it can't.
 #include "kit/enter/program_start.h"
 #include "kit/host/kit_error.h"
@@ -22,7 +22,7 @@ struct Limits {
     rlim_t files = RLIM_INFINITY;  ///< descriptors
 };
 
-/// Takes the options from the front of `words`.
+/// Removes the options from the front of `words` and returns them.
 Limits takeLimits(std::vector<std::string>& words) {
     const std::string memory = "--memory=";
     const std::string files = "--files=";
@@ -34,14 +34,14 @@ Limits takeLimits(std::vector<std::string>& words) {
         } else if (word.rfind(files, 0) == 0) {
             limits.files = std::stoul(word.substr(files.size()));
         } else {
-            throw KitError("knows no " + word);
+            throw KitError("unknown option " + word);
         }
         words.erase(words.begin());
     }
     return limits;
 }
 
-/// The soft limit only, and only down: that takes no privilege.
+/// Lowers only the soft limit, which needs no privilege.
 void limit(__rlimit_resource resource, rlim_t soft) {
     rlimit limits{};
     if (soft == RLIM_INFINITY) {

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What drivers share that ask something of many random units: the units, a pool, the reports."""
+"""What drivers of random units share: the units, a pool of workers, the reports."""
 
 from __future__ import annotations
 
@@ -16,18 +16,18 @@ from typing import Any
 
 from drivers import runner
 
-# So many units go to a worker at a time.
+# How many units a worker gets at a time.
 CHUNK = 20
 
-# Units with a difference before the rest is left alone.
+# After this many units with a difference, the rest is skipped.
 MOST_DIFFERENCES = 10
 
 
 @dataclass(frozen=True)
 class RandomUnit:
-    """A unit as it was made, the arguments of its run, and what has more to draw for it.
+    """A unit as it was made, the arguments of its run, and the generator for further choices.
 
-    `root` is the only entry of its folder: what a check makes may lie beside it.
+    `root` is the only entry of its folder, so a check may make files beside it.
     """
 
     root: Path
@@ -37,7 +37,7 @@ class RandomUnit:
 
 @dataclass(frozen=True)
 class Finding:
-    """`lines` say what is not as it must be, `reached` the outcomes that this unit has."""
+    """`lines` say what is wrong, `reached` are the outcomes of this unit."""
 
     lines: Sequence[str]
     reached: frozenset[str]
@@ -45,11 +45,11 @@ class Finding:
 
 @dataclass(frozen=True)
 class Question:
-    """What a driver asks of each unit.
+    """What a driver checks in each unit.
 
-    `make` fills an empty folder and returns the arguments of the run. `check` gets the tools of
-    the driver; it raises BrokenRun where a tool could not be run. Each of `outcomes` must be
-    reached by some unit, where there are `enough_units`.
+    `make` fills an empty folder and returns the arguments of the run. `check` gets the tools of the
+    driver; it raises BrokenRun if a tool could not be run. Some unit must reach each of `outcomes`
+    if there are `enough_units`.
     """
 
     name: str
@@ -61,7 +61,7 @@ class Question:
 
 @dataclass(frozen=True)
 class Report:
-    """`broken` says why a unit was not run; then there is no finding."""
+    """`broken` says why a unit was not run; there is no finding then."""
 
     index: int
     arguments: Sequence[str]
@@ -86,7 +86,7 @@ def _check(question: Question, tools: Any, seed: str, index: int) -> Report:
 
 
 def _keep(question: Question, keep: Path, seed: str, index: int) -> Path:
-    """A fresh copy of the unit, not run in."""
+    """A new copy of the unit, in which nothing has run."""
     root = keep / f"unit-{seed}-{index}"
     if root.exists():
         raise SystemExit(f"{root} is already there")
@@ -117,18 +117,18 @@ def _print_outcomes(question: Question, reached: Counter[str]) -> list[str]:
 
 
 def add_arguments(parser: argparse.ArgumentParser, units: int) -> None:
-    """Those of every driver of random units; `units` is the usual number of them."""
+    """The arguments of every driver of random units; `units` is the usual number of units."""
     runner.add_arguments(parser)
     parser.add_argument("--units", type=int, default=units)
     parser.add_argument("--seed", default="1", help='"random" draws one')
-    parser.add_argument("--only", type=int, help="the number of one single unit")
-    parser.add_argument("--keep", type=Path, help="where a unit that differs is kept")
+    parser.add_argument("--only", type=int, help="the number of a single unit")
+    parser.add_argument("--keep", type=Path, help="folder for units that differ")
     parser.add_argument("--jobs", type=int, default=2)
 
 
 def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str) -> int:
-    """The exit status: 0 all is well, 1 a difference or an outcome that never came up, 2 a unit
-    was not run. `more` are the arguments of the driver that are not those of add_arguments."""
+    """Returns the exit status: 0 no difference, 1 a difference or an outcome that never came up, 2
+    a unit was not run. `more` are the driver's arguments beyond those of add_arguments."""
     if options.seed == "random":
         options.seed = str(random.SystemRandom().randrange(10**9))
         print(f"{question.name}: seed {options.seed}")
@@ -145,7 +145,7 @@ def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str)
                 _print_difference(question, report, options, more)
                 differing += 1
                 if differing == MOST_DIFFERENCES:
-                    print(f"{question.name}: the other units were left alone")
+                    print(f"{question.name}: the other units were skipped")
                     return 1
             reached.update(report.finding.reached)
     missing = [] if single else _print_outcomes(question, reached)

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Runs the tool inside a unit and holds what it left behind against a prediction."""
+"""Runs the tool inside a unit and compares what it left behind with a prediction."""
 
 from __future__ import annotations
 
@@ -17,39 +17,38 @@ from model.identity import load_names
 from model.prediction import Prediction
 from model.snapshot import Entry
 
-# The launcher's status when it couldn't get as far as running the tool, which
-# itself has no status but 0.
+# The launcher's status when it could not run the tool, whose own status is always 0.
 LAUNCHER_FAILED = 125
 
-# Far longer than any run takes, so that only a tool that hangs gets there.
+# Far longer than any run, so that only a tool that hangs reaches it.
 TIME_LIMIT = 60
 
-# The status of one that hangs. One that dies has the number of the signal, negative.
+# The status of a tool that hangs. One that dies has the negative number of the signal.
 OUT_OF_TIME = -99
 
 
 class BrokenRun(Exception):
-    """The tool was not run at all: nothing can be said of it."""
+    """The tool was not run at all, so there is no result."""
 
 
 def add_arguments(parser: argparse.ArgumentParser) -> None:
-    """What every driver has to know to run the tool. A path is one word, blanks and all."""
+    """What every driver needs to run the tool. A path is one word, even with blanks."""
     parser.add_argument("--orvane", required=True, help="the tool")
     parser.add_argument("--enter", required=True,
                         help="launcher of the tool: ENTER ROOT ORVANE ARGUMENTS...")
-    parser.add_argument("--emulator", help="runs the launcher, where it is for another processor")
+    parser.add_argument("--emulator", help="runs a launcher for another processor")
 
 
 @dataclass(frozen=True)
 class Tools:
-    """`enter` are the words that go before ROOT ORVANE ARGUMENTS..., `names` those of the models."""
+    """`enter` are the words before ROOT ORVANE ARGUMENTS..., `names` the names of the models."""
 
     orvane: str
     enter: tuple[str, ...]
     names: tuple[str, ...]
 
     def command(self, root: Path, arguments: Sequence[str], *limits: str) -> list[str]:
-        """Runs the tool in a unit. `limits` are words for the launcher."""
+        """The command that runs the tool in a unit. `limits` are words for the launcher."""
         return [*self.enter, *limits, str(root), self.orvane, *arguments]
 
 
@@ -59,7 +58,7 @@ def tools(options: argparse.Namespace) -> Tools:
 
 
 def again(driver: str, options: argparse.Namespace, *more: object) -> str:
-    """A driver's command line with other words behind those of add_arguments, for a shell."""
+    """A driver's command line for a shell: the words of add_arguments, then `more`."""
     emulator = ["--emulator", options.emulator] if options.emulator else []
     return shlex.join(["python3", sys.argv[0], driver, "--orvane", options.orvane,
                        "--enter", options.enter, *emulator, *map(str, more)])
@@ -76,9 +75,9 @@ class Run:
 
 
 def run(command: Sequence[str], root: Path, environment: Mapping[str, str] | None = None) -> Run:
-    """`command` starts the tool in `root`, by way of the launcher.
+    """`command` starts the tool in `root` through the launcher.
 
-    `environment` is what the tool's holds beside that of this process.
+    `environment` adds to the environment of this process.
     """
     try:
         done = subprocess.run(command, stdin=subprocess.DEVNULL, capture_output=True,
@@ -95,7 +94,7 @@ def run(command: Sequence[str], root: Path, environment: Mapping[str, str] | Non
 
 def differences(before: Mapping[str, Entry], prediction: Prediction, result: Run,
                 mask: int) -> list[str]:
-    """Nothing when the run is as predicted, else what is wrong with its nearest reading.
+    """No lines when the run is as predicted; otherwise its differences from the closest alternative.
 
     `mask` is the file creation mask of the run.
     """

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A difference is reported and its unit kept; what was not run or never came up is no success."""
+"""A difference is reported and its unit kept; a unit not run or an outcome never reached is not a success."""
 
 from __future__ import annotations
 
@@ -65,12 +65,12 @@ class Asking(unittest.TestCase):
         self.assertEqual(status, 0)
         self.assertIn("asked: 30 units, 0 with a difference (seed 1)\n", said)
 
-    def test_an_outcome_that_never_came_up(self) -> None:
+    def test_outcome_that_is_never_reached(self) -> None:
         self.assertEqual(self.ask(all_good)[0], 1)
         self.assertIn("asked: never odd\n", self.ask(all_good, "--units", "20")[1])
         self.assertEqual(self.ask(all_good, "--units", "19")[0], 0)
 
-    def test_a_difference_keeps_the_unit_and_says_how_to_see_it_again(self) -> None:
+    def test_a_difference_keeps_the_unit_and_says_how_to_repeat_it(self) -> None:
         status, said = self.ask(all_bad, "--units", "1")
         self.assertEqual(status, 1)
         kept = self.keep / "unit-1-0"
@@ -82,10 +82,10 @@ class Asking(unittest.TestCase):
                          ["asked", "--orvane", "o", "--enter", "e", "--more", "a b", "--seed", "1",
                           "--only", "0", "--keep", "DIR"])
 
-    def test_many_differences_end_it(self) -> None:
+    def test_many_differences_end_the_run(self) -> None:
         status, said = self.ask(all_bad)
         self.assertEqual((status, said.count("\n  wrong: ")), (1, MOST_DIFFERENCES))
-        self.assertIn("asked: the other units were left alone\n", said)
+        self.assertIn("asked: the other units were skipped\n", said)
 
     def test_a_unit_that_was_not_run(self) -> None:
         status, said = self.ask(not_run)

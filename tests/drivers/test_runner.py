@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Each difference of a run from its prediction shows."""
+"""Each difference of a run from its prediction is found."""
 
 from __future__ import annotations
 
@@ -26,7 +26,7 @@ class Differences(UnitCase):
     def test_none(self) -> None:
         self.assertEqual(self.differences(self.run_as_predicted), [])
 
-    def test_what_the_process_says(self) -> None:
+    def test_what_the_process_prints(self) -> None:
         for changes in ({"status": 1}, {"status": -11}, {"stdout": b"x"}, {"stderr": b""}):
             self.assertEqual(len(self.differences(replace(self.run_as_predicted, **changes))), 1)
 

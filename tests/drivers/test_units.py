@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Units come again from their seed."""
+"""The same seed makes the same units."""
 
 from __future__ import annotations
 
@@ -23,7 +23,7 @@ class Units(unittest.TestCase):
         return Path(folder.name), make_unit(Path(folder.name), random.Random(f"test:{seed}"))
 
     def entries(self, root: Path) -> dict[str, snapshot.Entry]:
-        """The times of two units differ; all else may not."""
+        """The times of two units differ; nothing else may."""
         return {path: replace(entry, stamp=entry.stamp and (entry.stamp[0], 0))
                 for path, entry in snapshot.take(root).items()}
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Random units: half of them ordinary, the others with something odd in most places."""
+"""Random units: half of them ordinary, the others odd in most places."""
 
 from __future__ import annotations
 
@@ -12,7 +12,7 @@ from model.tree import Tree
 
 IMAGE_SIZES = (0, 1, 21, 22, 35, 36, 100, 133, 134, 135, 138, 139, 140, 178, 179, 180, 4096, 5000)
 
-# Where the serial, and then the tuning area, begin to fit on a disk.
+# The disk sizes from which the serial, and then the tuning area, fit.
 SERIAL_FITS = records.RECORD_AREA - records.SERIAL_OFFSET
 DISK_SIZES = (
     0, 1, records.TUNING_AREA - 1, records.TUNING_AREA, records.TUNING_AREA + 1,
@@ -22,7 +22,7 @@ DISK_SIZES = (
 
 TEXT_SIZES = (1, 40, 700, 4_095, 4_096, 8_000, 8_191, 8_192, 16_384, 70_000)
 
-# Only bytes that the tool doesn't read stand behind the tenth block.
+# After the tenth block are only bytes that the tool doesn't read.
 AREA_SIZE = records.DPS_AREA_SIZE + 20
 
 
@@ -99,7 +99,7 @@ def _version_files(root: Path, rng: random.Random, ordinary: bool) -> None:
             parts.put(root, folder, b"no folder")
         return
     parts.put_folder(root, folder)
-    if rng.random() < 0.005:  # more than one call's worth of listing
+    if rng.random() < 0.005:  # too many for one call to list
         for number in range(300):
             kind = rng.choice((b"Map", b"Map", b"Application"))
             parts.put_version(root, b"1.2.%d" % number, kind, f"{number}{'x' * 120}.inf")
@@ -148,7 +148,7 @@ def _product_file(root: Path, rng: random.Random, path: str, ordinary: bool) -> 
 
 
 def _output(root: Path, rng: random.Random, path: str, ordinary: bool) -> None:
-    """What is in the way of an output; most often nothing, or an earlier run's file."""
+    """What is at an output's path: mostly nothing, or an earlier run's file."""
     kind = rng.random() * (0.5 if ordinary else 1.0)
     if kind < 0.3:
         return
@@ -172,8 +172,8 @@ def _output(root: Path, rng: random.Random, path: str, ordinary: bool) -> None:
 def _other_place(root: Path, rng: random.Random, path: str) -> str:
     """Another output, a stock file, or the template of another output.
 
-    An output's own template is left out: what a stream reads of bytes that another
-    still holds back depends on the size of buffers.
+    Not the output's own template: whether a stream reads bytes that another still buffers depends
+    on the size of buffers.
     """
     own = parts.OUTPUTS.index(path)
     templates = [other for index, other in enumerate(parts.TEMPLATES) if index != own]
@@ -181,7 +181,7 @@ def _other_place(root: Path, rng: random.Random, path: str) -> str:
 
 
 def _part_outputs_from_their_templates(root: Path) -> None:
-    """Links may lead an output to its own template by way of other links."""
+    """Links may lead an output to its own template through other links."""
     tree = Tree(root)
     for output, template in zip(parts.OUTPUTS, parts.TEMPLATES):
         place = tree.resolve(output)

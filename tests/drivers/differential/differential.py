@@ -17,7 +17,7 @@ from drivers.units import make_unit
 from model import parts, snapshot
 from model.prediction import predict
 
-# Neither of these may make a difference, beyond the modes of files.
+# Neither of these may change anything but the modes of files.
 ENVIRONMENTS = ({}, {}, {"POSIXLY_CORRECT": "1"}, {"LC_ALL": "de_DE.UTF-8", "TMPDIR": "/fs"})
 MASKS = (0o022, 0o022, 0o000, 0o027, 0o077, 0o002)
 
@@ -37,7 +37,7 @@ def check(unit: RandomUnit, tools: runner.Tools) -> Finding:
                    frozenset(f"{output} {way}" for output, way in ways.items()))
 
 
-# The fallback of a tuning file is that of a disk that can't be read.
+# A tuning file's fallback is the file of an unreadable disk.
 QUESTION = Question("differential", make_unit, check,
                     [f"{output} {way}" for output in parts.OUTPUTS
                      for way in ("generated", "fallback")], enough_units=200)

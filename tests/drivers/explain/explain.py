@@ -1,12 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Holds orvane-unit's explain, describe and new against random units and runs of orvane in them.
+"""Checks orvane-unit's explain, describe and new against random units and runs of orvane in them.
 
-For each unit: explain says what the run then leaves behind; each output and each
-value has the reason codes of the faults that were laid; and the unit's description
-makes the same unit.
+For each unit: explain says what the run then leaves behind; each output and each value has the
+reason codes of the faults in the unit; and the unit's description makes the same unit.
 
-The units are made where TMPDIR says. In memory that is several times as fast, and what
-stands as a folder for the disk or the image fails there at another call.
+The units are made in TMPDIR. In memory that is several times as fast, and a folder in place of the
+disk or the image fails there at another call.
 
 Exit status: 0 all agree, 1 a difference or a code that never came up, 2 a tool could
 not be run.
@@ -58,7 +57,7 @@ def ask(command: Sequence[str]) -> Said:
 
 
 def make_marked_unit(root: Path, rng: random.Random) -> list[str]:
-    """Returns the options of the run: those in the drawn arguments, else one of each."""
+    """Returns the options of the run: those in the drawn arguments, or one of each if there are none."""
     arguments = make_unit(root, rng)
     (root / MARKER).write_bytes(MARKER_TEXT)
     return [f"-{letter}" for letter in parse_options(arguments)[0] or "ai"]
@@ -70,7 +69,7 @@ def letters_of(options: Sequence[str]) -> str:
 
 def ask_explain(unit_tool: str, root: Path, options: Sequence[str]
                 ) -> tuple[explanation.Explanation | None, int, list[str]]:
-    """What explain says, its exit status, and why there is nothing that it says."""
+    """What explain says, its exit status, and, if it says nothing usable, why."""
     said = ask([unit_tool, "explain", str(root), "--json", "--content", *options])
     if said.stderr or said.status not in (0, 1):
         return None, said.status, [f"explain: status {said.status}, said {said.stderr!r}"]
@@ -120,7 +119,7 @@ def check(unit: RandomUnit, tools: Tools) -> Finding:
     reached = {code for stage in stages
                for codes in (stage.reasons, *(line.reasons for line in stage.lines))
                for code in codes}
-    # Every output has text of its own as soon as it is generated.
+    # Every generated output has its own text.
     if any(stage.outcome == "generated" for stage in stages):
         reached |= set(explanation.FIXED)
     return Finding(lines, frozenset(reached))

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What orvane-unit says of a run, and what of it is wrong."""
+"""What orvane-unit says about a run, and what is wrong with it."""
 
 from __future__ import annotations
 
@@ -45,7 +45,7 @@ class Explanation:
 
 
 def _bytes(value: Any) -> bytes:
-    """Bytes that are no UTF-8 come in hex; only those may."""
+    """Bytes that are not UTF-8 are in hex; no others may be."""
     if isinstance(value, str):
         return value.encode()
     if list(value) != ["hex"]:
@@ -71,7 +71,7 @@ def _output(output: Any) -> Output:
 
 
 def parse(text: bytes) -> Explanation:
-    """Raises ValueError, KeyError or TypeError when it is no explanation."""
+    """Raises ValueError, KeyError or TypeError when the text is not an explanation."""
     document = json.loads(text)
     if (document["format"], document["command"]) != (FORMAT, "explain"):
         raise ValueError(f"format {document['format']}, command {document['command']}")
@@ -88,7 +88,7 @@ def _differs(what: str, want: object, have: object) -> list[str]:
 
 
 def own_faults(said: Explanation, root: bytes, letters: str, status: int) -> list[str]:
-    """Where it doesn't agree with itself, or with what it was asked."""
+    """Where the explanation contradicts itself or the request."""
     found = _differs("root", root, said.root) + _differs("letters", letters, said.letters)
     for output in said.outputs:
         for codes in (output.reasons, *(line.reasons for line in output.lines)):
@@ -110,7 +110,7 @@ def _line_faults(where: str, line: Line, expected: Line) -> list[str]:
 
 
 def reason_faults(said: Explanation, stages: Sequence[Stage]) -> list[str]:
-    """Where it differs from what is known of the unit."""
+    """Where the explanation differs from what is known about the unit."""
     found = _differs("outputs", [stage.path for stage in stages],
                      [output.path for output in said.outputs])
     if found:
@@ -134,10 +134,10 @@ def reason_faults(said: Explanation, stages: Sequence[Stage]) -> list[str]:
 
 
 def left_faults(said: Explanation, after: Tree) -> list[str]:
-    """Where it differs from what the run, now done, has left behind.
+    """Where the explanation differs from what the run has left behind.
 
-    What lies at an output may be a later output's, for links may lead two of them to
-    one place: the last that wrote there must have written all that is there.
+    The content of an output may be a later one's, since links may lead two outputs to one place:
+    the last one that wrote there must have written everything there.
     """
     found = []
     last: dict[str, Output] = {}

@@ -1,8 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What orvane-unit must say of a run: how each output comes about, and from what.
+"""What orvane-unit must say about a run: how each output comes about, and from what.
 
-Worked out from the unit's files as they stand before the run, apart from the
-program, and nothing is changed by it.
+Derived from the unit's files before the run, independently of the program. Changes nothing.
 """
 
 from __future__ import annotations
@@ -17,7 +16,7 @@ from model.streams import InputStream, OutputStream
 from model.system import Library, System
 from model.tree import Tree
 
-# Every code, and whether it is in order: that no fallback and no default stands in.
+# Every code, and whether it is intended: no fallback and no default is used.
 CODES = {
     "generated": True, "profile-not-generated": True, "profile-unknown": False,
     "output-not-openable": False, "template-missing": False, "template-empty": False,
@@ -37,7 +36,7 @@ CODES = {
 
 @dataclass(frozen=True)
 class Stage:
-    """One writing of one output. `lines` are those with a value of the unit."""
+    """One write of one output. `lines` are those with a value of the unit."""
 
     path: str
     outcome: str
@@ -58,7 +57,7 @@ def _copied(path: str, content: bytes, reason: str) -> Line:
 
 
 class Run:
-    """The stages in the order of the run; what one writes, a later one may read."""
+    """The stages in the order of the run; a later one may read what an earlier one wrote."""
 
     def __init__(self, root: Path, names: Sequence[str]) -> None:
         self._system = System(Tree(root), (), Library())
@@ -83,7 +82,7 @@ class Run:
         self._add(path, "generated", ("generated",), lines)
 
     def _stock(self, index: int, cause: str) -> None:
-        """`cause` is why there is no generated file. It doesn't matter where nothing is written."""
+        """`cause` is why there is no generated file. It doesn't matter if nothing is written."""
         path, stock_path = parts.OUTPUTS[index], parts.STOCK_FILES[index]
         stock = InputStream(self._system, stock_path)
         output = OutputStream(self._system, path)
@@ -138,8 +137,8 @@ class Run:
 
     def _iap_stage(self, index: int, cause: str, found: Values, firmware: Line, middle: bytes,
                    tail: bytes = b"") -> str:
-        """Returns why the next stage is not to be generated, should it ask. A `cause` has this
-        one not generated; without one it hangs on its template."""
+        """Returns why the next stage must not be generated, for a stage that needs it. With a
+        `cause` this stage is not generated; without one, that depends on its template."""
         asks_template = index != 3
         output = OutputStream(self._system, parts.OUTPUTS[index])
         template = InputStream(self._system, parts.TEMPLATES[index])

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Whether two folders hold the same: kinds, contents, targets of links; no modes, no times."""
+"""Whether two folders hold the same kinds, contents and targets of links; modes and times don't count."""
 
 from __future__ import annotations
 
@@ -17,7 +17,7 @@ PAGE = 4096
 
 
 def _data(descriptor: int, size: int) -> Iterator[tuple[int, int]]:
-    """The parts of a file that aren't holes, from and to."""
+    """The start and end of each part of a file that isn't a hole."""
     end = 0
     while end < size:
         try:
@@ -31,7 +31,7 @@ def _data(descriptor: int, size: int) -> Iterator[tuple[int, int]]:
 
 
 def digest(path: str) -> bytes:
-    """Zeros count the same whether they are a hole or not."""
+    """Zeros give the same digest whether they are a hole or not."""
     found = sha256()
     with open(path, "rb", buffering=0) as file:
         size = os.fstat(file.fileno()).st_size

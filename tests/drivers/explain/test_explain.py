@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The unit tool's driver: reason codes worked out by hand, and every difference shows."""
+"""The unit tool's driver: reason codes worked out by hand, and every difference is found."""
 
 from __future__ import annotations
 
@@ -81,12 +81,12 @@ class Explanations(UnitCase):
     def own(self, change: Change = lambda document: None, status: int = 1) -> list[str]:
         return own_faults(self.said(change), b"/bench", "a", status)
 
-    def test_none(self) -> None:
+    def test_no_differences(self) -> None:
         self.assertEqual(self.own(), [])
         self.assertEqual(reason_faults(self.said(), STAGES), [])
         self.assertEqual(left_faults(self.said(), Tree(self.root)), [])
 
-    def test_own(self) -> None:
+    def test_contradictions(self) -> None:
         self.assertEqual(len(self.own(status=0)), 1)
         for path, value in (
                 ("root", "/other"), ("letters", "ai"), ("outputs.0.isIntended", False),
@@ -129,7 +129,7 @@ class Explanations(UnitCase):
         content = put("outputs.2.content", "# fixed\nserial=\n")
         self.assertEqual(left_faults(self.said(content), Tree(self.root)), [])
 
-    def test_what_is_no_explanation(self) -> None:
+    def test_text_that_is_not_an_explanation(self) -> None:
         for change in (put("format", 2), put("command", "show"), put("outputs.0.content", {}),
                        put("outputs.0.content", {"hex": "61"}), put("outputs.0.content", 1),
                        lambda document: document["outputs"][0].pop("content")):
@@ -169,7 +169,7 @@ class SameTree(unittest.TestCase):
             disk.write_bytes(content)
         self.assertEqual(self.differing(whole), 0)
 
-    def test_what_is_not(self) -> None:
+    def test_differences(self) -> None:
         def disk_byte(root: Path) -> None:
             with open(root / "dev/hd0", "r+b") as file:
                 file.seek(70_000)
@@ -201,19 +201,19 @@ class Driver(UnitCase):
         tool.chmod(0o700)
         return str(tool)
 
-    def test_explaining_that_goes_wrong(self) -> None:
+    def test_failing_explain(self) -> None:
         for script in ("exit 1", "exit 2", "echo '{}'; exit 1", "echo x >&2; exit 1"):
             found, lines = explain.explained(self.tool(script), self.root, ["-a"], ())
             self.assertEqual((found, len(lines)), (None, 1))
 
-    def test_describing_that_goes_wrong(self) -> None:
+    def test_failing_describe_and_new(self) -> None:
         with tempfile.TemporaryDirectory() as folder:
             for script in ("exit 2", "echo x >&2", "[ $1 = describe ]", "[ $1 = describe ] || "
                            "mkdir $2"):
                 lines = explain.described(self.tool(script), self.root, Path(folder))
                 self.assertGreater(len(lines), 0)
 
-    def test_a_tool_that_is_not_there(self) -> None:
+    def test_missing_tool(self) -> None:
         with self.assertRaises(runner.BrokenRun):
             explain.ask([str(self.root / "none")])
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The reason codes of units whose faults were laid by hand."""
+"""The reason codes of units with faults made by hand."""
 
 from __future__ import annotations
 
@@ -25,7 +25,7 @@ class ReasonCase(UnitCase):
                 for path, stage in self.stages(letters).items()}
 
     def codes(self, path: str, key: str) -> Codes:
-        """Those of the only line with this key."""
+        """The codes of the only line with this key."""
         stage = self.stages("a" if path in (AIRPLAY, TELEPHONY, SPEECHREC) else "i")[path]
         (line,) = (line for line in stage.lines if line.key == key.encode())
         return line.reasons
@@ -76,7 +76,7 @@ class Outputs(ReasonCase):
             self.assertEqual(self.outcomes("ai")[parts.OUTPUTS[index]],
                              ("generated", ("template-empty",)))
 
-    def test_iap1_hangs_on_iap2(self) -> None:
+    def test_iap1_depends_on_iap2(self) -> None:
         self.remove(STATIC[3])
         self.assertEqual(self.outcomes("i")[IAP1], ("generated", ("template-missing",)))
         self.remove(STATIC[2])  # the stock file of iap2 doesn't matter to iap1

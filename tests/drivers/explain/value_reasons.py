@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Why each value of an output is what it is, found in the unit's own files.
+"""Why each value of an output is what it is, according to the unit's own files.
 
-A value has the code of its source, or in place of that those of what is wrong with it.
+A value has the code of its source, or instead the codes of what is wrong with it.
 """
 
 from __future__ import annotations
@@ -18,7 +18,7 @@ Codes = tuple[str, ...]
 
 @dataclass(frozen=True)
 class Line:
-    """`key` is empty where no value of the unit is in the line."""
+    """`key` is empty when the line has no value of the unit."""
 
     text: bytes
     reasons: Codes
@@ -27,7 +27,7 @@ class Line:
 
 @dataclass(frozen=True)
 class Values:
-    """What the writers put down, as lines without their beginnings and ends."""
+    """The values that the writers write, as lines without the fixed text around them."""
 
     model: Line
     brand: Line
@@ -39,7 +39,7 @@ class Values:
 
 
 def param_reasons(system: System, number: int) -> Codes:
-    """A parameter of which only the first byte is in the image is cut off as well."""
+    """A parameter with only its first byte in the image is cut off as well."""
     place = system.tree.resolve(configuration.IMAGE)
     if place is None or place.kind == FREE:
         return ("image-missing",)
@@ -55,7 +55,7 @@ def _param(system: System, number: int, text: bytes) -> Line:
 
 
 def _model(system: System, names: Sequence[str]) -> Line:
-    """A code that isn't in the image is not an unknown one."""
+    """A code outside the image is not an unknown one."""
     line = _param(system, configuration.MODEL, identity.model_name(system, names))
     code = configuration.parameter(system, configuration.MODEL) or 0
     if line.reasons == ("from-image",) and not 1 <= code <= identity.MODEL_COUNT:
@@ -80,7 +80,7 @@ def _serial(system: System) -> Line:
 
 
 def version_digits_reasons(text: bytes) -> Codes:
-    """Of a version that is there; in the order in which its faults are met."""
+    """The codes of a version that is there, in the order in which its faults are found."""
     found = []
     if text.count(b".") < 2:
         found.append("version-incomplete")
@@ -105,7 +105,7 @@ def _application(system: System) -> tuple[str, dict[bytes, bytes]] | None:
 
 
 def _versions(system: System) -> tuple[Line, Line]:
-    """Where no file is taken, the folder stands for them all."""
+    """If no file is chosen, the folder stands for them all."""
     text = version.application_version(system)
     digits = version.software_version(system)
     folder = system.tree.resolve(version.FOLDER)
@@ -136,7 +136,7 @@ def values(system: System, names: Sequence[str]) -> Values:
 
 
 def tuning_lines(system: System, block_id: int) -> tuple[Line, ...]:
-    """All fields of a block; numbers always have a text, so an empty one is a code's."""
+    """All fields of a block. Numbers always have a text, so an empty one belongs to a code."""
     trouble = _disk_trouble(system, records.TUNING_AREA)
     blocks = records.tuning_blocks(system) or bytes(records.DPS_AREA_SIZE)
     block = blocks[block_id * tuning.BLOCK_SIZE:(block_id + 1) * tuning.BLOCK_SIZE]

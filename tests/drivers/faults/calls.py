@@ -24,8 +24,8 @@ PIECE = re.compile(r"iov_len=(\d+)")
 class Call:
     """`number` counts the calls of this name from the start of the traced process.
 
-    `occurrence`, `offset` and `pieces` are those of a fault of this call;
-    `moved` is its result, the bytes that a transfer moved.
+    `occurrence`, `offset` and `pieces` are those of a fault of this call; `moved` is its result,
+    the number of bytes transferred.
     """
 
     name: str
@@ -60,7 +60,7 @@ class _Reader:
         name, arguments, result = match["name"], match["arguments"], match["result"]
         self._numbers[name] += 1
         if name in ("execve", "execveat") and result == "0":
-            # What came before was the launcher's, or the start of the launcher.
+            # Earlier calls belong to the launcher or its start.
             self.calls.clear()
             self._occurrences.clear()
             self._descriptors.clear()
@@ -78,7 +78,7 @@ class _Reader:
                 self._use(name, operation, arguments, int(result), descriptor)
 
     def _add(self, name: str, operation: str, path: str) -> int:
-        """A call that is told by how many of its kind the path has had."""
+        """A call that is identified by how many of its kind the path has had."""
         key = (operation, path)
         self._occurrences[key] += 1
         self.calls.append(Call(name, self._numbers[name], operation, path,

@@ -1,10 +1,9 @@
 # SPDX-License-Identifier: Apache-2.0
 """Lets each system call of orvane on its own files fail once, in every scenario.
 
-A run without faults, followed by strace, tells the calls. Each of them is then
-disturbed in runs of their own: strace injects errors, and short_transfer makes
-reads and writes short. What such a run leaves behind must be an outcome that the
-model allows.
+A run without faults under strace lists the calls. Each fault of each call then has its own run:
+strace injects errors, and short_transfer makes reads and writes short. Such a run must leave behind
+an outcome that the model allows.
 
 Exit status: 0 all agree, 1 a difference, 2 the tool could not be run.
 """
@@ -40,8 +39,7 @@ ERRORS = {
     "list": ("EIO", "ENOENT"),
 }
 
-# Whether the image's mapping can be released has no part in what the tool writes:
-# the model doesn't follow it.
+# Whether the image's mapping can be released does not affect what the tool writes: the model ignores it.
 WITHOUT_EFFECT = ("unmap",)
 
 MASK = 0o022
@@ -90,7 +88,7 @@ def inject(injection: Injection, root: Path, report: Path) -> tuple[runner.Run, 
 
 
 def check(injection: Injection) -> tuple[Injection, list[str]]:
-    """Nothing to say when the run agrees with the model."""
+    """No lines when the run agrees with the model."""
     scenario = SCENARIOS[injection.scenario]
     with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         root = Path(folder) / "unit"
@@ -108,7 +106,7 @@ def check(injection: Injection) -> tuple[Injection, list[str]]:
 
 
 def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
-    """The tool's calls in an undisturbed run, which must be as predicted itself."""
+    """The tool's calls in an undisturbed run, which must itself be as predicted."""
     with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
         root, report = Path(folder) / "unit", Path(folder) / "report"
         root.mkdir()
@@ -124,7 +122,7 @@ def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
 
 
 def build_short_transfer(folder: str) -> str:
-    """Needs a compiler for x86-64, the one processor that the helper knows."""
+    """Needs a compiler for x86-64, the only processor that the helper supports."""
     program = os.path.join(folder, "short_transfer")
     source = Path(__file__).with_name("short_transfer.cpp")
     subprocess.run([os.environ.get("CXX", "c++"), "-std=c++17", "-O1", "-o", program, source],
@@ -143,9 +141,9 @@ def print_table(injected: Counter[tuple[int, str]], agreed: Counter[tuple[int, s
 def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
     parser = argparse.ArgumentParser("faults", description=__doc__)
     runner.add_arguments(parser)
-    parser.add_argument("--short-transfer", help="short_transfer, built anew when not given")
+    parser.add_argument("--short-transfer", help="short_transfer, built if not given")
     parser.add_argument("--jobs", type=int, default=2)
-    parser.add_argument("--every", type=int, default=1, help="only each N-th fault, such as 5")
+    parser.add_argument("--every", type=int, default=1, help="only every N-th fault, such as 5")
     return parser.parse_args(arguments)
 
 

@@ -18,13 +18,13 @@ class Scenario:
 
 
 def _whole_unit(root: Path) -> None:
-    """Nothing is missing; outputs of an earlier run are in place of the new ones."""
+    """Nothing is missing, and outputs of an earlier run are there."""
     parts.put_base(root)
     parts.put_product_files(root)
     parts.put_image(root, {22: 1, 36: 2, 50: 1, 134: 3, 139: 5})
     parts.put_disk(root, serial=b"SER12345", area=bytes(range(1, 189)) * 10)
     parts.put_version(root, b"ABC_1.2.3", b"Service", "service.inf")
-    # The last line has no end, so that it counts how reading it ended.
+    # The last line has no end, so that it matters how reading it ended.
     parts.put(root, "/fs/rwdata/.Version/application.inf",
               b"Type=Application\nVersion Number=9.9.9\nVersion Number=ABC_3.10.2")
     for path in parts.OUTPUTS:
@@ -48,7 +48,7 @@ def _airplay_fallback(root: Path) -> None:
 
 
 def _large_templates(root: Path) -> None:
-    """Longer than a stream's buffer, so that writes fail in the midst of a copy."""
+    """Longer than a stream's buffer, so that writes fail in the middle of a copy."""
     _whole_unit(root)
     for path in parts.TEMPLATES:
         parts.put(root, path, b"key = value without a last line end;" * 600)

@@ -4,11 +4,11 @@
 //
 //   short_transfer REPORT NAME NUMBER BYTES COMMAND [ARGUMENT...]
 //
-// Runs COMMAND and lets its NUMBER-th call of NAME (read, write or writev, counted
-// from 1 and from the start of the process) ask for BYTES bytes only, so that the
-// kernel truly moves no more than these. REPORT then holds one line, the result of
-// that call, and nothing if it never came. The exit status is COMMAND's; 125 when
-// the command could not be run or followed. x86-64 only.
+// Runs COMMAND and makes its NUMBER-th call of NAME (read, write or writev, counted
+// from 1 and from the start of the process) ask for only BYTES bytes, so that the
+// kernel really moves no more. REPORT then holds one line, the result of that call,
+// and is empty if the call never came. The exit status is COMMAND's, or 125 when the
+// command could not be run or followed. x86-64 only.
 
 #include <sys/ptrace.h>
 #include <sys/syscall.h>
@@ -36,7 +36,7 @@ struct Wanted {
     unsigned long long bytes;
 };
 
-// The one word of the process that was changed, to be put back after the call.
+// The only changed word of the process, to restore after the call.
 struct ChangedWord {
     std::uintptr_t address = 0;
     long before = 0;
@@ -52,8 +52,8 @@ bool callOfName(std::string_view name, unsigned long long& call) {
     return call != SYS_writev || name == "writev";
 }
 
-// A gathered write is shortened at the piece in which the bytes run out: the pieces
-// behind it are left off, and its own length is changed in the process.
+// Shortens a gathered write at the piece in which the bytes run out: it drops the
+// pieces after it and changes that piece's length in the process.
 ChangedWord shortenPieces(pid_t process, user_regs_struct& registers, unsigned long long bytes) {
     ChangedWord changed;
     for (unsigned long long piece = 0; piece < registers.rdx; ++piece) {
@@ -99,7 +99,7 @@ int follow(pid_t process, const Wanted& wanted, std::FILE* report) {
     unsigned long count = 0;
     bool entry = true;
     int status = 0;
-    // The first stop is the one at the end of exec; from there calls stop twice.
+    // The first stop is at the end of exec; from there on each call stops twice.
     while (waitpid(process, &status, 0) != -1 && WIFSTOPPED(status)) {
         const int signal = WSTOPSIG(status);
         const bool isCall = signal == (SIGTRAP | 0x80);

@@ -1,10 +1,10 @@
 # SPDX-License-Identifier: Apache-2.0
 """Runs orvane with less and less memory and fewer and fewer descriptors.
 
-Whatever it is short of, it says nothing, exits with 0, and each output is a whole
-file made of true values and defaults, or what a fallback leaves.
+Whatever it lacks, it prints nothing, exits with 0, and each output is a whole file made of true values and
+defaults, or what a fallback leaves.
 
-Exit status: 0 so it is, 1 a run that was otherwise, 2 the tool could not be run.
+Exit status: 0 every run is so, 1 some run is not, 2 the tool could not be run.
 """
 
 from __future__ import annotations
@@ -30,7 +30,7 @@ ARGUMENTS = ["-ai"]
 PAGE = 4096
 MEBIBYTE = 1 << 20
 
-# One line of a version file that no shortage of memory lets through.
+# One line of a version file, too long to be read under any limit of memory.
 LONG_LINE = 64 * MEBIBYTE
 
 # Characters of a file that is not as it must be.
@@ -38,7 +38,7 @@ SHOWN = 1000
 
 
 def make_unit(root: Path) -> None:
-    """Values that are too long for a string's own buffer, and nothing missing."""
+    """A whole unit with values that are too long for a string's own buffer."""
     parts.put_base(root)
     parts.put_product_files(root)
     parts.put_image(root, {22: 1, 36: 2, 50: 1, 134: 0xFFFF, 139: 41})
@@ -54,7 +54,7 @@ def texts_after(root: Path, names: tuple[str, ...], command: list[str]) -> dict[
 
 
 def accepted(tools: runner.Tools) -> dict[str, set[bytes | None]]:
-    """Every text that a run may leave: with each of its values true, or its default."""
+    """Every text that a run may leave: each value is true or the default."""
     result: dict[str, set[bytes | None]] = {name: set() for name in OUTPUTS}
     for names in (tools.names, tuple("VOXA" for _ in tools.names)):
         for gone in ((), ("fs/rwdata/.Version",), ("dev/hd0",), ("fs/mp/etc/mm/iap1_static.cfg",),
@@ -82,8 +82,8 @@ def run(tools: runner.Tools, root: Path, limit: str, arguments: list[str]) -> ru
 
 
 def least_memory(tools: runner.Tools) -> int:
-    """The least address space, to the page, in which the tool starts at all: below it the kernel
-    or the C library end the process before its first line."""
+    """The smallest address space, in whole pages, in which the tool starts at all: with less, the kernel or
+    the C library end the process before `main`."""
     low, high = 0, 64 * MEBIBYTE
     with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
@@ -98,7 +98,7 @@ def least_memory(tools: runner.Tools) -> int:
 
 
 def check_run(tools: runner.Tools, limit: str, texts: dict[str, set[bytes | None]]) -> tuple[bool, bool]:
-    """Whether the run was as it must be, and whether nothing was missing in it."""
+    """Whether the run was as it must be, and whether it lacked nothing."""
     with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
         root = Path(folder)
         make_unit(root)
@@ -119,15 +119,15 @@ def sweep(tools: runner.Tools, what: str, limits: list[str],
     """The last limit is generous, so the last run must be whole, and the first must not."""
     outcomes = [check_run(tools, limit, texts) for limit in limits]
     whole = [is_whole for _, is_whole in outcomes]
-    print(f"limits: {what}: {len(limits)} runs, {whole.count(False)} short of something")
+    print(f"limits: {what}: {len(limits)} runs, {whole.count(False)} with a shortage")
     if whole[-1] and False in whole:
         return all(good for good, _ in outcomes)
-    print(f"limits: {what}: the limits did not tell a short run from a whole one")
+    print(f"limits: {what}: the limits must allow the last run to be whole, and not the first")
     return False
 
 
 def check_long_line(tools: runner.Tools) -> bool:
-    """A line of 64 MiB is read when there is memory for it, and else the file is as good as none."""
+    """A line of 64 MiB is read if there is memory for it; otherwise the file counts as missing."""
     good = True
     for limit, is_read in (("--memory=1073741824", True), ("--memory=33554432", False)):
         with tempfile.TemporaryDirectory(prefix="orvane limit-") as folder:
