@@ -1,2 +1,2 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Small changes of the product, and what notices them."""
+"""Small changes of the product, and whether anything notices them."""

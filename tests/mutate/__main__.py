@@ -13,7 +13,7 @@ from pathlib import Path
 
 
 def main() -> int:
-    # Python looks in this folder first. The packages lie in the one above it.
+    # Python looks in this folder first. The packages are in the one above it.
     sys.path[0] = str(Path(__file__).resolve().parents[1])
     words = sys.argv[1:]
     if words[:1] == ["--explain"]:

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Whether orvane-unit's explain says what a run of orvane leaves, in units that are made once."""
+"""Whether orvane-unit's explain says what a run of orvane leaves behind, in units that are made once."""
 
 from __future__ import annotations
 
@@ -26,10 +26,10 @@ UNIT_TOOL = Program("orvane-unit", ("orvane-unit", "orvane_unit", "orvane_kit", 
 RANDOM_UNITS = 50
 RANDOM_SEED = "1"
 
-# What can come of a mutant.
+# The results of a mutant.
 COMPILER = "compiler"    # refused
-BROKEN = "broken"        # no run that ends changes an output: others die, or one never ends
-UNCHANGED = "unchanged"  # every output is that of the unchanged tool
+BROKEN = "broken"        # no run that ends changes an output; others crash, or one never ends
+UNCHANGED = "unchanged"  # every output is the same as with the unchanged tool
 EXPLAINED = "explained"  # explain agrees with the run in every unit
 DIFFERS = "differs"
 
@@ -47,7 +47,7 @@ class Finding:
 
 @dataclass(frozen=True)
 class Recipe:
-    """`make` makes a unit at a path that is free, and returns the arguments of a run in it."""
+    """`make` makes a unit at a free path, and returns the arguments of a run in it."""
 
     name: str
     make: Callable[[Path], list[str]]
@@ -70,7 +70,7 @@ def random_recipe(index: int) -> Recipe:
 
 
 def recipes(base: Base) -> list[Recipe]:
-    """Of every golden unit, and of some random ones."""
+    """The recipes of every golden unit, and of some random ones."""
     golden = sorted((base.tree / "tests/whole_runs/golden").iterdir())
     return [*(golden_recipe(case, base.build / UNIT_TOOL.name) for case in golden),
             *(random_recipe(index) for index in range(RANDOM_UNITS))]
@@ -82,7 +82,7 @@ def changed_paths(before: Mapping[str, Entry], after: Mapping[str, Entry]) -> li
 
 
 def undo_writes(root: Path, before: Mapping[str, Entry], after: Mapping[str, Entry]) -> bool:
-    """Undoes what a run did to files; False when it did more than that."""
+    """Undoes what a run did to files; False if it did more than that."""
     for path in changed_paths(before, after):
         was, has = before.get(path), after.get(path)
         place = os.fspath(root) + path
@@ -98,7 +98,7 @@ def undo_writes(root: Path, before: Mapping[str, Entry], after: Mapping[str, Ent
 
 
 class Case:
-    """A unit in which runs are made and undone. `left` is what the unchanged tool leaves in it."""
+    """A unit in which runs are made and undone. `left` is what the unchanged tool leaves behind."""
 
     def __init__(self, recipe: Recipe, root: Path, enter: Path, original: Path) -> None:
         self.name = recipe.name
@@ -116,7 +116,7 @@ class Case:
             raise Broken(f"{self.name}: what the unchanged tool does can't be undone")
 
     def run(self, orvane: Path) -> runner.Run:
-        """What `undo` must follow."""
+        """Must be followed by `undo`."""
         return runner.run([str(self.enter), str(self.root), str(orvane), *self.arguments],
                           self.root)
 
@@ -131,12 +131,12 @@ class Case:
         return result
 
     def options(self) -> list[str]:
-        """What explain is asked about: the options among the arguments that count."""
+        """The arguments for explain: the options among those that count."""
         return [f"-{letter}" for letter in parse_options(self.arguments)[0]]
 
 
 def run_faults(case: Case, said: Explanation | None, after: Mapping[str, Entry]) -> list[str]:
-    """Where the run, not undone yet, left something else than explain says, or somewhere else."""
+    """Where the run, not undone yet, left something other than explain says, or somewhere else."""
     outputs = said.outputs if said else ()
     tree = Tree(case.root)
     places = [tree.resolve(output.path) for output in outputs]
@@ -147,9 +147,9 @@ def run_faults(case: Case, said: Explanation | None, after: Mapping[str, Entry])
 
 
 def faults(case: Case, orvane: Path, unit_tool: Path) -> list[str] | None:
-    """How explain and a run differ in a unit; None when the run does not end by itself.
+    """How explain and a run differ in a unit; None if the run does not end by itself.
 
-    Nothing can be asked of explain for arguments without an option: then no output may change.
+    Explain needs an option: for arguments without one, no output may change.
     """
     said: Explanation | None = None
     lines: list[str] = []
@@ -166,7 +166,7 @@ def faults(case: Case, orvane: Path, unit_tool: Path) -> list[str] | None:
 
 
 def first_change(cases: Sequence[Case], orvane: Path) -> Case | str:
-    """The first unit with another output than the unchanged tool's, or why there is none."""
+    """The first unit whose output differs from the unchanged tool's, or why there is none."""
     word = UNCHANGED
     for case in cases:
         result = case.run_and_undo(orvane)
@@ -180,7 +180,7 @@ def first_change(cases: Sequence[Case], orvane: Path) -> Case | str:
 
 
 def compare(cases: Sequence[Case], first: Case, orvane: Path, unit_tool: Path) -> Finding:
-    """`first` comes first: a difference is likeliest where an output changes."""
+    """`first` is compared first: a difference is most likely where an output changes."""
     for case in [first, *(case for case in cases if case is not first)]:
         found = faults(case, orvane, unit_tool)
         if found:
@@ -189,7 +189,7 @@ def compare(cases: Sequence[Case], first: Case, orvane: Path, unit_tool: Path) -
 
 
 class AgreementJob(Job):
-    """Has units of its own."""
+    """Has its own units."""
 
     def __init__(self, base: Base, number: int) -> None:
         super().__init__(base, number)
@@ -214,7 +214,7 @@ class AgreementJob(Job):
         return True
 
     def attempt(self, mutant: Mutant) -> Finding:
-        """The unit tool, which takes longer to build, is built only where an output changes."""
+        """The unit tool takes longer to build, so it is built only if an output changes."""
         self.lay(mutant)
         orvane, unit_tool = self.folder / ORVANE.name, self.folder / UNIT_TOOL.name
         if not self.is_built(ORVANE):

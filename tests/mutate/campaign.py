@@ -21,7 +21,7 @@ from mutate.workshop import Job
 
 PROJECT = Path(__file__).resolve().parents[2]
 
-# Of the rows of a catalogue, so many mutants for each file; of everything else all.
+# How many mutants of a catalogue's rows are tried for each file; everything else is tried completely.
 CATALOGUE_SAMPLE = 80
 
 AnyJob = TypeVar("AnyJob", bound=Job)
@@ -29,7 +29,7 @@ Result = TypeVar("Result")
 
 
 def sample(mutants: Sequence[Mutant], seed: str) -> list[Mutant]:
-    """All mutants, but of each catalogue's rows only some."""
+    """All mutants, but only a sample of each catalogue's rows."""
     chosen: set[Key] = set()
     for path in sorted({mutant.path for mutant in mutants}):
         keys = [mutant.key() for mutant in mutants if mutant.path == path and mutant.is_row]
@@ -39,7 +39,7 @@ def sample(mutants: Sequence[Mutant], seed: str) -> list[Mutant]:
 
 
 def in_turn(mutants: Sequence[Mutant], seed: str) -> list[Mutant]:
-    """All, shuffled, and from every file in turn: however few are taken, they are spread evenly."""
+    """All mutants, shuffled, from every file in turn: the first ones, however few, are spread evenly."""
     piles: list[list[Mutant]] = []
     for path in sorted({mutant.path for mutant in mutants}):
         pile = [mutant for mutant in mutants if mutant.path == path]
@@ -52,7 +52,7 @@ def in_turn(mutants: Sequence[Mutant], seed: str) -> list[Mutant]:
 
 
 def limited(mutants: Sequence[Mutant], limit: int, seed: str) -> list[Mutant]:
-    """So many, drawn from every file in turn."""
+    """`limit` mutants, drawn from every file in turn."""
     drawn = {mutant.key() for mutant in in_turn(mutants, seed)[:limit]}
     return [mutant for mutant in mutants if mutant.key() in drawn]
 
@@ -63,7 +63,7 @@ def argument_parser(name: str, description: str | None) -> argparse.ArgumentPars
                         help="a source, such as src/main/options.cpp; more than once for several")
     parser.add_argument("--line", type=int, help="of those, one line")
     parser.add_argument("--jobs", type=int, default=2)
-    parser.add_argument("--seed", default="1", help="of what is drawn")
+    parser.add_argument("--seed", default="1", help="of the random choices")
     parser.add_argument("--list", action="store_true", help="only show the mutants")
     parser.add_argument("--build", type=Path, default=PROJECT / "build/mutate")
     return parser
@@ -82,7 +82,7 @@ class Choice:
 def choose(options: argparse.Namespace, *folders: str) -> Choice:
     """The mutants of these folders of the product, or of all.
 
-    They are those of a copy of the project: from here on nothing looks at the project itself.
+    They come from a copy of the project: from here on nothing reads the project itself.
     """
     scratch = options.build.resolve()
     copy_tree(PROJECT, scratch / "tree")
@@ -104,7 +104,7 @@ def print_list(mutants: Sequence[Mutant]) -> None:
 def in_jobs(jobs: Sequence[AnyJob], mutants: Sequence[Mutant],
             attempt: Callable[[AnyJob, Mutant], Result],
             say: Callable[[Mutant, Result], None]) -> list[Result]:
-    """Tries each mutant in a job that is free, and says what came of it."""
+    """Tries each mutant in a free job, and reports its result."""
     free: queue.Queue[AnyJob] = queue.Queue()
     for job in jobs:
         free.put(job)
@@ -124,7 +124,7 @@ def in_jobs(jobs: Sequence[AnyJob], mutants: Sequence[Mutant],
 
 def print_table(mutants: Sequence[Mutant], verdicts: Sequence[str],
                 columns: Sequence[str]) -> None:
-    """How many of each file there are, and of each verdict."""
+    """How many mutants each file and each verdict have."""
     counts = Counter(zip((mutant.path for mutant in mutants), verdicts))
     paths = sorted({mutant.path for mutant in mutants})
     width = max(len(path) for path in paths)
@@ -138,7 +138,7 @@ def print_table(mutants: Sequence[Mutant], verdicts: Sequence[str],
 
 def stale_entries(name: str, entries: Sequence[Entry], made: Sequence[Mutant],
                   untrue: Mapping[Key, str], only: Sequence[str]) -> list[str]:
-    """What the list `name` has and is no mutant at all, or one whose entry is untrue, and why."""
+    """The entries of the list `name` that match no mutant or are untrue, and why."""
     known = {mutant.key() for mutant in made}
     problems = []
     for entry in entries:

@@ -1,11 +1,12 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Changes one thing of the product at a time and looks whether orvane-unit's explain follows.
+"""Changes one thing in the product at a time and checks whether orvane-unit's explain follows.
 
 Both programs are built from the mutated sources. In every golden unit and in some random ones,
-explain must say to the byte what the run then leaves. Only mutants that change an output count.
+explain must say to the byte what the run then leaves behind. Only mutants that change an output
+count.
 
-Exit status: 0 explain follows enough of them and the rest has a reason, 1 not so, 2 the project
-could not be built or explain fails as it is.
+Exit status: 0 explain follows enough of them and the others have a reason, 1 it does not, 2 the
+project could not be built, or explain fails without any change.
 """
 
 from __future__ import annotations
@@ -31,7 +32,7 @@ FOLDERS = ("src/config/", "src/identity/", "src/main/", "src/tuning/", "src/writ
 
 # In percent.
 ENOUGH = 95.0
-# Fewer mutants that change an output say too little.
+# With fewer mutants that change an output, the result says too little.
 FEWEST = 100
 
 LISTED = "listed"
@@ -42,9 +43,9 @@ Tried = tuple[Mutant, Finding]
 
 def try_until(mutants: Sequence[Mutant], limit: int,
               try_some: Callable[[Sequence[Mutant]], Sequence[Finding]]) -> list[Tried]:
-    """In their order, until so many change an output.
+    """Tries mutants in their order until `limit` of them change an output.
 
-    At a time, as many as are still missing: so the same are tried, whatever the number of jobs.
+    Each round tries as many as are still missing: so the same ones are tried, whatever the number of jobs.
     """
     tried: list[Tried] = []
     while len(tried) < len(mutants):
@@ -75,12 +76,12 @@ def try_all(choice: Choice, limit: int, number: int) -> list[Tried]:
 
 
 def verdict(finding: Finding, is_listed: bool) -> str:
-    """The column that a mutant counts in."""
+    """The column in which a mutant counts."""
     return LISTED if finding.word == DIFFERS and is_listed else finding.word
 
 
 def untrue_entries(tried: Sequence[Tried]) -> dict[Key, str]:
-    """What a list of mutants that explain does not follow must not hold, and why."""
+    """The mutants that must not be in the list of those that explain does not follow, and why."""
     untrue = {}
     for mutant, finding in tried:
         if finding.word == EXPLAINED:
@@ -108,7 +109,7 @@ def print_differences(choice: Choice, tried: Sequence[Tried], listed: Container[
 
 
 def report(tried: Sequence[Tried], listed: Container[Key], fewest: int) -> bool:
-    """Prints the numbers; whether explain follows enough, and every other mutant is listed."""
+    """Prints the numbers. Returns whether explain follows enough, and every other mutant is listed."""
     verdicts = [verdict(finding, mutant.key() in listed) for mutant, finding in tried]
     print_table([mutant for mutant, _ in tried], verdicts, COLUMNS)
     counts = Counter(verdicts)
@@ -117,14 +118,14 @@ def report(tried: Sequence[Tried], listed: Container[Key], fewest: int) -> bool:
     share = 100 * explained / changing if changing else 0.0
     print(f"\nexplain: {changing} mutants change an output, {explained} explained ({share:.1f} %)")
     if changing < fewest:
-        print(f"explain: {fewest} must change an output, or more", file=sys.stderr)
+        print(f"explain: at least {fewest} must change an output", file=sys.stderr)
     return share >= ENOUGH and counts[DIFFERS] == 0 and changing >= fewest
 
 
 def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
     parser = argument_parser("mutate --explain", __doc__)
     parser.add_argument("--limit", type=int, default=150,
-                        help="so many mutants that change an output, from every file in turn (150)")
+                        help="how many mutants that change an output, from every file in turn (150)")
     return parser.parse_args(arguments)
 
 
@@ -138,7 +139,7 @@ def main(arguments: Sequence[str]) -> int:
     if options.list:
         print_list(choice.chosen)
         return 0
-    # An endless loop must not take all of the host; this goes to what is started here.
+    # An endless loop must not exhaust the host; child processes inherit the limits.
     limit_resources()
     try:
         entries = read_entries(UNEXPLAINED)
@@ -148,7 +149,7 @@ def main(arguments: Sequence[str]) -> int:
         return 2
     listed = {entry.key() for entry in entries}
     print_differences(choice, tried, listed)
-    # One file alone may not have as many.
+    # A single file may not have that many.
     fewest = min(FEWEST, options.limit) if not options.only else 0
     is_good = report(tried, listed, fewest)
     problems = [

@@ -9,7 +9,7 @@ from pathlib import Path
 
 from mutate.mutants import Key
 
-# An entry, and the marks that its lines begin with.
+# An entry's keys, and the marks at the start of its lines.
 MARKS = ("@ ", "- ", "+ ", "= ")
 PLACE = re.compile(r"(?P<path>\S+)(?: \((?P<occurrence>\d+)\))?")
 
@@ -20,7 +20,7 @@ class EntryError(Exception):
 
 @dataclass(frozen=True)
 class Entry:
-    """`line` is its own line in the list; the rest as in a mutant."""
+    """`line` is the entry's line in the list; the rest is as in a mutant."""
 
     line: int
     path: str
@@ -34,7 +34,7 @@ class Entry:
 
 
 def parse_entries(text: str, name: str) -> list[Entry]:
-    """`name` is that of the list, for complaints."""
+    """`name` is the list's name, for complaints."""
     entries = []
     numbered = [(number, line.rstrip()) for number, line in enumerate(text.splitlines(), 1)
                 if line.strip() and not line.startswith("#")]

@@ -11,8 +11,8 @@ from dataclasses import dataclass
 from mutate.source import Region, Source, Token, is_inside, unmutated_regions
 from mutate.statements import swaps
 
-# The sources are formatted: a binary operator has blanks around it, a template's bracket, a
-# pointer's asterisk and a sign have not.
+# The sources are formatted: a binary operator has blanks around it; a template's bracket, a pointer's
+# asterisk and a sign do not.
 BINARY = {
     "<": ("<=", ">="), "<=": ("<", ">"), ">": (">=", "<="), ">=": (">", "<"),
     "==": ("!=",), "!=": ("==",), "&&": ("||",), "||": ("&&",),
@@ -36,11 +36,11 @@ CONSTANT_NAME = re.compile(r"[A-Z][A-Z0-9]*_[A-Z0-9_]*|[A-Z]{3,}")
 
 ROW = re.compile(r'[ \t]*(?:\{[^{}\n]*\}|"(?:\\.|[^"\\\n])*"|0x[0-9A-F]+(?:, 0x[0-9A-F]+)*),'
                  r'[ \t]*(?://[^\n]*)?\n')
-# A file with so many rows is a catalogue: its rows are sampled.
+# A file with at least this many rows is a catalogue: its rows are sampled.
 CATALOGUE_ROWS = 20
 
 
-# Path, occurrence, and the changed lines before and after: what tells a mutant from all others.
+# Path, occurrence, and the changed lines before and after: they identify a mutant.
 Key = tuple[str, int, str, str]
 
 
@@ -57,7 +57,7 @@ class Change:
 class Mutant:
     """`before` and `after` are the changed lines, with blanks collapsed.
 
-    `occurrence` tells mutants apart that look alike. `is_row`: of a row of a catalogue.
+    `occurrence` distinguishes mutants that look alike. `is_row`: it changes a row of a catalogue.
     """
 
     path: str
@@ -96,7 +96,7 @@ def other_numbers(text: str) -> Iterator[str]:
 
 
 def other_texts(text: str) -> Iterator[str]:
-    """Another character in the middle, and one character less."""
+    """Texts with another character in the middle, and with one character less."""
     units = re.findall(r"\\.|[^\\]", text[1:-1], re.DOTALL)
     if not units:
         yield '"?"'
@@ -127,7 +127,7 @@ def enumerators(sources: list[Source]) -> dict[str, list[str]]:
 
 
 def is_constant_use(tokens: tuple[Token, ...], index: int) -> bool:
-    """Whether a constant's name stands at `index`, and not where it is declared."""
+    """Whether the token at `index` is a constant's name, and not its declaration."""
     token = tokens[index]
     if token.kind != "word" or not CONSTANT_NAME.fullmatch(token.text):
         return False
@@ -159,7 +159,7 @@ class Mutator:
             yield Change(first[0], second[1], swapped)
 
     def others(self, index: int) -> Iterator[str]:
-        """What may stand in the place of one token."""
+        """The possible replacements of one token."""
         token = self.source.tokens[index]
         if token.kind == "number":
             yield from other_numbers(token.text)
@@ -192,7 +192,7 @@ class Mutator:
             yield group[(group.index(name) + 1) % len(group)]
 
     def negations(self) -> Iterator[Change]:
-        """Conditions that hold no comparison which could be changed itself."""
+        """Negates conditions without a comparison that could itself be changed."""
         tokens = self.source.tokens
         for index, token in enumerate(tokens):
             if token.text not in ("if", "while") or tokens[index + 1].text != "(":

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Changes one thing of the product at a time and looks whether the suite notices.
+"""Changes one thing in the product at a time and checks whether the suite notices.
 
-Exit status: 0 enough is noticed and the rest is explained, 1 not so, 2 the
-project could not be built or its suite fails as it is.
+Exit status: 0 enough is noticed and the rest is explained, 1 it is not, 2 the project could not be built, or
+its suite fails without any change.
 """
 
 from __future__ import annotations
@@ -30,7 +30,7 @@ COLUMNS = ("tests", "compiler", "equivalent", "survived")
 
 
 def verdict(outcome: Outcome, is_listed: bool) -> str:
-    """The column that a mutant counts in."""
+    """The column in which a mutant counts."""
     if outcome.by == "":
         return "equivalent" if is_listed else "survived"
     return "compiler" if outcome.by == "compiler" else "tests"
@@ -48,7 +48,7 @@ def progress(total: int, listed: Container[Key]) -> Callable[[Mutant, Outcome], 
 
 
 def try_all(choice: Choice, listed: Container[Key], number: int) -> list[Outcome]:
-    """The slowest tests see only what all others let pass and what is not explained."""
+    """The slowest tests run only for unexplained mutants that all other tests let pass."""
     mutants = choice.chosen
     base = build_base(choice.scratch, number)
     suites = read_suites(base)
@@ -73,7 +73,7 @@ def try_all(choice: Choice, listed: Container[Key], number: int) -> list[Outcome
 
 
 def report(choice: Choice, outcomes: Sequence[Outcome], entries: Sequence[Entry]) -> bool:
-    """Prints all; whether enough is noticed and nothing unexplained survives."""
+    """Prints everything. Returns whether enough is noticed and nothing unexplained survives."""
     listed = {entry.key() for entry in entries}
     verdicts = [verdict(outcome, mutant.key() in listed)
                 for mutant, outcome in zip(choice.chosen, outcomes)]
@@ -95,7 +95,7 @@ def report(choice: Choice, outcomes: Sequence[Outcome], entries: Sequence[Entry]
 
 def parse_arguments(arguments: Sequence[str]) -> argparse.Namespace:
     parser = argument_parser("mutate", __doc__)
-    parser.add_argument("--limit", type=int, help="so many mutants, from every file in turn")
+    parser.add_argument("--limit", type=int, help="how many mutants, from every file in turn")
     return parser.parse_args(arguments)
 
 

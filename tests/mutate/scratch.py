@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A copy of the project, and programs that must not get out of hand."""
+"""A copy of the project, and programs with limits."""
 
 from __future__ import annotations
 
@@ -11,10 +11,10 @@ import signal
 import subprocess
 from pathlib import Path
 
-# All of the project is copied but this: tests read documents, too.
+# Everything except this is copied: tests read documents, too.
 NOT_COPIED = ("build", ".git", "__pycache__")
 
-# What an endless loop must not take from the host; the tests themselves make disks of 5 GiB.
+# Limits for an endless loop; the tests themselves make disks of 5 GiB.
 MEMORY_LIMIT = 8 << 30
 FILE_LIMIT = 6 << 30
 
@@ -31,7 +31,7 @@ def call(command: list[str], folder: Path) -> str:
 
 
 def copy_tree(source: Path, target: Path) -> None:
-    """Makes `target` equal to `source`; a file that is equal keeps its time, so nothing rebuilds."""
+    """Makes `target` equal to `source`; an equal file keeps its time, so nothing is rebuilt for it."""
     wanted = set()
     for folder, folders, names in os.walk(source):
         folders[:] = sorted(set(folders).difference(NOT_COPIED))
@@ -55,7 +55,7 @@ def limit_resources() -> None:
 
 
 def passes(command: list[str], output: Path, scratch: Path, limit: float) -> bool:
-    """Whether the command succeeds; what it says is in `output`. TimeoutExpired when it lasts."""
+    """Whether the command succeeds; it prints to `output`. Raises TimeoutExpired after `limit` seconds."""
     with output.open("wb") as said, \
             subprocess.Popen(command, cwd=output.parent, stdin=subprocess.DEVNULL, stdout=said,
                              stderr=said, start_new_session=True, preexec_fn=limit_resources,

@@ -49,7 +49,7 @@ def tokenize(text: str) -> tuple[Token, ...]:
 
 
 def read_sources(root: Path) -> list[Source]:
-    """All of the product but what is built for the unit's own system only."""
+    """All of the product except what is built only for the unit's own system."""
     paths = [path for path in sorted((root / "src").rglob("*")) if path.suffix in (".cpp", ".h")]
     sources = []
     for path in paths:
@@ -61,7 +61,7 @@ def read_sources(root: Path) -> list[Source]:
 
 
 def matching(tokens: tuple[Token, ...], index: int) -> int:
-    """Where the bracket that opens at `index` closes."""
+    """The index of the bracket that closes the one at `index`."""
     depth = 0
     for at in range(index, len(tokens)):
         if tokens[at].text in OPENING:
@@ -74,7 +74,7 @@ def matching(tokens: tuple[Token, ...], index: int) -> int:
 
 
 def statement_end(tokens: tuple[Token, ...], index: int) -> int:
-    """The semicolon that ends the statement at `index`, whatever brackets it holds."""
+    """The index of the semicolon that ends the statement at `index`, whatever brackets it contains."""
     while tokens[index].text != ";":
         index = matching(tokens, index) if tokens[index].text in OPENING else index
         index += 1
@@ -114,9 +114,9 @@ def is_inside(position: int, regions: list[Region]) -> bool:
 
 
 def unmutated_regions(sources: list[Source]) -> dict[str, list[Region]]:
-    """By path: the static assertions, and what exists for nothing but them.
+    """By path: the static assertions, and what exists only for them.
 
-    What is asserted is the compiler's business; to change an assertion says nothing of the tests.
+    The compiler checks assertions, so changing one says nothing about the tests.
     """
     regions: dict[str, list[Region]] = {source.path: [] for source in sources}
     for source in sources:
@@ -125,7 +125,7 @@ def unmutated_regions(sources: list[Source]) -> dict[str, list[Region]]:
                 end = source.tokens[statement_end(source.tokens, index)].end
                 regions[source.path].append((token.start, end))
 
-    # A name that no header has is its file's own: another file may have one that looks alike.
+    # A name that is in no header belongs to its file: another file may have the same name.
     uses: dict[str, list[tuple[str, int]]] = {}
     shared: set[str] = set()
     for source in sources:

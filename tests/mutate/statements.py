@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Finds pairs of adjacent statements, and of adjacent data members, that can change places."""
+"""Finds pairs of adjacent statements, and of adjacent data members, that can be swapped."""
 
 from __future__ import annotations
 
@@ -8,7 +8,7 @@ from collections.abc import Iterator
 
 from mutate.source import Region, Token, matching
 
-# Two of these, one after the other, do nothing that an order could change.
+# The order of two of these never matters.
 QUIET_DECLARATION = re.compile(
     r"(?:(?:static|const|constexpr|\[\[ maybe_unused \]\]) )*"
     r"(?:\w+ :: )*\w+(?: < [^()]* >)?(?: [*&])?(?: const)? \w+(?: \[ (?:\w+ )?\])?"
@@ -38,7 +38,7 @@ def is_swap(kind: str, first: tuple[Token, ...], second: tuple[Token, ...]) -> b
 
 
 def swaps(tokens: tuple[Token, ...]) -> Iterator[tuple[Region, Region]]:
-    """The places of both, without what lies between them."""
+    """The regions of both, without the text between them."""
     scopes = ["namespace"]
     start = 0
     former: tuple[Token, ...] | None = None

@@ -26,7 +26,7 @@ DIFFERENTIAL_UNITS = 150
 FAULTS = "faults"
 FAULTS_TIME_LIMIT = 900
 
-# A mutant that takes so much longer than the original runs in an endless loop.
+# A mutant is in an endless loop if it takes more seconds than this and so many times the original's time.
 TIME_LIMIT = 30
 TIME_FACTOR = 10
 
@@ -55,7 +55,7 @@ class Outcome:
 
 
 class SuiteJob(Job):
-    """Its tool lies where its tests look for it."""
+    """Its tool is where the tests look for it."""
 
     def __init__(self, base: Base, suites: dict[str, list[str]], number: int) -> None:
         super().__init__(base, number)
@@ -69,12 +69,12 @@ class SuiteJob(Job):
                 for word in super().command(unit, target)]
 
     def make(self, mutant: Mutant | None) -> None:
-        """Broken when the compiler refuses it."""
+        """Raises Broken if the compiler refuses it."""
         self.lay(mutant)
         self.build(ORVANE, TESTS)
 
     def stages(self, folder: str) -> list[tuple[str, list[str]]]:
-        """The tests that stand next to `folder` come first, whole runs of the tool last."""
+        """The tests next to `folder` come first, whole runs of the tool last."""
         suites = self.suites
         near = suites.get(folder, [])
         rest = [suite for name, group in sorted(suites.items()) if name != WHOLE_RUNS
@@ -87,7 +87,7 @@ class SuiteJob(Job):
                                          "--units", str(DIFFERENTIAL_UNITS)])]
 
     def driver(self, name: str) -> list[str]:
-        """A driver, on this job's tool."""
+        """The command of a driver, with this job's tool."""
         return [sys.executable, str(self.base.tree / "tests/drivers"), name, "--jobs", "1",
                 "--orvane", str(self.folder / "orvane"),
                 "--enter", str(self.base.build / "orvane-enter")]
@@ -104,7 +104,7 @@ class SuiteJob(Job):
         return passes(command, self.folder / "output", scratch, limit)
 
     def check_original(self) -> None:
-        """The whole suite on the unchanged sources must pass; it also says how long it takes."""
+        """The whole suite must pass on the unchanged sources; this also measures its time."""
         self.make(None)
         self.check(self.stages(""))
 
@@ -140,7 +140,7 @@ class SuiteJob(Job):
         self.check([self.faults()])
 
     def attempt_faults(self, mutant: Mutant) -> Outcome:
-        """What the slowest tests say of a mutant that all others let pass."""
+        """The result of the slowest tests, for a mutant that all others let pass."""
         self.make(mutant)
         self.limits[FAULTS] = FAULTS_TIME_LIMIT
         return self.outcome([self.faults()])

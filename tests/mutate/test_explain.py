@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The trial of explain, on programs that are made for it."""
+"""The trial of explain, with programs made for it."""
 
 from __future__ import annotations
 
@@ -32,7 +32,7 @@ def program(path: Path, script: str) -> Path:
 
 
 def said(path: str, text: str) -> str:
-    """What explain prints of one output that is generated."""
+    """What explain prints for one generated output."""
     line = {"text": text, "reasons": ["fixed-text"], "key": None, "detail": ""}
     return json.dumps({
         "format": 1, "command": "explain", "root": "/", "letters": "a", "isIntended": True,
@@ -42,7 +42,7 @@ def said(path: str, text: str) -> str:
 
 
 class Programs(unittest.TestCase):
-    """Scripts in the place of the tools: the tool's sees the unit's folder as $ROOT."""
+    """Scripts in place of the tools: the tool's script gets the unit's folder as $ROOT."""
 
     def setUp(self) -> None:
         folder = tempfile.TemporaryDirectory()
@@ -77,7 +77,7 @@ class Programs(unittest.TestCase):
                     self.original)
 
     def finding(self, orvane: Path, unit_tool: Path, *cases: Case) -> Finding:
-        """As a job finds it, once both programs are built."""
+        """The finding of a job once both programs are built."""
         tried = cases or (self.case("-a"),)
         first = agreement.first_change(tried, orvane)
         if isinstance(first, str):
@@ -91,7 +91,7 @@ class FindingTest(Programs):
         self.assertEqual(found, Finding(EXPLAINED))
         self.assertTrue(found.changes_an_output())
 
-    def test_explain_that_says_what_was_differs_and_the_bytes_are_shown(self) -> None:
+    def test_explain_that_gives_the_old_content_differs_and_the_bytes_are_shown(self) -> None:
         found = self.finding(self.writing("new"), self.saying(OUTPUT, "old\n"))
         self.assertEqual((found.word, found.lines[0]), (DIFFERS, "bench: -a"))
         self.assertIn("'new\\n'", "".join(found.lines[1:]))
@@ -130,13 +130,13 @@ class FindingTest(Programs):
         self.assertEqual(found, Finding(DIFFERS, (
             "bench: word", f"{OUTPUT}: the run changes it, and explain does not name it")))
 
-    def test_change_of_no_output_is_not_asked_about(self) -> None:
+    def test_explain_is_not_asked_when_no_output_changes(self) -> None:
         found = self.finding(self.orvane(f'printf "old\\n" > "$ROOT{OUTPUT}"; echo more; exit 3'),
                              self.unit_tool("exit 2"))
         self.assertEqual(found, Finding(UNCHANGED))
         self.assertFalse(found.changes_an_output())
 
-    def test_run_that_dies_says_nothing(self) -> None:
+    def test_run_that_crashes_proves_nothing(self) -> None:
         self.assertEqual(self.finding(self.orvane("kill -6 $$"), self.unit_tool("exit 2")),
                          Finding(BROKEN))
         orvane = self.orvane(
@@ -148,7 +148,7 @@ class FindingTest(Programs):
 
 class UndoTest(Programs):
     def undone(self, script: str, times_made: int) -> None:
-        """The unit is as before; made anew where that was needed."""
+        """Requires that the unit is as before, and how many times it was made."""
         case = self.case("-a")
         case.run_and_undo(self.orvane(script))
         self.assertEqual(snapshot.take(case.root), case.before)
@@ -158,7 +158,7 @@ class UndoTest(Programs):
     def test_writes_are_undone_in_place(self) -> None:
         self.undone('echo new > "$ROOT/tmp/a"; echo new > "$ROOT/fs/stock"', 1)
 
-    def test_anything_else_takes_a_new_unit(self) -> None:
+    def test_anything_else_needs_a_new_unit(self) -> None:
         for script in ('rm "$ROOT/fs/stock"', 'mkdir "$ROOT/tmp/a"', 'chmod 600 "$ROOT/fs/stock"',
                        'rm "$ROOT/fs/stock"; ln -s a "$ROOT/fs/stock"'):
             with self.subTest(script):
@@ -241,7 +241,7 @@ class VerdictTest(unittest.TestCase):
 
 
 class ListTest(unittest.TestCase):
-    def test_entries_that_are_not_of_a_difference_are_untrue(self) -> None:
+    def test_entries_without_a_difference_are_untrue(self) -> None:
         untrue = explain.untrue_entries(tried(DIFFERS, EXPLAINED, UNCHANGED, BROKEN, COMPILER))
         self.assertEqual([untrue.get(mutant(line).key()) for line in range(1, 6)],
                          [None, "explain agrees with the run", "changes no output: unchanged",
@@ -252,7 +252,7 @@ class ListTest(unittest.TestCase):
         self.assertEqual(explain.untold_reasons("list.txt", entries, "As no one\n  can know, so."),
                          ["list.txt:6: promises.md does not give this reason"])
 
-    def test_own_list_is_well_formed_and_told(self) -> None:
+    def test_own_list_is_well_formed_and_explained(self) -> None:
         entries = read_entries(explain.UNEXPLAINED)
         promises = explain.PROMISES.read_text(encoding="utf-8")
         self.assertEqual(explain.untold_reasons(explain.UNEXPLAINED.name, entries, promises), [])

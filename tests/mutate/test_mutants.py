@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What is changed and what is not, on sources that are made for it."""
+"""What is changed and what is not, in sources made for it."""
 
 from __future__ import annotations
 
@@ -110,7 +110,7 @@ class SkippedTest(unittest.TestCase):
         self.assertEqual(changes('#include "a.h"\n// a < 1\n/* 2 */\nstatic_assert(f(3) == 4);\n'),
                          [])
 
-    def test_what_only_an_assertion_uses_stays(self) -> None:
+    def test_code_that_only_an_assertion_uses_stays(self) -> None:
         text = ("constexpr int LIMIT_OF_IT = 3;\n"
                 "constexpr bool inner() {\n    return 1 < LIMIT_OF_IT;\n}\n"
                 "constexpr bool outer() {\n    return inner();\n}\n"
@@ -118,14 +118,14 @@ class SkippedTest(unittest.TestCase):
         self.assertEqual(changes(text), [])
         self.assertNotEqual(changes(text + body("g(inner());")), [])
 
-    def test_name_that_another_file_uses_for_itself_is_no_use(self) -> None:
+    def test_name_that_another_file_defines_itself_is_not_a_use(self) -> None:
         checked = source("constexpr char NAME_OF_IT[] = {};\nstatic_assert(NAME_OF_IT[0] == 0);\n")
         other = source(body("g(NAME_OF_IT);"), "src/a/c.cpp")
         self.assertEqual(len(unmutated_regions([checked, other])["src/a/b.cpp"]), 2)
         header = source("extern const char NAME_OF_IT[];\n", "src/a/b.h")
         self.assertEqual(len(unmutated_regions([checked, other, header])["src/a/b.cpp"]), 1)
 
-    def test_constant_of_a_header_is_no_check(self) -> None:
+    def test_constant_of_a_header_is_not_a_check(self) -> None:
         header = source("constexpr int SIZE_OF_IT = 3;\n", "src/a/b.h")
         user = source("static_assert(SIZE_OF_IT == 3);\n")
         self.assertEqual(unmutated_regions([header, user])["src/a/b.h"], [])
@@ -159,7 +159,7 @@ class SampleTest(unittest.TestCase):
         drawn = limited([*rows("a", 100), *rows("b", 2), *rows("c", 100)], 9, "1")
         self.assertEqual([sum(each.path == path for each in drawn) for path in "abc"], [4, 2, 3])
 
-    def test_what_is_drawn_in_turn_is_all_and_begins_with_every_file(self) -> None:
+    def test_drawing_in_turn_gives_all_and_starts_with_every_file(self) -> None:
         mutants = [*rows("a", 100), *rows("b", 2), *rows("c", 100)]
         drawn = in_turn(mutants, "1")
         self.assertEqual([each.path for each in drawn[:7]], list("abcabca"))

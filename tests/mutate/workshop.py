@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """Builds the unchanged project once, and then the programs that one mutant changes.
 
-Everything lies in one scratch folder: tree/ (a copy of the project), base/ (its build), and a
-folder for each job with the sources, objects and programs of the mutant at hand.
+Everything is in one scratch folder: tree/ (a copy of the project), base/ (its build), and a folder
+for each job with the sources, objects and programs of its current mutant.
 """
 
 from __future__ import annotations
@@ -19,8 +19,7 @@ from pathlib import Path
 from mutate.mutants import Mutant
 from mutate.scratch import call
 
-# The assertions are those of the debug build, which is part of the suite; its sanitizers are left
-# out for their time.
+# The assertions are those of the debug build, which is part of the suite; its sanitizers would take too long.
 CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
                  "-DCMAKE_CXX_FLAGS=-O0 -w -D_GLIBCXX_ASSERTIONS", "-DCMAKE_CXX_FLAGS_DEBUG=",
                  "-DCMAKE_EXE_LINKER_FLAGS=-static", "-DORVANE_KIT=ON", "-DORVANE_TESTS=ON",
@@ -30,7 +29,7 @@ CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
 
 @dataclass(frozen=True)
 class Program:
-    """`targets` are those of the build whose objects it is linked of, `words` go behind them."""
+    """`targets` are the build's targets whose objects it is linked from, `words` follow them."""
 
     name: str
     targets: tuple[str, ...]
@@ -45,7 +44,7 @@ ORVANE = Program("orvane", ("orvane", "orvane_core"))
 
 @dataclass(frozen=True)
 class TranslationUnit:
-    """One of the base build. `depends` are the sources of the product that it includes."""
+    """A translation unit of the base build. `depends` are the sources of the product that it includes."""
 
     source: str
     object: str
@@ -54,9 +53,9 @@ class TranslationUnit:
 
 
 class Base:
-    """The unchanged project, built, and what it is made of.
+    """The unchanged project, built, and its parts.
 
-    `programs` are built again for each mutant, `others` only here.
+    `programs` are rebuilt for each mutant, `others` only here.
     """
 
     def __init__(self, scratch: Path, jobs: int, programs: Sequence[Program],
@@ -72,7 +71,7 @@ class Base:
         self.units = self.read_units()
 
     def read_units(self) -> list[TranslationUnit]:
-        """The product's own come first, so that what can't be compiled ends soon."""
+        """The product's own come first, so that a mutant that does not compile ends soon."""
         depends: dict[str, set[str]] = {}
         current: set[str] = set()
         for line in call(["ninja", "-C", str(self.build), "-t", "deps"], self.scratch).splitlines():
@@ -92,19 +91,19 @@ class Base:
 
 
 class Job:
-    """Makes one mutant at a time, and programs of it."""
+    """Makes one mutant at a time, and programs from it."""
 
     def __init__(self, base: Base, number: int) -> None:
         self.base = base
         self.folder = base.scratch / f"job{number}"
         shutil.rmtree(self.folder, ignore_errors=True)
         self.folder.mkdir(parents=True)
-        # Disk images and trees of small files: in memory where there is such a place.
+        # Disk images and trees of small files: in memory if possible.
         memory = Path("/dev/shm")
         place = memory if os.access(memory, os.W_OK) else self.folder
         self.temporary = Path(tempfile.mkdtemp(prefix="orvane-mutate-", dir=place))
         self.mutated = ""
-        # By the base's object: what stands in for it, whatever the mutant, and for this mutant.
+        # Replacements by the base's object: for every mutant, and for this mutant.
         self.own: dict[str, str] = {}
         self.changed: dict[str, str] = {}
 
@@ -112,7 +111,7 @@ class Job:
         shutil.rmtree(self.temporary, ignore_errors=True)
 
     def lay(self, mutant: Mutant | None) -> None:
-        """From here on programs are built of this mutant, or of the unchanged sources."""
+        """From here on programs are built from this mutant, or from the unchanged sources."""
         overlay = self.folder / "overlay"
         for folder in (overlay, self.folder / "changed"):
             shutil.rmtree(folder, ignore_errors=True)
@@ -124,7 +123,7 @@ class Job:
             (overlay / mutant.path).write_text(mutant.text, encoding="utf-8")
 
     def command(self, unit: TranslationUnit, target: Path) -> list[str]:
-        """As the base compiles it, but with the mutated file."""
+        """The base's compile command, but with the mutated file."""
         overlay = self.folder / "overlay"
         words = list(unit.command)
         words[words.index("-o") + 1] = str(target)
@@ -139,13 +138,13 @@ class Job:
         return str(target)
 
     def object(self, unit: TranslationUnit) -> str:
-        """Compiled for this mutant where it includes what is changed."""
+        """The object of `unit`, compiled for this mutant if it includes the changed file."""
         if self.mutated in unit.depends and unit.object not in self.changed:
             self.changed[unit.object] = self.compile(unit, "changed")
         return self.changed.get(unit.object) or self.own.get(unit.object) or unit.object
 
     def build(self, *programs: Program) -> None:
-        """Broken when the compiler refuses the mutant."""
+        """Raises Broken if the compiler refuses the mutant."""
         objects = {unit.object: self.object(unit) for unit in self.base.units
                    if any(program.holds(unit.object) for program in programs)}
         for program in programs:
