@@ -1,2 +1,2 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The rules of orvane once more, read apart from its program. Depends on no driver."""
+"""A second reading of orvane's rules, independent of its program. Depends on no driver."""

@@ -23,21 +23,21 @@ def width(number: int) -> int:
 
 
 def offset(number: int) -> int:
-    """The image is packed: a parameter follows on all those before it."""
+    """The image is packed: a parameter directly follows those before it."""
     return sum(width(before) for before in range(1, number))
 
 
 def parameter(system: System, number: int) -> int | None:
-    """Opens, measures, maps, reads and closes; None when there is no image to read.
+    """Opens, measures, maps, reads and closes; None without a readable image.
 
-    The length is never compared with what is read: past the end of a short image
-    the rest of the mapping's page reads as zeros.
+    The length is never checked: past the end of a short image, the rest of the mapping's page reads
+    as zeros.
     """
     handle = system.open_reading(IMAGE)
     if handle is None:
         return None
     value = None
-    # Rewind, measure, rewind: all three are made, only the measuring counts.
+    # Rewind, measure, rewind: all three are done, only the measuring counts.
     system.seek(IMAGE)
     measured = system.seek(IMAGE)
     system.seek(IMAGE)

@@ -19,9 +19,9 @@ DEFAULT_SERIAL = b"ABCD1234abc"
 
 
 def load_names(path: Path = MODEL_NAMES) -> list[str]:
-    """The model display names, that of code 1 on the first line.
+    """The model display names, code 1 first.
 
-    Code 32 has no name of its own but that of code 1; all others differ.
+    Code 32 has the name of code 1; all others differ.
     """
     names = path.read_text(encoding="ascii").splitlines()
     if len(names) != MODEL_COUNT:
@@ -46,7 +46,7 @@ def right_hand_drive(system: System) -> int:
 
 
 def fuel_type(system: System) -> None:
-    """Nothing is made of it, but its source is read on every run."""
+    """Unused, but its source is read on every run."""
     configuration.parameter(system, configuration.FUEL_TYPE)
 
 

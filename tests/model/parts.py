@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What a unit is put together from: an image, a disk, version files, product files."""
+"""What a unit is made of: an image, a disk, version files, product files."""
 
 from __future__ import annotations
 
@@ -57,7 +57,7 @@ def put_folder(root: Path, path: str) -> None:
 
 
 def image(values: Mapping[int, int] | None = None) -> bytes:
-    """A full image: zeros but for the given parameters."""
+    """A full image: zeros except for the given parameters."""
     content = bytearray(IMAGE_SIZE)
     for number, value in (values or {}).items():
         start, size = configuration.offset(number), configuration.width(number)
@@ -71,7 +71,7 @@ def put_image(root: Path, values: Mapping[int, int] | None = None) -> None:
 
 def put_disk(root: Path, size: int = 2 * records.RECORD_AREA, serial: bytes = b"",
              area: bytes = b"", path: str = "/dev/hd0") -> None:
-    """A disk that is a hole but for the serial and the tuning area, where they fit."""
+    """A disk that is a hole except for the serial and the tuning area, if they fit."""
     with open(_room(root, path), "wb") as file:
         file.truncate(size)
         serial_start = size - records.RECORD_AREA + records.SERIAL_OFFSET
@@ -88,7 +88,7 @@ def put_version(root: Path, number: bytes, kind: bytes = b"Application",
 
 
 def put_product_files(root: Path) -> None:
-    """Every template and stock file, each with a text of its own."""
+    """Every template and stock file, each with its own text."""
     for path in (*TEMPLATES, *STOCK_FILES):
         put(root, path, b"# " + path.encode("ascii") + b"\nkey = value\n")
 

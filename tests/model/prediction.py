@@ -1,8 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Says what a run of orvane leaves behind, worked out apart from its program.
+"""Predicts what a run of orvane leaves behind, independently of its program.
 
-The prediction is made from the unit's files as they stand before the run, and
-nothing is changed by making it.
+The prediction uses the unit's files as they are before the run, and changes nothing.
 """
 
 from __future__ import annotations
@@ -25,8 +24,8 @@ OPTION_LETTERS = b"ia"
 class Outcome:
     """`written` maps absolute paths, free of links, to content.
 
-    `tmp` is all of /tmp by paths relative to it, old entries included, or None
-    when there is no such folder. `ways` tells how each output came about.
+    `tmp` is all of /tmp by paths relative to it, old entries included, or None if there is no such
+    folder. `ways` says how each output came about.
     """
 
     written: Mapping[str, bytes]
@@ -38,7 +37,7 @@ class Outcome:
 class Prediction:
     """Any one of `alternatives` is right; without faults there is exactly one.
 
-    `unmet` are the faults whose operation the run never comes to.
+    `unmet` are the faults whose operation the run never reaches.
     """
 
     alternatives: tuple[Outcome, ...]
@@ -49,9 +48,9 @@ class Prediction:
 
 
 def parse_options(arguments: Sequence[str]) -> tuple[list[str], bytes]:
-    """The letters of writers to run, and what the C library says of the others.
+    """The letters of writers to run, and what the C library says about the others.
 
-    Options end at the first operand, for which a lone "-" counts, and at "--".
+    Options end at the first operand, such as a lone "-", and at "--".
     """
     letters: list[str] = []
     complaints = b""
@@ -82,7 +81,7 @@ def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcom
 
 def predict(root: Path, arguments: Sequence[str], names: Sequence[str],
             faults: Sequence[Fault] = (), retries_interrupted: bool = True) -> Prediction:
-    """`names` are the model display names, that of code 1 first."""
+    """`names` are the model display names, code 1 first."""
     letters, complaints = parse_options(arguments)
     outcomes: list[Outcome] = []
     met: set[Fault] = set()

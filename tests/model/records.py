@@ -36,6 +36,6 @@ def serial_record(system: System) -> bytes | None:
 
 
 def tuning_blocks(system: System) -> bytes | None:
-    """As long as the blocks are; zeros stand for what a short read didn't bring."""
+    """Always as long as the blocks; zeros replace what a short read didn't give."""
     blocks = _read_from_end(system, TUNING_AREA, DPS_AREA_SIZE)
     return None if blocks is None else blocks.ljust(DPS_AREA_SIZE, b"\0")

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""All that lies in a unit, as plain values that can be compared."""
+"""Everything in a unit, as plain values that can be compared."""
 
 from __future__ import annotations
 
@@ -13,14 +13,13 @@ FOLDER = "folder"
 FILE = "file"
 LINK = "link"
 
-# A larger file (a disk, which is mostly a hole) is told by its size and its time
-# of change alone.
+# A larger file (a disk, which is mostly a hole) is compared by its size and its time of change alone.
 MAX_READ = 1 << 19
 
 
 @dataclass(frozen=True)
 class Entry:
-    """`mode` is None where any will do; `stamp` is size and time of a large file."""
+    """`mode` is None if any mode is right; `stamp` is size and time of a large file."""
 
     kind: str
     content: bytes = b""
@@ -55,7 +54,7 @@ def take(root: Path, path: str = "") -> dict[str, Entry]:
 
 def changed(before: Mapping[str, Entry], written: Mapping[str, bytes],
             new_mode: int | None = None) -> dict[str, Entry]:
-    """What `before` becomes by writing; a file that was there keeps its mode."""
+    """What `before` becomes when `written` is written; an existing file keeps its mode."""
     after = dict(before)
     for path, content in written.items():
         old = before.get(path, Entry(FILE, mode=new_mode))
@@ -64,7 +63,7 @@ def changed(before: Mapping[str, Entry], written: Mapping[str, bytes],
 
 
 def difference(expected: Mapping[str, Entry], found: Mapping[str, Entry]) -> list[str]:
-    """One line for each path that isn't as expected; none when all is well."""
+    """One line for each path that isn't as expected."""
     lines = []
     for path in sorted(expected.keys() | found.keys()):
         want, have = expected.get(path), found.get(path)
@@ -86,7 +85,7 @@ def _entry_difference(want: Entry, have: Entry) -> str:
 
 
 def bytes_difference(want: bytes, have: bytes, margin: int = 24) -> str:
-    """Where two texts part, with the bytes around that place."""
+    """The first place at which two texts differ, with the bytes around it."""
     at = next((i for i, pair in enumerate(zip(want, have)) if pair[0] != pair[1]),
               min(len(want), len(have)))
     start = max(0, at - margin)

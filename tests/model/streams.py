@@ -13,7 +13,7 @@ class InputStream:
         self.failed = self._handle is None
 
     def rest(self) -> tuple[bytes, bool]:
-        """All bytes, and whether it was an error that ended them."""
+        """All bytes, and whether an error ended them."""
         if self._handle is None:
             return b"", False
         return self._system.read_stream(self._handle)
@@ -26,13 +26,13 @@ class InputStream:
         return lines
 
     def close(self) -> None:
-        """Nothing ever looks at an input after it was closed."""
+        """Nothing uses an input after it was closed."""
         if self._handle is not None:
             self._system.close(self._handle)
 
 
 class OutputStream:
-    """Drops what is written once it has failed; its file is complete at close."""
+    """Drops writes once it has failed; its file is complete at close."""
 
     def __init__(self, system: System, path: str) -> None:
         self._system = system
@@ -70,13 +70,12 @@ class OutputStream:
         self._handle = None
 
     def _apply(self, fault: Fault) -> None:
-        """Keeps what the file holds when the write of `fault` failed.
+        """Sets what the file holds after the write of `fault` failed.
 
-        What was there before stays. Of the call's own bytes, those that had been
-        pending (all of a plain write, the first piece of a gathered one) are
-        either tried again at close or lost. What comes later is dropped, except
-        that a copy which had moved a byte before doesn't mark its destination, so
-        that the lines behind the copy still arrive.
+        Earlier content stays. Of the call's own bytes, those that were pending (all of a plain
+        write, the first piece of a gathered one) are either tried again at close or lost. Later
+        bytes are dropped. One exception: a copy that has already moved a byte doesn't mark its
+        destination, so the lines after the copy are still written.
         """
         whole = self._content
         end = fault.offset + fault.length
@@ -96,7 +95,7 @@ class OutputStream:
 
 
 def install_stock(system: System, stock_path: str, output_path: str) -> None:
-    """Neither opening is looked at; the output's is a second one of that path."""
+    """Neither opening is checked; the output's is a second one of that path."""
     stock = InputStream(system, stock_path)
     output = OutputStream(system, output_path)
     output.copy(stock)

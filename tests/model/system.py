@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The unit's system calls: files, their counting, and the faults that hit them."""
+"""The unit's system calls: files, how calls are counted, and the faults that disturb them."""
 
 from __future__ import annotations
 
@@ -16,14 +16,12 @@ DISK = "/dev/hd0"
 class Fault:
     """One disturbed system call.
 
-    `occurrence` counts from 1. For open, seek and map it is the number of that
-    operation on `path` in the run. For read, write, close and list it is the
-    number of the opening whose descriptor the call used: how many transfers a
-    stream makes of one opening is the library's own business, so such a call is
-    told by the bytes it covered in an undisturbed run, `offset` and `length`.
-    `pieces` are the lengths of a gathered write. A list fault's offset is 0 when
-    no entry had been delivered and positive when all of them had. A short
-    transfer moves only `length` bytes.
+    `occurrence` counts from 1. For open, seek and map it is the number of that operation on `path`
+    in the run. For read, write, close and list it is the number of the opening whose descriptor the
+    call used: the library decides how many transfers a stream makes with one opening, so such a
+    call is identified by the bytes it covered in an undisturbed run, `offset` and `length`.
+    `pieces` are the lengths of a gathered write. A list fault's offset is 0 when no entry had been
+    delivered and positive when all of them had. A short transfer moves only `length` bytes.
     """
 
     operation: str
@@ -38,25 +36,23 @@ class Fault:
 
 @dataclass(frozen=True)
 class Library:
-    """What a C++ library is free to do when a call under a stream fails.
+    """What a C++ library may do when a call under a stream fails.
 
-    Each of these is consulted only where the fault makes it matter, so a run
-    without faults has one outcome whatever is chosen here.
+    Each of these is consulted only if the fault makes it matter, so a run without faults has one
+    outcome whatever is chosen here.
     """
 
-    # Reading breaks off behind the first byte of a copy: one library throws
-    # inside (which marks the destination failed), another sees a plain end.
+    # Reading fails after the first byte of a copy: one library throws inside (which marks the destination
+    # failed), another sees a plain end.
     broken_copy_fails: bool = False
-    # The same within a line: the thrown error drops the unfinished line, the
-    # plain end yields it.
+    # The same within a line: the thrown error drops the unfinished line, the plain end keeps it.
     unfinished_line_kept: bool = False
-    # Bytes that a failed write left pending are tried once more by close, or
-    # they are lost when it was close itself that wrote them.
+    # Close tries bytes that a failed write left pending once more; they are lost if close itself wrote them.
     pending_kept: bool = False
-    # The last write of a file may come from the copy (which had got bytes
-    # across before, so doesn't mark the stream) or from close (which does).
+    # The last write of a file may come from the copy (which has already moved bytes, so doesn't mark the
+    # stream) or from close (which does).
     last_write_fails_stream: bool = False
-    # A stream whose read or write is interrupted by a signal calls again.
+    # A stream repeats a read or write that a signal interrupted.
     retries_interrupted: bool = True
 
 
@@ -68,7 +64,7 @@ class Handle:
 
 
 class System:
-    """The tree as the tool's calls see it, in the order in which it makes them."""
+    """The tree as the tool's calls see it, in the order of the calls."""
 
     def __init__(self, tree: Tree, faults: Sequence[Fault], library: Library) -> None:
         self.tree = tree
@@ -95,7 +91,7 @@ class System:
         return self._fault(operation, path, self._count(operation, path)) is None
 
     def open_reading(self, path: str) -> Handle | None:
-        """Folders open for reading too; it is their reading that fails."""
+        """Folders can be opened for reading, too; reading them fails."""
         opening = self._count("open", path)
         if self._fault("open", path, opening):
             return None
@@ -125,18 +121,18 @@ class System:
         return self._fault("close", handle.path, handle.opening) is None
 
     def transfer_fault(self, operation: str, handle: Handle) -> Fault | None:
-        """The fault that disturbs a transfer of this opening for good, if any."""
+        """The fault that permanently disturbs a transfer of this opening, if any."""
         fault = self._fault(operation, handle.path, handle.opening)
         if fault is None or handle.path == DISK:
             return fault
         if fault.kind == "short":
-            return None  # a stream goes on with the rest
+            return None  # a stream continues with the rest
         if fault.error == "EINTR" and self.library.retries_interrupted:
             return None
         return fault
 
     def read_stream(self, handle: Handle) -> tuple[bytes, bool]:
-        """All that a stream gets out of a file, and whether an error ended it."""
+        """Everything that a stream reads from a file, and whether an error ended it."""
         content = b"" if handle.place.kind == FOLDER_PLACE else self.tree.read(handle.place)
         fault = self.transfer_fault("read", handle)
         if fault is not None:

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The names of the models are read, and are as many as there are codes."""
+"""The names of the models are read, one for each code."""
 
 from __future__ import annotations
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The model against outcomes worked out by hand: command line, identity, fallbacks."""
+"""The model compared with outcomes worked out by hand: command line, identity, fallbacks."""
 
 from __future__ import annotations
 
@@ -32,7 +32,7 @@ class CommandLine(UnitCase):
         self.assertEqual(set(self.outcome("-a", "word", "-i").written), {"/tmp/airplay.conf"})
 
     def test_both_letters_in_the_order_given(self) -> None:
-        # What the first writes is the other's template, so the order shows.
+        # The first output is the other's template, so the order shows.
         self.remove(STATIC[0])
         parts.put_link(self.root, "/tmp/iap2_device.cfg", "/fs/mp/etc/airplay_static.conf")
         for together, apart in ((("-ai",), ("-a", "-i")), (("-ia",), ("-i", "-a"))):
@@ -78,7 +78,7 @@ class Airplay(UnitCase):
         parts.put_folder(self.root, "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM")
         self.check(self.head())
 
-    def test_calibration_file_is_no_replacement(self) -> None:
+    def test_calibration_file_is_not_a_replacement(self) -> None:
         parts.put(self.root, "/fs/rwdata/CALS/cal_active.bin", parts.image({134: 3}))
         self.check(self.head())
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The model's outcomes of disturbed system calls, against ones worked out by hand."""
+"""The model's outcomes of disturbed system calls, compared with outcomes worked out by hand."""
 
 from __future__ import annotations
 
@@ -24,7 +24,7 @@ class Faults(UnitCase):
         self.compact = accessory(b"12345678", NAMES[0].encode(), b"010203")
 
     def contents(self, argument: str, fault: Fault, name: str) -> list[bytes | None]:
-        """What the file may hold, over all outcomes."""
+        """What the file may hold, in all outcomes."""
         prediction = predict(self.root, [argument], NAMES, [fault])
         self.assertEqual(prediction.unmet, ())
         found = []
@@ -145,6 +145,6 @@ class Faults(UnitCase):
         self.assertEqual(self.contents("-i", fault, "iap2_device.cfg"),
                          [start + b"x" * 8191 + VEHICLE])
 
-    def test_unmet_fault_is_told(self) -> None:
+    def test_unmet_fault_is_reported(self) -> None:
         fault = Fault("open", "/nowhere", 1)
         self.assertEqual(predict(self.root, ["-a"], NAMES, [fault]).unmet, (fault,))

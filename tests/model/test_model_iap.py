@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The model against outcomes worked out by hand: the iAP files and what is in them."""
+"""The model compared with outcomes worked out by hand: the iAP files and their content."""
 
 from __future__ import annotations
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The model against tuning files worked out by hand."""
+"""The model compared with tuning files worked out by hand."""
 
 from __future__ import annotations
 
@@ -57,7 +57,7 @@ qwaIVOSwitch
 qwaMEQEnable 0 0 0 0 
 """
 
-# What the program never looks at.
+# What the program never reads.
 UNREAD_BYTES = (11, 12, 74, 75, 80, 81, 82, 83, *range(179, 188))
 UNREAD_BITS = ((1, 0xC0), (3, 0xC0), (4, 0x30))
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A unit's files below a folder that stands for "/", with what was written kept aside."""
+"""A unit's files below a folder that stands for "/"; what is written is kept separately."""
 
 from __future__ import annotations
 
@@ -35,9 +35,9 @@ class Tree:
         return os.fspath(self.root) + path
 
     def resolve(self, path: str) -> Place | None:
-        """None when a part of the way is missing, no folder, or a loop of links.
+        """None if a part of the path is missing, not a folder, or a loop of links.
 
-        An absolute link starts over at the unit's root, and ".." doesn't leave it.
+        An absolute link starts again at the unit's root, and ".." doesn't leave it.
         """
         ahead = path.split("/")[::-1]
         done: list[str] = []
@@ -83,7 +83,7 @@ class Tree:
         return os.stat(self._real(place.path)).st_size
 
     def read(self, place: Place, offset: int = 0, count: int | None = None) -> bytes:
-        """`count` keeps a large sparse file from being read whole."""
+        """`count` avoids reading a large sparse file whole."""
         if place.path in self.written:
             content = self.written[place.path][offset:]
             return content if count is None else content[:count]
@@ -95,6 +95,6 @@ class Tree:
         self.written[place.path] = content
 
     def names(self, place: Place) -> list[str]:
-        """scandir and readdir give one and the same order."""
+        """scandir and readdir give the same order."""
         with os.scandir(self._real(place.path)) as entries:
             return [entry.name for entry in entries]

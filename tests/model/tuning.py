@@ -95,7 +95,7 @@ def tuning_text(block: bytes, block_id: int) -> bytes:
 
 
 def generate_tuning_file(system: System, block_id: int, path: str) -> str:
-    """The disk is read even when the file then can't be opened."""
+    """The disk is read even if the file can't be opened afterwards."""
     blocks = records.tuning_blocks(system)
     output = OutputStream(system, path)
     if output.failed:
@@ -108,7 +108,7 @@ def generate_tuning_file(system: System, block_id: int, path: str) -> str:
 
 
 def audio_profile(system: System, ways: dict[str, str]) -> int | None:
-    """None when unknown. The files are complete before the profile is known."""
+    """None if unknown. The files are complete before the profile is known."""
     profile = configuration.parameter(system, configuration.AUDIO_PROFILE)
     if profile == GENERATED_PROFILE:
         ways[TELEPHONY] = generate_tuning_file(system, 3, TELEPHONY)

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What tests of the model and of its drivers start from."""
+"""The common start of tests of the model and of the drivers."""
 
 from __future__ import annotations
 

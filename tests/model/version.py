@@ -17,7 +17,7 @@ INT_MIN = -(2**31)
 
 
 def read_record(system: System, path: str) -> dict[bytes, bytes]:
-    """Lines without "=", or with nothing behind it, make no entry."""
+    """Lines without "=", or with nothing after it, make no entry."""
     record: dict[bytes, bytes] = {}
     stream = InputStream(system, path)
     for line in stream.lines():
@@ -29,7 +29,7 @@ def read_record(system: System, path: str) -> dict[bytes, bytes]:
 
 
 def application_version(system: System) -> bytes:
-    """Every file is read before the first that describes an application is taken."""
+    """Every file is read before the first that describes an application is chosen."""
     found = [
         read_record(system, FOLDER + name) for name in system.list_folder(FOLDER)
         if ".inf" in FOLDER + name
@@ -42,7 +42,7 @@ def application_version(system: System) -> bytes:
 
 
 def extracted(component: bytes) -> int:
-    """0 when there is no number; a number past the range becomes its limit."""
+    """0 if there is no number; a number out of range becomes the limit."""
     match = NUMBER.match(component)
     if match is None:
         return 0
@@ -53,7 +53,7 @@ def extracted(component: bytes) -> int:
 
 
 def format_component(component: bytes) -> bytes:
-    """The remainder takes the dividend's sign, and a negative one eight digits."""
+    """The remainder has the dividend's sign; a negative one takes eight digits."""
     value = extracted(component)
     remainder = value % 256 if value >= 0 else -(-value % 256)
     return b"%02x" % (remainder & 0xFFFFFFFF)

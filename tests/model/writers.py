@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """The accessory files: a generated head and a template, or a stock file.
 
-Each writer notes in `ways` how its outputs came about, for the count of what a
-series of random units has reached.
+Each writer records in `ways` how its outputs came about, so that a series of random units can count
+what it has reached.
 """
 
 from __future__ import annotations
@@ -24,7 +24,7 @@ IAP1 = "/tmp/iap1.cfg"
 
 @dataclass(frozen=True)
 class Accessory:
-    """What the opening lines of the three iAP files tell, version aside."""
+    """The values in the first lines of the three iAP files, except the version."""
 
     serial: bytes
     model: bytes
@@ -107,8 +107,7 @@ def write_iap(system: System, names: Sequence[str], ways: dict[str, str]) -> Non
 
     firmware = version.software_version(system)
 
-    # Whether this file is generated hangs on the stage before it, and not on its
-    # own template.
+    # Whether this file is generated depends on the stage before it, not on its own template.
     iap1 = OutputStream(system, IAP1)
     iap1_template = InputStream(system, PRODUCT + "mm/iap1_static.cfg")
     if iap2.failed or iap1.failed:
