@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What every test of `orvane-field capture` does: it captures, and requires that the unit stays as it is."""
+"""What every test of `orvane-field capture` does: it captures, and requires that the unit is unchanged."""
 
 from __future__ import annotations
 
@@ -13,7 +13,7 @@ from car_case import CarTest
 
 class CaptureTest(CarTest):
     def capture(self, **given: object) -> Done:
-        """Captures into /home/car, and requires that the unit itself stays as it is."""
+        """Captures into /home/car, and requires that the unit itself is unchanged."""
         parts = [self.car / name for name in ("fs", "dev/hd0", "tmp")]
         before = [snapshot(part) for part in parts if os.path.lexists(part)]
         done = self.car.run("capture", "car", **given)
@@ -34,7 +34,7 @@ class CaptureTest(CarTest):
         self.check_record(done, "not complete")
 
     def check_failure_without_record(self, done: Done, said: str) -> None:
-        """Where there is no room for a record."""
+        """For a failure that leaves no room for a record."""
         self.assertEqual((done.status, done.out), (1, ""), done.err)
         self.assertIn(said, done.err)
         self.assertTrue(done.err.endswith("/home/car is not complete\n"), done.err)

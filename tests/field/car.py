@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A simulated unit with shells and utilities of its own, and processes whose root it is."""
+"""A simulated unit with its own shells and utilities, and processes that have it as their root."""
 
 from __future__ import annotations
 
@@ -35,7 +35,7 @@ AREA = 1 << 20
 NOBODY = 65534
 CLONE_NEWNS, CLONE_NEWUSER = 0x00020000, 0x10000000
 MS_REC, MS_PRIVATE = 0x4000, 0x40000
-TIME_LIMIT = 60  # seconds; only a script that hangs gets there
+TIME_LIMIT = 60  # seconds; only a script that hangs reaches it
 
 _libc = ctypes.CDLL(None, use_errno=True)
 
@@ -54,7 +54,7 @@ def _mount(kind: bytes | None, target: bytes, flags: int, data: bytes | None) ->
 
 
 def _become_root_of_a_namespace() -> None:
-    """What lets a process change its root: the privilege, or a user namespace of its own."""
+    """Lets this process change its root, through its own user namespace."""
     if is_root():
         return
     user, group = os.geteuid(), os.getegid()
@@ -70,7 +70,7 @@ def libraries(program: str) -> set[str]:
 
 
 def snapshot(folder: Path) -> dict[str, tuple[object, ...]]:
-    """All that a careless script could change below the folder, by path."""
+    """Everything that a careless script could change below the folder, by path."""
     entries: dict[str, tuple[object, ...]] = {}
     for path in [folder, *folder.rglob("*")]:
         status = path.lstat()
@@ -80,7 +80,7 @@ def snapshot(folder: Path) -> dict[str, tuple[object, ...]]:
             content = path.read_bytes() if status.st_size < AREA else status.st_size
         elif kind == stat.S_IFLNK:
             content = os.readlink(path)
-        # A folder's time changes when an entry comes and goes again.
+        # A folder's time changes even if an entry is added and removed again.
         stamp = None if kind == stat.S_IFDIR else status.st_mtime_ns
         entries[str(path.relative_to(folder))] = (
             kind, stat.S_IMODE(status.st_mode), status.st_uid, status.st_ino, stamp, content)
@@ -109,14 +109,14 @@ class Circumstances:
     path: str = "/bin"
     is_ordinary: bool = False  # an ordinary user; only where the tests run as root
     largest_file: int | None = None  # bytes
-    room: tuple[str, int] | None = None  # a file system of so many bytes at a folder
+    room: tuple[str, int] | None = None  # a file system of this many bytes at a folder
     mask: int = 0o022
     output: int = subprocess.PIPE
     environment: dict[str, str] = field(default_factory=dict)
 
 
 class Car:
-    """One folder for a whole test class: building the shells takes longer than a test."""
+    """One folder for a whole test class: installing the shells takes longer than a test."""
 
     def __init__(self) -> None:
         self._holder = tempfile.TemporaryDirectory(prefix="orvane-field-")
@@ -168,7 +168,7 @@ class Car:
         (self.root / "home").chmod(0o777)
 
     def replace_unit(self, made: Path) -> None:
-        """The unit's own folders become those of another unit."""
+        """Replaces the unit's own folders by those of another unit."""
         for name in ("fs", "dev", "tmp"):
             shutil.rmtree(self.root / name)
             if (made / name).is_dir():
@@ -186,13 +186,14 @@ class Car:
         target.chmod(0o755)
 
     def wrap(self, text: str, *names: str) -> str:
-        """Programs before the real ones, in a text where NAME stands for theirs; the search path."""
+        """Puts programs before the real ones; NAME in the text stands for each name. Returns the search
+        path."""
         for name in names:
             self.program(f"wrap/{name}", text.replace("NAME", name))
         return "/wrap:/bin"
 
     def without(self, utility: str) -> str:
-        """A search path on which one utility is missing."""
+        """A search path that lacks one utility."""
         folder = self.root / f"home/without-{utility}"
         folder.mkdir()
         for name in (*UTILITIES, "orvane"):
@@ -216,16 +217,16 @@ class Car:
                 os.setgroups([])
                 os.setgid(NOBODY)
                 os.setuid(NOBODY)
-            # What is ignored from the start, as in a job in the background, no shell can trap.
+            # A shell cannot trap a signal that is ignored from the start, as in a background job.
             for number in (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGPIPE):
                 signal.signal(number, signal.SIG_DFL)
             if given.largest_file is not None:
-                # Python ignores the signal of the limit, and so does what it starts.
+                # Python ignores the limit's signal, and so do the programs that it starts.
                 resource.setrlimit(resource.RLIMIT_FSIZE, (given.largest_file,) * 2)
         return enter
 
     def run(self, *words: str, **given: object) -> Done:
-        """Runs the script. Raises subprocess.SubprocessError where the root can't be entered so."""
+        """Runs the script. Raises subprocess.SubprocessError if the root can't be entered so."""
         circumstances = Circumstances(**given)  # type: ignore[arg-type]
         environment = {"PATH": circumstances.path, **circumstances.environment}
         done = subprocess.run([*SHELLS[circumstances.shell], "/bin/orvane-field", *words],
@@ -237,8 +238,8 @@ class Car:
                     done.stderr.decode(errors="replace"))
 
 
-# Counts the calls of all utilities that are wrapped so, and at one of them sends a signal to the
-# script, as by kill, or to the utility as well, as from a terminal.
+# Counts the calls of all utilities that it wraps. At one of them it sends a signal to the script, like kill,
+# or to the utility as well, like a terminal.
 SIGNALLER = """
 count=0
 [ ! -f /home/count ] || read -r count </home/count

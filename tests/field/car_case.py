@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A car for the tests of one class, as it was at first for each of them."""
+"""A car for the tests of one class, restored for each of them."""
 
 from __future__ import annotations
 

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What every test of `orvane-field look` does: it looks, and requires that /tmp is left as it was."""
+"""What every test of `orvane-field look` does: it looks, and requires that /tmp is unchanged."""
 
 from __future__ import annotations
 

@@ -1,5 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
-"""`orvane-field capture` copies what orvane reads, and the desk says the same of it as of the unit."""
+"""`orvane-field capture` copies what orvane reads, and the desk says the same about the copy as about the
+unit."""
 
 from __future__ import annotations
 
@@ -99,7 +100,7 @@ class WholeUnitTest(CaptureTest):
         wanted = taken | {"a.infx"}
         self.assertEqual({path.name for path in self.captured(VERSIONS).iterdir()}, wanted)
 
-    def test_several_applications_are_told(self) -> None:
+    def test_several_applications_are_reported(self) -> None:
         self.assertNotIn("applications", self.capture().err)
         (self.car / VERSIONS / "b.inf").write_bytes(b" Type = x\nType=MainApplication2")
         (self.car / VERSIONS / "c.inf").write_bytes(b"Type=Application\nType =Other\n")
@@ -110,12 +111,12 @@ class WholeUnitTest(CaptureTest):
 
 
 class ToTheDeskTest(CaptureTest):
-    """From the car to the reason: what the desk says of the captured folder holds for the unit."""
+    """What the desk says about the captured folder holds for the unit."""
 
     def tool(self, *words: object, status: tuple[int, ...] = (0, 1)) -> str:
         done = subprocess.run([ORVANE_UNIT, *map(str, words)], capture_output=True, text=True, check=False)
         self.assertIn(done.returncode, status, done.stderr)
-        # The disk's area begins elsewhere on a shorter disk.
+        # On a shorter disk, the area begins elsewhere.
         return re.sub(r"(disk bytes from|block \d, disk byte|disk byte) \d+", r"\1", done.stdout)
 
     def check_explanations(self, desk: Path) -> None:
@@ -137,7 +138,7 @@ class ToTheDeskTest(CaptureTest):
                 self.check_success(self.capture())
                 self.check_explanations(Path(folder) / "desk")
 
-    def test_the_record_is_no_part_of_the_unit(self) -> None:
+    def test_the_record_is_not_part_of_the_unit(self) -> None:
         self.check_success(self.capture())
         with tempfile.TemporaryDirectory(prefix="orvane-field-") as folder:
             self.tool("capture", self.captured("."), f"{folder}/desk", status=(0,))
@@ -145,9 +146,9 @@ class ToTheDeskTest(CaptureTest):
             self.tool("set", f"{folder}/desk", "serial=ZZ", status=(0,))
             self.assertIn("ZZ", self.tool("diff", self.captured("."), f"{folder}/desk", status=(1,)))
 
-    def test_what_stood_in_tmp_is_compared_with_a_run(self) -> None:
+    def test_the_captured_tmp_is_compared_with_a_run(self) -> None:
         with tempfile.TemporaryDirectory(prefix="orvane-field-") as folder:
-            # The boot came before the image was there.
+            # The boot ran before the image was there.
             image = (self.car / IMAGE).read_bytes()
             (self.car / IMAGE).unlink()
             self.car.program("home/boot", "/bin/orvane -a -i\n")

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""`orvane-field capture` finds the disk's end, reads little, and copies its last mebibyte to the byte."""
+"""`orvane-field capture` finds the disk's end, reads little, and copies exactly its last mebibyte."""
 
 from __future__ import annotations
 
@@ -13,14 +13,14 @@ from car import AREA, DISK, SHELLS
 
 GIB = 1 << 30
 BLOCK = 512
-# One-block reads of the search, and what measures and checks the end; see find_end in the script.
+# The search's reads of one block, and those that measure and check the end; see find_end in the script.
 MOST_CALLS = 75
 RECORDER = 'echo "$*" >>/home/calls\nexec /bin/NAME "$@"\n'
 
 
 class DiskTest(CaptureTest):
     def make_disk(self, size: int) -> bytes:
-        """The last bytes of a disk that is a hole before them; returns what must be captured."""
+        """Makes a disk with bytes only at its end; returns what must be captured."""
         content = random.Random(size).randbytes(min(size, AREA + 3 * BLOCK))
         with open(self.car / DISK, "wb") as disk:
             disk.truncate(size)
@@ -41,7 +41,7 @@ class DiskTest(CaptureTest):
                     self.assertTrue(self.captured(DISK).read_bytes() == wanted)
 
     def check_calls(self, size: int, most: int) -> None:
-        """What is read of the disk in all is the area, and a block for each other call."""
+        """In all, the area is read once, and one block by each other call."""
         (self.car / "home/calls").unlink()
         wanted = self.make_disk(size)
         self.again()
@@ -50,7 +50,7 @@ class DiskTest(CaptureTest):
         calls = (self.car / "home/calls").read_text().splitlines()
         counts = [int(re.search(r"bs=512 .*count=(\d+)", call)[1]) for call in calls
                   if f"if=/{DISK} " in call]
-        self.assertLessEqual(len(calls), most + 20)  # the small files, too
+        self.assertLessEqual(len(calls), most + 20)  # the small files as well
         self.assertLessEqual(len(counts), most)
         self.assertEqual(sorted(counts)[:-1], [1] * (len(counts) - 1))
         self.assertLessEqual(max(counts), AREA // BLOCK + 1)
@@ -97,8 +97,8 @@ class DiskTest(CaptureTest):
             self.check_success(self.capture())
             shutil.rmtree(self.car / "sys")
 
-    def test_a_disk_that_only_dd_can_look_at(self) -> None:
-        """As in a shell of 32 bits whose call for the size of a large disk fails."""
+    def test_a_disk_that_only_dd_can_read(self) -> None:
+        """As in a 32-bit shell that cannot get the size of a large disk."""
         wanted = self.make_disk(3 * AREA + 7)
         (self.car / DISK).rename(self.car / "home/disk")
         path = self.car.wrap('for word in "$@"; do\nshift\n[ "$word" != if=/dev/hd0 ] || word=if=/home/disk\n'
@@ -115,7 +115,7 @@ class DiskTest(CaptureTest):
             (self.car / DISK).unlink()
 
     def failing_dd(self, condition: str) -> str:
-        """A dd that fails for some blocks of the disk, as it does where one can't be read."""
+        """A dd that fails for some blocks of the disk, as if they could not be read."""
         return self.car.wrap(
             "skip=-1\nfor word in \"$@\"; do\ncase $word in\nskip=*) skip=${word#skip=} ;;\nesac\ndone\n"
             f"case $1 in\nif=/dev/hd0) if [ $skip -ge 0 ] && {condition}; then exit 1; fi ;;\n"
@@ -133,7 +133,7 @@ class DiskTest(CaptureTest):
         self.assertFalse(self.captured(DISK).exists())
 
     def test_blocks_near_the_end_that_cannot_be_read(self) -> None:
-        """Some disks lose eight blocks at a time."""
+        """Some disks lose eight blocks at once."""
         for blocks in (6144 + 64, 6144 + 1000, 6144 + 2000):
             self.make_disk(blocks * BLOCK)
             self.again()
@@ -146,7 +146,7 @@ class DiskTest(CaptureTest):
         self.check_failure(done, "/dev/hd0: cannot be read")
         self.assertFalse(self.captured(DISK).exists())
 
-    def test_an_area_that_comes_short(self) -> None:
+    def test_an_area_that_is_too_short(self) -> None:
         path = self.car.wrap('case $* in\n*count=2048*) set -- "$1" "$2" count=7 ;;\nesac\n'
                              'exec /bin/dd "$@"\n', "dd")
         self.check_failure(self.capture(path=path), "/dev/hd0: its last mebibyte cannot be copied")

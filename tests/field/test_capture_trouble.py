@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""`orvane-field capture` says what it could not copy, and never that it is done when it is not."""
+"""`orvane-field capture` says what it could not copy, and never claims to be complete when it is not."""
 
 from __future__ import annotations
 
@@ -47,7 +47,7 @@ class TroubleTest(CaptureTest):
         self.check_failure(self.capture(is_ordinary=True), f"/{VERSIONS}: no permission to list it")
 
     @unittest.skipUnless(is_root(), "only root can become another user")
-    def test_what_stands_in_a_folder_that_may_not_be_entered(self) -> None:
+    def test_files_in_a_folder_that_may_not_be_entered(self) -> None:
         for folder, path in (("fs/rwdata", VERSIONS), ("fs/tmpfs", IMAGE), ("fs", IMAGE),
                              ("fs/mp", "fs/mp/etc/mm/iap1.cfg"), ("tmp", "tmp/iap1.cfg")):
             self.car.reset()
@@ -88,8 +88,8 @@ class TroubleTest(CaptureTest):
                                                       "(not printable) is not complete\n"))
                     shutil.rmtree(self.car / "home" / name)
 
-    def test_names_that_the_folder_takes_for_one(self) -> None:
-        """As on a stick, where upper and lower case are the same."""
+    def test_names_that_the_folder_treats_as_one(self) -> None:
+        """As on a USB stick that ignores upper and lower case."""
         (self.car / VERSIONS / "b.inf").write_text("Type=x\n")
         path = self.car.wrap('/bin/dd "$@"\ncase $1 in\n*/application.inf)'
                              f" : >/home/car/{VERSIONS}/b.inf ;;\nesac\n", "dd")
@@ -126,7 +126,7 @@ class TroubleTest(CaptureTest):
                     self.assertEqual({k: v for k, v in after.items() if k not in ("pid", "dev/null")},
                                      {k: v for k, v in before.items() if k not in ("pid", "dev/null")})
 
-    def test_folders_that_are_taken(self) -> None:
+    def test_accepted_folders(self) -> None:
         for folder, real in (("/tmp/car", "/tmp/car"), ("-x", "/home/-x"), ("a b/", "/home/a b"),
                              ("/car", "/car"), ("./x/../y", None)):
             done = self.car.run("capture", folder)
@@ -136,7 +136,7 @@ class TroubleTest(CaptureTest):
                 self.assertEqual((done.status, done.out), (0, f"captured into {real}\n"))
                 self.assertTrue((self.car / real[1:] / DISK).is_file())
 
-    def test_a_missing_utility_is_told_before_anything_else(self) -> None:
+    def test_a_missing_utility_is_reported_before_anything_else(self) -> None:
         for shell in SHELLS:
             for utility in CAPTURE_UTILITIES:
                 with self.subTest(shell=shell, utility=utility):
@@ -146,7 +146,7 @@ class TroubleTest(CaptureTest):
                                      (2, "", f"orvane-field: missing here: {utility}\n"))
                     self.assertFalse((self.car / "home/car").exists())
 
-    def test_files_that_may_grow_no_further(self) -> None:
+    def test_files_that_may_not_grow_further(self) -> None:
         for number, size in enumerate((0, 1, 100, 511, 512, AREA - 1)):
             shell = list(SHELLS)[number % len(SHELLS)]
             with self.subTest(shell=shell, size=size):
@@ -170,7 +170,7 @@ class TroubleTest(CaptureTest):
                     self.skipTest("nothing can be mounted here")
                 self.check_failure_without_record(done, "orvane-field: ")
                 self.assertNotIn("cannot be read", done.err)
-        # What is mounted is gone with its process, and the record with it.
+        # The mount is gone with its process, and so is the record.
         self.assertEqual(self.capture(room=("home/car", 4 * AREA)).out, "captured into /home/car\n")
 
     def test_a_record_that_cannot_be_written(self) -> None:
@@ -187,7 +187,7 @@ class TroubleTest(CaptureTest):
                 self.again()
                 self.check_failure_without_record(self.capture(shell=shell, largest_file=whole - 1),
                                                   "cannot write /home/car/capture.txt")
-                # At its end only: there is a message.
+                # Fails only at its end, so there is a message.
                 (self.car / "tmp/iap1.cfg").unlink()
                 self.again()
                 self.check_failure_without_record(self.capture(shell=shell, largest_file=whole),
@@ -195,7 +195,7 @@ class TroubleTest(CaptureTest):
                 (self.car / "tmp/iap1.cfg").touch()
 
     def test_a_capture_that_is_killed(self) -> None:
-        """No trap helps then, nor at a loss of power."""
+        """No trap helps then, just as with a loss of power."""
         self.car.wrap(SIGNALLER, *CAPTURE_UTILITIES)
         for shell in SHELLS:
             self.again()
@@ -220,7 +220,7 @@ class InterruptedTest(CaptureTest):
         self.check_success(self.interrupted(0, "INT", "dash"))
         steps = int((self.car / "home/count").read_text())
         shells = list(SHELLS)
-        # The middle is the search, where each step is like the next.
+        # The middle is the search, where all steps are alike.
         for step in [*range(1, 16), *range(16, steps - 12, 11), *range(steps - 12, steps + 1)]:
             shell, name = shells[step % len(shells)], self.SIGNALS[step % len(self.SIGNALS)]
             with self.subTest(step=step, shell=shell, signal=name):

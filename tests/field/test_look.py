@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""`orvane-field look` sees what a unit has, and notices what it lacks."""
+"""`orvane-field look` sees what a unit has, and what it lacks."""
 
 from __future__ import annotations
 
@@ -31,7 +31,7 @@ class WholeUnitTest(LookTest):
                 outputs[shell] = done.out
         self.assertEqual(len(set(outputs.values())), 1, outputs)
 
-    def test_what_it_says_is_what_is_there(self) -> None:
+    def test_it_says_what_is_there(self) -> None:
         done = self.look()
         for line in ("the image arrives: audio profile 65535",
                      "the brand and the drive side arrive: brand QUARION, drive side 1",
@@ -110,7 +110,7 @@ class UnitThatLacksSomethingTest(LookTest):
             (self.car / IMAGE).write_bytes(image[:size])
             self.check("differs", "where the image lies", f"{size} bytes instead of 179")
 
-    def test_a_stock_file_tells_nothing_of_the_inputs(self) -> None:
+    def test_a_stock_file_says_nothing_about_the_inputs(self) -> None:
         for name in ("airplay", "iap2_device", "mm/iap2"):
             (self.car / f"fs/mp/etc/{name}_static.{'conf' if name == 'airplay' else 'cfg'}").unlink()
         (self.car / "fs/mp/etc/airplay.conf").write_text(
@@ -165,7 +165,7 @@ class UnitThatLacksSomethingTest(LookTest):
         self.check("ok", "the version arrives", "applications: 2")
 
     def test_a_version_file_with_a_zero_byte(self) -> None:
-        """No shell can hold that byte, so it cannot tell what orvane makes of it."""
+        """No shell can hold that byte, so the script cannot predict what orvane makes of it."""
         (self.car / VERSIONS / "application.inf").write_bytes(b"Type=Application\nVersion Number=3.1\x009\n")
         for shell in SHELLS:
             self.check("unknown", "the version arrives", "a zero byte may hide another in application.inf",

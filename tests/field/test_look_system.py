@@ -10,7 +10,7 @@ from look_case import LookTest
 
 
 class OtherOrvaneTest(LookTest):
-    """Every reliance that a system may lack, shown by a program that behaves as there."""
+    """Programs that behave as orvane would on a system that lacks something it relies on."""
 
     def check(self, text: str, question: str, seen: str = "", **given: object) -> Done:
         self.put_older_outputs()
@@ -29,7 +29,7 @@ class OtherOrvaneTest(LookTest):
     def test_it_ends_with_another_status(self) -> None:
         self.check("exit 3\n", "it starts:", "exit status 3")
 
-    def test_it_speaks(self) -> None:
+    def test_it_prints_something(self) -> None:
         self.check('[ $# = 0 ] || echo hello\nexec /bin/orvane "$@"\n', "silence and", 'says "hello"')
 
     def test_it_fails(self) -> None:
@@ -41,7 +41,7 @@ class OtherOrvaneTest(LookTest):
     def test_an_unknown_option_is_not_named(self) -> None:
         self.check('[ "${1-}" != -z ] || shift\nexec /bin/orvane "$@"\n', "differs  an unknown option:")
 
-    def test_an_unknown_option_ends_all(self) -> None:
+    def test_an_unknown_option_ends_the_options(self) -> None:
         self.check('[ "${1-}" != -z ] || { echo z >&2; exit 0; }\nexec /bin/orvane "$@"\n',
                    "what stands behind an", "makes nothing")
 
@@ -62,7 +62,7 @@ class OtherOrvaneTest(LookTest):
                    "/tmp/iap1.cfg comes whole", "its end is another")
 
     def test_a_template_that_ends_with_an_empty_line_is_left_out(self) -> None:
-        """The generated lines end so, too."""
+        """The generated lines end with one, too."""
         (self.car / "fs/mp/etc/mm/iap2_static.cfg").write_text("a\n\n")
         self.check('/bin/orvane "$@"\n[ -e /tmp/iap2.cfg ] || exit 0\nwhile IFS= read -r l; do echo "$l"\n'
                    '[ -n "$l" ] || break; done </tmp/iap2.cfg >/home/cut\n/bin/mv /home/cut /tmp/iap2.cfg\n',

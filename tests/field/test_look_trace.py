@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""`orvane-field look` leaves no trace, whatever stands in its way and whatever stops it."""
+"""`orvane-field look` leaves no trace, whatever is in its way and whatever stops it."""
 
 from __future__ import annotations
 
@@ -61,7 +61,7 @@ class SomethingInThePlaceOfAnOutputTest(LookTest):
 
     def test_a_file_that_would_be_overwritten_by_what_is_put_aside(self) -> None:
         self.put_older_outputs()
-        # The name has the number of the process, which a program of that process can tell.
+        # The name contains the number of the process, which a program of that process can read.
         path = self.car.wrap('read -r pid </pid\necho kept >/tmp/orvane-field-$pid-kept.airplay.conf\n',
                              "uname")
         done = self.car.run("look", path=path)
@@ -105,7 +105,7 @@ class TroubleTest(LookTest):
         self.assertEqual((done.status, done.err), (0, ""))
         self.assertTrue(done.out.startswith("usage: orvane-field look [ORVANE]\n"))
 
-    def test_a_missing_utility_is_told_before_anything_else(self) -> None:
+    def test_a_missing_utility_is_reported_before_anything_else(self) -> None:
         for shell in SHELLS:
             for utility in LOOK_UTILITIES:
                 with self.subTest(shell=shell, utility=utility):
@@ -128,8 +128,8 @@ class TroubleTest(LookTest):
         self.assertIn("-a, since /tmp/airplay.conf cannot be put aside", done.line("not all is tried"))
         self.assertEqual(done.err, "")
 
-    def test_putting_aside_copies_and_breaks_off(self) -> None:
-        """As where a file can't be renamed and there is no room for another."""
+    def test_putting_aside_copies_and_stops(self) -> None:
+        """As when a file can't be renamed and there is no room for a copy."""
         self.put_older_outputs()
         path = self.car.wrap('case $1 in\n*/iap2.cfg) echo part >"$2"; exit 1 ;;\nesac\nexec /bin/mv "$@"\n',
                              "mv")
@@ -154,7 +154,7 @@ class TroubleTest(LookTest):
         self.assertEqual((done.status, done.lines("differs"), done.err), (0, [], ""))
 
     def test_there_is_little_room(self) -> None:
-        """For less than one run at first, at last for the files of two."""
+        """Room for less than one run at first, finally for the files of two."""
         shells = list(SHELLS)
         for size in range(1, 13):
             shell = shells[size % len(shells)]
@@ -168,7 +168,7 @@ class TroubleTest(LookTest):
                 self.assertEqual((done.status, done.err), (int(size < 6), ""))
 
     def test_an_output_that_the_last_run_cuts_short(self) -> None:
-        """Only where nothing more can be written, the room is the cause."""
+        """The room is the cause only if nothing more can be written."""
         for full, word, seen in (("true", "differs", "its content is not the same"),
                                  ("/bin/dd if=/bin/orvane of=/tmp/other 2>/dev/null", "unknown",
                                   "it is cut short, since /tmp has no room for it")):
@@ -200,7 +200,7 @@ class TroubleTest(LookTest):
                     self.assertEqual(done.status, 1)
                     self.assertEqual(done.err, "")
 
-    def test_nobody_reads_what_it_says(self) -> None:
+    def test_nobody_reads_the_output(self) -> None:
         self.put_older_outputs()
         for shell in SHELLS:
             reading, writing = os.pipe()
@@ -211,7 +211,7 @@ class TroubleTest(LookTest):
 
 
 class InterruptedTest(LookTest):
-    """A signal at every call of a utility or of orvane: the script alone gets it, or both do."""
+    """A signal at every call of a utility or of orvane: only the script gets it, or both do."""
 
     SIGNALS = ("INT", "TERM", "HUP", "QUIT", "PIPE")
 
@@ -245,9 +245,9 @@ class InterruptedTest(LookTest):
             number = signal.Signals[f"SIG{name}"]
             with self.subTest(step=step, reaches=reaches, shell=shell, signal=name):
                 done = self.interrupted(step, reaches, name, shell)
-                # Early it touches nothing yet and simply ends; while it puts back it goes on.
+                # Early it has changed nothing yet and simply ends; while it puts files back, it continues.
                 self.assertIn(done.status, (0, -number, 128 + number))
-                # Some shells say more, of the utility that ended by the signal.
+                # Some shells also report the utility that the signal ended.
                 if done.err.endswith(f"orvane-field: stopped by SIG{name}; /tmp is as it was\n"):
                     self.assertEqual(done.status, 128 + number)
                     stopped += 1
