@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The check value that the catalogues of CRCs give for the one that orvane has.
+// Prints the check value that catalogues of CRCs give for orvane's CRC.
 #include <config/crc32.h>
 
 #include <iostream>

@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Projects that use orvane get its library, and nothing else: no target, option, flag or file of ours.
+"""Projects that use orvane get its library and nothing else: no other target, option, flag or file of ours.
 
-One adds orvane's folder to its own build, one finds what was installed. All paths hold blanks.
+One adds orvane's folder to its own build, one finds an installed orvane. All paths contain blanks.
 """
 
 from __future__ import annotations
@@ -19,12 +19,12 @@ from typing import Any
 HERE = Path(__file__).resolve().parent
 PROJECT = HERE.parents[1]
 
-# All that a build of the library alone reads.
+# Everything that a build of the library alone reads.
 TAKEN = ("CMakeLists.txt", "cmake", "src")
 
 CHECK_VALUE = "cbf43926\n"
 
-# What its sources mean, and nothing that a builder may choose.
+# What its sources require, and nothing that a builder may choose.
 LIBRARY_FLAGS = {"-std=c++11", "-D_FILE_OFFSET_BITS=64", "-D_LARGEFILE64_SOURCE"}
 
 
@@ -45,7 +45,7 @@ def files(folder: Path) -> set[str]:
 
 
 class Build:
-    """A consumer, configured and built, and what CMake says that it is made of."""
+    """A consumer, configured and built, and what CMake says it consists of."""
 
     def __init__(self, folder: Path, kind: str, *arguments: str) -> None:
         self.source, self.build = folder / "a consumer", folder / "a build"
@@ -126,7 +126,7 @@ class ConsumerTest(unittest.TestCase):
         self.check(build)
         self.assertEqual(set(build.targets()), {"consumer"})
 
-    def test_the_headers_are_all_and_the_library_is_all(self) -> None:
+    def test_all_headers_and_only_the_library_are_installed(self) -> None:
         prefix = self.install()
         headers = {f"include/orvane/{path.relative_to(PROJECT / 'src')}"
                    for path in (PROJECT / "src").rglob("*.h")}

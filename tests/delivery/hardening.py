@@ -1,9 +1,9 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Reads out of ELF files whether they were hardened.
+"""Reads from ELF files whether they were hardened.
 
-Headers speak for most. Canaries show in what a dynamic program asks the C library for. A static one has
-the C library's own in it, and a checked call is left only where the compiler can't prove a size, so
-what the code was compiled with is read out of the objects.
+Headers show most protections. A dynamic program's canaries show in what it asks the C library for. A static
+program contains the C library's own, and a checked call remains only where the compiler can't prove a size,
+so the objects show how the code was compiled.
 """
 
 from __future__ import annotations
@@ -54,13 +54,13 @@ def _undefined_names(file: Path) -> set[str]:
 
 
 def missing_in_dynamic(program: Path) -> set[str]:
-    """Of a program that is linked with the C library as it runs."""
+    """For a dynamic program."""
     return set() if "__stack_chk_fail" in _undefined_names(program) else {STACK_PROTECTOR}
 
 
 def missing_in_objects(objects: Iterable[Path]) -> set[str]:
-    """What no object asks the C library for. Not every function needs a canary or a checked call, and
-    not every object has one; of all together some do."""
+    """What no object asks the C library for. Not every function needs a canary or a checked call, and not
+    every object has one, but some of them do."""
     names = set().union(*map(_undefined_names, objects))
     missing = set()
     if "__stack_chk_fail" not in names:

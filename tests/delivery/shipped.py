@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""What the project ships, and the version that it is of."""
+"""What the project ships, and its version."""
 
 from __future__ import annotations
 

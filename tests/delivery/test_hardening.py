@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The programs are hardened, and a program that is not would be noticed."""
+"""The programs are hardened, and a program that is not hardened is noticed."""
 
 from __future__ import annotations
 
@@ -45,7 +45,7 @@ class ShippedTest(unittest.TestCase):
 
 
 class ReaderTest(unittest.TestCase):
-    """Each protection in turn is left out of a program of a few lines."""
+    """Programs of a few lines, each without one protection."""
 
     def setUp(self) -> None:
         holder = tempfile.TemporaryDirectory(prefix="orvane hardening-")

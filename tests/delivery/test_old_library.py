@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The program that stands in for older libraries is one: what it is compared for would mean nothing."""
+"""The stand-in for older libraries behaves like one; otherwise comparing with it would mean nothing."""
 
 from __future__ import annotations
 
@@ -10,7 +10,7 @@ import unittest
 
 
 def symbols(program: str) -> dict[str, str]:
-    """Kinds by name, as nm has them: T is defined here, W stands back behind another definition."""
+    """The kinds that nm prints, by name: T is defined here, W gives way to another definition."""
     listing = subprocess.run(["nm", "--demangle", program], check=True, text=True, stdout=subprocess.PIPE)
     found = re.findall(r"^[0-9a-f]* +(\w) (.+)$", listing.stdout, re.MULTILINE)
     return {name: kind for kind, name in found}

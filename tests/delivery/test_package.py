@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The packages hold what they should, install into a bare root, and what they installed runs there."""
+"""The packages hold what they should, install into a bare root, and their programs run there."""
 
 from __future__ import annotations
 
@@ -14,11 +14,11 @@ from pathlib import Path
 from shipped import EVERYWHERE, IN_TARBALL, PROJECT, VERSION
 
 DOCUMENTS = {f"docs/{path.name}" for path in (PROJECT / "docs").iterdir()}
-GZIP_TIME = slice(4, 8)  # of the bytes of a gzip header
-# Changing the root and the owner of files takes the privilege for it, or a user namespace.
+GZIP_TIME = slice(4, 8)  # bytes of a gzip header
+# Changing the root and the owners of files needs the privilege, or a user namespace.
 AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
 
-# A user's PATH need not hold the folders of what is the superuser's, as chroot and ldconfig are.
+# A user's PATH may lack the folders of the superuser's programs, such as chroot and ldconfig.
 PATH = f"{os.environ['PATH']}:/usr/local/sbin:/usr/sbin:/sbin"
 
 IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
@@ -71,7 +71,7 @@ class PackageTest(unittest.TestCase):
         cls.tarball = pack(cls.folder / "tgz", "TGZ")
 
     def bare_root(self) -> Path:
-        """With nothing but what no system lacks."""
+        """A root with only what every system has."""
         root = Path(tempfile.mkdtemp(dir=self.folder))
         (root / "dev").mkdir()
         (root / "dev/null").touch()
@@ -82,7 +82,7 @@ class PackageTest(unittest.TestCase):
         inside(root, f"{programs}/orvane-unit", "new", "/car")
         left = inside(root, f"{programs}/orvane-unit", "run", "/car", "--", "-a", "-i")
         self.assertIn("model = Quarion Velmira\n", left)
-        # And by itself: a root without templates is a unit of defaults.
+        # And alone: a root without templates is a unit of defaults.
         (root / "tmp").mkdir()
         self.assertEqual(inside(root, f"{programs}/orvane", "-a", "-i"), "")
         self.assertEqual(files(root / "tmp"),
@@ -93,7 +93,7 @@ class PackageTest(unittest.TestCase):
         self.assertEqual(self.package.name, f"orvane_{VERSION}_{processor}.deb")
         self.assertEqual(self.tarball.name, f"orvane-{VERSION}-linux-{os.uname().machine}.tar.gz")
 
-    def test_the_debian_package_installs_and_runs_and_goes(self) -> None:
+    def test_the_debian_package_installs_runs_and_is_removed(self) -> None:
         root = self.bare_root()
         database = root / "var/lib/dpkg"
         (database / "updates").mkdir(parents=True)
@@ -108,7 +108,7 @@ class PackageTest(unittest.TestCase):
         call(*dpkg, "--purge", "orvane")
         self.assertFalse((root / "usr").exists())
 
-    def test_the_debian_package_says_who_and_what_it_is(self) -> None:
+    def test_the_debian_package_describes_itself(self) -> None:
         fields = call("dpkg-deb", "--field", self.package)
         for line in ("Package: orvane", f"Version: {VERSION}", "Section: devel",
                      "Maintainer: orvane developers <orvane@example.org>",
@@ -136,14 +136,14 @@ class PackageTest(unittest.TestCase):
             self.assertEqual(gzip.decompress(packed), (PROJECT / source).read_bytes())
             self.assertEqual(packed[GZIP_TIME], bytes(4), name)
 
-    def test_packed_again_it_has_the_same_bytes(self) -> None:
+    def test_packing_again_gives_the_same_bytes(self) -> None:
         self.assertEqual(pack(self.folder / "deb2", "DEB").read_bytes(), self.package.read_bytes())
         self.assertEqual(pack(self.folder / "tgz2", "TGZ").read_bytes(), self.tarball.read_bytes())
 
     def test_the_mask_of_the_packer_does_not_matter(self) -> None:
         tarball = pack(self.folder / "tgz77", "TGZ", 0o077)
         self.assertEqual(tarball.read_bytes(), self.tarball.read_bytes())
-        # cpack gives a Debian package's two inner archives the mask, which nobody sees but a sum.
+        # cpack gives a Debian package's two inner archives the mask, which only a checksum shows.
         package = pack(self.folder / "deb77", "DEB", 0o077)
         self.assertEqual(call("dpkg-deb", "--contents", package),
                          call("dpkg-deb", "--contents", self.package))

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The same sources give the same program, wherever they lie and wherever they are built."""
+"""The same sources give the same program, wherever they are and wherever they are built."""
 
 from __future__ import annotations
 
@@ -17,13 +17,13 @@ PROJECT = Path(__file__).resolve().parents[2]
 class ReproducibleTest(unittest.TestCase):
     def test_two_folders_give_the_same_bytes(self) -> None:
         with tempfile.TemporaryDirectory(prefix="orvane reproducible-") as name:
-            # The compiler names the folder that it works in as the system does, without links.
+            # The compiler names its working folder as the system does, without links.
             programs = [self.build(Path(name).resolve() / place) for place in
                         ("here", "a folder/of another name, and deeper")]
         self.assertEqual(programs[0], programs[1])
 
     def build(self, folder: Path) -> bytes:
-        """Not stripped and with debugging records, which are what holds the names of folders."""
+        """Not stripped and with debugging records, which contain the names of folders."""
         sources = folder / "sources"
         shutil.copytree(PROJECT, sources,
                         ignore=shutil.ignore_patterns("build", ".git", "__pycache__"))

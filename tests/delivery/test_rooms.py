@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The folders of `kit` and `orvane_unit` stand in an order: each includes only those before it."""
+"""The folders of `kit` and `orvane_unit` have an order: each includes only those before it."""
 
 from __future__ import annotations
 
@@ -26,8 +26,8 @@ def room_of(path: str) -> str:
     return str(PurePosixPath(path).parent)
 
 
-def included_from_behind(path: str, text: str) -> Iterator[str]:
-    """What the file `path` of the project includes from a room behind its own; headers of `src` lie in none."""
+def included_from_later_rooms(path: str, text: str) -> Iterator[str]:
+    """What the project's file `path` includes from a room after its own; headers of `src` are in no room."""
     for included in INCLUDE.findall(text):
         room = room_of(included)
         if room.split("/", maxsplit=1)[0] not in ("kit", "orvane_unit"):
@@ -41,11 +41,11 @@ class RoomsTest(unittest.TestCase):
         found = {room_of(path.relative_to(PROJECT).as_posix()) for path in sources()}
         self.assertEqual(found, set(ROOMS))
 
-    def test_no_room_includes_one_behind_it(self) -> None:
+    def test_no_room_includes_a_later_one(self) -> None:
         for path in sources():
             name = path.relative_to(PROJECT).as_posix()
             with self.subTest(name=name):
-                self.assertEqual(list(included_from_behind(name, path.read_text(encoding="utf-8"))), [])
+                self.assertEqual(list(included_from_later_rooms(name, path.read_text(encoding="utf-8"))), [])
 
     def test_product_includes_no_room(self) -> None:
         product = [path for path in sorted((PROJECT / "src").rglob("*")) if path.suffix in (".cpp", ".h")]
@@ -55,7 +55,7 @@ class RoomsTest(unittest.TestCase):
                 included = INCLUDE.findall(path.read_text(encoding="utf-8"))
                 self.assertEqual([name for name in included if name.startswith(("kit/", "orvane_unit/"))], [])
 
-    def test_include_from_behind_is_seen(self) -> None:
+    def test_include_from_a_later_room_is_seen(self) -> None:
         for path, included in (("kit/host/text.h", "kit/enter/entered_root.h"),
                                ("kit/tuning/a.cpp", "kit/description/toml_text.h"),
                                ("kit/unit/marker.cpp", "orvane_unit/command_line.h"),
@@ -63,9 +63,9 @@ class RoomsTest(unittest.TestCase):
                                ("orvane_unit/report/json.h", "orvane_unit/command_line.h")):
             for line in (f'#include "{included}"', f' #  include "{included}"'):
                 with self.subTest(path=path, line=line):
-                    self.assertEqual(list(included_from_behind(path, f"#pragma once\n{line}\n")), [included])
+                    self.assertEqual(list(included_from_later_rooms(path, f"#pragma once\n{line}\n")), [included])
 
-    def test_include_from_before_is_not_seen(self) -> None:
+    def test_include_from_an_earlier_room_is_allowed(self) -> None:
         for path, line in (("kit/enter/entered_root.h", '#include "kit/host/descriptor.h"'),
                            ("kit/enter/entered_root.cpp", '#include "kit/enter/entered_root.h"'),
                            ("kit/host/text.h", "#include <kit/unit/edit.h>"),
@@ -73,11 +73,11 @@ class RoomsTest(unittest.TestCase):
                            ("kit/tuning/a.cpp", '#include "tuning/dps_block.h"'),
                            ("orvane_unit/main.cpp", '#include "orvane_unit/report/json.h"')):
             with self.subTest(path=path, line=line):
-                self.assertEqual(list(included_from_behind(path, line + "\n")), [])
+                self.assertEqual(list(included_from_later_rooms(path, line + "\n")), [])
 
     def test_unknown_room_is_refused(self) -> None:
         with self.assertRaises(ValueError):
-            list(included_from_behind("kit/host/text.h", '#include "kit/attic/x.h"\n'))
+            list(included_from_later_rooms("kit/host/text.h", '#include "kit/attic/x.h"\n'))
 
 
 if __name__ == "__main__":

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
-"""A rule of the product stands in `src` alone: none of its texts is repeated in `kit` or `orvane_unit`.
+"""A rule of the product is in `src` alone: none of its texts is repeated in `kit` or `orvane_unit`.
 
-Paths, labels, words and markers of the product are literals of `src`. Whoever needs one calls it by its
-name, so that a change in `src` changes everything.
+Paths, labels, words and markers of the product are literals of `src`. Other code uses their names, so that a
+change in `src` changes everything.
 """
 
 from __future__ import annotations
@@ -17,7 +17,7 @@ from shipped import PROJECT
 # Shorter literals are separators, and words of any text.
 LEAST_LENGTH = 3
 
-# Literals of the product that are words of their own elsewhere, with the reason.
+# Literals of the product that are ordinary words elsewhere, with the reason.
 OTHER_MEANINGS = {
     "model": "a word of reports and reason codes",
     "name": "a word of reports and reason codes",
@@ -25,7 +25,7 @@ OTHER_MEANINGS = {
     "0123456789abcdef": "digits",
 }
 
-# A key's name in the example of a help text is no rule.
+# A key's name in the example of a help text is not a rule.
 EXAMPLES = re.compile(r'"orvane-unit set bench [^"]*"')
 
 COMMENT = re.compile(r'//[^\n]*|("(?:[^"\\\n]|\\.)*")|(?P<char>\'(?:[^\'\\\n]|\\.)+\')')
@@ -41,7 +41,7 @@ def literals(text: str) -> Iterator[str]:
 
 
 def rules(texts: Iterable[str]) -> set[str]:
-    """What stands in the product's literals, cut at escapes and blank ends."""
+    """The contents of the product's literals, split at escapes and stripped."""
     return {part for text in texts for literal in literals(text)
             for part in (piece.strip(" =;:()#\"") for piece in ESCAPE.split(literal))
             if len(part) >= LEAST_LENGTH and part not in OTHER_MEANINGS}
@@ -68,7 +68,7 @@ class RulesOnceTest(unittest.TestCase):
                      "/dev/hd0", "qwaAECSwitch", "rightHandDrive", "QUARION", "ABCD1234abc"):
             self.assertTrue(any(rule in known for known in self.known), rule)
 
-    def test_no_rule_stands_twice(self) -> None:
+    def test_no_rule_is_repeated(self) -> None:
         for path in sources("kit", "orvane_unit"):
             with self.subTest(path=path.relative_to(PROJECT).as_posix()):
                 self.assertEqual(repeated(path.read_text(encoding="utf-8"), self.known), [])

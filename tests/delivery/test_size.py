@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The stripped product stays small where it is for: linked by the compiler of a 32-bit ARM system."""
+"""The stripped product stays small on its target: linked by the compiler of a 32-bit ARM system."""
 
 from __future__ import annotations
 

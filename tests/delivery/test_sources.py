@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """The product's sources use what the oldest compiler of a unit's SDK has: GCC 4.7 and its library.
 
-Newer compilers hold the sources to C++11 (-pedantic-errors), and `orvane-old-library` to the strings of
-GCC before 5. What they let pass and GCC 4.7 or its library is known to lack is listed here.
+Newer compilers hold the sources to C++11 (-pedantic-errors), and `orvane-old-library` to the strings of GCC
+before 5. This lists what they accept and GCC 4.7 or its library is known to lack.
 """
 
 from __future__ import annotations
@@ -26,7 +26,7 @@ LANGUAGE = (r"\[\[", r"\bthread_local\b", r"\balignas\b", r"\busing (\w+)::\1;",
 LIBRARY = (r"\bemplace(?:_hint|_back)?\b", r"\bstd::(?:regex|get_time|put_time)\b",
            r"\bstd::(?:move|swap)\([\w.>()-]*(?:[Ff]ile|[Ss]tream|[Oo]utput|[Ss]tock)\b",
            r"= std::[io]?fstream\(")
-# Of C99, what GCC's library leaves out on the units' system, where it finds the C library without.
+# Parts of C99 that GCC's library leaves out on the units' system because its C library lacks them.
 C99 = (r"\bto_w?string\b", r"\bsto(?:i|l|ul|ll|ull|f|d|ld)\b", r"\bv?snprintf\b",
        r"\b(?:strto(?:ll|ull|f|ld)|atoll|llabs|lldiv|_Exit)\b")
 ABSENT = (*LANGUAGE, *LIBRARY, *C99)

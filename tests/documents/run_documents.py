@@ -2,12 +2,12 @@
 # SPDX-License-Identifier: Apache-2.0
 """Runs the commands that Markdown documents show, and compares what they print.
 
-A fenced block of the language console holds "$ command" lines, each followed by what
-it prints; a command goes on in the next line, with or without "> ", after a backslash. The blocks of a document
-run one after the other in one temporary folder. A fenced block right after
+A fenced block of the language console holds "$ command" lines, each followed by what it prints; after a
+backslash, a command continues on the next line, with or without "> ". The blocks of a document run one after
+the other in one temporary folder. A fenced block right after
 
     <!-- file: NAME -->         is written to NAME there first,
-    <!-- not run: REASON -->    is left out, and counted.
+    <!-- not run: REASON -->    is skipped, and counted.
 
 A line "..." in the expected text stands for any lines. Exit status: 0 all is as shown,
 1 a difference or a document without a command, 2 wrong use.
@@ -135,7 +135,7 @@ def check(document: Path, path: str) -> Outcome:
 
 
 def update(document: Path, outcome: Outcome) -> None:
-    """Puts what was printed in place of what is shown, but where "..." stands."""
+    """Replaces the shown output by the printed one, except at "..."."""
     lines = document.read_text(encoding="utf-8").splitlines()
     for line, (shown, printed) in sorted(outcome.printed.items(), reverse=True):
         while lines[line - 1].endswith("\\"):
@@ -148,7 +148,7 @@ def update(document: Path, outcome: Outcome) -> None:
 def main() -> int:
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--path", required=True, type=Path, help="folder of the built programs")
-    parser.add_argument("--update", action="store_true", help="write what is printed instead")
+    parser.add_argument("--update", action="store_true", help="write the printed output into the documents")
     parser.add_argument("documents", nargs="+", type=Path)
     options = parser.parse_args()
     failed = False

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The completion offers what the program takes."""
+"""The completion offers what the program accepts."""
 
 from __future__ import annotations
 
@@ -14,7 +14,7 @@ SCRIPT = Path(__file__).resolve().parents[2] / "completion/orvane-unit.bash"
 
 
 def offers(*words: str, folder: str = "/") -> list[str]:
-    """What is offered for the last of the words, which follow the program's name."""
+    """What the completion offers for the last of the words after the program's name."""
     program = ('source "$SCRIPT"; shift; COMP_WORDS=(orvane-unit "$@"); COMP_CWORD=$#; '
                'cd "$FOLDER"; _orvane_unit; printf "%s\\n" "${COMPREPLY[@]}"')
     result = subprocess.run(["bash", "-c", program, "bash", "-", *words], check=True,

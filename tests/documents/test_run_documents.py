@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The runner of documents tells a wrong document from a right one."""
+"""The runner of documents distinguishes a wrong document from a right one."""
 
 from __future__ import annotations
 
@@ -24,12 +24,12 @@ def console(text: str) -> str:
 
 
 class RunDocumentsTest(unittest.TestCase):
-    def test_right_output_is_no_complaint(self) -> None:
+    def test_right_output_gives_no_complaint(self) -> None:
         outcome = outcome_of(console("$ echo one; echo two >&2\none\ntwo\n$ true\n"))
         self.assertEqual(outcome.complaints, [])
         self.assertEqual(outcome.ran, 2)
 
-    def test_wrong_missing_and_further_output_are_told_with_their_line(self) -> None:
+    def test_wrong_missing_and_additional_output_are_reported_with_their_line(self) -> None:
         for shown in ("", "two\n", "one\nmore\n"):
             complaints = outcome_of("text\n\n" + console("$ echo one\n" + shown)).complaints
             self.assertIn("document.md:4: $ echo one", complaints[0], shown)
@@ -42,7 +42,7 @@ class RunDocumentsTest(unittest.TestCase):
         text = "<!-- file: a/b.txt -->\n```toml\nx = 1\n```\n" + console("$ cat a/b.txt\nx = 1\n")
         self.assertEqual(outcome_of(text + console("$ ls\na\n")).complaints, [])
 
-    def test_command_goes_on_after_a_backslash(self) -> None:
+    def test_command_continues_after_a_backslash(self) -> None:
         for begin in ("  ", ">   "):
             text = console(f"$ echo one \\\n{begin}two\none two\n")
             self.assertEqual(outcome_of(text).complaints, [])
@@ -51,7 +51,7 @@ class RunDocumentsTest(unittest.TestCase):
         outcome = outcome_of(console("$ true\n") + "<!-- not run: a unit -->\n" + console("$ no\n"))
         self.assertEqual((outcome.ran, outcome.left_out, outcome.complaints), (1, 1, []))
 
-    def test_document_without_a_command_is_told(self) -> None:
+    def test_document_without_a_command_is_reported(self) -> None:
         self.assertIn("shows no command", outcome_of("text\n").complaints[0])
 
     def test_exit_status_and_environment(self) -> None:

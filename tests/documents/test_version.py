@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The version stands once, in CMakeLists.txt; whatever repeats it for readers says the same."""
+"""The version is defined once, in CMakeLists.txt; every repetition for readers is the same."""
 
 from __future__ import annotations
 

@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The tests run wherever the project lies, and without the privileges of the superuser.
+"""The tests run wherever the project is, and without the privileges of the superuser.
 
-A few units and documents each, in a copy of what they take in a folder with a blank in its name.
+A few units and documents each, in a copy of what they need, in a folder with a blank in its name.
 """
 
 from __future__ import annotations
@@ -19,8 +19,7 @@ TAKEN = ("tests/model", "tests/drivers", "tests/documents", "completion", "man",
          "CMakeLists.txt")
 PROGRAMS = ("ORVANE", "ORVANE_ENTER", "ORVANE_UNIT")
 
-# Of all its privileges the superuser keeps the one without which it may not even stand for itself in
-# a user namespace.
+# The superuser keeps only the privilege without which it may not even map itself into a user namespace.
 UNPRIVILEGED = ["setpriv", "--bounding-set=-all,+setfcap", "--inh-caps=-all"] \
     if os.geteuid() == 0 else []
 
@@ -55,7 +54,7 @@ class PlacesTest(unittest.TestCase):
         self.check_driver("differential", "--units", "4")
         self.check_driver("explain", "--units", "4", "--unit-tool", self.build / "orvane-unit")
 
-    def test_and_to_the_documents(self) -> None:
+    def test_a_path_with_a_blank_is_one_path_to_the_documents(self) -> None:
         self.check("-m", "unittest", "discover", "--start-directory",
                    self.project / "tests/documents")
         self.check(self.project / "tests/documents/run_documents.py", "--path", self.build,

@@ -6,4 +6,4 @@
 if [ "$(id -u)" -ne 0 ] && unshare --map-root-user true 2>/dev/null; then
     exec unshare --map-root-user "$@"
 fi
-exec "$@" # which says itself what it lacks
+exec "$@" # the command itself reports what it lacks

@@ -1,12 +1,12 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
-# Stands in for the SDK's compiler driver, as $QNX_HOST/usr/bin/q++: the ARM compiler for Linux, with what
-# CMake knows the driver by. Files in $QNX_HOST/stand-in make another driver of it:
-#   version   of the compiler, for CMake's program that asks
-#   known     patterns of the options that it has, one a line; any other ends it
-#   ignored   options among them that it does nothing for
-#   added     words that it adds to each link, as its configuration may say
-# Each call leaves its words, one a line, in a file in $QNX_HOST/calls.
+# Stands in for the SDK's compiler driver, as $QNX_HOST/usr/bin/q++: the ARM compiler for Linux, with
+# everything by which CMake recognises the driver. Files in $QNX_HOST/stand-in change it:
+#   version   the compiler's version, for CMake's test program
+#   known     patterns of the known options, one a line; any other is an error
+#   ignored   known options without effect
+#   added     words added to each link, as a driver's configuration may do
+# Each call writes its words, one a line, to a file in $QNX_HOST/calls.
 set -eu
 state=$QNX_HOST/stand-in
 
@@ -17,10 +17,10 @@ if [ "$*" = -V ]; then
     exit 0
 fi
 
-# is FILE WORD: whether a pattern in the file fits the word.
+# is FILE WORD: whether a pattern in the file matches the word.
 is() {
     while IFS= read -r pattern; do
-        # shellcheck disable=SC2254 # a pattern indeed
+        # shellcheck disable=SC2254 # meant as a pattern
         case $2 in $pattern) return 0 ;; esac
     done <"$state/$1"
     return 1
@@ -52,7 +52,7 @@ for word in "$@"; do
     *)
         is ignored "$word" && continue
         case $word in
-        -Bstatic | -Bdynamic) word=-Wl,$word ;; # the SDK's driver has them itself
+        -Bstatic | -Bdynamic) word=-Wl,$word ;; # options of the SDK's driver
         esac
         set -- "$@" "$word"
         ;;

@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The unit's toolchain file, with a stand-in for the SDK: what it has CMake do, and where it stops. All
-paths hold blanks, as those of a user may."""
+"""The unit's toolchain file, with a stand-in for the SDK: what it makes CMake do, and when it stops. All
+paths contain blanks, as a user's may."""
 
 from __future__ import annotations
 
@@ -23,14 +23,14 @@ STAND_IN = Path(__file__).with_name("stand_in.sh")
 TOOLCHAIN = "cmake/toolchains/qnx-armv7.cmake"
 DEFAULT_VARIANT = "gcc_ntoarmv7le_gpp"
 DEFINITIONS = {"-D_QNX_SOURCE", "-D_LARGEFILE64_SOURCE", "-D_FILE_OFFSET_BITS=64"}
-# What links the C++ library statically: GCC's own options, and positions, which q++ has of its own.
+# What links the C++ library statically: GCC's options, and positions, which only q++ has.
 STATIC_OPTIONS = ["-static-libstdc++", "-static-libgcc"]
 POSITIONS = ["-Wl,--as-needed", "-Bstatic", "-lstdc++", "-lgcc_eh", "-lgcc", "-Bdynamic"]
 POSITIONS_WITHOUT_SHARED_LIBGCC = ["-Wl,--as-needed", "-Bstatic", "-lstdc++", "-Bdynamic"]
 USAGE = (b"Usage: orvane <options>\r\n\r\nOptions:\r\n  -i -- Update iAP config files\r\n"
          b"  -a -- Update airplay config file\r\n\r\n")
-# The options that a build for the unit may use, as patterns: GCC 4.7, the oldest compiler of a unit, or
-# its driver has each. The stand-in ends at any other.
+# The options that a build for the unit may use, as patterns: GCC 4.7, the oldest compiler of a unit, or its
+# driver has each. The stand-in fails at any other.
 OPTIONS = (
     "-c", "-o", "-E", "-v", "-V?*", "-lang-c++", "-std=c++11", "-D*", "-U*", "-I*", "-Wp,-M[DTF],*",
     "-g", "-Os", "-O3", "-Wall", "-Wextra", "-fdata-sections", "-ffunction-sections",
@@ -40,7 +40,7 @@ OPTIONS = (
 
 
 class Sdk:
-    """The folders that its environment script would name."""
+    """The folders that the SDK's environment script would name."""
 
     def __init__(self, folder: Path, version: str = "4.7.3", unknown: Iterable[str] = (),
                  ignored: Iterable[str] = (), added: Iterable[str] = (),
@@ -108,7 +108,7 @@ class TargetBuildTest(unittest.TestCase):
         return done
 
     def commands(self, *options: str, sdk: Sdk) -> list[list[str]]:
-        """The words that would make the program, its link last, in a build that is configured only."""
+        """The commands that would build the program, the link last, in a build that is only configured."""
         done = self.configure(sdk.variables, *options)
         self.assertEqual(done.returncode, 0, done.stdout)
         lines = subprocess.run(["ninja", "-C", self.folder / "build", "-t", "commands", "orvane"],
@@ -116,13 +116,13 @@ class TargetBuildTest(unittest.TestCase):
         return [shlex.split(line) for line in lines.splitlines()]
 
     def libraries(self, *options: str, sdk: Sdk) -> list[str]:
-        """What the program is linked with, behind what it needs them for."""
+        """What the program is linked with, after its objects."""
         words = self.commands(*options, sdk=sdk)[-1]
         behind = words.index("src/liborvane_core.a") + 1
         return words[behind:words.index("&&", behind)]
 
     def compiled(self) -> dict[str, list[str]]:
-        """The words that each source of the project was compiled with."""
+        """The words with which each source of the project was compiled."""
         sources = {}
         for words in self.sdk.calls():
             if "-c" in words and words[-1].startswith(f"{self.sources}/"):
@@ -143,7 +143,7 @@ class TargetBuildTest(unittest.TestCase):
         assert content is not None
         return ELFFile(BytesIO(content.read()))
 
-    def test_cmake_takes_the_driver_for_what_it_is(self) -> None:
+    def test_cmake_recognises_the_driver(self) -> None:
         [found] = (self.build / "CMakeFiles").glob("*/CMakeCXXCompiler.cmake")
         self.assertIn('set(CMAKE_CXX_COMPILER_ID "QCC")', found.read_text())
 
@@ -162,7 +162,7 @@ class TargetBuildTest(unittest.TestCase):
         self.assertIn("unrecognized command line option '-Wduplicated-cond'", done.stdout)
 
     def test_every_call_names_the_variant(self) -> None:
-        question = ["-V"]  # of CMake, whether it is that driver
+        question = ["-V"]  # CMake asks whether it is that driver
         self.assertIn(question, self.sdk.calls())
         calls = [words for words in self.sdk.calls() if words != question]
         self.assertGreater(len(calls), 20)
@@ -232,7 +232,7 @@ class TargetBuildTest(unittest.TestCase):
 
     def test_what_the_linker_or_the_c_library_lacks_is_left_out(self) -> None:
         options = ["-Wl,--gc-sections", "-Wl,-z,relro", "-Wl,-z,now", "-Wl,-z,noexecstack"]
-        absent_symbol = "-Wl,--wrap=__stack_chk_fail"  # gives it another name, which nothing defines
+        absent_symbol = "-Wl,--wrap=__stack_chk_fail"  # renames it to a symbol that nothing defines
         sdk = Sdk(self.folder, unknown=options[:2], ignored=options[2:], added=[absent_symbol])
         *compiles, link = self.commands(sdk=sdk)
         self.assertEqual(set(options) & set(link), set(options[2:]))
@@ -255,7 +255,7 @@ class TargetBuildTest(unittest.TestCase):
         self.assertNotEqual(done.returncode, 0)
         self.assertIn("Could not find CMAKE_AR using the following names: ntoarmv7-ar", done.stdout)
 
-    def test_a_missing_variable_of_the_environment_is_named(self) -> None:
+    def test_a_missing_environment_variable_is_named(self) -> None:
         variables = Sdk(self.folder).variables
         for name in variables:
             for broken in ({key: text for key, text in variables.items() if key != name},

@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
-"""Runs several builds of orvane in every golden unit: all must leave the same bytes.
+"""Runs several builds of orvane in every golden unit: all must leave the same bytes behind.
 
 usage: same_bytes.py ORVANE_UNIT GOLDEN_FOLDER ORVANE ORVANE...
 """
