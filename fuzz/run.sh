@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# Runs every fuzz target for its share of a time, each on a fresh copy of its seeds, and reports.
+# Runs every fuzz target for its share of the time, each on a new copy of its seeds, and reports.
 # usage: fuzz/run.sh SECONDS [BUILD_FOLDER]
-#   SECONDS       in all, shared evenly by the targets, at least one each; longer if a target needs
+#   SECONDS       in all, split evenly between the targets, at least one each; longer if a target needs
 #                 more time for its minimum of 1,000 inputs
 #   BUILD_FOLDER  holds the targets; build/fuzz unless given
 # Exit status 1: a target found something, or ran too few inputs to mean anything.
@@ -20,12 +20,12 @@ build=$(realpath "${2:-build/fuzz}")
 share=$(($1 / ${#TARGETS[@]}))
 [ "$share" -ge 1 ] || share=1
 
-# The units that the targets work in, which a finding leaves behind.
+# Folder of the targets' units; a finding leaves its unit behind.
 TMPDIR=$(mktemp -d -p "$([ -w /dev/shm ] && echo /dev/shm || echo "${TMPDIR:-/tmp}")" orvane-fuzz-run-XXXXXX)
 export TMPDIR
 trap 'rm -rf "$TMPDIR"' EXIT
 
-# By target: a length from which inputs cost time and show nothing new; the words of its format.
+# By target: the length from which inputs cost time and find nothing new; the words of its format.
 options_of() {
     case $1 in
     inf_text) echo "-max_len=1024 -dict=fuzz/inf_text.dict" ;;
@@ -40,13 +40,13 @@ options_of() {
 # stat NAME LOG: a figure of libFuzzer's final statistics, 0 where the log has none.
 stat() { awk -v name="stat::$1:" '$1 == name { value = $2 } END { print value + 0 }' "$2"; }
 
-# what_happened LOG: the lines that say it, a sanitizer's or a target's own; else the last ones.
+# what_happened LOG: the report of a sanitizer or of the target; else the last lines.
 what_happened() {
     grep -a -B 1 -E '^expected:|^found: |ERROR: |runtime error:|what\(\):|^SUMMARY: ' "$1" |
         grep -a -v '^--' | cut -c 1-300 || tail -n 5 "$1"
 }
 
-# fuzz_until OPTION: runs the program until then, and sets the status.
+# fuzz_until OPTION: runs the program until OPTION ends it, and sets `status`.
 fuzz_until() {
     status=0
     "$program" "${options[@]}" "$1" -timeout=10 -print_final_stats=1 \
@@ -88,7 +88,7 @@ for target in "${TARGETS[@]}"; do
 
     if [ "$findings" -gt 0 ]; then
         failed=1
-        hints+=("$target: exit status $status; all of it in $log:" "$(what_happened "$log")")
+        hints+=("$target: exit status $status; full log in $log:" "$(what_happened "$log")")
         for artifact in "${artifacts[@]}"; do
             hints+=("again: $(printf '%q ' "$program" "$artifact")")
         done
