@@ -109,8 +109,8 @@ std::vector<std::string> wordsOf(std::string_view input) {
 
 /// What a command line must do.
 struct Outcome {
-    std::string written;     ///< as of Target::takeWritten
-    std::string diagnostics; ///< a line for each letter that is none, in the C library's words
+    std::string written;     ///< in the form of Target::takeWritten
+    std::string diagnostics; ///< a line for each unknown letter, in the C library's words
 };
 
 /// POSIX utility syntax guidelines: letters follow a "-", alone or together; "--" or the first

@@ -24,7 +24,7 @@ struct Row {
     Storage storage;
     Words words;
     int lowerBit; ///< of two bits
-    int elements; ///< of a list; 0 for what is none
+    int elements; ///< of a list; 0 for any other field
 };
 
 constexpr Row bits(const char* key, int offset, int lowerBit, Words words = Words::ofSwitch) {

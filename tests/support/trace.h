@@ -13,7 +13,7 @@ namespace orvane::test {
 ///
 ///   read PATH, list PATH, create PATH, open PATH FLAGS  an open for reading, of a folder, with
 ///                                                       create and truncate, or with other flags;
-///                                                       " failed" behind it when it failed
+///                                                       " failed" is added if it failed
 ///   seek PATH OFFSET WHENCE, get PATH LENGTH            of the image and of the disk
 ///   map PATH LENGTH, unmap PATH                         of the image
 ///   put PATH LENGTH                                     one write to any file

@@ -39,7 +39,7 @@ protected:
 
 TEST_F(MappedNothingTest, EmptyImageCountsAsMissing) {
     if (sizeof ORVANE_EMULATOR != 1) {
-        GTEST_SKIP() << "an emulator maps whole pages of its own accord";
+        GTEST_SKIP() << "an emulator always maps whole pages";
     }
     writeImage("");
     writeFile("/fs/mp/etc/airplay_static.conf", "template\n");

@@ -13,7 +13,7 @@ namespace orvane::test {
 namespace {
 
 constexpr std::uint64_t DISK_SIZE = 2U << 20U;
-constexpr std::uint64_t BASE = 1U << 20U; ///< of the record area of such a disk
+constexpr std::uint64_t BASE = 1U << 20U; ///< offset of the record area on such a disk
 
 TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
     struct Row {

@@ -61,7 +61,7 @@ TEST(CapturedRunTest, OutputOfSurvivingChildrenIsReadToItsEnd) {
 TEST(CapturedRunTest, ChildWithoutTheOutputsIsNotWaitedFor) {
     const kit::RunResult result = runOnHost({"sh", "-c", "sleep 600 >/dev/null 2>&1 & echo $!"});
     const pid_t sleeper = std::stoi(result.standardOutput);
-    EXPECT_EQ(kill(sleeper, SIGKILL), 0) << "it has ended before";
+    EXPECT_EQ(kill(sleeper, SIGKILL), 0) << "it has already ended";
 }
 
 TEST(CapturedRunTest, FailedStartIsThrownNotCaptured) {

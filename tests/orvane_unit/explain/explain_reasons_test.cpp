@@ -27,7 +27,7 @@ constexpr char VERSION_FILE[] = "/fs/rwdata/.Version/app.inf";
 
 struct Row {
     Reason reason;
-    const char* output; ///< where it is to be found
+    const char* output; ///< where the reason is expected
     Outcome outcome;
     std::function<void(UnitDescription&)> change;
 };

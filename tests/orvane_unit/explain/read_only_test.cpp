@@ -17,7 +17,7 @@ namespace fs = std::filesystem;
 using Words = std::vector<std::string>;
 
 /// The unit asks for every tuning file and every output, and already has one of them.
-void asMuchAsCanBeWritten(kit::UnitDescription& unit) {
+void everythingWritten(kit::UnitDescription& unit) {
     unit.image.params[134] = 0xFFFF;
     unit.files["/tmp/iap2.cfg"] = "of an earlier run\n";
     unit.links["/tmp/airplay.conf"] = "/fs/mp/etc/airplay.conf";
@@ -25,7 +25,7 @@ void asMuchAsCanBeWritten(kit::UnitDescription& unit) {
 
 class ReadOnlyTest : public ::testing::TestWithParam<Words> {
 protected:
-    ReadOnlyTest() : described_(asMuchAsCanBeWritten) {
+    ReadOnlyTest() : described_(everythingWritten) {
         fs::remove(described_.root() / kit::MARKER_NAME);
     }
 
@@ -69,7 +69,7 @@ INSTANTIATE_TEST_SUITE_P(Commands, ReadOnlyTest,
                          commandName);
 
 TEST(ReadOnlyCommandTest, DescribeChangesNothingInAUnitOfOurs) {
-    const DescribedUnit described(asMuchAsCanBeWritten);
+    const DescribedUnit described(everythingWritten);
     const auto before = treeStates(described.root());
     letTimePass();
     Words command = buildCommand(ORVANE_UNIT_BINARY);

@@ -68,7 +68,7 @@ protected:
             expectAcceptedOutputs(mayBeAbsent && hasFailed);
             ASSERT_FALSE(HasFailure());
         }
-        EXPECT_GT(moments, 10) << "the run hardly asks for memory: the test tests nothing";
+        EXPECT_GT(moments, 10) << "the run hardly allocates memory: this tests nothing";
     }
 };
 

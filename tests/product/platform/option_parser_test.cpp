@@ -66,7 +66,7 @@ private:
 };
 
 struct Parsed {
-    std::string letters; ///< all that came before the -1
+    std::string letters; ///< all results before the -1
     std::string said;    ///< on standard error
     int next = 0;        ///< index of the first word that was not parsed
 };
