@@ -59,9 +59,9 @@ class WholeUnitTest(LookTest):
 
     def test_modes_that_everybody_may_write_are_shown(self) -> None:
         self.put_older_outputs()
-        self.assertIn("ok ", self.look().line("the modes that stand"))
+        self.assertIn("ok ", self.look().line("the modes found"))
         (self.car / "tmp/iap2.cfg").chmod(0o666)
-        line = self.look().line("the modes that stand")
+        line = self.look().line("the modes found")
         self.assertRegex(line, "^unknown .* iap2.cfg -rw-rw-rw-; everybody")
 
     @unittest.skipUnless(is_root(), "only root can become another user")
@@ -189,7 +189,7 @@ class UnitThatLacksSomethingTest(LookTest):
 
     def test_an_empty_template(self) -> None:
         (self.car / "fs/mp/etc/iap2_device_static.cfg").write_bytes(b"")
-        self.check("differs", "/tmp/iap2_device.cfg comes whole", "nothing to be read")
+        self.check("differs", "/tmp/iap2_device.cfg comes whole", "nothing can be read")
 
     def test_templates_of_any_bytes(self) -> None:
         for content in (bytes(range(256)) * 3, b"a\\nb\\\n  c\t \n\x00", b"\n\n", b"no end of line"):
