@@ -77,7 +77,7 @@ std::optional<Conflict> findBytesConflict(const Map& bytes, std::uint64_t size, 
 
 std::optional<Conflict> findImageConflict(const ImageDescription& image) {
     for (const auto& [number, value] : image.params) {
-        if (const auto conflict = findPlaceConflict(paramKey(number), image.size)) {
+        if (auto conflict = findPlaceConflict(paramKey(number), image.size)) {
             return conflict;
         }
     }
@@ -96,7 +96,7 @@ std::optional<Conflict> findDiskConflict(const DiskDescription& disk) {
         keys.push_back(tuningBlockKey(block));
     }
     for (const ValueKey& key : keys) {
-        if (const auto conflict = findPlaceConflict(key, disk.size)) {
+        if (auto conflict = findPlaceConflict(key, disk.size)) {
             return conflict;
         }
     }

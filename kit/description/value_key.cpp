@@ -26,29 +26,29 @@ enum class Part { none, param, slot, byteOfSlot, block, field, offset, path };
 
 struct Form {
     Kind kind;
-    std::string_view begin;
     Part first;
-    std::string_view between; ///< behind the first part; empty where that is the last
     Part second;
+    std::string_view begin;   ///< before the first part
+    std::string_view between; ///< behind it; empty where it is the last
 };
 
 /// All keys. Where a text has two of the forms, the first one counts.
 constexpr Form FORMS[] = {
-    {Kind::imageSize, "image.size", Part::none, "", Part::none},
-    {Kind::param, "param.", Part::param, "", Part::none},
-    {Kind::imageBytes, "image.bytes.", Part::offset, "", Part::none},
-    {Kind::slotByte, "slot.", Part::slot, ".", Part::byteOfSlot},
-    {Kind::slot, "slot.", Part::slot, "", Part::none},
-    {Kind::aux, "aux", Part::none, "", Part::none},
-    {Kind::tuningRaw, "tuning.", Part::block, ".raw", Part::none},
-    {Kind::tuningField, "tuning.", Part::block, ".", Part::field},
-    {Kind::tuningBlock, "tuning.", Part::block, "", Part::none},
-    {Kind::diskBytes, "disk.bytes.", Part::offset, "", Part::none},
-    {Kind::fileBytes, "file.bytes.", Part::offset, ".", Part::path},
-    {Kind::file, "file.", Part::path, "", Part::none},
-    {Kind::link, "link.", Part::path, "", Part::none},
-    {Kind::folder, "folder.", Part::path, "", Part::none},
-    {Kind::absent, "absent.", Part::path, "", Part::none},
+    {Kind::imageSize, Part::none, Part::none, "image.size", ""},
+    {Kind::param, Part::param, Part::none, "param.", ""},
+    {Kind::imageBytes, Part::offset, Part::none, "image.bytes.", ""},
+    {Kind::slotByte, Part::slot, Part::byteOfSlot, "slot.", "."},
+    {Kind::slot, Part::slot, Part::none, "slot.", ""},
+    {Kind::aux, Part::none, Part::none, "aux", ""},
+    {Kind::tuningRaw, Part::block, Part::none, "tuning.", ".raw"},
+    {Kind::tuningField, Part::block, Part::field, "tuning.", "."},
+    {Kind::tuningBlock, Part::block, Part::none, "tuning.", ""},
+    {Kind::diskBytes, Part::offset, Part::none, "disk.bytes.", ""},
+    {Kind::fileBytes, Part::offset, Part::path, "file.bytes.", "."},
+    {Kind::file, Part::path, Part::none, "file.", ""},
+    {Kind::link, Part::path, Part::none, "link.", ""},
+    {Kind::folder, Part::path, Part::none, "folder.", ""},
+    {Kind::absent, Part::path, Part::none, "absent.", ""},
 };
 
 std::string partText(Part part, const ValueKey& key) {
