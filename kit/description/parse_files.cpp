@@ -104,24 +104,24 @@ Content sparseContent(const ContentReading& content) {
 
 /// A way to give a file's content besides a text: the keys that its table has, and its reader.
 struct ContentForm {
-    std::string_view keys[2]; ///< the second may be empty
+    std::string_view key;
+    std::string_view otherKey; ///< empty where there is one key alone
     Content (*read)(const ContentReading& content);
 };
 
 constexpr ContentForm CONTENT_FORMS[] = {
-    {{"hex", ""}, hexContent},          {{"repeat", "count"}, repeatedContent},
-    {{"path", ""}, hostContent},        {{"size", ""}, sparseContent},
-    {{"size", "bytes"}, sparseContent},
+    {"hex", "", hexContent},     {"repeat", "count", repeatedContent}, {"path", "", hostContent},
+    {"size", "", sparseContent}, {"size", "bytes", sparseContent},
 };
 constexpr char CONTENT_FORMS_TEXT[] = "hex, or repeat and count, or path, or size and bytes";
 
 bool hasKey(const ContentForm& form, std::string_view key) {
-    return !key.empty() && (form.keys[0] == key || form.keys[1] == key);
+    return !key.empty() && (form.key == key || form.otherKey == key);
 }
 
 /// Whether `table` has the keys of `form`, and no others.
 bool isOfForm(const toml::table& table, const ContentForm& form) {
-    const std::size_t count = form.keys[1].empty() ? 1 : 2;
+    const std::size_t count = form.otherKey.empty() ? 1 : 2;
     return table.size() == count &&
            std::all_of(table.begin(), table.end(),
                        [&form](const auto& entry) { return hasKey(form, entry.first.str()); });
@@ -136,7 +136,7 @@ Content readContentTable(const ContentReading& content) {
             failUnknown(key, content.what, CONTENT_FORMS_TEXT);
         }
     }
-    const auto* const form =
+    const ContentForm* const form =
         std::find_if(std::begin(CONTENT_FORMS), std::end(CONTENT_FORMS),
                      [&content](const ContentForm& row) { return isOfForm(content.table, row); });
     if (form == std::end(CONTENT_FORMS)) {
