@@ -8,8 +8,10 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <memory>
 
 namespace orvane::kit {
 
@@ -39,9 +41,10 @@ EnteredRoot::EnteredRoot(const std::filesystem::path& root)
         changeRoot(root);
     }
     if (::chdir("/") != 0) {
-        const KitError failure = systemError("cannot enter ", root);
+        const int error = errno;
         leaveRoot(outerRoot_, outerCwd_);
-        throw failure;
+        errno = error;
+        throw systemError("cannot enter ", root);
     }
 }
 

@@ -26,8 +26,8 @@ KitError systemError(const std::string& what) {
     return systemError(what, "");
 }
 
-KitError systemError(const std::string& before, const fs::path& path, const std::string& after) {
-    return {before, path, after + ": " + std::generic_category().message(errno)};
+KitError systemError(const std::string& before, const fs::path& path) {
+    return {before, path, ": " + std::generic_category().message(errno)};
 }
 
 } // namespace orvane::kit

@@ -30,8 +30,7 @@ private:
 /// The error for a system call that has just failed: `what`, a colon, and the text of errno.
 KitError systemError(const std::string& what);
 
-/// The same about `path`: `before`, the path and `after`, a colon, and the text of errno.
-KitError systemError(const std::string& before, const std::filesystem::path& path,
-                     const std::string& after = "");
+/// The same about `path`: `before`, the path, a colon, and the text of errno.
+KitError systemError(const std::string& before, const std::filesystem::path& path);
 
 } // namespace orvane::kit

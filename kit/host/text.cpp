@@ -28,10 +28,11 @@ bool isUtf8(std::string_view text) {
 
 std::string printable(std::string_view bytes) {
     std::string text;
-    for (auto at = bytes.begin(); at != bytes.end();) {
-        const auto valid = utf8::find_invalid(at, bytes.end());
+    const char* const end = bytes.data() + bytes.size();
+    for (const char* at = bytes.data(); at != end;) {
+        const char* const valid = utf8::find_invalid(at, end);
         while (at != valid) {
-            const auto begin = at;
+            const char* const begin = at;
             const char32_t character = utf8::unchecked::next(at);
             if (character == U'\n') {
                 text += "\\n";
@@ -43,7 +44,7 @@ std::string printable(std::string_view bytes) {
                 text.append(begin, at);
             }
         }
-        if (at != bytes.end()) {
+        if (at != end) {
             text += escaped(*at++);
         }
     }

@@ -8,6 +8,7 @@
 #include "kit/host/text.h"
 
 #include <algorithm>
+#include <array>
 #include <cstddef>
 #include <map>
 #include <utility>

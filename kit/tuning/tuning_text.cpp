@@ -11,12 +11,13 @@
 #include <charconv>
 #include <cstddef>
 #include <limits>
-#include <map>
 #include <optional>
 #include <set>
 #include <sstream>
 #include <string_view>
 #include <system_error>
+#include <utility>
+#include <variant>
 #include <vector>
 
 namespace orvane::kit {
@@ -28,6 +29,7 @@ namespace {
 
 /// A value that no block can hold.
 struct ValueFault {
+    std::size_t line = 0;   ///< from 0
     std::size_t column = 0; ///< of the value, from 0
     std::string what;
 };
@@ -35,7 +37,7 @@ struct ValueFault {
 /// What a lenient reader makes of a file.
 struct Reading {
     DpsBlock block{};
-    std::map<std::size_t, ValueFault> faults; ///< by line, from 0
+    std::vector<ValueFault> faults;
 };
 
 /// The words of `text` between its blanks.
@@ -107,7 +109,7 @@ Reading readLeniently(const std::string& text) {
         const std::string fault =
             readValue(std::string_view(line).substr(value), tuningField(key), reading.block);
         if (!fault.empty()) {
-            reading.faults[number] = {value, fault};
+            reading.faults.push_back({number, value, fault});
         }
     }
     return reading;
@@ -169,11 +171,14 @@ DpsBlock parseTuningText(const std::string& text, const std::string& name, std::
     const auto lines = static_cast<std::size_t>(
         std::count(text.begin(), text.begin() + static_cast<std::ptrdiff_t>(place), '\n'));
     const std::size_t begin = lines == 0 ? 0 : text.rfind('\n', place - 1) + 1;
-    const auto fault = reading.faults.find(lines);
-    const bool isInValue = fault != reading.faults.end() && begin + fault->second.column <= place;
+    std::string what = differenceAt(begin, file, text);
+    for (const ValueFault& fault : reading.faults) {
+        if (fault.line == lines && begin + fault.column <= place) {
+            what = fault.what;
+        }
+    }
     throw KitError(name + ":" + std::to_string(lines + 1) + ":" +
-                   std::to_string(place - begin + 1) + ": " +
-                   (isInValue ? fault->second.what : differenceAt(begin, file, text)));
+                   std::to_string(place - begin + 1) + ": " + what);
 }
 
 } // namespace orvane::kit

@@ -2,7 +2,9 @@
 #include "orvane_unit/check/case_check.h"
 
 #include "kit/description/parse_description.h"
+#include "kit/enter/captured_run.h"
 #include "kit/enter/run_inside.h"
+#include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"
 #include "kit/host/tree_entries.h"
@@ -12,15 +14,14 @@
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
 
-#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <fstream>
-#include <iterator>
 #include <map>
 #include <memory>
 #include <optional>
 #include <sstream>
+#include <system_error>
 #include <utility>
 
 namespace orvane::desk {

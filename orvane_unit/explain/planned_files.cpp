@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/planned_files.h"
 
+#include "kit/host/bytes.h"
 #include "kit/host/output_place.h"
 #include "kit/host/whole_file.h"
 
