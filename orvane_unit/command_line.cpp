@@ -176,8 +176,9 @@ private:
     bool isJson_ = false;
 };
 
-const std::string AIRPLAY_FLAG = {'-', AIRPLAY_OPTION};
-const std::string IAP_FLAG = {'-', IAP_OPTION};
+/// The options of this program that stand for orvane's.
+constexpr char AIRPLAY_FLAG[] = "-a";
+constexpr char IAP_FLAG[] = "-i";
 
 void addLetters(CLI::App& parser) {
     parser.add_flag(AIRPLAY_FLAG, "orvane's option -a; both, first -a, without either");
