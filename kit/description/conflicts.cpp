@@ -14,12 +14,12 @@ namespace orvane::kit {
 
 namespace {
 
-/// Finds what stands where the path or something above it shall stand.
+/// Finds two entries at one path, and entries below anything that is not a folder.
 class PathCheck {
 public:
     std::optional<Conflict> conflict;
 
-    /// `key` is that of a file, link or folder.
+    /// `key` is the key of a file, link or folder.
     void enter(const ValueKey& key) {
         const std::string& path = key.name;
         const auto [entry, isNew] = entries_.emplace(path, key);

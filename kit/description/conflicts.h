@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Faults of a description that show only between its parts, each of them right by itself: two
-// entries in one place, a value behind the end of an image or disk.
+// Conflicts between parts of a description that are each right by themselves: two entries at one
+// path, a value behind the end of an image or disk.
 #pragma once
 
 #include "kit/description/unit_description.h"
@@ -22,8 +22,8 @@ struct Conflict {
 /// A path is named twice, or lies below a file or link.
 std::optional<Conflict> findPathConflict(const UnitDescription& unit);
 
-/// A value of image, disk or sparse file does not fit into it. What `layout` has no place for is
-/// not looked at.
+/// A value does not fit into its image, disk or sparse file. Ignores an image or disk that `layout`
+/// does not have.
 std::optional<Conflict> findSizeConflict(const UnitDescription& unit, const Layout& layout);
 
 } // namespace orvane::kit

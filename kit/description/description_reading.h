@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The readers of a description's tables. Each enters what it finds into a unit, notes its place,
-// and throws KitError with the place for what it refuses.
+// The readers of a description's tables. Each stores values in a unit, notes their places, and
+// throws KitError with the place of a value that it refuses.
 #pragma once
 
 #include "kit/description/toml_values.h"
@@ -24,13 +24,13 @@ struct DescriptionReading {
     std::map<ValueKey, Place> places; ///< of the keys that a conflict may name
 };
 
-/// A key that a table may have, and the reader of what stands there.
+/// A key that a table may have, and the reader of its value.
 struct TableEntry {
     const char* key;
     void (*read)(const toml::key& key, const toml::node& value, DescriptionReading& reading);
 };
 
-/// Reads `table` by `entries`, which are all that it may have. `where` names it in an error.
+/// Reads `table`, which may only have the keys of `entries`. `where` names it in an error.
 template <std::size_t COUNT>
 void readEntries(const toml::table& table, const char* where, const TableEntry (&entries)[COUNT],
                  DescriptionReading& reading) {
@@ -56,7 +56,7 @@ void readLinks(const toml::key& key, const toml::node& node, DescriptionReading&
 void readFolders(const toml::key& key, const toml::node& node, DescriptionReading& reading);
 void readAbsent(const toml::key& key, const toml::node& node, DescriptionReading& reading);
 
-/// A table of raw bytes in hex by offset. `keyOf` gives the key of those at an offset.
+/// Reads a table of raw bytes, in hex by offset. `keyOf` gives the key of the bytes at an offset.
 template <class Map, class KeyOf>
 void readBytes(const toml::table& table, Map& bytes, const KeyOf& keyOf,
                DescriptionReading& reading) {

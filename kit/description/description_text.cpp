@@ -19,7 +19,7 @@ namespace orvane::kit {
 
 namespace {
 
-/// A content of so many bytes or more that are all the same is not spelled out.
+/// The fewest equal bytes that are written as a repeat.
 constexpr std::size_t LONG_REPEAT = 64;
 
 std::string listText(const std::vector<std::int64_t>& numbers) {
@@ -130,7 +130,7 @@ void addLinks(const UnitDescription& unit, std::string& text) {
 
 std::string descriptionText(const UnitDescription& unit) {
     std::string text;
-    // What belongs to no table must stand before all tables.
+    // Keys of no table must come before the first table.
     addPaths("folders", unit.folders, text);
     addPaths("absent", unit.absent, text);
     addImage(unit.image, text);

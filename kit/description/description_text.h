@@ -7,9 +7,9 @@
 
 namespace orvane::kit {
 
-/// `unit`, which must be one that makeUnit takes, as a description: parseDescription gives the same
-/// unit again. Numbers ascend, tuning fields stand in the block's order, texts are texts where they
-/// can be read, all other bytes are hex.
+/// The description of `unit`, which makeUnit must accept: parseDescription gives the same unit
+/// again. Numbers ascend, tuning fields are in the block's order, readable bytes are text, all
+/// others hex.
 std::string descriptionText(const UnitDescription& unit);
 
 } // namespace orvane::kit

@@ -13,7 +13,7 @@ namespace orvane::kit {
 
 namespace {
 
-/// So much of a text stands in an error.
+/// The most bytes of a text that an error shows.
 constexpr std::size_t SHOWN = 40;
 
 } // namespace
@@ -26,7 +26,7 @@ Bytes hexBytes(std::string_view text) {
         }
     }
     if (digits.size() % 2 != 0) {
-        throw KitError("hex takes two digits a byte: " + inQuotes(digits.substr(0, SHOWN)) +
+        throw KitError("hex needs two digits a byte: " + inQuotes(digits.substr(0, SHOWN)) +
                        (digits.size() > SHOWN ? "..." : "") + " has an odd number");
     }
     Bytes bytes;
@@ -35,8 +35,8 @@ Bytes hexBytes(std::string_view text) {
         unsigned byte = 0;
         const auto [end, error] = std::from_chars(pair, pair + 2, byte, 16);
         if (error != std::errc{} || end != pair + 2) {
-            throw KitError("hex takes the digits 0-9 and a-f: " +
-                           inQuotes(std::string_view(pair, 2)) + " is no byte");
+            throw KitError("hex has the digits 0-9 and a-f: " +
+                           inQuotes(std::string_view(pair, 2)) + " is not a byte");
         }
         bytes += static_cast<char>(byte);
     }

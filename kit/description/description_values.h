@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The texts inside a description that have a form of their own. Each function throws KitError with
-// what is wrong and what would be right; where, the caller knows.
+// The texts in a description that have a format of their own. Each function throws KitError with
+// what is wrong and what would be right; the caller knows where.
 #pragma once
 
 #include "kit/host/bytes.h"
@@ -13,27 +13,27 @@
 
 namespace orvane::kit {
 
-/// What a text begins with whose rest is hex.
+/// The prefix of a text in hex.
 constexpr std::string_view HEX_PREFIX = "hex:";
 bool hasHexPrefix(std::string_view text);
 
 /// The bytes of a hex text: two digits a byte, blanks and line ends ignored.
 Bytes hexBytes(std::string_view text);
 
-/// The bytes of a text that is taken as it is, or in hex when it begins with "hex:".
+/// The bytes of a text: those of the hex after "hex:", else the text itself.
 Bytes textOrHexBytes(std::string_view text);
 
-/// The number that `text` is: decimal, or hex after "0x"; where it is too great, the greatest.
-/// Nothing for any other text.
+/// The number in `text`, decimal or hex after "0x"; the greatest for one that is too great. Nothing
+/// for any other text.
 std::optional<std::uint64_t> wholeNumber(std::string_view text);
 
-/// The numbers that may stand as a key.
+/// The numbers that a key may be.
 struct KeyRange {
     std::uint64_t least;
     std::uint64_t greatest;
 };
 
-/// A number that stands as a key: decimal, or hex after "0x", in `range`. `what` names it in the
+/// The number in `key`, decimal or hex after "0x"; it must be in `range`. `what` names it in the
 /// error.
 std::uint64_t keyNumber(std::string_view key, KeyRange range, const std::string& what);
 

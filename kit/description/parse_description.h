@@ -10,10 +10,9 @@
 
 namespace orvane::kit {
 
-/// Reads a description. `name` is that of its file: it stands in the error texts, and the host
-/// files that the text names are relative to its folder. Throws KitError with "name:line:column:"
-/// in front for anything that is not a description: bad TOML, an unknown key, a value that does not
-/// fit.
+/// Reads a description. `name` is the path of its file: errors show it, and host files are relative
+/// to its folder. Throws KitError with "name:line:column:" in front for anything that is not a
+/// description: bad TOML, an unknown key, a value that does not fit.
 UnitDescription parseDescription(const std::string& text, const std::string& name);
 UnitDescription readDescription(const std::filesystem::path& file);
 

@@ -28,10 +28,10 @@ namespace orvane::kit {
 
 namespace {
 
-/// Most bytes of a repeated text or of a host's file: a slip of the finger shall not fill the disk.
+/// The most bytes of a repeated text or of a host file, so that a typing error can't fill the disk.
 constexpr std::uint64_t CONTENT_LIMIT = std::uint64_t{1} << 30;
 
-/// A path of the unit, as a text or after "hex:".
+/// A path of the unit, as text or in hex after "hex:".
 std::string unitPathOf(const Place& place, std::string_view text) {
     return at(place, [text] {
         std::string path = textOrHexBytes(text);
@@ -102,10 +102,10 @@ Content sparseContent(const ContentReading& content) {
     return file;
 }
 
-/// A way to give a file's content besides a text: the keys that its table has, and its reader.
+/// A form of a file's content other than text: the keys of its table, and its reader.
 struct ContentForm {
     std::string_view key;
-    std::string_view otherKey; ///< empty where there is one key alone
+    std::string_view otherKey; ///< empty if there is only one key
     Content (*read)(const ContentReading& content);
 };
 

@@ -1,17 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The TOML library, safe for texts that are no TOML. As it is (3.3), it relies in two places on
-// what only such a text violates, and which it would go on to report as an error:
-//  - it asserts that a key begins as a key does, and "[{" does not: an assertion ends the program,
-//    and without assertions Clang takes it for granted;
-//  - it takes for granted that most characters behind U+00A0 are not asked whether they are blank,
-//    which those of a text like "é = 1" are.
-// So assertions do nothing, and such a character is no blank.
+// The TOML library, safe for texts that are not TOML. In two places, version 3.3 relies on what
+// such a text violates before it is reported as an error:
+//  - it asserts that a key begins with a character of keys, which "[{" does not: the assertion ends
+//    the program, and without assertions Clang assumes that it holds;
+//  - it assumes that it never asks whether most characters above U+00A0 are blank, but it does for
+//    "é = 1".
+// So assertions do nothing, and such a character is not a blank.
 #pragma once
 
 #pragma push_macro("NDEBUG")
 #undef NDEBUG
-// NOLINTBEGIN(cppcoreguidelines-macro-usage): so the library wants it
+// NOLINTBEGIN(cppcoreguidelines-macro-usage): the library is configured by macros
 #define TOML_ASSERT(condition) static_cast<void>(0)
 #define TOML_HEADER_ONLY 1
 // NOLINTEND(cppcoreguidelines-macro-usage)

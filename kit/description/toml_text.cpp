@@ -36,7 +36,7 @@ std::string escaped(char c) {
     return std::string("\\u00") + DIGITS[byte >> 4U] + DIGITS[byte & 0xFU];
 }
 
-/// `bytes` in hex, on one line or several.
+/// `bytes` in hex, on one or more lines.
 std::string hexLines(std::string_view bytes) {
     if (bytes.size() <= HEX_LINE) {
         return hexText(bytes);
@@ -78,7 +78,7 @@ std::string tomlLines(std::string_view text) {
     std::string result = "\"\"\"\n"; // the first line end is not part of the text
     for (std::size_t at = 0; at < text.size(); ++at) {
         const char c = text[at];
-        // A quote may stand as it is, but not beside another, nor before the three at the end.
+        // A quote needs an escape only next to another one and before the three at the end.
         const bool isPlainQuote = c == '"' && result.back() != '"' && at + 1 < text.size();
         const bool isPlain =
             c == '\n' || c == '\t' || isPlainQuote || (!isControl(c) && c != '"' && c != '\\');

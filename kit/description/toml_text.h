@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Texts and bytes as they stand in a TOML document.
+// Texts and bytes in the form of a TOML document.
 #pragma once
 
 #include <string>
@@ -15,13 +15,13 @@ bool isReadable(std::string_view text);
 /// The UTF-8 text `text` in quotes, on one line.
 std::string tomlText(std::string_view text);
 
-/// The same over as many lines as it has, in three quotes, where it has more than one.
+/// The same for one line; more lines stay lines, in three quotes.
 std::string tomlLines(std::string_view text);
 
-/// `bytes` in hex, in quotes; over several lines of 32 bytes each where there are more.
+/// `bytes` in hex, in quotes; more than 32 bytes take several lines.
 std::string tomlHex(std::string_view bytes);
 
-/// `bytes` as a readable text that does not begin with "hex:", else in hex after it.
+/// `bytes` as text if it is readable and does not begin with "hex:", else as "hex:" and hex.
 std::string tomlTextOrHex(std::string_view bytes);
 
 /// The same for a path or a name in it, which is a text whenever it is UTF-8.

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Typed values out of a TOML tree, each refusal with its place in the text, what was there, and
-// what would be right. For the readers of descriptions alone: compiling the parser takes a while.
+// Typed values from a TOML tree. Each refusal has its place in the text, what was there, and what
+// would be right. Only for the readers of descriptions: the parser takes long to compile.
 #pragma once
 
 #include "kit/description/description_values.h"
@@ -19,7 +19,7 @@ namespace orvane::kit {
 
 using Place = toml::source_region;
 
-/// Throws KitError with "name:line:column:" in front, on one line whatever texts stand in `what`.
+/// Throws KitError with "name:line:column:" in front, on one line whatever `what` contains.
 [[noreturn]] inline void failAt(const Place& place, std::string what) {
     std::replace_if(
         what.begin(), what.end(), [](char c) { return static_cast<unsigned char>(c) < 0x20; }, ' ');
@@ -27,7 +27,7 @@ using Place = toml::source_region;
                    std::to_string(place.begin.column) + ": " + what);
 }
 
-/// Does `action` and adds the place to what it throws.
+/// Calls `action` and adds the place to its errors.
 template <class Action>
 auto at(const Place& place, const Action& action) {
     try {
@@ -37,7 +37,7 @@ auto at(const Place& place, const Action& action) {
     }
 }
 
-/// Does `action` and adds the place and what it is about to what it throws.
+/// Calls `action` and adds the place and `what` to its errors.
 template <class Action>
 auto at(const Place& place, const std::string& what, const Action& action) {
     try {
@@ -47,7 +47,7 @@ auto at(const Place& place, const std::string& what, const Action& action) {
     }
 }
 
-/// The node as it may stand in an error: a single value as in TOML, the beginning of a long one.
+/// The node for an error: a single value as in TOML, cut short if it is long.
 inline std::string shown(const toml::node& node) {
     constexpr std::size_t LONGEST = 40;
     if (node.is_table()) {
@@ -71,7 +71,7 @@ inline std::string shown(const toml::node& node) {
     return text.size() <= LONGEST ? text : text.substr(0, LONGEST) + "...";
 }
 
-/// Throws for a key that `where` does not know; `known` lists those that it does.
+/// Throws for a key that `where` does not know; `known` lists those that it knows.
 [[noreturn]] inline void failUnknown(const toml::key& key, const std::string& where,
                                      const std::string& known) {
     failAt(key.source(),
@@ -79,7 +79,7 @@ inline std::string shown(const toml::node& node) {
 }
 
 /// The node as a table, a text, a whole number, and a number from 0 to `greatest`. Each throws with
-/// the node's place when it is anything else; `what` names it there.
+/// the node's place if the node is anything else; `what` names it in the error.
 inline const toml::table& tableOf(const toml::key& key, const toml::node& node) {
     const toml::table* table = node.as_table();
     if (table == nullptr) {
@@ -120,12 +120,13 @@ inline Bytes hexOf(const toml::node& node, const std::string& what) {
     return at(node.source(), what, [&text] { return hexBytes(text); });
 }
 
-/// A number that stands as a key, as of keyNumber.
+/// The number in a key, as keyNumber reads it.
 inline std::uint64_t numberOf(const toml::key& key, KeyRange range, const std::string& what) {
     return at(key.source(), [&] { return keyNumber(key.str(), range, what); });
 }
 
-/// Enters a value under a key that may be written in two ways; `what` names it.
+/// Adds a value. Throws if its key is there already, which may be written in two ways; `what` names
+/// it.
 template <class Map, class Key, class Value>
 void putOnce(Map& map, const toml::key& key, const Key& mapKey, Value value,
              const std::string& what) {

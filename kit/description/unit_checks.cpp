@@ -32,7 +32,7 @@ void checkParam(std::uint16_t number, std::int64_t value) {
     ParamInfo info{};
     const std::string name = valueName(paramKey(number));
     if (describeParam(number, info) != 0) {
-        throw KitError("there is no " + name + ": they are 1 to " + std::to_string(PARAM_COUNT));
+        throw KitError("there is no " + name + ", only 1 to " + std::to_string(PARAM_COUNT));
     }
     if (value < 0 || value >= std::int64_t{1} << (8 * info.size)) {
         throw KitError(name + (info.size == 1 ? " is one byte: " : " is two bytes: ") +
@@ -43,7 +43,7 @@ void checkParam(std::uint16_t number, std::int64_t value) {
 void checkSlot(std::uint32_t slot, const Bytes& bytes) {
     const std::string name = valueName(slotKey(slot));
     if (slot >= RECORD_SLOT_COUNT) {
-        throw KitError("there is no " + name + ": they are 0 to " +
+        throw KitError("there is no " + name + ", only 0 to " +
                        std::to_string(RECORD_SLOT_COUNT - 1));
     }
     checkLength(name, bytes, slotPlace(slot).size);
@@ -55,10 +55,10 @@ void checkAux(const Bytes& bytes) {
 
 void checkTuning(std::uint32_t id, const TuningDescription& block) {
     if (id >= DPS_BLOCK_COUNT) {
-        throw KitError("there is no " + valueName(tuningBlockKey(id)) + ": they are 0 to " +
+        throw KitError("there is no " + valueName(tuningBlockKey(id)) + ", only 0 to " +
                        std::to_string(DPS_BLOCK_COUNT - 1));
     }
-    encodeTuningBlock(block); // only for its refusals
+    encodeTuningBlock(block); // throws for a value that does not fit
 }
 
 void checkUnitPath(const std::string& path) {

@@ -22,7 +22,7 @@ struct ImageDescription {
     std::map<std::uint32_t, Bytes> bytes; ///< raw bytes by offset, put after the parameters
 };
 
-/// The boot disk: zeros but for what is named here.
+/// The boot disk: zeros except for what is named here.
 struct DiskDescription {
     std::uint64_t size = std::uint64_t{2} << 20U;      ///< bytes
     std::map<std::uint32_t, Bytes> slots;              ///< by slot number, through writeRecordSlot
@@ -31,13 +31,13 @@ struct DiskDescription {
     std::map<std::uint64_t, Bytes> bytes; ///< raw bytes by offset from the start of the disk
 };
 
-/// A file of zeros but for what is named here; the zeros take no room on the host.
+/// A file of zeros except for what is named here; the zeros take no room on the host.
 struct SparseFile {
     std::uint64_t size = 0;               ///< bytes
     std::map<std::uint64_t, Bytes> bytes; ///< by offset; they lie within the size
 };
 
-/// A whole unit, by absolute paths on it. No path is named twice but in `absent`, and nothing lies
+/// A whole unit, by its absolute paths. No path is named twice except in `absent`, and nothing lies
 /// below a file or a link.
 struct UnitDescription {
     ImageDescription image;
@@ -46,7 +46,7 @@ struct UnitDescription {
     std::map<std::string, SparseFile> sparseFiles; ///< path -> content
     std::map<std::string, std::string> links;      ///< path -> target of a symbolic link
     std::vector<std::string> folders;              ///< further folders
-    std::vector<std::string> absent; ///< paths at and below which nothing is made after all
+    std::vector<std::string> absent;               ///< paths at and below which nothing is made
 };
 
 } // namespace orvane::kit

@@ -16,7 +16,7 @@ namespace orvane::kit {
 
 namespace {
 
-/// The folders that every unit has: those of all that a run opens.
+/// The folders that every unit has: those of everything that a run opens.
 std::set<std::string> unitFolders() {
     std::set<std::string> folders = {OUTPUT_FOLDER};
     for (const char* source : VALUE_SOURCES) {
@@ -29,14 +29,14 @@ std::set<std::string> unitFolders() {
     return folders;
 }
 
-/// The folders above each entry, where nothing stands yet.
+/// Adds the folders above `path` that have no entry yet.
 void addFoldersAbove(const std::string& path, Layout& layout) {
     for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
         layout.emplace(above, EntryKind::folder);
     }
 }
 
-/// What is there unless something else is: nothing lies below a file or a link.
+/// Adds an entry unless `path` has one already or lies below a file or link.
 void addUnlessTaken(const std::string& path, EntryKind kind, Layout& layout) {
     for (std::string above = pathAbove(path); !above.empty(); above = pathAbove(above)) {
         const auto taken = layout.find(above);

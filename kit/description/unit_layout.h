@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What a description puts where: the standard folders, image and disk, and what gives way to what.
+// The entries that a description makes: its own, and the standard ones that they leave room for.
 #pragma once
 
 #include "kit/description/unit_description.h"
@@ -10,17 +10,17 @@
 
 namespace orvane::kit {
 
-/// The kit's own mark at the top of a unit, which is no part of its description.
+/// The kit's own mark at the top of a unit, which is not part of its description.
 constexpr char MARKER_NAME[] = ".orvane-unit";
 
 enum class EntryKind { folder, file, sparseFile, link, image, disk };
 
-/// All entries of a unit by their paths, those above before those below.
+/// All entries of a unit by path, each folder before what it contains.
 using Layout = std::map<std::string, EntryKind>;
 
 /// The layout that `unit` asks for, the folders above each entry included. Image, disk and standard
-/// folders give way to what `unit` names at their path or, but for a folder, above it. Requires
-/// that findPathConflict finds nothing.
+/// folders give way to whatever `unit` names at their path, and to anything but a folder above it.
+/// Requires that findPathConflict finds nothing.
 Layout layoutOf(const UnitDescription& unit);
 
 /// The path without its last name: "/tmp" for "/tmp/x", empty for "/tmp".

@@ -32,7 +32,7 @@ struct Form {
     std::string_view between; ///< behind it; empty where it is the last
 };
 
-/// All keys. Where a text has two of the forms, the first one counts.
+/// All forms of keys. A text that fits two of them has the first one.
 constexpr Form FORMS[] = {
     {Kind::imageSize, Part::none, Part::none, "image.size", ""},
     {Kind::param, Part::param, Part::none, "param.", ""},
@@ -69,7 +69,7 @@ std::string partText(Part part, const ValueKey& key) {
     return {};
 }
 
-/// Enters `text` into `key`. Throws KitError.
+/// Sets `part` of `key` from `text`. Throws KitError.
 void readPart(Part part, std::string_view text, ValueKey& key) {
     constexpr std::uint64_t GREATEST = std::numeric_limits<std::int64_t>::max();
     switch (part) {
@@ -104,7 +104,7 @@ void readPart(Part part, std::string_view text, ValueKey& key) {
     }
 }
 
-/// What stands for the two parts of `form` in `text`; false when the text has another form.
+/// Finds the two parts of `form` in `text`; false when the text has another form.
 bool splitParts(const Form& form, std::string_view text, std::string_view& first,
                 std::string_view& second) {
     if (text.substr(0, form.begin.size()) != form.begin) {

@@ -9,7 +9,7 @@
 
 namespace orvane::kit {
 
-/// The key of one value of a unit. The default is the empty key, which is that of no value.
+/// The key of one value of a unit. The default is the empty key, which no value has.
 struct ValueKey {
     enum class Kind {
         none,        ///< the empty text
@@ -33,12 +33,12 @@ struct ValueKey {
     Kind kind = Kind::none;
     std::uint64_t number = 0; ///< of the parameter, slot or tuning block
     std::uint64_t offset = 0; ///< bytes
-    std::string name;         ///< of the tuning field; the path of all that has one
+    std::string name;         ///< of the tuning field; the path where there is one
 
     bool isEmpty() const { return kind == Kind::none; }
 };
 
-/// The order is that of the kinds, then of numbers, offsets and names.
+/// Ordered by kind, then number, offset and name.
 bool operator==(const ValueKey& one, const ValueKey& other);
 bool operator!=(const ValueKey& one, const ValueKey& other);
 bool operator<(const ValueKey& one, const ValueKey& other);
@@ -67,8 +67,8 @@ struct ParsedKey {
     std::string fault; ///< what is wrong with the text and what would be right; empty for a key
 };
 
-/// The inverse of keyText. Numbers may also be hexadecimal, after "0x". There must be such a
-/// parameter, slot, byte, tuning block and field, and a path must begin with a slash.
+/// The inverse of keyText. Numbers may also be hexadecimal, after "0x". The parameter, slot, byte,
+/// tuning block or field must exist, and a path must begin with a slash.
 ParsedKey parseKey(std::string_view text);
 
 } // namespace orvane::kit

@@ -23,7 +23,7 @@ ValuePlace imagePlace(const ParamPlace& param) {
             std::uint64_t{param.offset} + param.size};
 }
 
-/// A place whose beginning must lie on the disk.
+/// A place whose first byte must lie on the disk.
 ValuePlace recordPlace(std::uint64_t offset, std::uint32_t size) {
     return {true, offset, Bytes(size, ALL_BITS), AREA_SIZE - offset};
 }
@@ -142,7 +142,7 @@ std::string valueName(const ValueKey& key) {
     case Kind::imageBytes:
     case Kind::diskBytes:
     case Kind::fileBytes:
-        return "what stands at " + std::to_string(key.offset);
+        return "the content at " + std::to_string(key.offset);
     case Kind::none:
     case Kind::imageSize:
     case Kind::tuningRaw:
@@ -165,7 +165,7 @@ std::string placeFault(const ValueKey& key, std::uint64_t size) {
     }
     const bool isTuning = key.kind == Kind::tuningBlock || key.kind == Kind::tuningField;
     return (isTuning ? "the tuning area" : valueName(key)) + " does not fit on a disk of " +
-           std::to_string(size) + " bytes: it takes " + std::to_string(place.leastSize);
+           std::to_string(size) + " bytes: it needs " + std::to_string(place.leastSize);
 }
 
 std::string pastTheEnd(const std::string& what, std::uint64_t offset, std::uint64_t length,

@@ -16,31 +16,30 @@ namespace orvane::kit {
 /// The catalogue's row of parameter `number`, which must exist.
 ParamDescriptor paramRow(std::uint16_t number);
 
-/// Where parameter `number`, an existing one, lies in the image.
+/// Where an existing parameter lies in the image.
 struct ParamPlace {
     std::uint32_t offset; ///< bytes
     std::uint32_t size;   ///< bytes, 1 or 2
 };
 ParamPlace paramPlace(std::uint16_t number);
 
-/// Where slot `slot`, an existing one, lies in the record area.
+/// Where an existing slot lies in the record area.
 struct SlotPlace {
     std::uint64_t offset; ///< from the area's base, in bytes
     std::uint32_t size;   ///< bytes
 };
 SlotPlace slotPlace(std::uint32_t slot);
 
-/// The other slots whose bytes are all bytes of slot `slot`: none but for the one that repeats
-/// them.
+/// The other slots that lie within slot `slot`: none, except for the slot that repeats them.
 std::vector<std::uint32_t> slotsWithin(std::uint32_t slot);
 
 /// Where a value of the image or the disk lies.
 struct ValuePlace {
     bool isOnDisk = false;
     std::uint64_t offset = 0; ///< in the image, or in the record area of the disk
-    Bytes mask;               ///< the bits that are the value's; as long as the place
-    /// The bytes that the image or disk must have at least. What counts is the beginning of a whole
-    /// slot, or of the tuning area, since the tool reads and writes no part of them.
+    Bytes mask;               ///< the value's bits; as long as the place
+    /// The least size of the image or disk, in bytes. The beginning of the whole slot or of the
+    /// tuning area must be on it, since the tool reads and writes them only as a whole.
     std::uint64_t leastSize = 0;
 
     /// The offset in an image or disk of `size` bytes.
@@ -48,15 +47,14 @@ struct ValuePlace {
 };
 
 /// The place of a parameter, a slot or one byte of it, the auxiliary area, a tuning block (without
-/// the bits that no field reads) or one of its fields: for other kinds of keys there is none.
+/// the bits that no field reads) or one of its fields. Other kinds of keys have none.
 ValuePlace valuePlace(const ValueKey& key);
 
-/// The value in words, for an error: "parameter 139", "qwaNRAtten of tuning block 3"; of what is in
-/// no image and on no disk its path.
+/// The value in words, for an error: "parameter 139", "qwaNRAtten of tuning block 3"; the path of
+/// anything else.
 std::string valueName(const ValueKey& key);
 
-/// What is wrong when the value of `key` is to stand in an image or on a disk of `size` bytes;
-/// empty where it fits.
+/// Why the value of `key` does not fit in an image or on a disk of `size` bytes; empty if it does.
 std::string placeFault(const ValueKey& key, std::uint64_t size);
 
 /// "`what` ends at byte ... of `whole` of `size` bytes", or empty where it ends within.

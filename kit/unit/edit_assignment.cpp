@@ -35,8 +35,8 @@ using Kind = ValueKey::Kind;
 constexpr char SERIAL[] = "serial"; ///< another name for its slot
 constexpr std::uint64_t LONGEST_TUNING_FILE = std::uint64_t{1} << 20U; ///< bytes
 
-/// A whole number, decimal or in hex, negative after "-"; nothing for any other text. What is
-/// too great fits nowhere: the greatest number stands for it.
+/// A whole number, decimal or in hex, negative after "-"; nothing for any other text. One that is
+/// too great becomes the greatest, which fits nowhere.
 std::optional<std::int64_t> numberIn(std::string_view text) {
     const bool isNegative = text.substr(0, 1) == "-";
     const std::optional<std::uint64_t> number = wholeNumber(text.substr(isNegative ? 1 : 0));
@@ -67,21 +67,21 @@ std::vector<std::int64_t> numbersIn(const std::string& what, std::string_view te
     return numbers;
 }
 
-/// The bytes for the place of a key, or what is wrong with the file that the value names, at the
-/// places in it.
+/// The bytes for a key's place, or the faults of the tuning file that the value names, with their
+/// places.
 struct ReadValue {
     Bytes bytes;
     std::string fileFaults;
 };
 
-/// Each of the readers throws KitError for a value that its key does not take.
+/// Each reader throws KitError for a value that its key can't have.
 ReadValue readParam(const ValueKey& key, std::string_view text) {
     const std::int64_t value = requireNumber(valueName(key), text);
     checkParam(static_cast<std::uint16_t>(key.number), value);
     return {littleEndian(static_cast<std::uint64_t>(value), valuePlace(key).mask.size()), ""};
 }
 
-/// `bytes` with zeros behind them to the end of the key's place.
+/// `bytes`, padded with zeros to the size of the key's place.
 ReadValue padded(const ValueKey& key, Bytes bytes) {
     bytes.resize(valuePlace(key).mask.size());
     return {std::move(bytes), ""};
@@ -146,7 +146,7 @@ const SettableKind& settableKind(Kind kind, std::string_view key) {
     return *found;
 }
 
-/// The values that are set with that of `key`: more than itself for what holds other values.
+/// The values that an assignment to `key` sets: those inside it, if there are any, else its own.
 std::vector<ValueKey> valuesIn(const ValueKey& key) {
     std::vector<ValueKey> keys;
     if (key.kind == Kind::slot) {
@@ -166,7 +166,7 @@ std::vector<ValueKey> valuesIn(const ValueKey& key) {
 Assignment readAssignment(const std::string& text) {
     const std::size_t equals = text.find('=');
     if (equals == std::string::npos) {
-        throw KitError(inQuotes(text) + " is no assignment: it takes KEY=VALUE");
+        throw KitError(inQuotes(text) + " is not of the form KEY=VALUE");
     }
     const std::string key = text.substr(0, equals);
     const ParsedKey parsed =
@@ -193,8 +193,8 @@ void requireDistinct(const std::vector<Assignment>& assignments) {
         for (const ValueKey& key : valuesIn(assignment.key)) {
             const auto [entry, isNew] = setBy.emplace(key, assignment.text);
             if (!isNew) {
-                throw KitError(assignment.text + ": " + valueName(key) + " is set by " +
-                               inQuotes(entry->second) + " already");
+                throw KitError(assignment.text + ": " + valueName(key) + " is already set by " +
+                               inQuotes(entry->second));
             }
         }
     }

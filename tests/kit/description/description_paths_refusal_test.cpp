@@ -18,7 +18,7 @@ const DescriptionRefusal REFUSALS[] = {
     {"absent = [\"/tmp/../x\"]\n", "unit.toml:1:11: a path must be absolute and have no \".\", "
                                    "\"..\" or needless \"/\", unlike \"/tmp/../x\""},
     {"folders = [\"hex:2\"]\n",
-     "unit.toml:1:12: hex takes two digits a byte: \"2\" has an odd number"},
+     "unit.toml:1:12: hex needs two digits a byte: \"2\" has an odd number"},
     {"folders = [\"hex:74\"]\n", "unit.toml:1:12: a path must be absolute and have no \".\", "
                                  "\"..\" or needless \"/\", unlike \"t\""},
     {"folders = [\"/.orvane-unit\"]\n", "unit.toml:1:12: a path must not be /.orvane-unit, which "
@@ -69,7 +69,7 @@ const DescriptionRefusal REFUSALS[] = {
     {"[files]\n\"/x\" = { repeat = \"x\", count = \"2\" }\n",
      "unit.toml:2:32: count in the content of /x must be a whole number, not \"2\""},
     {"[files]\n\"/x\" = { repeat = { hex = \"f\" }, count = 2 }\n",
-     "unit.toml:2:27: repeat in the content of /x: hex takes two digits a byte: \"f\" has an odd "
+     "unit.toml:2:27: repeat in the content of /x: hex needs two digits a byte: \"f\" has an odd "
      "number"},
     {"[files]\n\"/x\" = { repeat = { tex = \"f\" }, count = 2 }\n",
      "unit.toml:2:19: repeat in the content of /x must be a text or { hex = \"...\" }"},
@@ -88,9 +88,9 @@ const DescriptionRefusal REFUSALS[] = {
     {"[files]\n\"/x\" = { size = 1, bytes = \"x\" }\n",
      "unit.toml:2:28: bytes in the content of /x must be a table of hex by offset, not \"x\""},
     {"[files]\n\"/x\" = { size = 1, bytes = { 1 = \"41\" } }\n",
-     "unit.toml:2:30: what stands at 1 ends at byte 2 of a file of 1 bytes"},
+     "unit.toml:2:30: the content at 1 ends at byte 2 of a file of 1 bytes"},
     {"[files]\n\"/x\" = { size = 1, bytes = { 0 = 41 } }\n",
-     "unit.toml:2:34: what stands at 0 must be a text in quotes, not 41"},
+     "unit.toml:2:34: the content at 0 must be a text in quotes, not 41"},
     {"[files]\n\"/x\" = { bytes = { 0 = \"41\" } }\n",
      "unit.toml:2:8: the content of /x must be given in one way: hex, or repeat and count, or "
      "path, or size and bytes"},
@@ -113,7 +113,7 @@ const DescriptionRefusal REFUSALS[] = {
     {"[links]\n\"/x\" = \"hex:00\"\n", "unit.toml:2:8: the target of /x: a link's target must have "
                                        "at least one byte, and none that is zero"},
     {"[links]\n\"/x\" = \"hex:0\"\n",
-     "unit.toml:2:8: the target of /x: hex takes two digits a byte: \"0\" has an odd number"},
+     "unit.toml:2:8: the target of /x: hex needs two digits a byte: \"0\" has an odd number"},
     {"[links]\n\"/x\" = \"a\\u0000b\"\n", "unit.toml:2:8: the target of /x: a link's target must "
                                           "have at least one byte, and none that is zero"},
     {"links = []\n", "unit.toml:1:9: \"links\" must be a table, not a list"},

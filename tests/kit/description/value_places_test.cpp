@@ -69,9 +69,9 @@ TEST(ValuePlacesTest, ValueThatDoesNotFitIsNamedWithTheSizeItNeeds) {
               "parameter 134 ends at byte 135 of an image of 134 bytes");
     EXPECT_EQ(kit::placeFault(kit::slotKey(9), 1048447), "");
     EXPECT_EQ(kit::placeFault(kit::slotKey(9), 1048446),
-              "slot 9 does not fit on a disk of 1048446 bytes: it takes 1048447");
+              "slot 9 does not fit on a disk of 1048446 bytes: it needs 1048447");
     EXPECT_EQ(kit::placeFault(kit::tuningFieldKey(3, "qwaNRAtten"), 9),
-              "the tuning area does not fit on a disk of 9 bytes: it takes 1044480");
+              "the tuning area does not fit on a disk of 9 bytes: it needs 1044480");
 }
 
 } // namespace

@@ -41,9 +41,9 @@ const Refusal REFUSALS[] = {
     {"slot.9=123456789", "slot 9 takes 1 to 8 bytes, not 9"},
     {"slot.9=", "slot 9 takes 1 to 8 bytes, not 0"},
     {"serial=123456789", "slot 9 takes 1 to 8 bytes, not 9"},
-    {"slot.9=hex:4", "hex takes two digits a byte: \"4\" has an odd number"},
+    {"slot.9=hex:4", "hex needs two digits a byte: \"4\" has an odd number"},
     {"aux=", "the auxiliary area takes 1 to 1024 bytes, not 0"},
-    {"aux=hex:zz", "hex takes the digits 0-9 and a-f: \"zz\" is no byte"},
+    {"aux=hex:zz", "hex has the digits 0-9 and a-f: \"zz\" is not a byte"},
     {"tuning.10.qwaSendGain=1", "a tuning block must be from 0 to 9, not \"10\""},
     {"tuning.3.qwaNone=1", "there is no tuning field \"qwaNone\""},
     {"tuning.3.=1", "there is no tuning field \"\""},
@@ -75,7 +75,7 @@ TEST_F(EditTest, UnknownKeyIsNamedWithTheKnownOnes) {
         EXPECT_EQ(refusalOf({assignment}),
                   std::string(assignment).append(": unknown key \"").append(key) + "\"" + KNOWN);
     }
-    EXPECT_EQ(refusalOf({"serial"}), "\"serial\" is no assignment: it takes KEY=VALUE");
+    EXPECT_EQ(refusalOf({"serial"}), "\"serial\" is not of the form KEY=VALUE");
 }
 
 TEST_F(EditTest, WrongAssignmentAfterGoodOnesChangesNothing) {
@@ -88,18 +88,18 @@ TEST_F(EditTest, WrongAssignmentAfterGoodOnesChangesNothing) {
 TEST_F(EditTest, ValueThatIsSetTwiceIsRefused) {
     writeFile(hostFile(), "");
     EXPECT_EQ(refusalOf({"param.22=1", "param.0x16=1"}),
-              "param.0x16=1: parameter 22 is set by \"param.22=1\" already");
+              "param.0x16=1: parameter 22 is already set by \"param.22=1\"");
     EXPECT_EQ(refusalOf({"serial=a", "slot.9=b"}),
-              "slot.9=b: slot 9 is set by \"serial=a\" already");
+              "slot.9=b: slot 9 is already set by \"serial=a\"");
     EXPECT_EQ(refusalOf({"slot.15=a", "slot.1=b"}),
-              "slot.1=b: slot 1 is set by \"slot.15=a\" already");
+              "slot.1=b: slot 1 is already set by \"slot.15=a\"");
     EXPECT_EQ(refusalOf({"serial=a", "slot.15=b"}),
-              "slot.15=b: slot 9 is set by \"serial=a\" already");
+              "slot.15=b: slot 9 is already set by \"serial=a\"");
     EXPECT_EQ(refusalOf({"aux=a", "aux=a"}),
-              "aux=a: the auxiliary area is set by \"aux=a\" already");
+              "aux=a: the auxiliary area is already set by \"aux=a\"");
     EXPECT_EQ(refusalOf({"tuning.3.qwaSendGain=1", "tuning.0x3.qwaSendGain=1"}),
-              "tuning.0x3.qwaSendGain=1: qwaSendGain of tuning block 3 is set by "
-              "\"tuning.3.qwaSendGain=1\" already");
+              "tuning.0x3.qwaSendGain=1: qwaSendGain of tuning block 3 is already set by "
+              "\"tuning.3.qwaSendGain=1\"");
 }
 
 TEST_F(EditTest, FaultOfATuningFileNamesItsPlace) {
@@ -152,9 +152,9 @@ TEST_F(EditTest, DiskThatIsTooShortIsRefused) {
     unit.disk.size = 1044479;
     make(unit);
     EXPECT_EQ(refusalOf({"serial=x"}), "serial=x: slot 9 does not fit on a disk of 1044479 bytes: "
-                                       "it takes 1048447");
+                                       "it needs 1048447");
     EXPECT_EQ(refusalOf({"aux=x"}), "aux=x: the auxiliary area does not fit on a disk of 1044479 "
-                                    "bytes: it takes 1045504");
+                                    "bytes: it needs 1045504");
     EXPECT_EQ(refusalOf({"tuning.3.qwaSendGain=1"}),
               "tuning.3.qwaSendGain=1: the tuning area does not fit on a disk of 1044479 bytes: it "
               "takes 1044480");

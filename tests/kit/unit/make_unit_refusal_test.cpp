@@ -29,9 +29,9 @@ struct Refusal {
 
 const Refusal REFUSALS[] = {
     {[](kit::UnitDescription& unit) { unit.image.params[0] = 1; },
-     "there is no parameter 0: they are 1 to 171"},
+     "there is no parameter 0, only 1 to 171"},
     {[](kit::UnitDescription& unit) { unit.image.params[172] = 1; },
-     "there is no parameter 172: they are 1 to 171"},
+     "there is no parameter 172, only 1 to 171"},
     {[](kit::UnitDescription& unit) { unit.image.params[22] = 256; },
      "parameter 22 is one byte: 256 does not fit"},
     {[](kit::UnitDescription& unit) {
@@ -40,9 +40,9 @@ const Refusal REFUSALS[] = {
      },
      "parameter 134 ends at byte 135 of an image of 134 bytes"},
     {[](kit::UnitDescription& unit) { unit.image.bytes[178] = "ab"; },
-     "what stands at 178 ends at byte 180 of an image of 179 bytes"},
+     "the content at 178 ends at byte 180 of an image of 179 bytes"},
     {[](kit::UnitDescription& unit) { unit.disk.slots[18] = "x"; },
-     "there is no slot 18: they are 0 to 17"},
+     "there is no slot 18, only 0 to 17"},
     {[](kit::UnitDescription& unit) { unit.disk.slots[9] = "123456789"; },
      "slot 9 takes 1 to 8 bytes, not 9"},
     {[](kit::UnitDescription& unit) { unit.disk.slots[9] = ""; },
@@ -52,7 +52,7 @@ const Refusal REFUSALS[] = {
     {[](kit::UnitDescription& unit) { unit.disk.aux = ""; },
      "the auxiliary area takes 1 to 1024 bytes, not 0"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[10].raw = "x"; },
-     "there is no tuning block 10: they are 0 to 9"},
+     "there is no tuning block 10, only 0 to 9"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[0].raw = std::string(189, 'x'); },
      "a tuning block has 188 bytes, not 189"},
     {[](kit::UnitDescription& unit) { unit.disk.tuning[2].fields["qwaNone"] = "x"; },
@@ -61,29 +61,29 @@ const Refusal REFUSALS[] = {
          unit.disk.size = 1048575; // a byte less than the record area
          unit.disk.slots[0] = "x";
      },
-     "slot 0 does not fit on a disk of 1048575 bytes: it takes 1048576"},
+     "slot 0 does not fit on a disk of 1048575 bytes: it needs 1048576"},
     {[](kit::UnitDescription& unit) {
          unit.disk = {};
          unit.disk.size = 0;
          unit.disk.aux = "x";
      },
-     "the auxiliary area does not fit on a disk of 0 bytes: it takes 1045504"},
+     "the auxiliary area does not fit on a disk of 0 bytes: it needs 1045504"},
     {[](kit::UnitDescription& unit) {
          unit.disk = {};
          unit.disk.size = 0xFF000 - 1;
          unit.disk.tuning[0].raw = "x";
      },
-     "the tuning area does not fit on a disk of 1044479 bytes: it takes 1044480"},
+     "the tuning area does not fit on a disk of 1044479 bytes: it needs 1044480"},
     {[](kit::UnitDescription& unit) { unit.disk.bytes[0x1FFFFF] = "ab"; },
-     "what stands at 2097151 ends at byte 2097153 of a disk of 2097152 bytes"},
+     "the content at 2097151 ends at byte 2097153 of a disk of 2097152 bytes"},
     {[](kit::UnitDescription& unit) {
          unit.disk.bytes[~std::uint64_t{0}] = "ab"; // past the end, however it is counted
      },
-     "what stands at 18446744073709551615 ends at byte 1 of a disk of 2097152 bytes"},
+     "the content at 18446744073709551615 ends at byte 1 of a disk of 2097152 bytes"},
     {[](kit::UnitDescription& unit) {
          unit.sparseFiles["/tmp/x"] = {3, {{2, "ab"}}};
      },
-     "what stands at 2 ends at byte 4 of a file of 3 bytes"},
+     "the content at 2 ends at byte 4 of a file of 3 bytes"},
     {[](kit::UnitDescription& unit) { unit.files["/tmp/file/below"] = "x"; },
      "/tmp/file/below lies below /tmp/file, which is a file, not a folder"},
     {[](kit::UnitDescription& unit) { unit.folders.emplace_back("/tmp/file/b/c"); },
