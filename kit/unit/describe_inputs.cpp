@@ -40,7 +40,8 @@ bool isMissing() {
     return errno == ENOENT || errno == ENOTDIR || errno == ELOOP || errno == ENAMETOOLONG;
 }
 
-/// What `descriptor`, just opened, or not, as `path`, is; `none` when it is not there.
+/// The type of what has just been opened as `path`, also if that failed; `none` when nothing is
+/// there.
 fs::file_type typeOf(const Descriptor& descriptor, const char* path) {
     if (!descriptor.isOpen() && isMissing()) {
         return fs::file_type::none;
@@ -54,7 +55,7 @@ fs::file_type typeOf(const Descriptor& descriptor, const char* path) {
                                     : fs::file_type::unknown;
 }
 
-/// Reads in a process that has entered the unit.
+/// Requires that the process has entered the unit.
 class InputReader {
 public:
     UnitInputs read() {
@@ -111,7 +112,7 @@ private:
         }
     }
 
-    /// Looks before it opens: to open a device may do something.
+    /// Looks before it opens: opening a device may have an effect.
     void readFile(const std::string& path) {
         struct stat state {};
         if (::stat(path.c_str(), &state) != 0) {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// All that a run of the tool reads in a unit, which the kit need not have made.
+// All that a run of the tool reads in a unit, whoever made it.
 #pragma once
 
 #include "kit/description/unit_description.h"
@@ -26,14 +26,13 @@ UnitDescription descriptionOf(UnitInputs inputs);
 /// What a run of the tool reads in the unit at `source` ("/", or a mounted image of a unit; the kit
 /// need not have made it), as a description of a unit in which a run does the same:
 ///  - the configuration image, and the last mebibyte of the boot disk, or all of a shorter one;
-///  - of the version folder what the tool takes for a version description;
-///  - templates and stock files.
-/// Links are followed inside the source, and the content taken. What is missing or can't be reached
-/// there is missing in the description, a folder in the place of a file is a folder. Outputs are
-/// left out, but one that can't be opened for writing there is a folder, and a missing /tmp is
-/// missing. What outputs and inputs share by a link is not kept, nor the order of the version
-/// folder's listing, which is the file system's. Never writes. Throws KitError when the source
-/// can't be entered, or something in it is there and can't be read.
+///  - the files of the version folder that the tool takes for version descriptions;
+///  - templates and stock files. Links are followed inside the source. What is missing or can't be
+///    reached there is missing in the description; a folder in the place of a file is a folder.
+///    Outputs are left out, except that one that can't be opened for writing becomes a folder, and
+///    a missing /tmp stays missing. Not kept are links between outputs and inputs, and the order of
+///    the version folder's listing, which is the file system's. Never writes. Throws KitError when
+///    the source can't be entered, or something in it can't be read.
 UnitDescription describeInputs(const std::filesystem::path& source);
 
 } // namespace orvane::kit

@@ -31,12 +31,12 @@ namespace orvane::kit {
 
 namespace {
 
-/// A shorter file is not worth a table of its own. In bytes.
+/// Shorter files get no table of their own. In bytes.
 constexpr std::uint64_t LEAST_SPARSE = 4096;
 /// What an entry of such a table takes besides its bytes, in bytes.
 constexpr std::uint64_t RUN_COST = 32;
 
-/// Gives a part of `area` and leaves zeros in its place.
+/// Returns a part of `area` and sets it to zeros.
 Bytes takePart(Bytes& area, std::int64_t begin, std::size_t length) {
     const auto at = static_cast<std::size_t>(begin);
     Bytes part = area.substr(at, length);
@@ -72,8 +72,8 @@ void takeTuning(Bytes& area, DiskDescription& disk) {
     }
 }
 
-/// Where parts of the area begin that are taken out of it, and its end: what is left before and
-/// behind a part must not become one run.
+/// The offsets of the parts that are taken out of the area, and its end: what is left before and
+/// after a part must not become one run.
 std::set<std::uint64_t> bordersOfParts() {
     std::set<std::uint64_t> borders = {RECORD_AREA_SIZE - AUX_AREA_START,
                                        RECORD_AREA_SIZE - TUNING_AREA_START, RECORD_AREA_SIZE};

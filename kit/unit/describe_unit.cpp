@@ -21,7 +21,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Fills in what can't be told from one entry: which paths a unit would have and this one has not.
+/// Adds the paths that every unit has and this one lacks.
 void findAbsent(const std::vector<std::string>& there, UnitDescription& unit) {
     for (const auto& [path, kind] : layoutOf(unit)) {
         const bool isThere = std::binary_search(there.begin(), there.end(), path);
@@ -94,7 +94,7 @@ private:
     fs::path root_;
     UnitDescription unit_;
     std::vector<std::string> there_;   ///< all paths
-    std::vector<std::string> pending_; ///< folders that are still to be looked into
+    std::vector<std::string> pending_; ///< folders still to be read
 };
 
 } // namespace

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Changing single values of a unit that is there.
+// Changing single values of an existing unit.
 #pragma once
 
 #include <filesystem>
@@ -23,9 +23,9 @@ namespace orvane::kit {
 ///
 /// Numbers are decimal or, after "0x", hexadecimal. The bits of a block that no field reads stay as
 /// they are. All assignments are checked before the first one is carried out. Throws KitError, the
-/// assignment in front, for a key or value that is wrong, a value that two assignments set, and an
-/// image or disk that is missing, not a regular file or too short; for a faulty tuning file as
-/// parseTuningText does.
+/// assignment in front, for a wrong key or value, a value that two assignments set, and an image or
+/// disk that is missing, not a regular file or too short; for a faulty tuning file like
+/// parseTuningText.
 void setValues(const std::filesystem::path& root, const std::vector<std::string>& assignments);
 
 } // namespace orvane::kit

@@ -14,7 +14,7 @@ namespace orvane::kit {
 struct Assignment {
     std::string text; ///< as it was given
     ValueKey key;
-    Bytes bytes; ///< for the place of `key`: as long as that, zero in the bits of other values
+    Bytes bytes; ///< as long as the place of `key`, zero in the bits of other values
 };
 
 /// Reads an assignment, and the tuning file that it may name. Throws KitError as setValues does.

@@ -89,7 +89,7 @@ void makeSparse(const SparseFile& content, const fs::path& file) {
     }
 }
 
-/// One entry, where nothing is yet and the folder above is there.
+/// Makes one entry. Requires that the path is free and the folder above exists.
 void makeEntry(const UnitDescription& unit, const std::string& path, EntryKind kind,
                const fs::path& root) {
     const fs::path place = root / fs::path(path).relative_path();

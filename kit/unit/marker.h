@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The mark of a folder that the kit has made: a file at its top. Whoever changes or removes a unit
-// asks for it first, so that no other folder, and not the host's own root, is taken for a unit.
+// The mark of a folder that the kit has made: a file at its top. Whatever changes or removes a unit
+// requires it, so that no other folder, such as the host's own root, is taken for a unit.
 #pragma once
 
 #include <filesystem>
@@ -14,11 +14,11 @@ constexpr char MARKER_TEXT[] = "made by orvane-unit, layout 1\n";
 /// Marks the folder `root`. Throws KitError.
 void markUnit(const std::filesystem::path& root);
 
-/// Whether `root` is a folder with the mark: a regular file, no link, of exactly that text.
+/// Whether `root` is a folder with the mark: a regular file, not a link, with exactly that text.
 bool isKitUnit(const std::filesystem::path& root);
 
-/// Throws KitError when `root` is no folder, has no mark, or is "/" itself by whatever name, marked
-/// or not.
+/// Throws KitError when `root` is not a folder, has no mark, or is "/" itself by whatever name,
+/// marked or not.
 void requireKitUnit(const std::filesystem::path& root);
 
 } // namespace orvane::kit

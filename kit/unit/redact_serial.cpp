@@ -16,8 +16,8 @@ namespace orvane::kit {
 
 namespace {
 
-/// A shorter serial may stand anywhere by chance. In bytes.
-constexpr std::size_t LEAST_TOLD = 4;
+/// A shorter serial may occur anywhere by chance. In bytes.
+constexpr std::size_t SHORTEST_SOUGHT = 4;
 
 void redact(const Bytes& serial, Bytes& bytes) {
     for (std::size_t at = bytes.find(serial); at != Bytes::npos;
@@ -40,7 +40,7 @@ void redactSerial(UnitInputs& inputs) {
     const Bytes serial = slot.substr(0, slot.find('\0'));
     disk.replace(begin, size, size, '\0');
     disk.replace(begin, serial.size(), serial.size(), 'X');
-    if (serial.size() < LEAST_TOLD) {
+    if (serial.size() < SHORTEST_SOUGHT) {
         return;
     }
     redact(serial, disk);
@@ -49,7 +49,7 @@ void redactSerial(UnitInputs& inputs) {
     }
     for (auto& [path, content] : inputs.unit.sparseFiles) {
         for (auto& [at, bytes] : content.bytes) {
-            redact(serial, bytes); // holds no zero, so that no serial goes beyond a run
+            redact(serial, bytes); // a serial has no zero, so it lies within one run
         }
     }
 }

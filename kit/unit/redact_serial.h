@@ -5,9 +5,9 @@
 
 namespace orvane::kit {
 
-/// Makes the serial text in record slot 9 as many "X", and zero what stands in the slot behind its
-/// first zero byte. A serial of at least four bytes becomes "X" wherever else it stands on the disk
-/// or in a file. Does nothing where the disk is too short for the slot.
+/// Replaces the serial in record slot 9 by as many "X", and what follows it in the slot by zeros. A
+/// serial of at least four bytes is replaced wherever else it occurs on the disk or in a file, too.
+/// Does nothing if the disk is too short for the slot.
 void redactSerial(UnitInputs& inputs);
 
 } // namespace orvane::kit

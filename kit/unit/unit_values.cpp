@@ -32,7 +32,7 @@ namespace {
 
 constexpr char MISSING[] = "(missing)";
 
-/// Longer values are told by their size and checksum.
+/// Longer values are shown as their size and checksum.
 constexpr std::size_t LONGEST_SHOWN = 64;
 
 std::string crcText(const std::string& bytes) {
@@ -102,7 +102,7 @@ void addImage(UnitValues& values, const ImageDescription& image) {
 void addDisk(UnitValues& values, const DiskDescription& disk) {
     for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
         const auto content = disk.slots.find(slot);
-        if (slotsWithin(slot).empty()) { // or its bytes have keys already
+        if (slotsWithin(slot).empty()) { // else its bytes have keys already
             values.emplace_back(slotKey(slot),
                                 content == disk.slots.end() ? "" : textOrHex(content->second));
         }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The values of a unit by their keys: image, disk, and all else that a run can meet.
+// The values of a unit by their keys: image, disk, and everything else that a run can meet.
 #pragma once
 
 #include "kit/description/unit_description.h"
@@ -12,12 +12,12 @@
 
 namespace orvane::kit {
 
-/// Key and value, in the order of a description. A value that is not there has no entry.
+/// Keys and values, in the order of a description. A missing value has no entry.
 using UnitValues = std::vector<std::pair<ValueKey, std::string>>;
 
 UnitValues unitValues(const UnitDescription& unit);
 
-/// A value that differs between two units. "(missing)" stands for one that is not there.
+/// A value that differs between two units. "(missing)" stands for a missing one.
 struct ValueChange {
     ValueKey key;
     std::string before;
