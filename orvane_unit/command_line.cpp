@@ -93,7 +93,7 @@ public:
         : Command(app, "new", "Make a unit", "orvane-unit new bench --from unit.toml") {
         addNeeded("ROOT", root_, NEW_ROOT);
         addOption("--from", description_,
-                  "The unit's description in TOML; the built-in sample unit without it");
+                  "The unit's description in TOML; by default the built-in sample unit");
     }
 
     ExitStatus run() const override {
@@ -181,7 +181,7 @@ constexpr char AIRPLAY_FLAG[] = "-a";
 constexpr char IAP_FLAG[] = "-i";
 
 void addLetters(CLI::App& parser) {
-    parser.add_flag(AIRPLAY_FLAG, "orvane's option -a; both, first -a, without either");
+    parser.add_flag(AIRPLAY_FLAG, "orvane's option -a; by default -a -i");
     parser.add_flag(IAP_FLAG, "orvane's option -i");
 }
 
@@ -272,7 +272,7 @@ class DiffCommand : public Command {
 public:
     explicit DiffCommand(CLI::App& app)
         : Command(app, "diff",
-                  "Print the values that differ between two units, and the lines they move",
+                  "Print the values that differ between two units, and the lines they change",
                   "orvane-unit diff bench field") {
         addNeeded("A", first_, "A unit's folder, or /");
         addNeeded("B", second_, "Another unit's folder, or /");
@@ -306,11 +306,11 @@ class ImpactCommand : public Command {
 public:
     explicit ImpactCommand(CLI::App& app)
         : Command(app, "impact",
-                  "Change every input in a copy of a unit, and say which output lines move",
+                  "Change every input in a copy of a unit, and say which output lines change",
                   "orvane-unit impact bench param. slot.9") {
         addNeeded("ROOT", root_, ANY_ROOT);
         parser().add_option("KEY", prefixes_,
-                            "Only the inputs whose key begins so; all without any");
+                            "Only the inputs whose key begins with this; by default all");
         parser().add_flag("--json", isJson_, JSON);
     }
 
@@ -395,7 +395,8 @@ std::vector<std::unique_ptr<Command>> addCommands(CLI::App& app) {
     return commands;
 }
 
-/// The first word must be a command or an option; the parser would only say that one is missing.
+/// The first word must be a command or an option. The parser alone would only say that one is
+/// missing.
 void checkCommand(const CLI::App& app, int argc, const char* const* argv) {
     const std::string word = argc > 1 ? argv[1] : "";
     if (word.empty() || word[0] == '-') {
@@ -409,11 +410,11 @@ void checkCommand(const CLI::App& app, int argc, const char* const* argv) {
         }
         names += (names.empty() ? "" : ", ") + command->get_name();
     }
-    throw kit::KitError("there is no command \"" + word + "\": it takes " + names);
+    throw kit::KitError("there is no command \"" + word + "\", only " + names);
 }
 
 int chooseAndRun(int argc, const char* const* argv) {
-    CLI::App app("Makes simulated units - folders that stand for a unit's \"/\" -, explains what "
+    CLI::App app("Makes simulated units (folders that stand for a unit's \"/\"), explains what "
                  "orvane does in them and on real ones, and runs the unmodified orvane.",
                  "orvane-unit");
     app.require_subcommand(1);

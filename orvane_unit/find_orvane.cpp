@@ -28,7 +28,7 @@ fs::path findOrvane(const std::string& wanted) {
             return fs::path(folder) / NAME;
         }
     }
-    throw kit::KitError("orvane is neither beside orvane-unit nor on PATH: name it by --orvane");
+    throw kit::KitError("orvane is neither beside orvane-unit nor on PATH: name it with --orvane");
 }
 
 } // namespace orvane::desk

@@ -6,7 +6,7 @@
 
 namespace orvane::desk {
 
-/// The binary to run: `wanted`, or when that is empty the orvane beside this program, else the
+/// The binary to run: `wanted`; if that is empty, the orvane next to this program, else the
 /// first on PATH. Throws kit::KitError when there is none.
 std::filesystem::path findOrvane(const std::string& wanted);
 

@@ -60,7 +60,7 @@ struct Input {
 };
 
 /// Other values than `original`: each bit flipped, the small codes, the ends of its range and of
-/// the tables. For an element of a tuning field, which can only be a code or a number, fewer do.
+/// the tables. An element of a tuning field, which can only be a code or a number, needs fewer.
 std::vector<std::string> otherValues(const std::string& original, bool isElement = false) {
     const std::vector<std::uint32_t> codes =
         isElement ? std::vector<std::uint32_t>{0, 1, 2, 3, 0xFFFF}
@@ -136,7 +136,7 @@ std::optional<Input> inputOf(const ValueKey& key, const CopiedFile& image, const
                      : otherValues(original)};
 }
 
-/// Those of `keys` that begin with one of `prefixes`, or all where there are none.
+/// The `keys` that begin with one of `prefixes`, or all if there are none.
 std::vector<ValueKey> withPrefixes(std::vector<ValueKey> keys,
                                    const std::vector<std::string>& prefixes) {
     const auto isWanted = [&prefixes](const ValueKey& key) {

@@ -21,12 +21,12 @@ struct Impact {
     std::set<std::string> lines; ///< "/tmp/airplay.conf:5"; "/tmp/airplay.conf" for a whole output
 };
 
-/// Calls for how many of how many inputs are done.
+/// Called with the number of inputs that are done, and of all.
 using Progress = std::function<void(std::size_t done, std::size_t all)>;
 
 /// Tries every parameter, slot byte and tuning field of the unit at `root`, which is only read; of
-/// these, where there are `prefixes`, only those whose key as a text begins with one of them.
-/// Throws kit::KitError when the unit can't be read, no copy can be made, or no key begins so.
+/// these, if there are `prefixes`, only those whose key as a text begins with one of them. Throws
+/// kit::KitError when the unit can't be read, no copy can be made, or no key has such a prefix.
 std::vector<Impact> findImpacts(const std::filesystem::path& root,
                                 const std::vector<std::string>& prefixes, const Progress& progress);
 

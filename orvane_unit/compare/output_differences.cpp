@@ -36,7 +36,7 @@ std::vector<ValueKey> keysByLine(const Output& output) {
     return keys;
 }
 
-/// The keys of the lines that are left out for want of their values.
+/// The keys of the lines that are left out because they have no value.
 std::vector<ValueKey> keysOfMissingLines(const Output& output) {
     std::vector<ValueKey> keys;
     for (const Line& line : output.lines) {
@@ -111,7 +111,7 @@ public:
         }
     }
 
-    /// The index of the change that is about `key`; none when nothing of that has changed.
+    /// The index of the change that is about `key`; none if nothing like that has changed.
     std::optional<std::size_t> find(const ValueKey& key) const {
         const auto found = std::find_if(consequences_.begin(), consequences_.end(),
                                         [&key](const Consequence& consequence) {
@@ -132,8 +132,8 @@ public:
         return std::nullopt;
     }
 
-    /// Gives `output`, and `line` of it unless that is null, to the change at `index`; to the entry
-    /// with the empty key where there is none.
+    /// Assigns `output`, and its `line` unless that is null, to the change at `index`; without an
+    /// index, to the entry with the empty key.
     void assign(std::optional<std::size_t> index, const OutputDifference& output,
                 const DifferingLine* line) {
         if (!index) {
@@ -182,7 +182,7 @@ std::vector<Consequence> consequences(const std::vector<kit::ValueChange>& chang
         for (const DifferingLine& line : output.lines) {
             const std::optional<std::size_t> own = distribution.find(line.key);
             if (own && !whole) {
-                whole = own; // for the lines beside it, such as the comment above a value
+                whole = own; // for the lines around it, such as the comment above a value
             }
             distribution.assign(own ? own : whole, output, &line);
         }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// In what two explanations differ, and which values that comes from.
+// How two explanations differ, and which values cause it.
 #pragma once
 
 #include "kit/description/value_key.h"
@@ -39,7 +39,7 @@ struct Consequence {
 };
 
 /// Assigns every differing line to the changed value that it comes from; where its own value has
-/// not changed, to one that decided its output's outcome. What no value accounts for goes to a last
+/// not changed, to one that decided its output's outcome. What no value explains goes to a last
 /// entry with an empty key.
 std::vector<Consequence> consequences(const std::vector<kit::ValueChange>& changes,
                                       const std::vector<OutputDifference>& differences);

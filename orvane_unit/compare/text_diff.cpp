@@ -38,7 +38,7 @@ std::vector<DiffLine> editScript(const std::string& before, const std::string& a
             lines.push_back({DiffLine::Kind::common, text, ++oldNumber, ++newNumber});
         }
     }
-    // Of lines that take each other's place, the old ones come first.
+    // Where lines replace others, the old ones come first.
     for (auto begin = lines.begin(); begin != lines.end();) {
         const auto isCommon = [](const DiffLine& line) {
             return line.kind == DiffLine::Kind::common;

@@ -19,7 +19,7 @@ struct DiffLine {
 
 /// Changed lines and some common ones around them.
 struct Hunk {
-    std::size_t before = 0; ///< number of its first line in either text; without one, of that above
+    std::size_t before = 0; ///< its first line in each text; without one, the line above
     std::size_t beforeCount = 0;
     std::size_t after = 0;
     std::size_t afterCount = 0;

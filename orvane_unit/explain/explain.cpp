@@ -135,8 +135,8 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
     }
 }
 
-/// The writers that a command line asks for, in their order, by the product's own reading of it.
-/// What that says to standard error is left out.
+/// The writers that a command line asks for, in their order, as the product's own parser reads it.
+/// What the parser prints on standard error is dropped.
 std::vector<Writer> writersOf(const std::vector<std::string>& arguments) {
     std::vector<std::string> words = {"orvane"};
     words.insert(words.end(), arguments.begin(), arguments.end());

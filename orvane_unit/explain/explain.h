@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What a run would leave in a unit, found out without writing: the values, the lines and the order
-// of the files are made by the tool's own functions; only the opening of its outputs is replaced.
+// What a run would leave in a unit, found without writing: the tool's own functions make the
+// values, the lines and the order of the files; only the opening of outputs, templates and stock
+// files is replaced.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What a run of orvane would leave, and why: the answer of explain.h, without any input in it.
+// What a run of orvane would leave, and why: the result of explain.h. It holds no inputs.
 #pragma once
 
 #include "kit/description/value_key.h"
@@ -19,8 +19,8 @@ struct Origin {
     Place place;
 };
 
-/// A piece of an output: one line with its line end; of a value that holds line ends, or of a
-/// template, all its lines. The pieces of an output, one behind the other, are its content.
+/// A piece of an output: one line with its line end, or all lines of a template or of a value that
+/// has line ends. The pieces of an output, in order, are its content.
 struct Line {
     std::string text; ///< empty for a line that was left out
     Origin origin;
@@ -30,8 +30,8 @@ enum class Outcome {
     generated,
     stock,    ///< a copy of the stock file
     empty,    ///< opened, and nothing was written
-    kept,     ///< could not be opened: what was there, if anything, is there still
-    notAsked, ///< nothing asked for it: what was there is there still
+    kept,     ///< could not be opened: what was there, if anything, stays
+    notAsked, ///< not asked for: what was there, if anything, stays
 };
 
 /// What is at a path.
@@ -47,13 +47,13 @@ struct Output {
     std::string contentAfter;               ///< of a file, after the whole run
 };
 
-/// The outputs in the order in which the run comes to them: one entry for each time.
+/// The outputs in the order in which the run writes them; one that it writes twice has two entries.
 using Explanation = std::vector<Output>;
 
 /// The tool's own text.
 Origin fixedText();
 
-/// Whether neither a fallback nor a default stands in anywhere.
+/// Whether no fallback or default was used.
 bool isIntended(const std::vector<Reason>& reasons);
 bool isIntended(const Output& output);
 bool isIntended(const Explanation& explanation);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Where a value of an output stands in the unit, or what was found in its place.
+// Where a value of an output lies in the unit, or what was found in its place.
 #pragma once
 
 #include <cstddef>
@@ -14,7 +14,7 @@ namespace orvane::desk {
 /// Nothing to add to the value's key.
 struct NoPlace {};
 
-/// The source is missing, and a default stands in for the value.
+/// The source is missing, and a default replaces the value.
 struct DefaultStandsIn {};
 
 struct ImagePlace {

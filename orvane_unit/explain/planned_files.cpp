@@ -30,7 +30,7 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
     if (written != written_.end()) {
         return written->second;
     }
-    // Anything else is left alone: looking into a pipe would take from it, or wait for ever.
+    // Anything else is not read: that would take bytes from a pipe, or wait for ever.
     const bool isFolder = place->kind == S_IFDIR;
     if ((!isFolder && place->kind != S_IFREG) || ::access(place->path.c_str(), R_OK) != 0) {
         return std::nullopt;

@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The files of a unit as a run would change them, while nothing is written. An output can be a link
-// to another output, a template or a stock file: so what a run writes counts for what it reads
-// later.
+// The files of a unit as a run would change them, without writing. An output can be a link to
+// another output, a template or a stock file, so later reads see what the run has written.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -22,10 +21,10 @@ public:
     /// What an input stream gets: nothing when `path` can't be opened, an empty text for a folder.
     std::optional<std::string> read(const std::string& path) const;
 
-    /// Adds to what was opened for writing.
+    /// Appends to what was opened for writing.
     void write(const std::string& path, const std::string& text);
 
-    /// Tells what is at `path` now, links followed.
+    /// What is at `path` now, links followed.
     PathKind look(const std::string& path, std::string& content) const;
 
 private:

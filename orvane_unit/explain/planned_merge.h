@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A merge of an accessory file on planned files. The product's own functions do it, on streams that
-// hold what the opened files would give and take.
+// stand for the opened files.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -20,11 +20,11 @@ namespace orvane::desk {
 /// A value that the generated lines carry.
 template <class Values>
 struct MergedValue {
-    std::function<void(Values&)> change; ///< makes it another one, as changedBytes requires
+    std::function<void(Values&)> change; ///< changes the value as changedBytes requires
     Origin origin;
 };
 
-/// The streams of a TemplateMerge, and what stands behind them.
+/// The streams of a TemplateMerge, and their files.
 class PlannedMerge {
 public:
     std::ostringstream output;
@@ -34,8 +34,7 @@ public:
     /// Opens the output, which truncates it, then the template.
     void open(PlannedFiles& files, const AccessoryFile& file);
 
-    /// Has `generate` decide, and do it. `values` are what it renders, `sources` where they come
-    /// from.
+    /// Lets `generate` decide and write. It renders `values`, which come from `sources`.
     template <class Values, class Generate>
     Output finish(const Values& values, const std::vector<MergedValue<Values>>& sources,
                   const Generate& generate) {

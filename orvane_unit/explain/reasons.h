@@ -54,7 +54,7 @@ struct ReasonInfo {
     Reason reason;
     const char* code;     ///< stable, for programs
     std::string sentence; ///< for people, without a full stop
-    bool isIntended;      ///< no fallback or default stands in
+    bool isIntended;      ///< no fallback or default is used
 };
 
 /// All reasons, in the order of the enumeration.

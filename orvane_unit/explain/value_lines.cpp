@@ -89,8 +89,7 @@ std::vector<Line> cutIntoLines(const std::string& text, std::vector<ValueRegion>
 }
 
 std::string otherText(const std::string& text) {
-    // A value may end before the last byte of its text, so a byte that is nowhere in it comes
-    // first.
+    // A value may end before the last byte of its text, so a letter that is not in it is preferred.
     for (char letter = 'a'; letter <= 'z'; ++letter) {
         if (text.find(letter) == std::string::npos) {
             return {letter};

@@ -51,7 +51,7 @@ std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd) {
     struct stat state {};
     const bool isFolder = ::stat(BOOT_DISK, &state) == 0 && S_ISDIR(state.st_mode);
     if (!disk.seekFromEnd(bytesBeforeEnd)) {
-        // Whether a folder can be sought at all is the file system's business.
+        // Whether a seek in a folder works depends on the file system.
         return isFolder ? Reason::diskUnreadable : Reason::diskTooShort;
     }
     char byte = 0;
@@ -76,7 +76,7 @@ Image readImage() {
     if (opened == STORE_OPENED) {
         image.bytes.assign(reinterpret_cast<const char*>(store.data), store.length);
     } else {
-        // What opens and can't be measured, such as a folder, is no memory object either.
+        // What opens and can't be measured, such as a folder, is not a memory object either.
         const bool isThere = opened == STORE_NOT_MAPPED || store.descriptor != -1;
         image.reason = isThere ? Reason::imageNotMappable : Reason::imageMissing;
     }

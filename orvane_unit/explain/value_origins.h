@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Where the values of the outputs come from: for each, the value's key, the reason why it is what
-// it is, and its raw form. All read the unit that the process has as its root.
+// Where the values of the outputs come from: for each, its key, reason and raw form. All functions
+// read the unit that the process has as its root.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -15,7 +15,7 @@
 
 namespace orvane::desk {
 
-/// Why the disk can't be read at a place; nothing when it can.
+/// Why the disk can't be read at a place; nothing if it can.
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
 
 /// Size of the disk in bytes, also of a device; 0 when it can't be opened.

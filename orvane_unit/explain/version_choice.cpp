@@ -12,8 +12,7 @@ namespace orvane::desk {
 
 namespace {
 
-/// The number of the line, from 1, that gives `key` the value that it has in the end; 0 when none
-/// does.
+/// The number, from 1, of the line that gives `key` its final value; 0 when none does.
 std::size_t lineOf(const std::string& path, const std::string& key) {
     std::ifstream file(path);
     Inf_Data record;
@@ -41,7 +40,7 @@ bool fitsOneByte(const std::string& component) {
     return number >= 0 && number <= 0xFF;
 }
 
-/// Whether a component that is put behind `version` would count.
+/// Whether a component appended to `version` would count.
 bool isIncomplete(const std::string& version) {
     return formatVersion(version + COMPONENT_SEPARATOR + "1") !=
            formatVersion(version + COMPONENT_SEPARATOR + "2");

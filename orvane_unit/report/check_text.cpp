@@ -40,7 +40,7 @@ void printCheck(std::ostream& out, const CheckReport& report) {
         printCase(out, result, width);
     }
     out << kit::counted(report.cases.size(), "unit") << ", " << failed << " not as expected"
-        << (report.isUpdate ? "; expectations written anew" : "") << '\n'
+        << (report.isUpdate ? "; expectations updated" : "") << '\n'
         << "reasons reached: " << REASON_COUNT - report.unreached.size() << " of " << REASON_COUNT;
     const char* separator = "; not reached: ";
     for (const char* code : report.unreached) {

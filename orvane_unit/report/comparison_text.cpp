@@ -71,7 +71,7 @@ std::vector<std::string> inRanges(const std::vector<ValueKey>& keys) {
     return ranges;
 }
 
-/// The keys, with that of a block in place of those of its fields where they are all there.
+/// The keys, with that of a whole block in place of those of all its fields.
 std::vector<ValueKey> withWholeBlocks(const std::vector<ValueKey>& keys) {
     std::map<std::uint64_t, std::size_t> fieldsOfBlocks;
     for (const ValueKey& key : keys) {
@@ -98,14 +98,14 @@ void printConsequences(std::ostream& out, const std::vector<Consequence>& conseq
     for (const Consequence& consequence : consequences) {
         const kit::ValueChange& change = consequence.change;
         if (change.key.isEmpty()) {
-            out << "of no value that differs:\n";
+            out << "explained by no value:\n";
         } else {
             out << kit::printable(keyText(change.key)) << ": "
                 << painted(Colour::removed, valueText(change.before)) << " -> "
                 << painted(Colour::added, valueText(change.after)) << '\n';
         }
         if (consequence.outputs.empty()) {
-            out << "  " << painted(Colour::faint, "moves no output") << '\n';
+            out << "  " << painted(Colour::faint, "changes no output") << '\n';
         }
         for (const OutputDifference& output : consequence.outputs) {
             printDifference(out, output);
@@ -121,12 +121,14 @@ void printImpacts(std::ostream& out, const std::vector<Impact>& impacts) {
             continue;
         }
         out << painted(Colour::place, keyText(impact.key)) << ": " << impact.changing << " of "
-            << kit::counted(impact.tried, "value") << " moved\n";
+            << kit::counted(impact.tried, "value")
+            << (impact.changing == 1 ? " changes" : " change") << " the output\n";
         for (const std::string& line : impact.lines) {
             out << "  " << line << '\n';
         }
     }
-    out << kit::counted(inert.size(), "input") << " moved nothing:\n";
+    out << kit::counted(inert.size(), "input") << (inert.size() == 1 ? " changes" : " change")
+        << " nothing:\n";
     for (const std::string& range : inRanges(withWholeBlocks(inert))) {
         out << "  " << range << '\n';
     }

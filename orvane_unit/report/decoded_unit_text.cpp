@@ -63,7 +63,7 @@ void printPart(std::ostream& out, const DecodedImage& image) {
     }
 }
 
-/// Bytes as a text, without the zeros at their end; "-" where they can't be read.
+/// Bytes as text, without the zeros at their end; "-" where they can't be read.
 std::string contentText(const std::optional<std::string>& bytes) {
     if (!bytes) {
         return "-";
@@ -99,8 +99,7 @@ void printPart(std::ostream& out, const DecodedRecords& records) {
     for (const DecodedSlot& slot : records.slots) {
         printCells(out, SLOT_COLUMNS, slot.number, slot.offset, slot.size);
         const std::string repeated = repeatedSlots(slot.number);
-        out << "  " << (repeated.empty() ? contentText(slot.bytes) : repeated + " once more")
-            << '\n';
+        out << "  " << (repeated.empty() ? contentText(slot.bytes) : "repeats " + repeated) << '\n';
     }
     out << "auxiliary area: " << contentText(records.aux) << '\n'
         << "CRC over " << repeatedSlots(CRC_RECORD_SLOT) << ": " << hexNumber(records.crc, 8)
@@ -159,7 +158,7 @@ void printPart(std::ostream& out, const DecodedVersions& versions) {
         } else if (file.isApplication) {
             out << "not chosen: an application, but not the first one";
         } else {
-            out << "not chosen: its type has no \"" << APPLICATION_TYPE << "\" in it";
+            out << "not chosen: its type does not contain \"" << APPLICATION_TYPE << '"';
         }
         out << '\n';
         for (const auto& [key, value] : file.record) {

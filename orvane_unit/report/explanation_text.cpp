@@ -22,7 +22,7 @@ namespace orvane::desk {
 
 namespace {
 
-/// Where the column of origins begins, at most.
+/// The greatest width of the column before the origins.
 constexpr std::size_t WIDEST_LINE = 44;
 
 Reason firstReason(const Line& line) {
@@ -47,8 +47,8 @@ std::string lineText(const Line& line) {
     return kit::printable(line.text.substr(0, line.text.size() - 1)); // without its line end
 }
 
-/// What is printed beside a line: where its value stands, and the code of what is not as intended.
-/// What a code means is said once; `said` keeps which were.
+/// What is printed next to a line: the place of its value, and the codes of what is not as
+/// intended. A code is explained only once; `said` holds those that were.
 std::string originText(const Origin& origin, std::set<Reason>& said) {
     std::string text = placeText(origin);
     for (const Reason reason : origin.reasons) {
@@ -65,19 +65,19 @@ bool saysTheSame(const Origin& one, const Origin& other) {
     return one.reasons == other.reasons && placeText(one) == placeText(other);
 }
 
-/// A line of the report: the text of one or more lines of the output, and what is said of them.
+/// A line of the report: the text of one or more lines of the output, and their origin.
 struct Row {
     std::string text;
     std::string origin;
     bool isIntended = true;
 };
 
-/// The fields of a tuning block that are as they should be: 44 lines that all say the same.
+/// One row for the intended fields of a tuning block: up to 44 lines that all say the same.
 Row tuningRow(const kit::ValueKey& key, std::size_t count) {
     return {"... " + kit::counted(count, "value"), holderText(key) + " of the boot disk", true};
 }
 
-/// The rows of all lines, or of those that have more to say than most.
+/// The rows of all lines, or without orvane's own text and with one for all intended tuning fields.
 std::vector<Row> rowsOf(const std::vector<Line>& lines, bool showsAll) {
     const auto isField = [](const Line& line) {
         return firstReason(line) == Reason::fromTuningBlock;
@@ -95,7 +95,7 @@ std::vector<Row> rowsOf(const std::vector<Line>& lines, bool showsAll) {
             continue;
         }
         const bool isGood = isIntended(line.origin.reasons);
-        // Lines that say the same of themselves, such as a block of zeros, need saying it once.
+        // The origin of lines that share one, such as those of a block of zeros, is printed once.
         const bool isRepeated = !isGood && before != nullptr && saysTheSame(*before, line.origin);
         rows.push_back({lineText(line), isRepeated ? "\"" : originText(line.origin, said), isGood});
         before = &line.origin;

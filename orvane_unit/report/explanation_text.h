@@ -9,8 +9,8 @@
 
 namespace orvane::desk {
 
-/// Prints each output with its outcome and reasons, and below it its lines with theirs. The tool's
-/// own text is left out unless `showsAll`.
+/// Prints each output with its outcome and reasons, and below it its lines with their origins. The
+/// tool's own text is left out unless `showsAll`.
 void printExplanation(std::ostream& out, const Explanation& explanation, bool showsAll);
 
 } // namespace orvane::desk

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What the reports call the values of enumerations.
+// The names of enumeration values in the reports.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -8,7 +8,7 @@
 
 namespace orvane::desk {
 
-/// The published names, the same in texts and in JSON: programs read them.
+/// The published names, the same in text and JSON: programs read them.
 const char* nameOf(Outcome outcome);
 const char* nameOf(CrcVerdict verdict);
 const char* nameOf(PathKind kind);

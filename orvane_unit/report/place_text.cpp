@@ -19,7 +19,7 @@ std::string bytesText(const char* where, std::uint64_t offset, const std::string
            std::to_string(offset) + ": " + kit::hexText(bytes);
 }
 
-/// A text for each kind of place, behind that of the value's holder.
+/// The text of each kind of place, after that of the value's holder.
 struct PlaceText {
     const ValueKey& key;
 

@@ -11,8 +11,8 @@ namespace orvane::desk {
 /// What holds the value of `key`: "parameter 139", "record slot 9", "block 3"; empty for others.
 std::string holderText(const kit::ValueKey& key);
 
-/// Where a value stands, with its raw bytes, or what was found there instead; empty for the tool's
-/// own text. Bytes of the unit stand in it as they are.
+/// Where a value lies, with its raw bytes, or what was found there instead; empty for the tool's
+/// own text. Bytes of the unit are not escaped.
 std::string placeText(const Origin& origin);
 
 } // namespace orvane::desk

@@ -13,7 +13,7 @@ namespace orvane::desk {
 /// A column of a table: titles and values end at its right edge.
 struct Column {
     const char* title;
-    int width; ///< with the blanks that part it from the column before
+    int width; ///< with the blanks between it and the column before
 };
 
 template <std::size_t COUNT>
@@ -31,7 +31,7 @@ void printCells(std::ostream& out, const Column (&columns)[COUNT], const Values&
     ((out << std::setw(columns[column++].width) << values), ...);
 }
 
-/// `text` with blanks behind it, so that it takes `width` bytes at least.
+/// `text`, padded with blanks to at least `width` bytes.
 std::string padded(const std::string& text, std::size_t width);
 
 } // namespace orvane::desk

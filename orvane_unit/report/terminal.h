@@ -14,7 +14,7 @@ enum class Colour { good = 32, added = good, bad = 31, removed = bad, place = 36
 /// Whether standard output is a terminal and NO_COLOR is unset or empty.
 bool hasColours();
 
-/// `text` in the colour, or as it is where there are no colours.
+/// `text` in the colour, or as it is if there are no colours.
 std::string painted(Colour colour, const std::string& text);
 
 } // namespace orvane::desk

@@ -7,8 +7,8 @@
 
 namespace orvane::desk {
 
-/// Prints a unified diff of the file `name`; nothing on a side where there is no file. Prints
-/// nothing when both sides are the same. Anything that is not text is escaped.
+/// Prints a unified diff of the file `name`; a side is nothing if it has no file. Prints nothing
+/// when both sides are the same. Anything that is not text is escaped.
 void printUnifiedDiff(std::ostream& out, const std::string& name,
                       const std::optional<std::string>& before,
                       const std::optional<std::string>& after);

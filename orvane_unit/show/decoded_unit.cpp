@@ -53,7 +53,7 @@ std::string meaningOf(std::uint16_t number) {
     case BRAND_PARAM:
         return "brand " + textBy(getBrandName);
     case FUEL_TYPE_PARAM:
-        return "fuel type " + textBy(getFuelType) + ", which is written nowhere";
+        return "fuel type " + textBy(getFuelType) + ", which is not written";
     case AUDIO_PROFILE_PARAM:
         return profileMeaning(readAudioProfile());
     case MODEL_PARAM:

@@ -37,7 +37,7 @@ struct DecodedSlot {
     std::optional<std::string> bytes;
 };
 
-/// What can be said of the CRC. The disk holds none to compare it with.
+/// What is known of the CRC. The disk stores none to compare it with.
 enum class CrcVerdict {
     computed,
     blank,      ///< the records are all zero

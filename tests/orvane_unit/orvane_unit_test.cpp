@@ -63,7 +63,7 @@ TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
 }
 
 TEST(OrvaneUnitTest, WrongUseIsRefused) {
-    expectRefused({"wash"}, "there is no command \"wash\": it takes new, describe, set, show, "
+    expectRefused({"wash"}, "there is no command \"wash\", only new, describe, set, show, "
                             "explain, run, diff, impact, capture, check");
     expectRefused({"run", "a", "-a"},
                   "The following argument was not expected: -a; orvane's own options follow --");
@@ -133,7 +133,7 @@ TEST(OrvaneUnitTest, DiffSaysNoForADifference) {
     const DescribedUnit second([](kit::UnitDescription& unit) { unit.image.params[50] = 1; });
     expectRan(start({"diff", first.root(), first.root()}), 0, "");
     expectRan(start({"diff", first.root(), second.root()}), 1,
-              "param.50: 0 -> 1\n  moves no output\n");
+              "param.50: 0 -> 1\n  changes no output\n");
 }
 
 TEST(OrvaneUnitTest, RunShowsADiffOrOnlyNames) {
@@ -190,7 +190,7 @@ TEST(OrvaneUnitTest, ToolIsFoundBesideTheProgramOrOnPath) {
         return runOnHost(command);
     };
     expectRan(startAlone(":" + alone.parent_path().string()), 2, "",
-              "orvane-unit: orvane is neither beside orvane-unit nor on PATH: name it by "
+              "orvane-unit: orvane is neither beside orvane-unit nor on PATH: name it with "
               "--orvane\n");
     EXPECT_EQ(startAlone(alone.parent_path().string() + ":" + tools.string()).exitStatus, 0);
     EXPECT_TRUE(exists(described.root() / "tmp/iap2.cfg"));

@@ -35,7 +35,7 @@ TEST(CheckTextTest, UnreachedReasonsAreNamed) {
     report.isUpdate = true;
     EXPECT_EQ(printed(report),
               "one  ok\n"
-              "1 unit, 0 not as expected; expectations written anew\n"
+              "1 unit, 0 not as expected; expectations updated\n"
               "reasons reached: 31 of 33; not reached: disk-missing, serial-blank\n");
 }
 

@@ -39,8 +39,8 @@ TEST(ComparisonTextTest, ConsequencesFollowTheirValues) {
               "slot.9: (empty) -> B\n"
               "  /tmp/x\n    -a\n    +\\xff\n"
               "  /tmp/y: generated -> stock\n"
-              "param.1: 0 -> 1\n  moves no output\n"
-              "of no value that differs:\n  /tmp/z: kept -> empty\n");
+              "param.1: 0 -> 1\n  changes no output\n"
+              "explained by no value:\n  /tmp/z: kept -> empty\n");
 }
 
 TEST(ComparisonTextTest, InputsThatChangeNothingAreGroupedInRanges) {
@@ -53,9 +53,9 @@ TEST(ComparisonTextTest, InputsThatChangeNothingAreGroupedInRanges) {
                                           {kit::slotByteKey(1, 0), 3, 0, {}},
                                           {kit::slotByteKey(1, 1), 3, 0, {}},
                                           {kit::tuningFieldKey(1, "qwaA"), 3, 0, {}}}),
-              "param.3: 12 of 13 values moved\n  /tmp/x:1\n  /tmp/y\n"
-              "param.4: 1 of 1 value moved\n  /tmp/x:2\n"
-              "7 inputs moved nothing:\n"
+              "param.3: 12 of 13 values change the output\n  /tmp/x:1\n  /tmp/y\n"
+              "param.4: 1 of 1 value changes the output\n  /tmp/x:2\n"
+              "7 inputs change nothing:\n"
               "  param.1-2\n  param.5\n  slot.0.0\n  slot.1.0-1\n  tuning.1.qwaA\n");
 }
 
@@ -68,7 +68,7 @@ TEST(ComparisonTextTest, WholeTuningBlocksAreOneWord) {
         }
     }
     impacts.push_back({kit::tuningFieldKey(8, "qwa0"), 3, 0, {}});
-    EXPECT_EQ(printed(impacts), "133 inputs moved nothing:\n"
+    EXPECT_EQ(printed(impacts), "133 inputs change nothing:\n"
                                 "  tuning.4-5\n  tuning.7\n  tuning.8.qwa0\n");
 }
 

@@ -57,7 +57,7 @@ TEST(DecodedUnitTextTest, RecordsAreATableAndTheCrc) {
                                         "slot offset size  content\n"
                                         "   0      0    1  zeros\n"
                                         "   9    129    8  \"SN\\x01\"  53 4e 01\n"
-                                        "  15      1  136  slots 1 to 9 once more\n"
+                                        "  15      1  136  repeats slots 1 to 9\n"
                                         "  17   2214    2  -\n"
                                         "auxiliary area: \"bench 2\"\n"
                                         "CRC over slots 1 to 9: 0x0000abcd, computed\n");
@@ -101,7 +101,7 @@ TEST(DecodedUnitTextTest, VersionFilesSayWhetherTheyWereChosen) {
     unit.versions.version = "1";
     unit.versions.digits = "010101";
     EXPECT_EQ(printed(unit, "versions"),
-              "/v/map.inf: not chosen: its type has no \"Application\" in it\n"
+              "/v/map.inf: not chosen: its type does not contain \"Application\"\n"
               "  Type = Map\n"
               "/v/app.inf: chosen: the first application in the order of the listing\n"
               "  Type = Application\n"

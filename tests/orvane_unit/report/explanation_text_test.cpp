@@ -60,9 +60,9 @@ TEST(ExplanationTextTest, FaultIsExplainedOncePerOutput) {
         printed({output(Outcome::generated, {Reason::generated}, {line, line, other})}),
         "/tmp/x: generated\n"
         "  v=1  /v:1: N is \"1.999\"; version-incomplete: the version has fewer than three "
-        "components, and the "
+        "components, so the "
         "last one is repeated; version-out-of-range: a component of the version is not from 0 to "
-        "255, and its remainder by 256 stands in\n"
+        "255, so its remainder modulo 256 is used\n"
         "  v=1  \"\n"
         "  w=0  /v; version-incomplete\n");
 }

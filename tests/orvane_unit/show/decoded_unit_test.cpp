@@ -33,7 +33,7 @@ TEST(DecodedUnitTest, ParametersAreDecoded) {
               "audio profile 65535, generated from tuning blocks 3 and 2");
     EXPECT_EQ(unit.image.params[21].meaning, "right-hand drive 1");
     EXPECT_EQ(unit.image.params[35].meaning, "brand QUARION");
-    EXPECT_EQ(unit.image.params[49].meaning, "fuel type cng, which is written nowhere");
+    EXPECT_EQ(unit.image.params[49].meaning, "fuel type cng, which is not written");
     EXPECT_EQ(unit.image.params[170].raw, 255);
     EXPECT_EQ(unit.image.params[0].meaning, "");
 }
