@@ -23,8 +23,8 @@ namespace {
 /// Status of a child that could not become the program.
 constexpr int NOT_STARTED = 127;
 
-/// Does `call`, a system call that returns a negative number on failure, until no signal interrupts
-/// it.
+/// Repeats `call`, a system call that returns a negative number on failure, while a signal
+/// interrupts it.
 template <class Call>
 auto uninterrupted(const Call& call) {
     auto result = call();
@@ -37,8 +37,9 @@ auto uninterrupted(const Call& call) {
 /// What a child writes, kept in memory.
 class MemoryFile {
 public:
-    /// The lock is the writing end's and lasts as long as any process holds that. Writes append, so
-    /// that none leaves a hole where a program has cut its output off ("> /dev/stderr").
+    /// The lock belongs to the writing end and lasts as long as any process holds it. Writes
+    /// append, so that none leaves a hole where a program has truncated its output (">
+    /// /dev/stderr").
     MemoryFile() : forWriting_(::memfd_create("output", MFD_CLOEXEC)) {
         if (forWriting_.isOpen()) {
             const std::string name = "/proc/self/fd/" + std::to_string(forWriting_.number());
@@ -52,7 +53,7 @@ public:
 
     const Descriptor& forWriting() const { return forWriting_; }
 
-    /// All of it, when the last holder of the writing end has let go.
+    /// All of it, once no process holds the writing end.
     std::string waitForAll() {
         forWriting_.close();
         if (uninterrupted([this] { return ::flock(forReading_.number(), LOCK_SH); }) != 0) {
@@ -89,7 +90,7 @@ struct Outputs {
     } catch (const std::exception& error) {
         reason = error.what();
     }
-    // Should even this write fail, the status still tells.
+    // If this write fails, too, the status still tells.
     const ssize_t written =
         ::write(outputs.failedStart.forWriting().number(), reason.data(), reason.size());
     static_cast<void>(written);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Running a child process and keeping what it says.
+// Running a child process and keeping what it prints.
 #pragma once
 
 #include <functional>
@@ -8,7 +8,7 @@
 
 namespace orvane::kit {
 
-/// How a program ended, and what it said.
+/// How a program ended, and what it printed.
 struct RunResult {
     int exitStatus = -1; ///< exit status, or 128 + signal number
     std::string standardOutput;
@@ -16,8 +16,8 @@ struct RunResult {
 };
 
 /// Forks. The child has /dev/null as standard input, its two outputs are captured whole, and it
-/// calls `becomeProgram`, which executes a program or throws KitError; what it throws, this throws
-/// as well. Returns when the child has ended and nobody holds its outputs any more. Needs /proc.
+/// calls `becomeProgram`, which executes a program or throws KitError; what that throws is thrown
+/// here. Returns when the child has ended and no process holds its outputs. Needs /proc.
 RunResult runCaptured(const std::function<void()>& becomeProgram);
 
 } // namespace orvane::kit

@@ -23,7 +23,7 @@ constexpr char REMEDY[] =
     "namespaces: `sysctl user.max_user_namespaces=1000 kernel.unprivileged_userns_clone=1`, with "
     "AppArmor also `kernel.apparmor_restrict_unprivileged_userns=0`)";
 
-/// A mapping file of /proc takes its whole text in one write.
+/// A mapping file of /proc accepts only one write.
 bool writeProcFile(const char* path, const std::string& text) {
     const Descriptor file(::open(path, O_WRONLY | O_CLOEXEC));
     return file.isOpen() &&
@@ -44,8 +44,8 @@ bool enterUserNamespace() {
            writeProcFile("/proc/self/gid_map", "0 " + group + " 1");
 }
 
-/// Does `action`, a system call that returns 0 or -1, and once more from inside a user namespace
-/// when this process lacks the privilege. errno is EPERM when neither is to be had.
+/// Calls `action`, a system call that returns 0 or -1, and if this process lacks the privilege,
+/// again inside a user namespace. errno is EPERM if neither is possible.
 template <class Action>
 bool succeeds(const Action& action) {
     if (action() == 0) {
@@ -85,7 +85,8 @@ bool showProc(const std::filesystem::path& root) {
     if (!isFolder(target) || !succeeds([] { return ::unshare(CLONE_NEWNS); })) {
         return false;
     }
-    // Where "/" is itself a changed root it is no mount, and what it lies on can't be made private.
+    // A "/" that is itself a changed root is not a mount, and the mount below it can't be made
+    // private.
     const bool isPrivate = ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0;
     return (isPrivate || errno == EINVAL) &&
            ::mount("/proc", target.c_str(), nullptr, MS_BIND | MS_REC, nullptr) == 0;

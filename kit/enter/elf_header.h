@@ -16,10 +16,10 @@ struct ElfHeader {
 };
 
 /// Reads the header of a little-endian program. Throws KitError for a file that can't be read or is
-/// anything else.
+/// not one.
 ElfHeader readElfHeader(const std::filesystem::path& file);
 
-/// The machine that this very program was made for.
+/// The machine that this program itself was built for.
 std::uint16_t ownMachine();
 
 } // namespace orvane::kit

@@ -17,7 +17,7 @@ namespace orvane::kit {
 
 namespace {
 
-/// Must not fail: to go on after that would mean to work on the unit as if it were the host.
+/// Must not fail: the process would go on in the unit as if it were the host.
 void leaveRoot(const Descriptor& outerRoot, const Descriptor& outerCwd) {
     const bool isRootBack =
         !outerRoot.isOpen() || (::fchdir(outerRoot.number()) == 0 && ::chroot(".") == 0);

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A simulated unit is a folder that stands for the unit's "/". The product opens absolute paths
-// only, so the one honest way to lend it a unit is to change the root directory of the process.
-// chroot(2) does that: directly when the process may, else inside a user namespace of its own.
+// only, so the one honest way to give it a unit is to change the root directory of the process: by
+// chroot(2), directly if the process may, else inside a user namespace of its own.
 #pragma once
 
 #include "kit/host/descriptor.h"
@@ -11,12 +11,11 @@
 
 namespace orvane::kit {
 
-/// While it lives, "/" of this process is `root`, and so is the working directory. The destructor
+/// While it exists, "/" and the working directory of this process are `root`. The destructor
 /// restores both. Works in a single-threaded process only (a user namespace needs that), and cannot
-/// be nested. Throws KitError when `root` is not a folder or the system allows neither way, the
-/// remedy in its text; the root is then unchanged. A user namespace, once entered, stays for the
-/// process's life. Where `root` is "/" already, only the working directory changes, which takes no
-/// privilege.
+/// be nested. Throws KitError, with the remedy, when `root` is not a folder or the system allows
+/// neither; the root is then unchanged. A user namespace, once entered, stays until the process
+/// ends. If `root` is "/" already, only the working directory changes, which needs no privilege.
 class EnteredRoot {
 public:
     explicit EnteredRoot(const std::filesystem::path& root);

@@ -21,7 +21,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// The emulator that this kit itself runs under, by the build; empty when it runs directly.
+/// The emulator that the kit itself runs under, set by the build; empty when it runs directly.
 constexpr char OWN_EMULATOR[] = ORVANE_KIT_EMULATOR;
 constexpr char DEFAULT_EMULATOR[] = "/usr/bin/qemu-arm-static";
 
@@ -35,7 +35,7 @@ std::string relativeToHost(const fs::path& file) {
     return real.relative_path().string();
 }
 
-/// execv's array, which lasts as long as `words`.
+/// The array for execv, valid as long as `words`.
 std::vector<char*> pointers(const std::vector<std::string>& words) {
     std::vector<char*> result;
     result.reserve(words.size() + 1);

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// How a program of the host gets started when the root directory is no longer the host's: either by
-// a descriptor opened before, or by a path relative to a working directory that is still the host's
+// How a program of the host is started when the root directory is no longer the host's: by a
+// descriptor opened before, or by a path relative to a working directory that is still the host's
 // "/".
 #pragma once
 
@@ -26,16 +26,16 @@ struct ProgramStart {
     bool isDynamic = false;        ///< the program is started by a loader
 };
 
-/// Looks at the program and decides. Runs the loader of a dynamic one to learn where its libraries
-/// lie. Throws KitError when there is no such program or no way to start it.
+/// Looks at the program and decides. Runs the loader of a dynamic one to find its libraries. Throws
+/// KitError when there is no such program or no way to start it.
 ProgramStart findProgramStart(const Program& program);
 
-/// Makes `root`, an absolute path, the "/" of this process, with the working directory from which
-/// the program can be started. Throws KitError when it can't.
+/// Makes `root`, an absolute path, the "/" of this process, and sets the working directory from
+/// which the program can be started. Throws KitError when it can't.
 void enterRootFor(const ProgramStart& start, const std::filesystem::path& root);
 
-/// Executes the program once enterRootFor has prepared its process. Opens no file, so that limits
-/// of the program can be set in between. Does not return; throws KitError on failure.
+/// Executes the program once enterRootFor has prepared its process. Opens no file, so the program's
+/// limits can be set in between. Does not return; throws KitError on failure.
 void becomeProgram(const ProgramStart& start);
 
 } // namespace orvane::kit

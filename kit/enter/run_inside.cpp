@@ -11,16 +11,16 @@ namespace orvane::kit {
 
 namespace {
 
-/// The folder for /proc in a unit that has none, as long as a program needs it.
+/// The folder for /proc in a unit without one, while a program needs it.
 class ProcFolder {
 public:
     explicit ProcFolder(const std::filesystem::path& root) : folder_(root / "proc") {
-        std::error_code ignored; // a program that can't have it says so itself
+        std::error_code ignored; // a program that needs it says so itself
         isOurs_ = std::filesystem::create_directory(folder_, ignored);
     }
     ~ProcFolder() {
         if (isOurs_) {
-            ::umount2(folder_.c_str(), MNT_DETACH); // nothing, but in a changed root (showProc)
+            ::umount2(folder_.c_str(), MNT_DETACH); // a mount only in a changed root (showProc)
             std::error_code ignored;
             std::filesystem::remove(folder_, ignored);
         }
