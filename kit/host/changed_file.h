@@ -9,10 +9,10 @@
 
 namespace orvane::kit {
 
-/// A regular file that is open to be changed in its place, at the length that it has.
+/// A regular file, open to be changed in place without changing its length.
 class ChangedFile {
 public:
-    /// Opens `path`, links followed. Throws KitError where it is no regular file or can't be
+    /// Opens `path`, links followed. Throws KitError if it is not a regular file or can't be
     /// opened.
     explicit ChangedFile(std::filesystem::path path);
 

@@ -9,7 +9,7 @@
 
 namespace orvane::kit {
 
-/// Closes its descriptor at the end of its life, or earlier by close(), which is safe to repeat.
+/// Closes its descriptor on destruction, or earlier by close(), which is safe to repeat.
 class Descriptor {
 public:
     Descriptor() = default;

@@ -17,10 +17,10 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Leaves room in a name of 255 bytes for what is added to it.
+/// Leaves room in a name of 255 bytes for what is added.
 constexpr std::size_t NAME_KEPT = 200;
 
-/// `folder` as a place in a folder that is there, without links in it, and with a name at its end.
+/// The place of `folder` in an existing folder, without links, ending with a name.
 fs::path finalPlace(const fs::path& folder, bool isThere) {
     if (isThere) {
         return fs::canonical(folder);
@@ -30,7 +30,7 @@ fs::path finalPlace(const fs::path& folder, bool isThere) {
     return fs::canonical(above.empty() ? "." : above) / plain.filename();
 }
 
-/// A new empty folder beside `place`.
+/// Makes an empty folder next to `place`.
 fs::path makeBeside(const fs::path& place) {
     const std::string stem = "." + place.filename().string().substr(0, NAME_KEPT) + ".unfinished-" +
                              std::to_string(::getpid()) + "-";
@@ -42,7 +42,7 @@ fs::path makeBeside(const fs::path& place) {
     }
 }
 
-/// Removes the folder beside, unless it has been renamed.
+/// Removes the unfinished folder, unless it has been renamed.
 class Cleaner {
 public:
     explicit Cleaner(fs::path beside) : beside_(std::move(beside)) {}
@@ -57,13 +57,13 @@ private:
     fs::path beside_;
 };
 
-/// Of the two paths of a link's failure the second is the link.
+/// If making a link failed, the second of the two paths is the link.
 KitError errorOf(const fs::filesystem_error& failure) {
     const fs::path& path = failure.path2().empty() ? failure.path1() : failure.path2();
     return {"cannot make ", path, ": " + failure.code().message()};
 }
 
-/// The system's own text of a failure that has no place within the folder.
+/// For a failure without a path inside the folder: the system's own text.
 [[noreturn]] void failAtFolder(const fs::path& folder, const std::error_code& error) {
     throw KitError("cannot make ", folder, ": " + error.message());
 }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// A folder that is there as a whole or not at all.
+// A folder that is complete or not there.
 #pragma once
 
 #include <filesystem>
@@ -8,12 +8,13 @@
 
 namespace orvane::kit {
 
-/// Has `fill` fill an empty folder beside `folder`, then renames it to `folder`, which must be
-/// absent or an empty folder. The folder beside is named "." + the folder's name + ".unfinished-"
-/// and a number, and has the access rights that an empty `folder` had. What `fill` throws, this
-/// throws on: a failure of the file system as KitError, and a KitError about a path of the folder
-/// beside as one about the final path. The folder beside is then removed and `folder` is as it was.
-/// Also throws KitError when `folder` is anything but absent or empty, or the system refuses.
+/// Lets `fill` fill an empty folder next to `folder`, then renames it to `folder`, which must be
+/// absent or an empty folder. The unfinished folder is named "." + the folder's name +
+/// ".unfinished-" and a number, and has the access rights that an empty `folder` had. What `fill`
+/// throws is thrown on: a failure of the file system as KitError, and a KitError about a path of
+/// the unfinished folder as one about the final path. The unfinished folder is then removed and
+/// `folder` is as it was. Also throws KitError when `folder` is anything but absent or empty, or
+/// the system refuses.
 void makeFinishedFolder(const std::filesystem::path& folder,
                         const std::function<void(const std::filesystem::path&)>& fill);
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Reading and writing a unit's files through the host's file system. Every function throws
-// KitError, the file's path in its text.
+// Reading and writing a unit's files through the host's file system. Every function throws KitError
+// with the file's path.
 #pragma once
 
 #include "kit/host/bytes.h"
@@ -22,7 +22,7 @@ void writeAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 /// Opens without waiting for the other end of a pipe.
 Descriptor openForReading(const std::filesystem::path& file);
 
-/// Where the end is, by a seek: devices tell their size in no other way.
+/// The offset of the end, by a seek: devices tell their size in no other way.
 std::uint64_t sizeOf(const Descriptor& descriptor, const std::filesystem::path& file);
 
 /// `length` bytes from `offset` on; fewer only where the file ends.
@@ -32,7 +32,7 @@ Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 /// All bytes, up to the size that sizeOf tells.
 Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file);
 
-/// Whether `folder` is this process's "/", by whatever name. Throws nothing.
+/// Whether `folder` is this process's "/", under any name. Throws nothing.
 bool isRootDirectory(const std::filesystem::path& folder);
 
 } // namespace orvane::kit

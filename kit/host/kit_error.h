@@ -9,8 +9,7 @@
 
 namespace orvane::kit {
 
-/// What the kit throws for wrong use, a bad root or a refusing system: one clear line without a
-/// newline at its end.
+/// Thrown for wrong use, a bad root or a refusal of the system: one clear line without a newline.
 class KitError : public std::runtime_error {
 public:
     explicit KitError(const std::string& what);
@@ -18,7 +17,7 @@ public:
     KitError(const std::string& before, const std::filesystem::path& path,
              const std::string& after);
 
-    /// The same error as if what lies at or below `from` lay at or below `to`.
+    /// The same error with `to` in place of `from`, if its path is at or below that.
     KitError moved(const std::filesystem::path& from, const std::filesystem::path& to) const;
 
 private:

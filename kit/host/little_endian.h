@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Numbers as the unit keeps them: low byte first.
+// Numbers as the unit stores them: low byte first.
 #pragma once
 
 #include "kit/host/bytes.h"

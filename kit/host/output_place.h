@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Where an output goes: a path as an output stream takes it, which makes the file if it is not
-// there.
+// Where an output goes: the path resolved as by an output stream, which makes a missing file.
 #pragma once
 
 #include <sys/types.h>
@@ -17,10 +16,10 @@ struct OutputPlace {
 };
 
 /// Follows the links of `path`, an absolute one, also to a file that is not there yet. Nothing when
-/// the way is broken: a folder on it is missing or no folder, or links lead in a circle.
+/// the path is broken: a folder in it is missing or not a folder, or links form a circle.
 std::optional<OutputPlace> findOutputPlace(std::string path);
 
-/// Whether this process may write what is there, or make it. A folder or socket can't be written.
+/// Whether this process may write the file there, or make it. A folder or socket can't be written.
 bool canBeWritten(const OutputPlace& place);
 
 /// The same for a path.

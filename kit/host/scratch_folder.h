@@ -5,7 +5,7 @@
 
 namespace orvane::kit {
 
-/// A fresh folder among the system's temporary ones, gone with its owner.
+/// A new folder among the system's temporary ones, removed with its owner.
 class ScratchFolder {
 public:
     /// Throws KitError.

@@ -46,7 +46,7 @@ private:
         }
     }
 
-    /// Bytes without a zero among them.
+    /// Adds bytes, none of which is zero.
     void add(std::string_view bytes, std::uint64_t offset) {
         if (!runs.empty()) {
             auto& [begin, run] = *runs.rbegin();
@@ -68,7 +68,7 @@ std::uint64_t seekNext(const Descriptor& descriptor, std::uint64_t offset, int w
     if (found >= 0) {
         return std::min(static_cast<std::uint64_t>(found), size);
     }
-    // Behind the last data, or a device that knows no holes.
+    // After the last data, or on a device that does not know holes.
     return what == SEEK_DATA && errno != ENXIO ? offset : size;
 }
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// What a mostly empty file or device holds, without a look at the zeros one by one.
+// What a mostly empty file or device holds, found without reading zero after zero.
 #pragma once
 
 #include "kit/host/bytes.h"
@@ -13,7 +13,7 @@
 
 namespace orvane::kit {
 
-/// So many zero bytes or more between two others end a run; fewer are part of it.
+/// At least this many zero bytes between two others end a run; fewer are part of it.
 constexpr std::uint64_t RUN_GAP = 16;
 
 /// Mostly zeros: the runs of other bytes, by offset. Each begins and ends with a byte that is not
@@ -23,8 +23,8 @@ using SparseContent = std::map<std::uint64_t, Bytes>;
 /// The content of `bytes`, which stand at `offset`.
 SparseContent sparseContent(std::string_view bytes, std::uint64_t offset = 0);
 
-/// The content of the first `size` bytes of a file or device; holes are skipped where it tells
-/// them. Throws KitError, `file` in its text.
+/// The content of the first `size` bytes of a file or device; known holes are skipped. Throws
+/// KitError with the path `file`.
 SparseContent sparseContent(const Descriptor& descriptor, const std::filesystem::path& file,
                             std::uint64_t size);
 

@@ -12,7 +12,8 @@ namespace orvane::kit {
 /// Whether `text` is well-formed UTF-8: shortest forms only, no surrogates, nothing above U+10FFFF.
 bool isUtf8(std::string_view text);
 
-/// `bytes` as one line of text: what is no printable UTF-8 is escaped as in \n, \\ or \x1b.
+/// `bytes` as one line of text: anything that is not printable UTF-8 is escaped, as in \n, \\ or
+/// \x1b.
 std::string printable(std::string_view bytes);
 
 /// `bytes` in hex, two digits each, with blanks between them.

@@ -12,7 +12,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Throws what the system says of `path`.
+/// Throws KitError for a failure at `path`.
 void check(const std::error_code& error, const fs::path& path) {
     if (error) {
         throw KitError("cannot read ", path, ": " + error.message());

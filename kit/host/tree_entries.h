@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Reading single entries of a folder tree. Every function throws KitError, the path in its text.
+// Reading single entries of a folder tree. Every function throws KitError with the path.
 #pragma once
 
 #include <filesystem>
@@ -15,7 +15,7 @@ std::vector<std::filesystem::directory_entry> listFolder(const std::filesystem::
 /// What `entry` is, links not followed.
 std::filesystem::file_type kindOf(const std::filesystem::path& entry);
 
-/// What `entry` leads to, links followed; `not_found` for a link that leads nowhere or in a circle.
+/// What `entry` leads to, links followed; `not_found` for a broken or circular link.
 std::filesystem::file_type kindBehind(const std::filesystem::path& entry);
 
 /// The target of a link.

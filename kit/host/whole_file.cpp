@@ -69,7 +69,7 @@ Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
     }
     if (static_cast<std::uint64_t>(state.st_size) > limit) {
         throw KitError(file.string() + " has " + std::to_string(state.st_size) +
-                       " bytes: at most " + std::to_string(limit) + " are taken");
+                       " bytes: at most " + std::to_string(limit) + " are allowed");
     }
     return readAt(descriptor, file, 0, static_cast<std::uint64_t>(state.st_size));
 }

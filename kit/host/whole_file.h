@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Reading whole files by their paths. Every function throws KitError for what is there and can't be
-// read, the file's path in its text.
+// Reading whole files by their paths. Every function throws KitError with the file's path for what
+// is there and can't be read.
 #pragma once
 
 #include "kit/host/bytes.h"
