@@ -44,7 +44,7 @@ std::int64_t codeOf(const DpsField& field, const std::string& word) {
                    ": it takes " + known + "or a code " + rangeText(field));
 }
 
-/// The value as a list of numbers, whatever it was.
+/// The value as a list of numbers.
 std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& value) {
     if (const auto* list = std::get_if<std::vector<std::int64_t>>(&value)) {
         if (field.kind != DpsKind::list) {
@@ -62,7 +62,7 @@ std::vector<std::int64_t> numbersOf(const DpsField& field, const TuningValue& va
     return {std::get<std::int64_t>(value)};
 }
 
-/// Puts one number, known to be in range.
+/// Requires that `number` is in range.
 void putNumber(DpsBlock& block, const DpsField& field, std::size_t element, std::int64_t number) {
     const std::size_t size = dpsElementSize(field.encoding);
     const std::size_t at = field.offset + element * size;

@@ -24,8 +24,8 @@ namespace orvane::kit {
 
 namespace {
 
-// A file is read leniently, and the product then writes it again: whatever the product writes
-// otherwise is wrong. So the form of a tuning file is known to the product alone.
+// A file is read leniently, and the product then writes it again: the first difference is the
+// fault. So only the product knows the form of a tuning file.
 
 /// A value that no block can hold.
 struct ValueFault {
@@ -50,7 +50,7 @@ std::vector<std::string> wordsIn(std::string_view text) {
     return words;
 }
 
-/// A decimal number; one that is too great for any field is the greatest.
+/// A decimal number; one that is too great for any field becomes the greatest.
 std::optional<std::int64_t> numberIn(const std::string& word) {
     std::int64_t number = 0;
     const char* const last = word.data() + word.size();
@@ -62,12 +62,12 @@ std::optional<std::int64_t> numberIn(const std::string& word) {
     return error == std::errc{} ? number : word.front() == '-' ? Limits::min() : Limits::max();
 }
 
-/// Puts what `text` says into `field`, or the nearest that the field can hold: the product's text
-/// then differs from the file's where the fault is. Returns the fault; empty when there is none.
+/// Sets `field` to the value in `text`, or the nearest that it can hold: the product's text then
+/// differs from the file's at the fault. Returns the fault; empty when there is none.
 std::string readValue(std::string_view text, const DpsField& field, DpsBlock& block) {
     const bool isList = field.kind == DpsKind::list;
     std::vector<std::int64_t> numbers;
-    std::string word; // the first that is no number
+    std::string word; // the first that is not a number
     for (const std::string& part : wordsIn(text)) {
         const std::optional<std::int64_t> number = numberIn(part);
         numbers.push_back(number.value_or(0));
@@ -126,7 +126,8 @@ std::size_t sameBytes(const std::string& one, const std::string& other) {
         std::mismatch(one.begin(), one.end(), other.begin(), other.end()).first - one.begin());
 }
 
-/// The tuning file of `block` that agrees longest with `text`: that of `blockId`, or any other.
+/// The tuning file of `block` that agrees longest with `text`: that of `blockId` or of any other
+/// block.
 std::string nearestFile(const DpsBlock& block, std::int32_t blockId, const std::string& text) {
     std::string nearest = textOf(block, blockId);
     for (std::int32_t id = 0; isTuningBlock(id); ++id) {
@@ -148,7 +149,7 @@ std::string shownLine(const std::string& text, std::size_t begin) {
 /// What differs in the line at `begin`, where both texts still have the same bytes before it.
 std::string differenceAt(std::size_t begin, const std::string& written, const std::string& found) {
     if (begin == written.size()) {
-        return "orvane writes no further line, not " + shownLine(found, begin);
+        return "orvane does not write " + shownLine(found, begin);
     }
     const std::string line = shownLine(written, begin);
     if (begin == found.size()) {

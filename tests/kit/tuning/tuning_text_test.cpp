@@ -218,7 +218,7 @@ const Refusal REFUSALS[] = {
     {"qwaMEQEnable 0 0 0 0 \n", "",
      "a.txt:45:1: the text ends here: orvane writes \"qwaMEQEnable 0 0 0 0 \""},
     {"qwaMEQEnable 0 0 0 0 \n", "qwaMEQEnable 0 0 0 0 \nmore",
-     "a.txt:46:1: orvane writes no further line, not \"more\""},
+     "a.txt:46:1: orvane does not write \"more\""},
 };
 
 TEST(TuningText, TextThatTheToolWouldNotWriteIsRefusedWithItsPlace) {
