@@ -102,7 +102,8 @@ void compareEntries(const std::set<std::string>& found, const std::set<std::stri
     }
 }
 
-/// What no expectation can hold: the tool always ends with 0 and prints nothing of its own.
+/// What holds without an expectation: the tool always ends with 0 and prints nothing on standard
+/// output.
 void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences) {
     if (run.exitStatus != 0) {
         differences.push_back("exit status " + std::to_string(run.exitStatus));
@@ -119,7 +120,7 @@ void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult
     }
     const std::optional<std::string> list = kit::readWholeFileIfThere(expected / "tmp.list");
     if (!list) {
-        differences.push_back("there is no expectation: no expected/tmp.list");
+        differences.push_back("expected/tmp.list is missing");
         return;
     }
     const std::set<std::string> wanted = linesOf(*list);
@@ -154,7 +155,7 @@ void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult&
     }
 }
 
-/// Whether the run has left what the explanation says.
+/// Adds the outputs that are not as the explanation says.
 void compareWithRun(const Explanation& explanation, const TmpTree& tree,
                     std::vector<std::string>& surprises) {
     const std::size_t folderLength = pathInTmp("").size();

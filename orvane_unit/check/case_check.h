@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Units with the outputs that are expected of them, in a folder: for each, NAME/unit.toml, the
-// options in NAME/arguments, one a line ("-a", "-i" without that file), and below NAME/expected
-// what /tmp holds afterwards: tmp.list names every entry, folders with a slash behind, or says
-// "(absent)"; tmp/ holds the files; stderr, if there, what the tool says.
+// A folder of units with their expected outputs. Each has NAME/unit.toml, its options in
+// NAME/arguments, one a line (by default "-a", "-i"), and in NAME/expected what /tmp holds after
+// the run: tmp.list names every entry, folders with a slash at the end, or is "(absent)"; tmp/
+// holds the files; stderr, if there, what the tool prints there.
 #pragma once
 
 #include "orvane_unit/explain/reasons.h"
@@ -18,7 +18,7 @@ namespace orvane::desk {
 struct CaseResult {
     std::string name;
     std::vector<std::string> differences; ///< none when all is as expected
-    std::vector<std::string> surprises;   ///< where the explanation and the run do not agree
+    std::vector<std::string> surprises;   ///< where explanation and run differ
     std::set<Reason> reasons;             ///< all that its explanation gives
 
     bool isAsExpected() const { return differences.empty() && surprises.empty(); }
@@ -30,7 +30,7 @@ struct CheckReport {
     bool isUpdate = false;
 };
 
-/// Runs `binary` in every unit of `folder`. With `updates`, writes what it leaves as the new
+/// Runs `binary` in every unit of `folder`. With `updates`, writes what the run leaves as the new
 /// expectations instead of comparing. Throws kit::KitError for a folder without units, a bad
 /// description, or a binary that can't be run.
 CheckReport checkCases(const std::filesystem::path& folder, const std::filesystem::path& binary,

@@ -14,7 +14,7 @@ namespace fs = std::filesystem;
 
 namespace {
 
-/// Enters what is in `folder`, and gives the folders among it; links are not gone into.
+/// Adds the entries of `folder` and returns the folders among them; links are not followed.
 std::vector<fs::path> readFolder(const fs::path& folder, TmpTree& tree) {
     std::vector<fs::path> folders;
     for (const fs::path& entry : kit::listFolder(folder)) {

@@ -90,7 +90,7 @@ TEST_F(CaseCheckTest, EntryIsNotMatchedAsAPrefix) {
 
 TEST_F(CaseCheckTest, MissingListIsNotAnExpectation) {
     fs::remove(expected() / "tmp.list");
-    EXPECT_EQ(differences(), Lines{"there is no expectation: no expected/tmp.list"});
+    EXPECT_EQ(differences(), Lines{"expected/tmp.list is missing"});
 }
 
 TEST_F(CaseCheckTest, StandardErrorIsCompared) {
