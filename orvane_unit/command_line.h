@@ -6,7 +6,7 @@ namespace orvane::desk {
 /// The exit status of every command.
 enum ExitStatus {
     EXIT_AS_INTENDED = 0,
-    EXIT_ANSWER_IS_NO = 1, ///< a fallback or default stands in, a difference, a failed check
+    EXIT_ANSWER_IS_NO = 1, ///< a fallback or default, a difference, a failed check
     EXIT_BAD_INPUT = 2,    ///< wrong use or bad input; a line on standard error says what
 };
 

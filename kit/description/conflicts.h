@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // Conflicts between parts of a description that are each right by themselves: two entries at one
-// path, a value behind the end of an image or disk.
+// path, a value past the end of an image or disk.
 #pragma once
 
 #include "kit/description/unit_description.h"

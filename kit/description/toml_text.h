@@ -8,8 +8,8 @@
 
 namespace orvane::kit {
 
-/// Whether `text` can stand in a document as a text that a reader can read: UTF-8, and no more than
-/// one control character in eight, line ends and tabs aside.
+/// Whether `text` is readable in a document: UTF-8, and at most one control character in eight,
+/// apart from line ends and tabs.
 bool isReadable(std::string_view text);
 
 /// The UTF-8 text `text` in quotes, on one line.

@@ -29,7 +29,7 @@ struct Form {
     Part first;
     Part second;
     std::string_view begin;   ///< before the first part
-    std::string_view between; ///< behind it; empty where it is the last
+    std::string_view between; ///< after it; empty if it is the last
 };
 
 /// All forms of keys. A text that fits two of them has the first one.

@@ -18,7 +18,7 @@ namespace orvane::kit {
 constexpr std::uint64_t LONGEST_IMAGE = std::uint64_t{1} << 20U;
 
 /// The image: its size, the parameters that lie wholly inside and are not zero, and as raw bytes
-/// all else that is not zero: behind the catalogue's end, or the first byte of a two-byte parameter
+/// all else that is not zero: past the catalogue's end, or the first byte of a two-byte parameter
 /// that is cut off.
 ImageDescription describeImage(const Bytes& image);
 

@@ -39,7 +39,7 @@ namespace fs = std::filesystem;
 using kit::ValueKey;
 using kit::ValuePlace;
 
-/// The configuration image or the boot disk of the copy; nothing where it is no regular file there.
+/// The configuration image or the boot disk of the copy; nothing if it is not a regular file.
 using CopiedFile = std::optional<kit::ChangedFile>;
 
 CopiedFile openCopied(const fs::path& path) {

@@ -15,7 +15,7 @@ namespace orvane::desk {
 /// The part of a text that carries one value.
 struct ValueRegion {
     std::size_t begin = 0;
-    std::size_t end = 0; ///< behind its last byte; `begin` for a value that leaves its lines out
+    std::size_t end = 0; ///< after its last byte; `begin` for a value that leaves its lines out
     Origin origin;
 };
 
