@@ -17,8 +17,6 @@
 
 #include <unistd.h>
 
-#include <algorithm>
-#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <sstream>
@@ -82,14 +80,10 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
     AirplayValues values;
     readVehicleValues(values);
     values.audioProfile = readAudioProfile();
-    const TuningOutputRange asked = tuningOutputsFor(values.audioProfile);
     for (const TuningOutput& tuning : TUNING_OUTPUTS) {
-        const bool isAsked =
-            std::any_of(asked.begin(), asked.end(), [&tuning](const TuningOutput& other) {
-                return other.blockId == tuning.blockId;
-            });
-        outputs.push_back(isAsked ? generatedTuning(files, tuning)
-                                  : tuningNotAsked(tuning, values.audioProfile));
+        outputs.push_back(asksForTuning(values.audioProfile)
+                              ? generatedTuning(files, tuning)
+                              : tuningNotAsked(tuning, values.audioProfile));
     }
     const Image image = readImage();
     const std::vector<MergedValue<AirplayValues>> sources = {
@@ -102,8 +96,7 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
         {[](AirplayValues& v) { v.rightHandDrive ^= 1U; },
          paramOrigin(image, RIGHT_HAND_DRIVE_PARAM)},
     };
-    PlannedMerge merge;
-    merge.open(files, AIRPLAY_FILE);
+    PlannedMerge merge(files, AIRPLAY_FILE);
     outputs.push_back(merge.finish(values, sources, generateAirplayFile));
 }
 
@@ -117,22 +110,21 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
         {[](IapValues& v) { v.firmwareVersion = otherText(v.firmwareVersion); },
          versionTextOrigin(versions)},
     };
-    std::array<PlannedMerge, IAP_STAGE_COUNT> merges;
-    for (std::size_t i = 0; i < merges.size(); ++i) {
-        const IapStage& stage = IAP_STAGES.at(i);
-        changeIapValues(stage, values);
-        if (stage.hasVersionDigits) {
-            sources.back().origin = versionDigitsOrigin(versions);
-        }
-        const PlannedMerge& iap2 = merges.at(IAP2_STAGE);
-        merges.at(i).iap2 = &iap2;
-        merges.at(i).open(files, stage.file);
-        outputs.push_back(merges.at(i).finish(
-            values, sources,
-            [&stage, &iap2](std::istream& templateFile, std::ostream& output, const IapValues& v) {
-                return stage.generate(templateFile, output, iap2.output, v);
-            }));
-    }
+    PlannedMerge device(files, IAP2_DEVICE_FILE);
+    outputs.push_back(device.finish(values, sources, generateIap2DeviceFile));
+
+    PlannedMerge iap2(files, IAP2_FILE);
+    outputs.push_back(iap2.finish(values, sources, generateIap2File));
+
+    switchToVersionDigits(values);
+    sources.back().origin = versionDigitsOrigin(versions);
+    PlannedMerge iap1(files, IAP1_FILE);
+    iap1.dependsOn(iap2);
+    outputs.push_back(
+        iap1.finish(values, sources,
+                    [&iap2](std::istream& templateFile, std::ostream& output, const IapValues& v) {
+                        return generateIap1File(templateFile, output, iap2.output, v);
+                    }));
 }
 
 /// The writers that a command line asks for, in their order, as the product's own parser reads it.
@@ -165,6 +157,8 @@ Explanation explain(const std::vector<std::string>& arguments) {
             explainAirplay(files, outputs);
         } else if (writer == updateIapConfigFiles) {
             explainIap(files, outputs);
+        } else {
+            throw std::logic_error("error in orvane-unit: a writer that it can't explain");
         }
     }
     // Last, since a later output may be the same file by way of a link.

@@ -12,12 +12,33 @@
 
 namespace orvane::desk {
 
+namespace {
+
+/// One name for all paths of a file: its device and number; for a file that is not there yet, its
+/// path without links.
+std::string fileName(const kit::OutputPlace& place) {
+    struct stat state {};
+    if (place.kind == 0 || ::stat(place.path.c_str(), &state) != 0) {
+        return place.path;
+    }
+    return std::to_string(state.st_dev) + ":" + std::to_string(state.st_ino);
+}
+
+/// Whether what is written there can be read again: not so in a device or pipe.
+bool keepsBytes(const kit::OutputPlace& place) {
+    return place.kind == 0 || place.kind == S_IFREG;
+}
+
+} // namespace
+
 bool PlannedFiles::openForWriting(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
-    if (!place || !(written_.count(place->path) != 0 || kit::canBeWritten(*place))) {
+    if (!place || !(written_.count(fileName(*place)) != 0 || kit::canBeWritten(*place))) {
         return false;
     }
-    written_[place->path].clear();
+    if (keepsBytes(*place)) {
+        written_[fileName(*place)].clear();
+    }
     return true;
 }
 
@@ -26,7 +47,7 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
     if (!place) {
         return std::nullopt;
     }
-    const auto written = written_.find(place->path);
+    const auto written = written_.find(fileName(*place));
     if (written != written_.end()) {
         return written->second;
     }
@@ -39,8 +60,9 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
 }
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {
-    if (const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path)) {
-        written_[place->path] += text;
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
+    if (place && keepsBytes(*place)) {
+        written_[fileName(*place)] += text;
     }
 }
 

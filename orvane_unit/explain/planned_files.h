@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The files of a unit as a run would change them, without writing. An output can be a link to
-// another output, a template or a stock file, so later reads see what the run has written.
+// The files of a unit as a run would change them, without writing. An output can be a link, hard or
+// symbolic, to another output, a template or a stock file, so what is opened later has what the run
+// has written. (A template that is its own output is the exception: the run reads what it writes.)
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -28,7 +29,7 @@ public:
     PathKind look(const std::string& path, std::string& content) const;
 
 private:
-    std::map<std::string, std::string> written_; ///< content by place: a path without links
+    std::map<std::string, std::string> written_; ///< content by file: see fileName in the source
 };
 
 } // namespace orvane::desk

@@ -7,14 +7,12 @@
 
 namespace orvane::desk {
 
-void PlannedMerge::open(PlannedFiles& files, const AccessoryFile& file) {
-    files_ = &files;
-    file_ = file;
-    isOutputOpen_ = files.openForWriting(file.output);
+PlannedMerge::PlannedMerge(PlannedFiles& files, const AccessoryFile& file)
+    : files_(files), file_(file), isOutputOpen_(files.openForWriting(file.output)),
+      template_(files.read(file.templateFile)) {
     if (!isOutputOpen_) {
         output.setstate(std::ios::failbit);
     }
-    template_ = files.read(file.templateFile);
     templateFile = templateStream(template_);
 }
 
@@ -24,6 +22,10 @@ std::istringstream PlannedMerge::templateStream(const std::optional<std::string>
         stream.setstate(std::ios::failbit);
     }
     return stream;
+}
+
+std::optional<std::string> PlannedMerge::briefTemplate() const {
+    return template_ ? std::optional<std::string>(template_->substr(0, 1)) : std::nullopt;
 }
 
 Origin PlannedMerge::templateOrigin() const {
@@ -52,21 +54,26 @@ Output PlannedMerge::writeGenerated(const std::string& text, std::vector<ValueRe
                       : template_->empty() ? Reason::templateEmpty
                                            : Reason::generated};
     result.lines = cutIntoLines(text, std::move(regions));
-    files_->write(file_.output, text);
+    for (Line& line : result.lines) {
+        if (line.origin.reasons.front() == Reason::fromTemplate) {
+            line.text = *template_;
+        }
+    }
+    files_.write(file_.output, output.str());
     return result;
 }
 
 /// As installStockFile does: the stock file is opened first.
 Output PlannedMerge::installStock(MergeDecision decision) {
-    const std::optional<std::string> stock = files_->read(file_.stockFile);
-    if (!files_->openForWriting(file_.output)) {
+    const std::optional<std::string> stock = files_.read(file_.stockFile);
+    if (!files_.openForWriting(file_.output)) {
         return keep();
     }
     Output result = begin();
-    if (decision == MergeDecision::iap2Failed && iap2 != nullptr) {
-        result.reasons = {iap2->isOutputOpen_ ? Reason::iap2TemplateEmpty : Reason::iap2NotOpened};
+    if (decision == MergeDecision::iap2Failed && iap2_ != nullptr) {
+        result.reasons = {iap2_->isOutputOpen_ ? Reason::iap2TemplateEmpty : Reason::iap2NotOpened};
         result.keys.push_back(
-            kit::fileKey(iap2->isOutputOpen_ ? iap2->file_.templateFile : iap2->file_.output));
+            kit::fileKey(iap2_->isOutputOpen_ ? iap2_->file_.templateFile : iap2_->file_.output));
     } else {
         result.reasons = {Reason::templateMissing};
         result.keys.push_back(kit::fileKey(file_.templateFile));
@@ -85,7 +92,7 @@ Output PlannedMerge::installStock(MergeDecision decision) {
     result.outcome = Outcome::stock;
     result.lines = {
         {text, {{Reason::fromStock}, kit::fileKey(file_.stockFile), FilePlace{file_.stockFile}}}};
-    files_->write(file_.output, text);
+    files_.write(file_.output, text);
     return result;
 }
 

@@ -13,6 +13,7 @@
 #include <optional>
 #include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {
@@ -29,12 +30,15 @@ class PlannedMerge {
 public:
     std::ostringstream output;
     std::istringstream templateFile;
-    const PlannedMerge* iap2 = nullptr; ///< the merge of IAP2_FILE, where the file depends on it
 
     /// Opens the output, which truncates it, then the template.
-    void open(PlannedFiles& files, const AccessoryFile& file);
+    PlannedMerge(PlannedFiles& files, const AccessoryFile& file);
 
-    /// Lets `generate` decide and write. It renders `values`, which come from `sources`.
+    /// Names the merge of IAP2_FILE, whose failure is a reason for the stock file.
+    void dependsOn(const PlannedMerge& iap2) { iap2_ = &iap2; }
+
+    /// Has `generate` decide and do what is decided. `values` are what it renders, `sources` where
+    /// they come from.
     template <class Values, class Generate>
     Output finish(const Values& values, const std::vector<MergedValue<Values>>& sources,
                   const Generate& generate) {
@@ -42,9 +46,8 @@ public:
         if (decision != MergeDecision::generate) {
             return installStock(decision);
         }
-        if (!isOutputOpen_) {
-            return keep();
-        }
+        // A template is only copied, so a short one shows as well which bytes are whose.
+        const std::optional<std::string> brief = briefTemplate();
         const auto render = [&generate](const Values& other,
                                         const std::optional<std::string>& content) {
             std::ostringstream text;
@@ -52,16 +55,16 @@ public:
             generate(stream, text, other);
             return text.str();
         };
-        const std::string text = output.str();
+        const std::string text = render(values, brief);
         std::vector<ValueRegion> regions;
         for (const MergedValue<Values>& source : sources) {
             Values other = values;
             source.change(other);
-            regions.push_back(changedLines(text, render(other, template_), source.origin));
+            regions.push_back(changedLines(text, render(other, brief), source.origin));
         }
-        if (template_ && !template_->empty()) {
+        if (brief && !brief->empty()) {
             regions.push_back(
-                changedBytes(text, render(values, otherText(*template_)), templateOrigin()));
+                changedBytes(text, render(values, otherText(*brief)), templateOrigin()));
         }
         return writeGenerated(text, std::move(regions));
     }
@@ -69,16 +72,20 @@ public:
 private:
     static std::istringstream templateStream(const std::optional<std::string>& content);
 
+    /// The first byte of the template; nothing of an empty one, and none where there is none.
+    std::optional<std::string> briefTemplate() const;
     Origin templateOrigin() const;
     Output begin() const;
     Output keep() const;
+    /// `text` and `regions` are those of the brief template.
     Output writeGenerated(const std::string& text, std::vector<ValueRegion> regions);
     Output installStock(MergeDecision decision);
 
-    PlannedFiles* files_ = nullptr;
-    AccessoryFile file_{};
-    bool isOutputOpen_ = false;
+    PlannedFiles& files_;
+    AccessoryFile file_;
+    bool isOutputOpen_;
     std::optional<std::string> template_; ///< its content, if it can be opened
+    const PlannedMerge* iap2_ = nullptr;
 };
 
 } // namespace orvane::desk

@@ -12,16 +12,15 @@ namespace orvane::desk {
 
 namespace {
 
-/// The number, from 1, of the line that gives `key` its final value; 0 when none does.
-std::size_t lineOf(const std::string& path, const std::string& key) {
+/// The number, from 1, of the last line that gives `key` the value that it has in `record`; 0 when
+/// none does.
+std::size_t lineOf(const std::string& path, const std::string& key, const Inf_Data& record) {
     std::ifstream file(path);
-    Inf_Data record;
     std::size_t found = 0;
     std::string line;
     for (std::size_t number = 1; std::getline(file, line); ++number) {
         Inf_Data alone;
         addInfLine(line, alone);
-        addInfLine(line, record);
         if (alone.count(key) != 0 && infValue(alone, key) == infValue(record, key)) {
             found = number;
         }
@@ -79,7 +78,7 @@ Origin versionTextOrigin(const VersionFiles& versions) {
     const VersionFile& file = versions.files[*versions.chosen];
     Origin origin{{Reason::fromVersionFile},
                   kit::fileKey(file.path),
-                  VersionPlace{file.path, lineOf(file.path, VERSION_KEY), VERSION_KEY,
+                  VersionPlace{file.path, lineOf(file.path, VERSION_KEY, file.record), VERSION_KEY,
                                infValue(file.record, VERSION_KEY)}};
     const std::string text = versionText(file.record);
     if (text.empty()) {

@@ -37,10 +37,12 @@ std::string profileMeaning(std::int32_t profile) {
         return "no audio profile";
     }
     std::string meaning = "audio profile " + std::to_string(profile);
-    const char* separator = ", generated from tuning blocks ";
-    for (const TuningOutput& output : tuningOutputsFor(profile)) {
-        meaning += separator + std::to_string(output.blockId);
-        separator = " and ";
+    if (asksForTuning(profile)) {
+        const char* separator = ", generated from tuning blocks ";
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            meaning += separator + std::to_string(output.blockId);
+            separator = " and ";
+        }
     }
     return meaning;
 }

@@ -55,8 +55,10 @@ VersionFileListing::~VersionFileListing() {
 }
 
 bool VersionFileListing::next(std::string& path) {
-    const dirent* entry = nullptr;
-    while (isOpen() && (entry = readdir(folder_)) != nullptr) {
+    if (!isOpen()) {
+        return false;
+    }
+    while (const dirent* entry = readdir(folder_)) {
         path = std::string(VERSION_DIR) + entry->d_name;
         if (isVersionFile(path)) {
             return true;

@@ -22,8 +22,10 @@ constexpr char VERSION_DIR[] = "/fs/rwdata/.Version/";
 constexpr char TYPE_KEY[] = "Type";
 constexpr char VERSION_KEY[] = "Version Number";
 
-/// The "Type" of the application contains the one; the other stands for a missing version.
+/// The "Type" of the application contains this.
 constexpr char APPLICATION_TYPE[] = "Application";
+
+/// Stands for a missing version.
 constexpr char NO_VERSION[] = "N/A";
 
 /// Between the components of a version.

@@ -5,8 +5,6 @@
 #include "config/param_access.h"
 #include "tuning/tuning_file.h"
 
-#include <iterator>
-
 namespace orvane {
 
 namespace {
@@ -35,15 +33,16 @@ std::int32_t readAudioProfile() {
     return isRead ? profile : NO_AUDIO_PROFILE;
 }
 
-TuningOutputRange tuningOutputsFor(std::int32_t profile) {
-    const TuningOutput* const first = std::begin(TUNING_OUTPUTS);
-    return {first, profile == AUDIO_PROFILE_GENERATED ? std::end(TUNING_OUTPUTS) : first};
+bool asksForTuning(std::int32_t profile) {
+    return profile == AUDIO_PROFILE_GENERATED;
 }
 
 std::int32_t getAudioProfile() {
     const std::int32_t profile = readAudioProfile();
-    for (const TuningOutput& output : tuningOutputsFor(profile)) {
-        generate(output);
+    if (asksForTuning(profile)) {
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            generate(output);
+        }
     }
     return profile;
 }

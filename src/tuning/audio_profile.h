@@ -12,7 +12,7 @@ namespace orvane {
 constexpr std::uint16_t AUDIO_PROFILE_PARAM = 134;
 /// The profile that asks for tuning generated on the unit.
 constexpr std::uint16_t AUDIO_PROFILE_GENERATED = 0xFFFF;
-/// What getAudioProfile gives when the profile is unknown.
+/// What readAudioProfile gives when the profile is unknown.
 constexpr std::int32_t NO_AUDIO_PROFILE = -1;
 
 constexpr char TELEPHONY_TUNING_FILE[] = "/tmp/telephony_FFFF.txt";
@@ -35,21 +35,11 @@ constexpr TuningOutput TUNING_OUTPUTS[] = {
 /// on every path.
 std::int32_t readAudioProfile();
 
-/// Some of TUNING_OUTPUTS, one after the other.
-struct TuningOutputRange {
-    const TuningOutput* first;
-    const TuningOutput* last; ///< behind the last one
+/// Whether `profile`, as readAudioProfile gives it, asks for TUNING_OUTPUTS.
+bool asksForTuning(std::int32_t profile);
 
-    const TuningOutput* begin() const { return first; }
-    const TuningOutput* end() const { return last; }
-};
-
-/// What `profile`, as readAudioProfile gives it, asks for: all of TUNING_OUTPUTS for
-/// AUDIO_PROFILE_GENERATED, else none.
-TuningOutputRange tuningOutputsFor(std::int32_t profile);
-
-/// readAudioProfile. It first writes what the profile asks for; whether that could be written does
-/// not matter to the result.
+/// readAudioProfile. Where the profile asks for them, it first writes TUNING_OUTPUTS; whether they
+/// could be written does not matter to the result.
 std::int32_t getAudioProfile();
 
 } // namespace orvane

@@ -68,8 +68,8 @@ bool isTuningBlock(std::int32_t blockId) {
 
 DpsArea readTuningBlocks() {
     DpsArea area{};
-    readTuningArea(area.data(),
-                   sizeof area); // the result is not looked at: what can't be read stays zero
+    // The result is not looked at, on purpose: what can't be read stays zero.
+    readTuningArea(area.data(), sizeof area);
     return area;
 }
 

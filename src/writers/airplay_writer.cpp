@@ -53,9 +53,8 @@ int updateAirplayConfigFile() {
     readVehicleValues(values);
     values.audioProfile = getAudioProfile();
 
-    TemplateMerge merge;
-    merge.open(AIRPLAY_FILE);
-    merge.finish(AIRPLAY_FILE, generateAirplayFile(merge.templateFile, merge.output, values));
+    TemplateMerge merge(AIRPLAY_FILE);
+    merge.finish(generateAirplayFile(merge.templateFile, merge.output, values));
     return 0;
 }
 

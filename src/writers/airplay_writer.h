@@ -24,7 +24,7 @@ struct AirplayValues {
     std::int32_t audioProfile = NO_AUDIO_PROFILE; ///< NO_AUDIO_PROFILE leaves its lines out
 };
 
-/// Reads everything but the audio profile, whose reading may write files of its own.
+/// Reads everything but the audio profile: getAudioProfile, which comes after it, writes files.
 void readVehicleValues(AirplayValues& values);
 
 /// Writes the generated head, which comes before the template.

@@ -33,8 +33,9 @@ void writeIap1Head(std::ostream& file, const IapValues& values) {
     file << "rfcert=00000000 \n\n"; // the blank is there on purpose
 }
 
-MergeDecision generateIap2File(std::istream& templateFile, std::ostream& output,
-                               const std::ios& /*iap2Output*/, const IapValues& values) {
+/// The lines that both iAP2 files have.
+MergeDecision generateIap2Lines(std::istream& templateFile, std::ostream& output,
+                                const IapValues& values) {
     const MergeDecision decision = decideMerge(templateFile, output);
     if (decision == MergeDecision::generate) {
         writeIap2Head(output, values);
@@ -43,18 +44,38 @@ MergeDecision generateIap2File(std::istream& templateFile, std::ostream& output,
     return decision;
 }
 
-MergeDecision generateDeviceFile(std::istream& templateFile, std::ostream& output,
-                                 const std::ios& iap2Output, const IapValues& values) {
-    const MergeDecision decision = generateIap2File(templateFile, output, iap2Output, values);
+} // namespace
+
+void readIapValues(IapValues& values) {
+    getUnitSerial(values.serial);
+    getModelName(values.model);
+    values.firmwareVersion = findApplicationVersion();
+    // Read on every run and written nowhere, on purpose: none of the files carries a fuel type.
+    std::string fuelType;
+    getFuelType(fuelType);
+}
+
+void switchToVersionDigits(IapValues& values) {
+    values.firmwareVersion = softwareVersion();
+}
+
+MergeDecision generateIap2DeviceFile(std::istream& templateFile, std::ostream& output,
+                                     const IapValues& values) {
+    const MergeDecision decision = generateIap2Lines(templateFile, output, values);
     if (decision == MergeDecision::generate) {
         output << "\n[vehicle]\nenable=no\n\n";
     }
     return decision;
 }
 
-/// Tests the iAP2 output, then its own, and not its own template, on purpose. So a failed iAP2
-/// output (not opened, not written whole, or its template empty) makes this file its stock file,
-/// and a missing template leaves out the template's lines only.
+MergeDecision generateIap2File(std::istream& templateFile, std::ostream& output,
+                               const IapValues& values) {
+    return generateIap2Lines(templateFile, output, values);
+}
+
+// Tests the iAP2 output, then its own, and not its own template, on purpose. So a failed iAP2
+// output (not opened, not written whole, or its template empty) makes this file its stock file, and
+// a missing template leaves out the template's lines only.
 MergeDecision generateIap1File(std::istream& templateFile, std::ostream& output,
                                const std::ios& iap2Output, const IapValues& values) {
     if (iap2Output.fail()) {
@@ -68,43 +89,22 @@ MergeDecision generateIap1File(std::istream& templateFile, std::ostream& output,
     return MergeDecision::generate;
 }
 
-} // namespace
-
-// iap1.cfg alone carries the six digits.
-constexpr std::array<IapStage, IAP_STAGE_COUNT> IAP_STAGES = {{
-    {IAP2_DEVICE_FILE, false, generateDeviceFile},
-    {IAP2_FILE, false, generateIap2File},
-    {IAP1_FILE, true, generateIap1File},
-}};
-
-void readIapValues(IapValues& values) {
-    getUnitSerial(values.serial);
-    getModelName(values.model);
-    values.firmwareVersion = findApplicationVersion();
-    // Read on every run and written nowhere, on purpose: none of the files carries a fuel type.
-    std::string fuelType;
-    getFuelType(fuelType);
-}
-
-void changeIapValues(const IapStage& stage, IapValues& values) {
-    if (stage.hasVersionDigits) {
-        values.firmwareVersion = softwareVersion();
-    }
-}
-
 int updateIapConfigFiles() {
     IapValues values;
     readIapValues(values);
 
     // The streams of every stage live until the end, also those that a fallback leaves unwritten.
-    std::array<TemplateMerge, IAP_STAGE_COUNT> merges;
-    for (std::size_t i = 0; i < merges.size(); ++i) {
-        const IapStage& stage = IAP_STAGES[i];
-        changeIapValues(stage, values); // whatever became of the files before
-        merges[i].open(stage.file);
-        merges[i].finish(stage.file, stage.generate(merges[i].templateFile, merges[i].output,
-                                                    merges[IAP2_STAGE].output, values));
-    }
+    TemplateMerge device(IAP2_DEVICE_FILE);
+    device.finish(generateIap2DeviceFile(device.templateFile, device.output, values));
+
+    TemplateMerge iap2(IAP2_FILE);
+    iap2.finish(generateIap2File(iap2.templateFile, iap2.output, values));
+
+    // The switch comes whatever became of iap2.cfg.
+    switchToVersionDigits(values);
+
+    TemplateMerge iap1(IAP1_FILE);
+    iap1.finish(generateIap1File(iap1.templateFile, iap1.output, iap2.output, values));
     return 0;
 }
 

@@ -3,8 +3,6 @@
 
 #include "writers/template_merge.h"
 
-#include <array>
-#include <cstddef>
 #include <iosfwd>
 #include <string>
 
@@ -36,34 +34,23 @@ struct IapValues {
     std::string firmwareVersion; ///< a text in the two iAP2 files, six digits in the iAP1 file
 };
 
-/// One of the three files on its way.
-struct IapStage {
-    AccessoryFile file;
-
-    /// Whether the values carry the six digits of the version from this stage on.
-    bool hasVersionDigits;
-
-    /// Writes the generated lines and the template to `output`, if that is the decision; else
-    /// nothing. `iap2Output` is the output of IAP2_FILE.
-    MergeDecision (*generate)(std::istream& templateFile, std::ostream& output,
-                              const std::ios& iap2Output, const IapValues& values);
-};
-
-constexpr std::size_t IAP_STAGE_COUNT = 3;
-/// The place of IAP2_FILE among the stages.
-constexpr std::size_t IAP2_STAGE = 1;
-
-/// The stages in their order.
-extern const std::array<IapStage, IAP_STAGE_COUNT> IAP_STAGES;
-
-/// Reads the values of the first stage.
+/// Reads the values of the two iAP2 files.
 void readIapValues(IapValues& values);
 
-/// Makes the values of `stage` out of those of the stage before.
-void changeIapValues(const IapStage& stage, IapValues& values);
+/// Makes them the values of the iAP1 file, which alone carries the six digits of the version.
+void switchToVersionDigits(IapValues& values);
 
-/// Takes IAP_STAGES in their order: opens each file, and generates it or puts its stock file in its
-/// place. A stage that fails stops no later one. Always returns 0.
+/// Write the generated lines and the template of a file to `output`, if that is the decision; else
+/// nothing. `iap2Output` is the output of IAP2_FILE.
+MergeDecision generateIap2DeviceFile(std::istream& templateFile, std::ostream& output,
+                                     const IapValues& values);
+MergeDecision generateIap2File(std::istream& templateFile, std::ostream& output,
+                               const IapValues& values);
+MergeDecision generateIap1File(std::istream& templateFile, std::ostream& output,
+                               const std::ios& iap2Output, const IapValues& values);
+
+/// Writes IAP2_DEVICE_FILE, IAP2_FILE and IAP1_FILE, in this order, each generated or replaced by
+/// its stock file. A stage that fails stops no later one. Always returns 0.
 int updateIapConfigFiles();
 
 } // namespace orvane

@@ -14,7 +14,7 @@ std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-v
 
 /// The buffer comes first: a file stream takes one only before its first use, if at all.
 template <typename FileStream, std::size_t SIZE>
-void openFile(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
+void open(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
     stream.rdbuf()->pubsetbuf(buffer.data(), SIZE);
     stream.open(path);
 }
@@ -32,9 +32,10 @@ void copyBytes(std::istream& source, std::ostream& output) {
     output << source.rdbuf();
 }
 
-void TemplateMerge::open(const AccessoryFile& file) {
-    openFile(output, outputBuffer, file.output);
-    openFile(templateFile, InputBuffer, file.templateFile);
+// The buffer stays as it is: a stream writes it before it reads it. NOLINTNEXTLINE(*-member-init)
+TemplateMerge::TemplateMerge(const AccessoryFile& accessoryFile) : file(accessoryFile) {
+    open(output, outputBuffer, file.output);
+    open(templateFile, InputBuffer, file.templateFile);
 }
 
 void TemplateMerge::close() {
@@ -42,7 +43,7 @@ void TemplateMerge::close() {
     output.close();
 }
 
-void TemplateMerge::finish(const AccessoryFile& file, MergeDecision decision) {
+void TemplateMerge::finish(MergeDecision decision) {
     if (decision == MergeDecision::generate) {
         close();
     } else {
@@ -54,8 +55,8 @@ void installStockFile(const AccessoryFile& file) {
     OutputBuffer outputBuffer;
     std::ifstream stock;
     std::ofstream output;
-    openFile(stock, InputBuffer, file.stockFile);
-    openFile(output, outputBuffer, file.output);
+    open(stock, InputBuffer, file.stockFile);
+    open(output, outputBuffer, file.output);
     copyBytes(stock, output);
     stock.close();
     output.close();

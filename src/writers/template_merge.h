@@ -42,19 +42,17 @@ void copyBytes(std::istream& source, std::ostream& output);
 /// The streams of one merge. A stream that could not be opened is failed, and what is written to it
 /// is dropped.
 struct TemplateMerge {
-    /// Opens nothing.
-    TemplateMerge() = default;
-
     /// Opens the output for writing (created, or truncated at once), then the template for reading.
-    void open(const AccessoryFile& file);
+    explicit TemplateMerge(const AccessoryFile& accessoryFile);
 
     /// Closes the template, then the output. A close that fails leaves its stream failed.
     void close();
 
-    /// Ends the merge of `file` as decided: closes it, or puts the stock file in its place. The
-    /// streams of a file that was not generated stay open.
-    void finish(const AccessoryFile& file, MergeDecision decision);
+    /// Ends the merge as decided: closes it, or puts the stock file in its place. The streams of a
+    /// file that was not generated stay open.
+    void finish(MergeDecision decision);
 
+    AccessoryFile file;
     OutputBuffer outputBuffer;
     std::ofstream output;
     std::ifstream templateFile;

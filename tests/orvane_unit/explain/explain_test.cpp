@@ -11,6 +11,9 @@
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 
+#include <sys/stat.h>
+#include <sys/sysmacros.h>
+
 #include <algorithm>
 
 namespace orvane::test {

@@ -55,8 +55,7 @@ TEST_F(StockFileTest, IsCopiedByteForByte) {
 
 TEST_F(StockFileTest, UsesItsOwnStreams) {
     {
-        TemplateMerge merge;
-        merge.open(ACCESSORY_FILE);
+        const TemplateMerge merge(ACCESSORY_FILE);
         installStockFile(ACCESSORY_FILE);
         EXPECT_TRUE(merge.output.is_open());
         EXPECT_TRUE(merge.templateFile.is_open());

@@ -32,7 +32,7 @@ protected:
 
 /// A merge of ACCESSORY_FILE whose streams are open.
 struct OpenMerge : TemplateMerge {
-    OpenMerge() { open(ACCESSORY_FILE); }
+    OpenMerge() : TemplateMerge(ACCESSORY_FILE) {}
     MergeDecision decision() const { return decideMerge(templateFile, output); }
 };
 
