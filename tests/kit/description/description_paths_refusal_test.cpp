@@ -39,7 +39,7 @@ const DescriptionRefusal REFUSALS[] = {
                                "repeat and count, or path, or size and bytes"},
     {"[files]\n\"/x\" = { hex = 1 }\n",
      "unit.toml:2:16: hex in the content of /x must be a text in quotes, not 1"},
-    {"[files]\n\"/x\" = { hex = \"4\" }\n", "unit.toml:2:16: hex in the content of /x: hex takes "
+    {"[files]\n\"/x\" = { hex = \"4\" }\n", "unit.toml:2:16: hex in the content of /x: hex needs "
                                             "two digits a byte: \"4\" has an odd number"},
     {"[files]\n\"/x\" = { hex = \"41\", count = 1 }\n",
      "unit.toml:2:8: the content of /x must be given in one way: hex, or repeat and count, or "

@@ -157,7 +157,7 @@ TEST_F(EditTest, DiskThatIsTooShortIsRefused) {
                                     "bytes: it needs 1045504");
     EXPECT_EQ(refusalOf({"tuning.3.qwaSendGain=1"}),
               "tuning.3.qwaSendGain=1: the tuning area does not fit on a disk of 1044479 bytes: it "
-              "takes 1044480");
+              "needs 1044480");
 }
 
 TEST_F(EditTest, FolderThatTheKitDidNotMakeIsRefused) {

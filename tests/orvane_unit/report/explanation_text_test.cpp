@@ -74,7 +74,7 @@ TEST(ExplanationTextTest, OutcomeShowsItsReasons) {
               "  template-missing: the template can't be opened\n"
               "  stock-missing: the stock file can't be opened, so the output is left empty\n"
               "/tmp/x: kept\n"
-              "  output-not-openable: the output can't be opened for writing; what stands there "
+              "  output-not-openable: the output can't be opened for writing; what is there "
               "stays\n");
 }
 
