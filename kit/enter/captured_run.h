@@ -17,7 +17,7 @@ struct RunResult {
 
 /// Forks. The child has /dev/null as standard input, its two outputs are captured whole, and it
 /// calls `becomeProgram`, which executes a program or throws KitError; what that throws is thrown
-/// here. Returns when the child has ended and no process holds its outputs. Needs /proc.
+/// here. Returns when the child has ended: what its own children write later is left out.
 RunResult runCaptured(const std::function<void()>& becomeProgram);
 
 } // namespace orvane::kit
