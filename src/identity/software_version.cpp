@@ -114,8 +114,11 @@ VersionComponents versionComponents(const std::string& text) {
     // repeats the one before it, on purpose.
     const std::string fromSecond = after(text, COMPONENT_SEPARATOR);
     const std::string fromThird = after(fromSecond, COMPONENT_SEPARATOR);
-    return {{before(text, COMPONENT_SEPARATOR), before(fromSecond, COMPONENT_SEPARATOR),
-             before(fromThird, AFFIX_SEPARATOR)}};
+    VersionComponents components;
+    components[0] = before(text, COMPONENT_SEPARATOR);
+    components[1] = before(fromSecond, COMPONENT_SEPARATOR);
+    components[2] = before(fromThird, AFFIX_SEPARATOR);
+    return components;
 }
 
 std::int32_t componentNumber(const std::string& component) {
