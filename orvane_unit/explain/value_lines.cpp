@@ -45,12 +45,12 @@ std::size_t lineEnd(const std::string& text, std::size_t at) {
     return std::min(text.find('\n', at), text.size() - 1) + 1;
 }
 
-void addFixedLines(std::vector<Line>& lines, const std::string& text, std::size_t begin,
-                   std::size_t end) {
-    while (begin < end) {
-        const std::size_t next = std::min(lineEnd(text, begin), end);
-        lines.push_back({text.substr(begin, next - begin), fixedText()});
-        begin = next;
+void addFixedLines(std::vector<Line>& lines, const std::string& text, std::size_t from,
+                   std::size_t to) {
+    while (from < to) {
+        const std::size_t next = std::min(lineEnd(text, from), to);
+        lines.push_back({text.substr(from, next - from), fixedText()});
+        from = next;
     }
 }
 

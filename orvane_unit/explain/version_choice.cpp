@@ -30,7 +30,7 @@ std::size_t lineOf(const std::string& path, const std::string& key, const Inf_Da
 
 bool isNumeric(const std::string& component) {
     char* end = nullptr;
-    std::strtol(component.c_str(), &end, 10);
+    static_cast<void>(std::strtol(component.c_str(), &end, 10));
     return end != component.c_str();
 }
 
