@@ -1,13 +1,13 @@
 # SPDX-License-Identifier: Apache-2.0
-# For clang-tidy, which looks at the headers of the system and of the libraries again for every source:
-# that takes most of its time. The sources of a folder are one batch, read with one look at their
-# headers. Such a build is never run.
-option(ORVANE_BATCHES "Compile the sources of a folder as one, for clang-tidy" OFF)
+# Compilers, and clang-tidy still more, spend most of their time on the headers of the system and of the
+# libraries, again for each source. In a batch the sources of a folder are one, with one look at their
+# headers. That is for builds from nothing: after a change of one source its whole folder is compiled.
+set(ORVANE_BATCHES "" CACHE STRING "Targets whose sources are compiled a folder at a time")
 
 # orvane_batch_by_folder(TARGET [ALONE SOURCE...]): the sources of TARGET, but those that are to stay
 # alone, since they have a name of their own that another source of their folder has, too.
 function(orvane_batch_by_folder target)
-  if(NOT ORVANE_BATCHES)
+  if(NOT target IN_LIST ORVANE_BATCHES)
     return()
   endif()
   cmake_parse_arguments(PARSE_ARGV 1 given "" "" ALONE)
@@ -21,9 +21,10 @@ function(orvane_batch_by_folder target)
   endforeach()
   set_source_files_properties(${given_ALONE} PROPERTIES SKIP_UNITY_BUILD_INCLUSION ON)
   set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
-  # The static analyzer follows what a batch includes only when it is told to.
-  target_compile_options(${target} PRIVATE "SHELL:-Xclang -analyzer-opt-analyze-headers")
-  # The checks for a batch are looked up where the batch lies.
+  # GCC takes what is included for a header, where a class of an unnamed namespace would be another one
+  # for each source. clang-tidy sees to those.
+  target_compile_options(${target} PRIVATE $<$<CXX_COMPILER_ID:GNU>:-Wno-subobject-linkage>)
+  # The checks of clang-tidy for a batch are looked up where the batch lies.
   if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/.clang-tidy)
     configure_file(.clang-tidy .clang-tidy COPYONLY)
   endif()
