@@ -14,7 +14,6 @@
 #include <cstdint>
 #include <filesystem>
 #include <map>
-#include <memory>
 #include <string>
 #include <string_view>
 #include <utility>

@@ -10,7 +10,6 @@
 #include <fcntl.h>
 #include <unistd.h>
 
-#include <memory>
 #include <set>
 #include <sstream>
 #include <system_error>

@@ -18,7 +18,6 @@
 #include <cstddef>
 #include <fstream>
 #include <map>
-#include <memory>
 #include <optional>
 #include <sstream>
 #include <system_error>

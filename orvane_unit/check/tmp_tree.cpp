@@ -2,6 +2,7 @@
 #include "orvane_unit/check/tmp_tree.h"
 
 #include "kit/enter/entered_root.h"
+#include "kit/host/bytes.h"
 #include "kit/host/tree_entries.h"
 #include "kit/host/whole_file.h"
 #include "main/unit_files.h"

@@ -4,7 +4,6 @@
 #include <dtl/dtl.hpp>
 
 #include <algorithm>
-#include <memory>
 #include <type_traits>
 
 namespace orvane::desk {

@@ -2,10 +2,12 @@
 #include "orvane_unit/explain/explain.h"
 
 #include "identity/vehicle_identity.h"
+#include "kit/description/value_key.h"
 #include "kit/enter/entered_root.h"
 #include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
 #include "orvane_unit/explain/planned_merge.h"
+#include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/value_lines.h"
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
@@ -17,11 +19,14 @@
 
 #include <unistd.h>
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <sstream>
 #include <stdexcept>
 #include <utility>
+#include <variant>
 #include <vector>
 
 namespace orvane::desk {

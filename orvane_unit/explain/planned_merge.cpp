@@ -1,9 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/planned_merge.h"
 
-#include "writers/iap_writer.h"
+#include "kit/description/value_key.h"
+#include "orvane_unit/explain/place.h"
+#include "orvane_unit/explain/reasons.h"
 
 #include <utility>
+#include <variant>
 
 namespace orvane::desk {
 

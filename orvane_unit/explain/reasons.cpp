@@ -4,6 +4,7 @@
 #include "identity/software_version.h"
 #include "tuning/audio_profile.h"
 #include "writers/iap_writer.h"
+#include "writers/template_merge.h"
 
 namespace orvane::desk {
 

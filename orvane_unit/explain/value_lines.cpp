@@ -7,6 +7,7 @@
 #include <iterator>
 #include <stdexcept>
 #include <utility>
+#include <variant>
 
 namespace orvane::desk {
 

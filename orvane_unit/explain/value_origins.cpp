@@ -3,11 +3,13 @@
 
 #include "config/boot_disk.h"
 #include "config/config_store.h"
-#include "config/param_catalogue.h"
 #include "config/record_area.h"
 #include "config/record_slots.h"
 #include "identity/model_names.h"
 #include "identity/vehicle_identity.h"
+#include "kit/description/value_key.h"
+#include "kit/description/value_places.h"
+#include "orvane_unit/explain/place.h"
 #include "tuning/tuning_file.h"
 
 #include <fcntl.h>
@@ -16,6 +18,8 @@
 
 #include <array>
 #include <cstddef>
+#include <variant>
+#include <vector>
 
 namespace orvane::desk {
 
@@ -26,19 +30,10 @@ std::uint64_t diskOffset(std::int64_t bytesBeforeEnd) {
 }
 
 /// The bytes of a value in an image; none when the image ends before them.
-std::optional<std::string> imageBytes(const Image& image, const ParamDescriptor& row) {
-    const std::uint32_t size = paramTypeSize(row.type);
-    return row.offset + size <= image.bytes.size()
-               ? std::optional<std::string>(image.bytes.substr(row.offset, size))
+std::optional<std::string> imageBytes(const Image& image, const kit::ParamPlace& place) {
+    return place.offset + place.size <= image.bytes.size()
+               ? std::optional<std::string>(image.bytes.substr(place.offset, place.size))
                : std::nullopt;
-}
-
-/// An existing parameter.
-ParamDescriptor rowOf(std::uint16_t number) {
-    ParamDescriptor row{};
-    std::int32_t index = 0;
-    lookupParam(number, index, row);
-    return row;
 }
 
 } // namespace
@@ -88,12 +83,12 @@ Origin paramOrigin(const Image& image, std::uint16_t number) {
     if (image.reason != Reason::fromImage) {
         return origin;
     }
-    const ParamDescriptor row = rowOf(number);
-    if (const std::optional<std::string> bytes = imageBytes(image, row)) {
-        origin.place = ImagePlace{row.offset, *bytes};
+    const kit::ParamPlace place = kit::paramPlace(number);
+    if (const std::optional<std::string> bytes = imageBytes(image, place)) {
+        origin.place = ImagePlace{place.offset, *bytes};
     } else {
         origin.reasons = {Reason::imageTooShort};
-        origin.place = BehindImage{row.offset, image.bytes.size()};
+        origin.place = BehindImage{place.offset, image.bytes.size()};
     }
     return origin;
 }
@@ -109,16 +104,14 @@ Origin modelOrigin(const Image& image) {
 
 Origin serialOrigin() {
     Origin origin{{Reason::fromRecord}, kit::slotKey(SERIAL_RECORD_SLOT), NoPlace()};
-    std::uint32_t size = 0;
-    std::uint64_t offset = 0;
-    recordSlotLayout(SERIAL_RECORD_SLOT, size, offset);
-    const std::int64_t bytesBeforeEnd = RECORD_AREA_SIZE - static_cast<std::int64_t>(offset);
+    const kit::SlotPlace slot = kit::slotPlace(SERIAL_RECORD_SLOT);
+    const std::int64_t bytesBeforeEnd = RECORD_AREA_SIZE - static_cast<std::int64_t>(slot.offset);
     if (const std::optional<Reason> trouble = diskTrouble(bytesBeforeEnd)) {
         origin.reasons = {*trouble};
         return origin;
     }
-    std::string record(size, '\0');
-    readRecordSlot(SERIAL_RECORD_SLOT, record.data(), size);
+    std::string record(slot.size, '\0');
+    readRecordSlot(SERIAL_RECORD_SLOT, record.data(), slot.size);
     std::string serial;
     getUnitSerial(serial);
     if (serial.empty()) {

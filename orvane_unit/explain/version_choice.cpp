@@ -2,9 +2,12 @@
 #include "orvane_unit/explain/version_choice.h"
 
 #include "identity/software_version.h"
+#include "kit/description/value_key.h"
+#include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <fstream>
 

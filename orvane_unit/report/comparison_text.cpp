@@ -5,7 +5,6 @@
 #include "kit/host/text.h"
 #include "kit/unit/unit_values.h"
 #include "orvane_unit/compare/text_diff.h"
-#include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"

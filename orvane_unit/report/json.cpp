@@ -24,7 +24,6 @@
 #include <map>
 #include <optional>
 #include <set>
-#include <utility>
 
 namespace orvane::desk {
 

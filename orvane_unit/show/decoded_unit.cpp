@@ -19,7 +19,6 @@
 #include <sys/stat.h>
 
 #include <cstddef>
-#include <memory>
 #include <utility>
 
 namespace orvane::desk {
