@@ -37,9 +37,9 @@ bool isNumeric(const std::string& component) {
     return end != component.c_str();
 }
 
-bool fitsOneByte(const std::string& component) {
-    const std::int32_t number = componentNumber(component);
-    return number >= 0 && number <= 0xFF;
+/// Whether the digits that are written for a component have its number.
+bool keepsItsNumber(const std::string& component) {
+    return std::stoll(formatVersionByte(component), nullptr, 16) == componentNumber(component);
 }
 
 /// Whether a component appended to `version` would count.
@@ -106,7 +106,7 @@ Origin versionDigitsOrigin(const VersionFiles& versions) {
     if (!std::all_of(components.begin(), components.end(), isNumeric)) {
         faults.push_back(Reason::versionNotNumeric);
     }
-    if (!std::all_of(components.begin(), components.end(), fitsOneByte)) {
+    if (!std::all_of(components.begin(), components.end(), keepsItsNumber)) {
         faults.push_back(Reason::versionOutOfRange);
     }
     if (!faults.empty()) {
