@@ -43,7 +43,7 @@ public:
     Output finish(const Values& values, const std::vector<MergedValue<Values>>& sources,
                   const Generate& generate) {
         const MergeDecision decision = generate(templateFile, output, values);
-        if (decision != MergeDecision::generate) {
+        if (needsStockFile(decision)) {
             return installStock(decision);
         }
         // A template is only copied, so a short one shows as well which bytes are whose.

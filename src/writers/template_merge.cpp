@@ -28,6 +28,10 @@ MergeDecision decideMerge(const std::ios& templateFile, const std::ios& output) 
     return output.fail() ? MergeDecision::outputFailed : MergeDecision::generate;
 }
 
+bool needsStockFile(MergeDecision decision) {
+    return decision != MergeDecision::generate;
+}
+
 void copyBytes(std::istream& source, std::ostream& output) {
     output << source.rdbuf();
 }
@@ -44,10 +48,10 @@ void TemplateMerge::close() {
 }
 
 void TemplateMerge::finish(MergeDecision decision) {
-    if (decision == MergeDecision::generate) {
-        close();
-    } else {
+    if (needsStockFile(decision)) {
         installStockFile(file);
+    } else {
+        close();
     }
 }
 

@@ -35,6 +35,9 @@ enum class MergeDecision {
 /// The decision for a file that needs both its streams. The template is tested first.
 MergeDecision decideMerge(const std::ios& templateFile, const std::ios& output);
 
+/// Whether the stock file takes the place of a file for which this was decided.
+bool needsStockFile(MergeDecision decision);
+
 /// Appends all bytes of `source` to `output`. A source that yields none, being empty, absent or a
 /// folder, leaves the output failed: what is written afterwards is dropped.
 void copyBytes(std::istream& source, std::ostream& output);

@@ -99,6 +99,13 @@ TEST_F(TemplateMergeTest, CannotGenerateOnceAStreamHasFailed) {
     EXPECT_EQ(merge.decision(), MergeDecision::generate);
 }
 
+TEST_F(TemplateMergeTest, StockFileIsNeededUnlessTheFileIsGenerated) {
+    EXPECT_FALSE(needsStockFile(MergeDecision::generate));
+    EXPECT_TRUE(needsStockFile(MergeDecision::templateFailed));
+    EXPECT_TRUE(needsStockFile(MergeDecision::outputFailed));
+    EXPECT_TRUE(needsStockFile(MergeDecision::iap2Failed));
+}
+
 TEST_F(TemplateMergeTest, TemplateReadToItsEndStillCounts) {
     OpenMerge merge;
     merge.templateFile.setstate(std::ios::eofbit);
