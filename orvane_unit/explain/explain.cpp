@@ -94,10 +94,7 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
     const std::vector<MergedValue<AirplayValues>> sources = {
         {[](AirplayValues& v) { v.model = otherText(v.model); }, modelOrigin(image)},
         {[](AirplayValues& v) { v.brand = otherText(v.brand); }, paramOrigin(image, BRAND_PARAM)},
-        {[](AirplayValues& v) {
-             v.audioProfile = v.audioProfile == NO_AUDIO_PROFILE ? 0 : v.audioProfile ^ 1;
-         },
-         paramOrigin(image, AUDIO_PROFILE_PARAM)},
+        {[](AirplayValues& v) { v.audioProfile ^= 1; }, paramOrigin(image, AUDIO_PROFILE_PARAM)},
         {[](AirplayValues& v) { v.rightHandDrive ^= 1U; },
          paramOrigin(image, RIGHT_HAND_DRIVE_PARAM)},
     };
