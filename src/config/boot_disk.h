@@ -7,7 +7,7 @@ namespace orvane {
 
 constexpr char BOOT_DISK[] = "/dev/hd0";
 
-/// The raw boot disk, open for one transfer at a place that is counted from its end. Owns the
+/// The raw boot disk, open for one transfer at a position counted from its end. Owns the
 /// descriptor.
 class BootDisk {
 public:
@@ -20,11 +20,11 @@ public:
     bool isOpen() const { return descriptor_ != -1; }
 
     /// Goes to `bytesBeforeEnd` bytes before the end of the device. False when the device is
-    /// closed, or has no such place.
+    /// closed, or has no such position.
     bool seekFromEnd(std::int64_t bytesBeforeEnd) const;
 
-    /// One read or write of `length` bytes where the last seek went. False when it fails; a short
-    /// transfer is no failure.
+    /// One read or write of `length` bytes at the position of the last seek. False when it fails; a
+    /// short transfer is not a failure.
     bool read(void* buffer, std::uint32_t length) const;
     bool write(const void* buffer, std::uint32_t length) const;
 

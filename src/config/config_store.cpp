@@ -39,7 +39,7 @@ void ConfigStore::init() {
 
 std::int32_t ConfigStore::open() {
     // Composed and never used, on purpose: there is no file to fall back on, and an absent object
-    // means no configuration, whatever calibration file stands on the unit.
+    // means no configuration, even on a unit with a calibration file.
     static_cast<void>(composeCalibrationPath());
 
     const int opened = platform::openSharedMemory(CONFIG_SHM_NAME, O_RDONLY, SHM_MODE);
@@ -56,10 +56,10 @@ std::int32_t ConfigStore::open() {
     }
     const auto bytes = static_cast<std::size_t>(size);
     void* const mapped = mmap(nullptr, bytes, PROT_READ, MAP_PRIVATE, descriptor, 0);
-    // Stored even when it is the failure value: close hands that to munmap, which refuses it.
+    // Stored even when it is the failure value: close passes it to munmap, which refuses it.
     data = static_cast<const std::uint8_t*>(mapped);
-    // Linux refuses to map nothing. A system that does not would leave the getters without a byte
-    // to read, so a length of 0 counts as one that can't be mapped, whatever mmap says.
+    // Linux refuses to map 0 bytes. A system that maps them would leave the getters nothing to
+    // read, so length 0 counts as a failure, whatever mmap says.
     if (bytes == 0 || mapped == MAP_FAILED) {
         close();
         return STORE_NOT_MAPPED;

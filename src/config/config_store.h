@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // Read-only access to the vehicle configuration image, which another process of the unit publishes
-// as a shared-memory object. The bytes are mapped and not interpreted: layout and meaning are the
-// catalogue's (param_catalogue.h).
+// as a shared-memory object. The bytes are mapped, not interpreted: the catalogue
+// (param_catalogue.h) has their layout.
 #pragma once
 
 #include <array>
@@ -17,19 +17,19 @@ constexpr char CONFIG_SHM_NAME[] = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"
 constexpr char CAL_FILE_DIR[] = "/fs/rwdata/CALS";
 constexpr char CAL_FILE_NAME[] = "cal_active.bin";
 
-/// The calibration file's path, with a NUL behind it. ConfigStore::open composes it and does
-/// nothing with it.
+/// The calibration file's path, with its NUL. ConfigStore::open composes it and never uses it.
 using CalibrationPath = std::array<char, sizeof CAL_FILE_DIR + sizeof CAL_FILE_NAME>;
 CalibrationPath composeCalibrationPath();
 
-/// What ConfigStore::open answers.
+/// What ConfigStore::open returns.
 enum ConfigStoreResult : std::int32_t {
     STORE_OPENED = 0,
-    STORE_NOT_MAPPED = -1, ///< the object is there, and can't be mapped
-    STORE_NOT_FOUND = -2,  ///< the object can't be opened, or not measured
+    STORE_NOT_MAPPED = -1, ///< the object exists but can't be mapped
+    STORE_NOT_FOUND = -2,  ///< the object can't be opened or measured
 };
 
-/// The handle on the mapped image: init, open, one getter, close. It owns descriptor and mapping.
+/// The handle on the mapped image: init, open, one getter, close. It owns the descriptor and the
+/// mapping.
 struct ConfigStore {
     std::int32_t descriptor = -1;       ///< of the shared-memory object; -1 when closed
     const std::uint8_t* data = nullptr; ///< the mapped bytes; null when nothing is mapped
@@ -43,11 +43,10 @@ struct ConfigStore {
     /// Puts the handle into the closed state without releasing anything.
     void init();
 
-    /// Maps the object as it stands; nothing in it is validated.
-    /// Returns a ConfigStoreResult. STORE_NOT_FOUND: the object can't be opened (handle untouched)
-    /// or not measured (the descriptor stays in the handle until close). STORE_NOT_MAPPED, for an
-    /// empty object, too: the handle is closed. An open handle must not be opened again: what it
-    /// held would leak.
+    /// Maps the object and validates nothing in it. Returns a ConfigStoreResult. STORE_NOT_FOUND:
+    /// the object can't be opened (the handle is untouched) or measured (the descriptor stays in
+    /// the handle until close). STORE_NOT_MAPPED, also for an empty object: the handle is closed.
+    /// Don't open an open handle: what it holds would leak.
     std::int32_t open();
 
     /// Releases what is held. Safe on a closed handle and safe to repeat. `length` keeps its value.

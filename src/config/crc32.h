@@ -14,7 +14,7 @@ constexpr std::uint32_t CRC32_INITIAL = 0xFFFFFFFFU;
 /// The register's change for each low byte: 256 words of constant data.
 extern const std::array<std::uint32_t, 256> CRC32_TABLE;
 
-/// The register `crc` after one more byte. The final complement is the caller's business.
+/// The register `crc` after one more byte. The final complement is left to the caller.
 std::uint32_t crc32Step(std::uint32_t crc, std::uint8_t byte);
 
 } // namespace orvane

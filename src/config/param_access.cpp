@@ -12,7 +12,7 @@ namespace {
 /// For `readParam`: any size that it can read.
 constexpr std::uint32_t ANY_SIZE = 0;
 
-/// The one read behind all getters, its checks in the order that decides which status wins.
+/// The read behind all getters. The order of its checks decides which status wins.
 ParamStatus readParam(const ConfigStore& store, std::uint16_t number, std::uint32_t wantedSize,
                       void* value) {
     std::int32_t index = 0;
@@ -27,8 +27,8 @@ ParamStatus readParam(const ConfigStore& store, std::uint16_t number, std::uint3
     if (store.descriptor == -1 || store.data == nullptr) {
         return PARAM_STORE_NOT_OPEN;
     }
-    // Not checked against store.length, on purpose: the catalogue defines the layout. A short image
-    // is read from its mapping's page as it stands.
+    // Not checked against store.length, on purpose: the catalogue defines the layout. Past the end
+    // of a short image, the rest of its page is read.
     const std::uint8_t* bytes = store.data + descriptor.offset;
     if (size == 1) {
         std::memcpy(value, bytes, 1);
@@ -65,7 +65,7 @@ std::int32_t readAllParams(ConfigStore& store, std::uint16_t* values, std::uint3
         return opened;
     }
     ParamStatus status = PARAM_OK;
-    // At the latest parameter 172 fails, so the 16-bit number never overflows.
+    // Parameter 172 fails at the latest, so the 16-bit number never overflows.
     for (std::uint16_t number = 1; number <= count && status == PARAM_OK; ++number) {
         values[number - 1] = 0; // a one-byte parameter fills the low half only
         status = getParam(store, number, &values[number - 1]);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The getters: the only way in which values leave the configuration image. None checks an offset
+// The getters: the only way to read values from the configuration image. None checks an offset
 // against the length of the image: the catalogue is trusted, on purpose.
 #pragma once
 
@@ -18,14 +18,14 @@ enum ParamStatus : std::uint32_t {
 };
 
 /// Reads parameter `number` of any supported size: one byte, or a 16-bit value that is
-/// little-endian in the image and arrives in this processor's order. `value` must have room for it.
-/// On any status but PARAM_OK, `value` is left as it was.
+/// little-endian in the image and is returned in the processor's order. `value` must have room for
+/// it. On any status but PARAM_OK, `value` is unchanged.
 ParamStatus getParam(const ConfigStore& store, std::uint16_t number, void* value);
 
-/// Reads a one-byte parameter; PARAM_WRONG_SIZE for any other. Else as getParam.
+/// Reads a one-byte parameter; PARAM_WRONG_SIZE for any other. Otherwise like getParam.
 ParamStatus getParamU8(const ConfigStore& store, std::uint16_t number, std::uint8_t* value);
 
-/// Reads a two-byte parameter; PARAM_WRONG_SIZE for any other. Else as getParam.
+/// Reads a two-byte parameter; PARAM_WRONG_SIZE for any other. Otherwise like getParam.
 ParamStatus getParamU16(const ConfigStore& store, std::uint16_t number, std::uint16_t* value);
 
 /// Opens `store` itself and reads parameters 1 to `count` into `values`, one 16-bit slot each (a

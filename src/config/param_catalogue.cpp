@@ -184,7 +184,7 @@ constexpr ParamTable ParamCatalogue = {
 // clang-format on
 
 static_assert(sizeof(ParamDescriptor) == 7 * sizeof(std::uint32_t), "a row is seven words");
-static_assert(sizeof(ParamTable) == 4824, "nothing lies between the sizes and the rows, nor after");
+static_assert(sizeof(ParamTable) == 4824, "the table has no padding");
 
 std::uint32_t paramTypeSize(ParamType type) {
     return type < ParamCatalogue.typeSizes.size() ? ParamCatalogue.typeSizes[type] : 1;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The vehicle configuration image is a packed array of bytes without any description of itself.
-// This catalogue is the description: parameter number -> type, group and byte offset.
+// The vehicle configuration image is a packed array of bytes that does not describe itself. This
+// catalogue is the description: parameter number -> type, group and byte offset.
 #pragma once
 
 #include <array>
@@ -17,11 +17,11 @@ constexpr std::size_t PARAM_TYPE_COUNT = 9;
 constexpr std::size_t PARAM_COUNT = 171;
 /// Bytes that the catalogue addresses, without gaps: the length of a whole image.
 constexpr std::uint32_t CONFIG_IMAGE_SIZE = 179;
-/// What `paramGroup` answers for an unknown number; real groups are 0 to 7.
+/// What `paramGroup` returns for an unknown number; real groups are 0 to 7.
 constexpr std::uint32_t NO_GROUP = 8;
 
-/// One row of the catalogue: seven 32-bit words. Only the first four are consulted here; the others
-/// belong to the process that writes the image and are carried as issued.
+/// One row of the catalogue: seven 32-bit words. Only the first four are used here; the others
+/// belong to the process that writes the image and are kept as issued.
 struct ParamDescriptor {
     std::uint32_t number; ///< 1 to 171, the row's position + 1
     ParamType type;       ///< index into the sizes below
@@ -45,13 +45,13 @@ std::uint32_t paramTypeSize(ParamType type);
 
 /// Copies the row of parameter `number` to `descriptor`, its index (number - 1) to `index`, and
 /// returns 0. For an unknown number (0, 172 and over) returns 1, sets `index` to -1 and leaves
-/// `descriptor` as it was.
+/// `descriptor` unchanged.
 std::uint32_t lookupParam(std::uint16_t number, std::int32_t& index, ParamDescriptor& descriptor);
 
 /// Group of parameter `number`, 0 to 7, or NO_GROUP when the number is unknown.
 std::uint32_t paramGroup(std::uint16_t number);
 
-/// The catalogue's answer about one parameter, without any image.
+/// What the catalogue says about one parameter.
 struct ParamInfo {
     std::uint16_t number;
     std::uint16_t type; ///< type code
@@ -59,7 +59,7 @@ struct ParamInfo {
     std::uint16_t group;
 };
 
-/// Fills `info` and returns 0; returns 1 and leaves `info` as it was when the number is unknown.
+/// Fills `info` and returns 0; returns 1 and leaves `info` unchanged when the number is unknown.
 std::uint32_t describeParam(std::uint16_t number, ParamInfo& info);
 
 } // namespace orvane

@@ -30,7 +30,7 @@ constexpr std::array<RecordSlot, RECORD_SLOT_COUNT> RECORD_SLOTS = {{
     {  1, 2187}, // 12
     {  1, 2188}, // 13
     {  1, 2189}, // 14
-    {136,    1}, // 15: slots 1 to 9 once more as one block, on purpose; the CRC is taken over it
+    {136,    1}, // 15: slots 1 to 9 again as one block, on purpose: the range of the CRC
     { 24, 2190}, // 16
     {  2, 2214}, // 17
 }};

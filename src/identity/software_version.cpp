@@ -42,7 +42,7 @@ std::string after(const std::string& text, char separator) {
 } // namespace
 
 bool isVersionFile(const std::string& path) {
-    // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old are taken, too.
+    // Anywhere in the name, on purpose, not only at its end: a.info and b.inf.old match, too.
     return path.find(INF_MARKER) != std::string::npos;
 }
 
@@ -68,7 +68,7 @@ bool VersionFileListing::next(std::string& path) {
 }
 
 bool isApplication(const Inf_Data& record) {
-    // A substring test, on purpose: a type of MainApplication is taken, too.
+    // A substring test, on purpose: a type of MainApplication matches, too.
     return infValue(record, TYPE_KEY).find(APPLICATION_TYPE) != std::string::npos;
 }
 
@@ -96,7 +96,7 @@ std::string findApplicationVersion() {
         return application == InfRecords.size() ? std::string()
                                                 : versionText(InfRecords[application]);
     } catch (...) {
-        return {}; // files that memory can't hold are files that can't be read
+        return {}; // files too large for memory count as unreadable
     }
 }
 
@@ -110,8 +110,8 @@ std::string formatVersion(const std::string& text) {
 }
 
 VersionComponents versionComponents(const std::string& text) {
-    // `after` gives the whole text again when there is no separator left: so a missing component
-    // repeats the one before it, on purpose.
+    // `after` returns the whole text when no separator is left, so a missing component repeats the
+    // one before it, on purpose.
     const std::string fromSecond = after(text, COMPONENT_SEPARATOR);
     const std::string fromThird = after(fromSecond, COMPONENT_SEPARATOR);
     VersionComponents components;

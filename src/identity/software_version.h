@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The version of the unit's application software, out of the version description files.
+// The version of the unit's application software, from the version description files.
 #pragma once
 
 #include "identity/inf_file.h"
@@ -34,7 +34,7 @@ constexpr char COMPONENT_SEPARATOR = '.';
 /// What softwareVersion gives when there is no usable version.
 constexpr char DEFAULT_SOFTWARE_VERSION[] = "000000";
 
-/// Whether the file at `path` is a version description file: ".inf" may stand anywhere in it.
+/// Whether the file at `path` is a version description file: ".inf" may be anywhere in it.
 bool isVersionFile(const std::string& path);
 
 /// The version description files of VERSION_DIR, one by one, in the order of the directory listing.
@@ -45,7 +45,7 @@ public:
     VersionFileListing(const VersionFileListing&) = delete;
     VersionFileListing& operator=(const VersionFileListing&) = delete;
 
-    /// Whether there is such a folder.
+    /// Whether the folder could be opened.
     bool isOpen() const { return folder_ != nullptr; }
 
     /// Sets `path` to the next file. False at the end, and at once without a folder; `path` is then
@@ -59,32 +59,32 @@ private:
 /// Whether `record` describes the application: its "Type" contains "Application".
 bool isApplication(const Inf_Data& record);
 
-/// The place in `records` of the application: the first; records.size() when there is none.
+/// The index in `records` of the first application; records.size() when there is none.
 std::size_t chooseApplication(const std::vector<Inf_Data>& records);
 
-/// The "Version Number" of `record` behind its first "_", or all of it when it has none; the empty
-/// string when there is none.
+/// The "Version Number" of `record` after its first "_", or all of it when it has no "_"; the empty
+/// string when there is no such key.
 std::string versionText(const Inf_Data& record);
 
-/// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out. Where
-/// even a short string needs memory (GCC before 5), std::bad_alloc may leave it then.
+/// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out; where
+/// even that short string needs memory (GCC before 5), it may throw std::bad_alloc.
 std::string softwareVersion();
 
-/// Scans VERSION_DIR afresh and returns the versionText of the application: the first in the order
-/// of the directory listing. The empty string when there is no such file, value or folder, or when
-/// memory runs out.
+/// Scans VERSION_DIR and returns the versionText of the application: the first in the order of the
+/// directory listing. The empty string when there is no such file, value or folder, or when memory
+/// runs out.
 std::string findApplicationVersion();
 
-/// The versionComponents of a version text, two hexadecimal digits each; "000000" for an empty text
-/// and for "N/A". "1.2" gives "010202".
+/// The versionComponents of a version text, at least two hexadecimal digits each; "000000" for an
+/// empty text and for "N/A". "1.2" gives "010202".
 std::string formatVersion(const std::string& text);
 
 /// The first three components of a version text. A missing one repeats the one before it.
 using VersionComponents = std::array<std::string, 3>;
 VersionComponents versionComponents(const std::string& text);
 
-/// The decimal number at the start of `component`; 0 if there is none. A number past the range of a
-/// 32-bit integer counts as the nearest one in it.
+/// The decimal number at the start of `component`; 0 if there is none. A number outside the range
+/// of a 32-bit integer counts as the nearest one in it.
 std::int32_t componentNumber(const std::string& component);
 
 /// The number of `component` modulo 256 in lower-case hexadecimal of at least two digits. The

@@ -13,7 +13,7 @@ namespace orvane {
 
 namespace {
 
-/// The value of a one-byte parameter; 0 when it can't be had, so that a missing image and a stored
+/// The value of a one-byte parameter; 0 when it can't be read, so that a missing image and a stored
 /// 0 give the same result everywhere.
 std::uint8_t paramOrZero(std::uint16_t number) {
     std::uint8_t value = 0;

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The display values of the vehicle and of the unit. Each lookup opens its source, reads one value
-// and closes the source again; none fails towards its caller: where the source is missing or the
-// value unknown, it yields a default like any other value. Where even a short string needs memory
-// (GCC before 5), std::bad_alloc may leave one when there is none.
+// and closes the source. None reports a failure: where the source is missing or the value unknown,
+// it gives a default. Where even a short string needs memory (GCC before 5), a lookup may throw
+// std::bad_alloc.
 #pragma once
 
 #include <cstdint>

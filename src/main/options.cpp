@@ -9,14 +9,14 @@ namespace orvane {
 
 namespace {
 
-/// Runs one writer. All that can come out of one is that memory ran out where no default stands in:
-/// the writer ends there, as silently as after any other failure, and the next option runs.
+/// Runs one writer. It throws only if memory runs out where no default can be used: it then ends,
+/// as silently as after any other failure, and the next option runs.
 void run(Writer writer) {
     try {
         writer();
     } catch (...) { // NOLINT(bugprone-empty-catch) GCOVR_EXCL_LINE
-        // Nothing is reported, on purpose. What leads here are streams that need memory before
-        // they are opened (libc++), and strings that need it however short they are (GCC before 5).
+        // Nothing is reported, on purpose. The causes are streams that need memory before they are
+        // opened (libc++), and strings that need it even when short (GCC before 5).
     }
 }
 

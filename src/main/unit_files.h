@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Every path of a unit that a run opens, for whoever makes, copies or shows a unit.
+// Every path of a unit that a run opens, for code that makes, copies or shows a unit.
 #pragma once
 
 #include "config/boot_disk.h"

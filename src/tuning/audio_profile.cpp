@@ -14,7 +14,7 @@ void generate(const TuningOutput& output) {
     try {
         generateTuningFile(output.blockId, output.path);
     } catch (...) { // NOLINT(bugprone-empty-catch)
-        // The profile stands whether or not its files could be written, on purpose.
+        // The profile counts whether or not its files could be written, on purpose.
     }
 }
 

@@ -31,15 +31,14 @@ constexpr TuningOutput TUNING_OUTPUTS[] = {
 };
 
 /// The value of AUDIO_PROFILE_PARAM, 0 to 65535 without any check, or NO_AUDIO_PROFILE when it
-/// can't be read, for whatever cause. Reads it through a handle of its own, which is closed again
-/// on every path.
+/// can't be read. Reads it through a handle of its own, which is closed on every path.
 std::int32_t readAudioProfile();
 
 /// Whether `profile`, as readAudioProfile gives it, asks for TUNING_OUTPUTS.
 bool asksForTuning(std::int32_t profile);
 
 /// readAudioProfile. Where the profile asks for them, it first writes TUNING_OUTPUTS; whether they
-/// could be written does not matter to the result.
+/// could be written does not affect the result.
 std::int32_t getAudioProfile();
 
 } // namespace orvane

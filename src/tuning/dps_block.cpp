@@ -67,7 +67,7 @@ constexpr std::array<QwaWord, 3> qwaModeWords = {{
 
 namespace {
 
-/// Two's complement, low byte first, whatever this processor's own order.
+/// Two's complement, low byte first, whatever the processor's own order.
 std::int32_t decodeI16(const std::uint8_t* bytes) {
     return static_cast<std::int16_t>(bytes[0] | bytes[1] << 8);
 }

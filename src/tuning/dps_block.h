@@ -26,7 +26,7 @@ struct DpsBlock {
 using DpsArea = std::array<DpsBlock, DPS_BLOCK_COUNT>;
 static_assert(sizeof(DpsArea) == DPS_AREA_SIZE, "blocks lie back to back");
 
-/// How a value is kept. Multi-byte values are little-endian.
+/// How a value is stored. Multi-byte values are little-endian.
 enum class DpsEncoding : std::uint8_t {
     code2, ///< two bits of one byte, 0 to 3
     u8,    ///< one byte, 0 to 255
@@ -41,15 +41,14 @@ enum class DpsKind : std::uint8_t {
     list,       ///< every element in decimal, each followed by one space
 };
 
-/// One field of a block. The fields stand in the order of their offsets, which is the order of the
-/// lines of a tuning file.
+/// One field of a block, which becomes one line of a tuning file.
 struct DpsField {
     const char* key;
     std::uint8_t offset; ///< of the first byte in the block
     std::uint8_t bit;    ///< code2: the lower bit of the pair, 0 for the least significant; else 0
     DpsEncoding encoding;
     DpsKind kind;
-    std::uint8_t count; ///< elements; 1 but for lists
+    std::uint8_t count; ///< elements; 1 except for lists
 };
 
 /// Bytes of one element; a code2 is part of one.
@@ -58,10 +57,10 @@ constexpr std::size_t dpsElementSize(DpsEncoding encoding) {
 }
 
 constexpr std::size_t DPS_FIELD_COUNT = 44;
-/// Characters of the longest line that a field can become in a tuning file, with its line end.
+/// The length of a field's longest possible line in a tuning file, with its line end.
 constexpr std::size_t DPS_LINE_MAX = 127;
 
-/// All fields of a block, in ascending order of their places.
+/// All fields of a block in ascending order of their positions, the order of a tuning file's lines.
 extern const std::array<DpsField, DPS_FIELD_COUNT> DPS_LAYOUT;
 
 /// The value of element `element` (0 to count - 1) of `field` in `block`: -32768 to 32767.

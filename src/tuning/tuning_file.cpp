@@ -14,7 +14,7 @@ namespace orvane {
 namespace {
 
 /// A line is built before it is written: the stream would look up its locale's digits for every
-/// number. No line is longer than its room; a test takes the longest from the layout.
+/// number. No line is longer than the array; a test computes the longest from the layout.
 struct Line {
     std::array<char, DPS_LINE_MAX> text;
     std::size_t length;
@@ -48,7 +48,7 @@ void appendValue(Line& line, const DpsBlock& block, const DpsField& field) {
     if (field.kind == DpsKind::list) {
         for (std::size_t element = 0; element < field.count; ++element) {
             append(line, decodeField(block, field, element));
-            append(line, ' '); // behind the last one, too
+            append(line, ' '); // after the last one, too
         }
         return;
     }
@@ -68,7 +68,7 @@ bool isTuningBlock(std::int32_t blockId) {
 
 DpsArea readTuningBlocks() {
     DpsArea area{};
-    // The result is not looked at, on purpose: what can't be read stays zero.
+    // The result is ignored, on purpose: what can't be read stays zero.
     readTuningArea(area.data(), sizeof area);
     return area;
 }
@@ -84,7 +84,7 @@ void writeTuningLine(std::ostream& file, const DpsField& field, const DpsBlock& 
 }
 
 void writeTuningText(std::ostream& file, std::int32_t blockId, const DpsBlock& block) {
-    // "Genereated" is spelled so on purpose, and every line is flushed on purpose.
+    // "Genereated", and the flush of every line, are on purpose.
     file << "; Genereated config from DPS (blockId " << blockId << ")" << std::endl;
     for (const DpsField& field : DPS_LAYOUT) {
         writeTuningLine(file, field, block);

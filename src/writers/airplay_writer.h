@@ -16,7 +16,7 @@ constexpr AccessoryFile AIRPLAY_FILE = {
     "/fs/mp/etc/airplay.conf",
 };
 
-/// What the generated head says of the vehicle.
+/// What the generated head says about the vehicle.
 struct AirplayValues {
     std::string model;
     std::string brand;

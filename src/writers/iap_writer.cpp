@@ -10,8 +10,8 @@ namespace orvane {
 
 namespace {
 
-/// The identity lines that open all three files. Values go out as C strings, on purpose: each ends
-/// at its first NUL byte.
+/// The identity lines that open all three files. Values are written as C strings, on purpose: each
+/// ends at its first NUL byte.
 void writeAccessoryBlock(std::ostream& file, const IapValues& values) {
     file << "# This section is mandatory.  Populate all fields with accessory-specific info.\n";
     file << "[accessory]\n";
@@ -73,7 +73,7 @@ MergeDecision generateIap2File(std::istream& templateFile, std::ostream& output,
     return generateIap2Lines(templateFile, output, values);
 }
 
-// Tests the iAP2 output, then its own, and not its own template, on purpose. So a failed iAP2
+// Tests the iAP2 output, then its own, but not its own template, on purpose. So a failed iAP2
 // output (not opened, not written whole, or its template empty) makes this file its stock file, and
 // a missing template leaves out the template's lines only.
 MergeDecision generateIap1File(std::istream& templateFile, std::ostream& output,
@@ -93,14 +93,14 @@ int updateIapConfigFiles() {
     IapValues values;
     readIapValues(values);
 
-    // The streams of every stage live until the end, also those that a fallback leaves unwritten.
+    // The streams of every stage live until the end, even those that a fallback leaves unwritten.
     TemplateMerge device(IAP2_DEVICE_FILE);
     device.finish(generateIap2DeviceFile(device.templateFile, device.output, values));
 
     TemplateMerge iap2(IAP2_FILE);
     iap2.finish(generateIap2File(iap2.templateFile, iap2.output, values));
 
-    // The switch comes whatever became of iap2.cfg.
+    // Whatever became of iap2.cfg.
     switchToVersionDigits(values);
 
     TemplateMerge iap1(IAP1_FILE);

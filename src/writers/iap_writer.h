@@ -26,8 +26,8 @@ constexpr AccessoryFile IAP1_FILE = {
     "/fs/mp/etc/mm/iap1.cfg",
 };
 
-/// What the generated lines say of the vehicle and the unit. Each value goes out up to its first
-/// NUL byte.
+/// What the generated lines say about the vehicle and the unit. Each value is written up to its
+/// first NUL byte.
 struct IapValues {
     std::string serial;
     std::string model;
@@ -37,7 +37,7 @@ struct IapValues {
 /// Reads the values of the two iAP2 files.
 void readIapValues(IapValues& values);
 
-/// Makes them the values of the iAP1 file, which alone carries the six digits of the version.
+/// Turns them into the values of the iAP1 file, the only one with the six digits of the version.
 void switchToVersionDigits(IapValues& values);
 
 /// Write the generated lines and the template of a file to `output`, if that is the decision; else
@@ -50,7 +50,7 @@ MergeDecision generateIap1File(std::istream& templateFile, std::ostream& output,
                                const std::ios& iap2Output, const IapValues& values);
 
 /// Writes IAP2_DEVICE_FILE, IAP2_FILE and IAP1_FILE, in this order, each generated or replaced by
-/// its stock file. A stage that fails stops no later one. Always returns 0.
+/// its stock file. A failed stage does not stop the next. Always returns 0.
 int updateIapConfigFiles();
 
 } // namespace orvane

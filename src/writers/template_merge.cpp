@@ -5,14 +5,13 @@ namespace orvane {
 
 namespace {
 
-/// The buffer of every file that is copied. One serves them all: streams that share it may be open
-/// together, but none reads before its copy, and none after it. Its size is what a large template's
-/// speed comes from: reads of many whole pages, of one byte less than the buffer, as libstdc++
-/// keeps one back.
+/// The buffer of every file that is copied. Streams that share it may be open together: each reads
+/// only during its own copy. Its size makes large templates fast: each read is many whole pages,
+/// one byte less than the buffer, since libstdc++ keeps one back.
 constexpr std::size_t INPUT_BUFFER_SIZE = 131073; // bytes
 std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-variables)
 
-/// The buffer comes first: a file stream takes one only before its first use, if at all.
+/// The buffer comes first: a file stream accepts one only before its first use, if at all.
 template <typename FileStream, std::size_t SIZE>
 void open(FileStream& stream, std::array<char, SIZE>& buffer, const char* path) {
     stream.rdbuf()->pubsetbuf(buffer.data(), SIZE);
@@ -36,7 +35,7 @@ void copyBytes(std::istream& source, std::ostream& output) {
     output << source.rdbuf();
 }
 
-// The buffer stays as it is: a stream writes it before it reads it. NOLINTNEXTLINE(*-member-init)
+// A stream writes the buffer before it reads it. NOLINTNEXTLINE(*-member-init)
 TemplateMerge::TemplateMerge(const AccessoryFile& accessoryFile) : file(accessoryFile) {
     open(output, outputBuffer, file.output);
     open(templateFile, InputBuffer, file.templateFile);

@@ -17,14 +17,14 @@ struct AccessoryFile {
     const char* stockFile;
 };
 
-/// Every output brings a buffer, small so that a run touches few pages: a head fits in, and a large
-/// template bypasses it. Where the library uses it, opening the file needs no memory. What is
+/// Every output has its own buffer, small so that a run touches few pages: it holds a head, and a
+/// large template bypasses it. Where the library uses it, opening the file needs no memory. What is
 /// written never depends on it.
 constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
 using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 
-/// What becomes of an accessory file: it is generated, or its stock file takes its place, since a
-/// stream that counts for it is failed.
+/// What becomes of an accessory file: it is generated, or replaced by its stock file because a
+/// stream that it depends on has failed.
 enum class MergeDecision {
     generate,
     templateFailed,
@@ -35,15 +35,15 @@ enum class MergeDecision {
 /// The decision for a file that needs both its streams. The template is tested first.
 MergeDecision decideMerge(const std::ios& templateFile, const std::ios& output);
 
-/// Whether the stock file takes the place of a file for which this was decided.
+/// Whether the stock file replaces a file for which this was decided.
 bool needsStockFile(MergeDecision decision);
 
-/// Appends all bytes of `source` to `output`. A source that yields none, being empty, absent or a
-/// folder, leaves the output failed: what is written afterwards is dropped.
+/// Appends all bytes of `source` to `output`. A source without any (empty, absent or a folder)
+/// leaves the output failed: what is written afterwards is dropped.
 void copyBytes(std::istream& source, std::ostream& output);
 
-/// The streams of one merge. A stream that could not be opened is failed, and what is written to it
-/// is dropped.
+/// The streams of one merge. A stream that could not be opened has failed, and what is written to
+/// it is dropped.
 struct TemplateMerge {
     /// Opens the output for writing (created, or truncated at once), then the template for reading.
     explicit TemplateMerge(const AccessoryFile& accessoryFile);

@@ -9,8 +9,8 @@ namespace orvane {
 namespace platform {
 
 int nextOption(int argc, char* const argv[], const char* letters) {
-    // Without the "+" glibc moves operands behind the options and goes on after them. The libraries
-    // of such systems keep so short a string without memory.
+    // Without the "+" glibc moves operands after the options and continues past them. C++ libraries
+    // there need no memory for so short a string.
     const std::string posixly = std::string("+") + letters;
     return getopt(argc, argv, posixly.c_str());
 }
