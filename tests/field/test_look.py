@@ -40,7 +40,7 @@ class WholeUnitTest(LookTest):
                      "the digits of the version arrive: 030a02",
                      "/tmp/telephony_FFFF.txt arrives: 45 lines",
                      "the modes are 0666 less the mask: with the mask 027 all -rw-r-----",
-                     "where /tmp lies: /tmp", "where the image lies: /fs/tmpfs; a file"):
+                     "where /tmp is: /tmp", "where the image is: /fs/tmpfs; a file"):
             self.assertEqual(done.line(line), f"ok       {line}")
 
     def test_the_document_shows_what_it_says(self) -> None:
@@ -97,18 +97,18 @@ class UnitThatLacksSomethingTest(LookTest):
         (self.car / IMAGE).unlink()
         done = self.check("differs", "the image arrives", "no audio profile")
         self.assertIn("VOXA", done.line("the model arrives"))
-        self.assertEqual(done.line("where the image lies"),
-                         "differs  where the image lies: /fs/tmpfs; missing")
+        self.assertEqual(done.line("where the image is"),
+                         "differs  where the image is: /fs/tmpfs; missing")
 
     def test_an_image_that_is_not_filled(self) -> None:
         (self.car / IMAGE).write_bytes(b"")
-        self.check("differs", "where the image lies", "it is empty")
+        self.check("differs", "where the image is", "it is empty")
 
     def test_an_image_that_is_not_whole(self) -> None:
         image = (self.car / IMAGE).read_bytes()
         for size in (1, 140, 178):
             (self.car / IMAGE).write_bytes(image[:size])
-            self.check("differs", "where the image lies", f"{size} bytes instead of 179")
+            self.check("differs", "where the image is", f"{size} bytes instead of 179")
 
     def test_a_stock_file_says_nothing_about_the_inputs(self) -> None:
         for name in ("airplay", "iap2_device", "mm/iap2"):
@@ -203,7 +203,7 @@ class UnitThatLacksSomethingTest(LookTest):
         shutil.rmtree(self.car / "tmp")
         done = self.car.run("look")
         self.assertEqual(done.status, 1)
-        self.assertIn("there is no folder /tmp", done.line("where /tmp lies"))
+        self.assertIn("there is no folder /tmp", done.line("where /tmp is"))
         self.assertFalse((self.car / "tmp").exists())
 
     @unittest.skipUnless(is_root(), "only root can become another user")
@@ -223,8 +223,8 @@ class UnitThatLacksSomethingTest(LookTest):
         done = self.car.run("look")
         self.assertEqual(snapshot(self.car / "home/tmp"), before)
         self.assertEqual((done.status, done.lines("differs")), (0, []))
-        self.assertEqual(done.line("where /tmp lies"),
-                         "ok       where /tmp lies: /tmp is a link to /home/tmp")
+        self.assertEqual(done.line("where /tmp is"),
+                         "ok       where /tmp is: /tmp is a link to /home/tmp")
 
     def test_a_place_that_a_terminal_would_obey(self) -> None:
         (self.car / "tmp").rename(self.car / "home/t\x1b[2J")
@@ -232,10 +232,10 @@ class UnitThatLacksSomethingTest(LookTest):
         path = self.car.wrap("echo 'a on /fs type qn\033[2Jx6'\n", "mount")
         for shell in SHELLS:
             done = self.car.run("look", path=path, shell=shell)
-            self.assertEqual(done.line("where /tmp lies"),
-                             "ok       where /tmp lies: /tmp is a link to (not printable)")
-            self.assertEqual(done.line("where the image lies"),
-                             "ok       where the image lies: /fs/tmpfs, mounted at (not printable); a file")
+            self.assertEqual(done.line("where /tmp is"),
+                             "ok       where /tmp is: /tmp is a link to (not printable)")
+            self.assertEqual(done.line("where the image is"),
+                             "ok       where the image is: /fs/tmpfs, mounted at (not printable); a file")
             done = self.car.run("look", "/home/a\\033[2J", shell=shell)
             self.assertEqual(done.err, "orvane-field: (not printable) is not a program here\n")
 
@@ -243,14 +243,14 @@ class UnitThatLacksSomethingTest(LookTest):
         (self.car / "dev/shmem").mkdir()
         shutil.rmtree(self.car / "tmp")
         (self.car / "tmp").symlink_to("/dev/shmem")
-        self.assertIn("shared memory", self.car.run("look").line("unknown  where /tmp lies"))
+        self.assertIn("shared memory", self.car.run("look").line("unknown  where /tmp is"))
 
     def test_where_tmp_is_mounted(self) -> None:
         path = self.car.wrap("echo 'a on / type qnx6'\necho 'b on /tmp type shmem (rw)'\n"
                              "echo nonsense\necho 'c on /tmp/x type y'\n", "mount")
         done = self.look(path=path)
-        self.assertIn("/tmp, mounted at /tmp as shmem", done.line("where /tmp lies"))
-        self.assertIn("/fs/tmpfs, mounted at / as qnx6;", done.line("where the image lies"))
+        self.assertIn("/tmp, mounted at /tmp as shmem", done.line("where /tmp is"))
+        self.assertIn("/fs/tmpfs, mounted at / as qnx6;", done.line("where the image is"))
 
     def test_another_system(self) -> None:
         self.check("differs", "a system that orvane", "Plan9", path=self.car.wrap("echo Plan9\n", "uname"))

@@ -53,9 +53,9 @@ class OtherOrvaneTest(LookTest):
             "  [ ! -e /home/old.$n ] || {\n    skip=0\n    while IFS= read -r l; do skip=$((skip + 1)); done"
             " </tmp/$n\n    i=0\n    while IFS= read -r l; do i=$((i + 1)); [ $i -le $skip ] ||"
             ' echo "$l"; done </home/old.$n >>/tmp/$n\n  }\n  /bin/rm -f /home/old.$n\ndone\n',
-            "/tmp/airplay.conf is made anew", "its content is not the same")
-        self.assertTrue(done.line("/tmp/iap2.cfg is made anew").startswith("differs"))
-        self.assertTrue(done.line("/tmp/iap1.cfg is made anew").startswith("ok"))
+            "/tmp/airplay.conf replaces a longer one", "its content is not the same")
+        self.assertTrue(done.line("/tmp/iap2.cfg replaces a longer one").startswith("differs"))
+        self.assertTrue(done.line("/tmp/iap1.cfg replaces a longer one").startswith("ok"))
 
     def test_a_file_is_cut_short(self) -> None:
         self.check('/bin/orvane "$@"\n[ ! -e /tmp/iap1.cfg ] || echo name >/tmp/iap1.cfg\n',

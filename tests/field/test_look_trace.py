@@ -57,7 +57,7 @@ class SomethingInThePlaceOfAnOutputTest(LookTest):
             with self.subTest(shell):
                 done = self.look(shell=shell)
                 self.assertEqual(done.status, 1)
-                self.assertIn("a folder stands there", done.line("/tmp/iap2.cfg comes whole"))
+                self.assertIn("a folder is there", done.line("/tmp/iap2.cfg comes whole"))
 
     def test_a_file_that_would_be_overwritten_by_what_is_put_aside(self) -> None:
         self.put_older_outputs()
@@ -117,7 +117,7 @@ class TroubleTest(LookTest):
 
     def test_other_utilities_may_be_missing(self) -> None:
         for utility, question in (("ls", "the modes are"), ("uname", "a system that"),
-                                  ("mount", "where /tmp lies"), ("dd", "silence and")):
+                                  ("mount", "where /tmp is"), ("dd", "silence and")):
             done = self.look(path=self.car.without(utility))
             self.assertEqual((done.status, done.err), (0, ""), utility)
             self.assertIn("unknown" if utility in ("ls", "uname") else "ok", done.line(question))
@@ -149,8 +149,9 @@ class TroubleTest(LookTest):
     def test_a_file_to_compare_with_cannot_be_renamed(self) -> None:
         path = self.car.wrap('case $2 in\n*-first.iap2.cfg) exit 1 ;;\nesac\nexec /bin/mv "$@"\n', "mv")
         done = self.look(path=path)
-        self.assertEqual(done.line("/tmp/iap2.cfg is made anew"), "unknown  /tmp/iap2.cfg is made anew "
-                         "where a longer one was: the file to compare with cannot be renamed")
+        self.assertEqual(done.line("/tmp/iap2.cfg replaces a longer one"),
+                         "unknown  /tmp/iap2.cfg replaces a longer one: "
+                         "the file to compare with cannot be renamed")
         self.assertEqual((done.status, done.lines("differs"), done.err), (0, [], ""))
 
     def test_there_is_little_room(self) -> None:
@@ -163,8 +164,9 @@ class TroubleTest(LookTest):
                     done = self.look(shell=shell, room=("tmp", size * resource.getpagesize()))
                 except subprocess.SubprocessError:
                     self.skipTest("nothing can be mounted here")
-                self.assertEqual([line for line in done.lines("differs") if "made anew" in line], [])
-                self.assertEqual("made anew" in "".join(done.lines("unknown")), size < 12)
+                self.assertEqual([line for line in done.lines("differs")
+                                  if "replaces a longer one" in line], [])
+                self.assertEqual("replaces a longer one" in "".join(done.lines("unknown")), size < 12)
                 self.assertEqual((done.status, done.err), (int(size < 6), ""))
 
     def test_an_output_that_the_last_run_cuts_short(self) -> None:
@@ -179,8 +181,8 @@ class TroubleTest(LookTest):
                         done = self.look("/home/orvane", shell=shell, room=("tmp", 1 << 17))
                     except subprocess.SubprocessError:
                         self.skipTest("nothing can be mounted here")
-                    self.assertEqual(done.line("/tmp/iap1.cfg is made anew"),
-                                     f"{word:9}/tmp/iap1.cfg is made anew where a longer one was: {seen}")
+                    self.assertEqual(done.line("/tmp/iap1.cfg replaces a longer one"),
+                                     f"{word:9}/tmp/iap1.cfg replaces a longer one: {seen}")
 
     def test_a_folder_is_made_in_the_place_of_an_output(self) -> None:
         self.put_older_outputs()
