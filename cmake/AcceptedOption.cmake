@@ -10,7 +10,7 @@ function(orvane_accepts result option)
 endfunction()
 
 # orvane_add_linker_options(TARGET OPTION...): adds each option that the linker accepts for users of
-# TARGET. Only the linker of a unit's SDK is asked; a desk's linker that lacks one should say so.
+# TARGET. Only the linker of a unit's SDK is asked; a desk's linker that lacks one should fail.
 function(orvane_add_linker_options target)
   foreach(option ${ARGN})
     if(CMAKE_CXX_COMPILER_ID STREQUAL QCC)

@@ -5,7 +5,7 @@
 if(CMAKE_CXX_COMPILER_ID MATCHES "^(GNU|QCC)$" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 4.7)
   set(advice "")
   if(CMAKE_CXX_COMPILER_ID STREQUAL QCC)
-    set(advice " `q++ -V` lists what the SDK has. To name another one, configure anew with cmake "
+    set(advice " `q++ -V` lists what the SDK has. To name another one, configure again with cmake "
       "--fresh and, for example, -DORVANE_QNX_VARIANT=4.7.3,gcc_ntoarmv7le_gpp.")
   endif()
   string(STRIP "${CMAKE_CXX_COMPILER} ${CMAKE_CXX_COMPILER_ARG1}" compiler)
@@ -17,5 +17,5 @@ endif()
 string(STRIP "${CMAKE_CXX_COMPILER_ARG1}" argument)
 if(DEFINED ORVANE_QNX_VARIANT AND NOT argument STREQUAL "-V${ORVANE_QNX_VARIANT}")
   message(FATAL_ERROR "This folder was configured with ${argument}. For -V${ORVANE_QNX_VARIANT} "
-    "configure anew, with cmake --fresh.")
+    "configure again, with cmake --fresh.")
 endif()

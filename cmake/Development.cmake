@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # What `cmake --install BUILD --component development` installs: the library, its headers and the files
-# by which find_package(orvane) finds them. This component is in no package: whoever installs the programs
-# does not want it.
+# by which find_package(orvane) finds them. This component is in no package: users of the programs do not
+# need it.
 include(CMakePackageConfigHelpers)
 include(GNUInstallDirs)
 

@@ -1,11 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
-# Compilers, and clang-tidy still more, spend most of their time on the headers of the system and of the
-# libraries, again for each source. In a batch the sources of a folder are one, with one look at their
-# headers. That is for builds from nothing: after a change of one source its whole folder is compiled.
+# Compilers, and clang-tidy even more, spend most of their time on system and library headers, again for
+# each source. A batch compiles the sources of a folder as one, so reads each header once. It is for builds from
+# nothing: a change of one source compiles its whole folder.
 set(ORVANE_BATCHES "" CACHE STRING "Targets whose sources are compiled a folder at a time")
 
-# orvane_batch_by_folder(TARGET [ALONE SOURCE...]): the sources of TARGET, but those that are to stay
-# alone, since they have a name of their own that another source of their folder has, too.
+# orvane_batch_by_folder(TARGET [ALONE SOURCE...]): batches the sources of TARGET by folder, except each
+# SOURCE that defines a name which another source of its folder also defines.
 function(orvane_batch_by_folder target)
   if(NOT target IN_LIST ORVANE_BATCHES)
     return()
@@ -21,10 +21,10 @@ function(orvane_batch_by_folder target)
   endforeach()
   set_source_files_properties(${given_ALONE} PROPERTIES SKIP_UNITY_BUILD_INCLUSION ON)
   set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
-  # GCC takes what is included for a header, where a class of an unnamed namespace would be another one
-  # for each source. clang-tidy sees to those.
+  # GCC takes an included source for a header, in which a class of an unnamed namespace would differ for
+  # each source. clang-tidy finds those in real headers.
   target_compile_options(${target} PRIVATE $<$<CXX_COMPILER_ID:GNU>:-Wno-subobject-linkage>)
-  # The checks of clang-tidy for a batch are looked up where the batch lies.
+  # clang-tidy looks for its configuration next to the batch.
   if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/.clang-tidy)
     configure_file(.clang-tidy .clang-tidy COPYONLY)
   endif()

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: Apache-2.0
-# Options that make a fault of ours harder to exploit and don't measurably delay the start, as an
-# interface target: canaries on the stack, checked library calls where the compiler can't prove a size, no
-# executable stack, and loader tables that are read-only once the program runs. Debug builds don't have
-# them: _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
+# Options that make a bug of ours harder to exploit and don't measurably delay the start, as an interface
+# target: stack canaries, checked library calls where the compiler can't prove a size, no executable
+# stack, and loader tables that are read-only once the program runs. Debug builds don't have them:
+# _FORTIFY_SOURCE needs optimisation, and the sanitizers see more.
 include(CheckCXXSourceCompiles)
 
 # Sets RESULT to whether a function that OPTION protects can be compiled and linked: a canary also needs

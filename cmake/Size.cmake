@@ -12,7 +12,7 @@ endif()
 # SDK does not: CMake's rules for its driver (QCC) have no such optimisation, and it is not worth asking
 # for by hand. Measured with the ARM compiler for Linux: with the C++ library linked statically, as for a
 # unit, the code shrinks by 2.3 KB, but alignment keeps the file at 341,832 bytes; it runs 0.4 % fewer
-# instructions. With a dynamic library the file has 30,348 bytes instead of 34,444 and runs 0.3 % fewer:
+# instructions. With a dynamic library the file is 30,348 bytes instead of 34,444 and runs 0.3 % fewer:
 # an all-dynamic program without the optimisation is above the limit of 32 KiB, which the Linux build
 # meets.
 if(CMAKE_CXX_COMPILER_ID STREQUAL GNU AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)

@@ -21,7 +21,7 @@ endforeach()
 set(ORVANE_QNX_VARIANT gcc_ntoarmv7le_gpp CACHE STRING "What q++ gets after -V")
 set(CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ORVANE_QNX_VARIANT)
 
-# orvane_find_tool(VARIABLE NAME...): searches only the SDK's own tools, or the host's could be taken.
+# orvane_find_tool(VARIABLE NAME...): searches only the SDK's own tools, never the host's.
 function(orvane_find_tool variable)
   find_program(${variable} NAMES ${ARGN} PATHS ${QNX_HOST}/usr/bin NO_DEFAULT_PATH REQUIRED)
 endfunction()

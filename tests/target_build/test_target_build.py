@@ -284,7 +284,7 @@ class TargetBuildTest(unittest.TestCase):
         done = self.configure(sdk.variables, option)
         self.assertNotEqual(done.returncode, 0)
         self.assertIn(f"This folder was configured with -V{DEFAULT_VARIANT}. For "
-                      "-V5.4.0,gcc_ntoarmv7le_gpp configure anew, with cmake --fresh.", done.stdout)
+                      "-V5.4.0,gcc_ntoarmv7le_gpp configure again, with cmake --fresh.", done.stdout)
         words = self.commands("--fresh", option, sdk=sdk)[-1]
         self.assertIn("-V5.4.0,gcc_ntoarmv7le_gpp", words)
 
