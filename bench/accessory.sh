@@ -67,7 +67,7 @@ read_image() {
     esac
 }
 
-# place BYTES: prints the offset that is so many bytes before the end of the disk.
+# place BYTES: prints the offset of the place BYTES before the end of the disk.
 place() {
     echo $(($(wc -c <"$disk") - $1))
 }
@@ -119,7 +119,7 @@ write_tuning() {
         }' >"$2"
 }
 
-# Prints the version of the first application, from behind its first "_".
+# Prints the version of the first application, from after its first "_".
 read_version() {
     awk '
         function trim(text) {

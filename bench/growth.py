@@ -25,7 +25,7 @@ NANOSECONDS = 1e9
 
 
 # The speed of copying a large file varies by 20 % and more with the place of its pages in memory, so
-# the file is written anew this many times.
+# the file is rewritten this many times.
 PLACES = 7
 
 

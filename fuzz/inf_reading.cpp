@@ -11,7 +11,7 @@ namespace orvane::fuzz {
 
 namespace {
 
-/// A key and a value, built one character after the other.
+/// A key and a value, built character by character.
 struct Line {
     std::string key;
     std::string value;

@@ -10,7 +10,7 @@ import unittest
 
 
 def symbols(program: str) -> dict[str, str]:
-    """The kinds that nm prints, by name: T is defined here, W gives way to another definition."""
+    """The kinds that nm prints, by name: T is defined here, W is weak."""
     listing = subprocess.run(["nm", "--demangle", program], check=True, text=True, stdout=subprocess.PIPE)
     found = re.findall(r"^[0-9a-f]* +(\w) (.+)$", listing.stdout, re.MULTILINE)
     return {name: kind for kind, name in found}

@@ -47,7 +47,7 @@ class Library:
     broken_copy_fails: bool = False
     # The same within a line: the thrown error drops the unfinished line, the plain end keeps it.
     unfinished_line_kept: bool = False
-    # Close tries bytes that a failed write left pending once more; they are lost if close itself wrote them.
+    # Close retries bytes that a failed write left pending; they are lost if close itself wrote them.
     pending_kept: bool = False
     # The last write of a file may come from the copy (which has already moved bytes, so doesn't mark the
     # stream) or from close (which does).

@@ -52,7 +52,7 @@ def parse_entries(text: str, name: str) -> list[Entry]:
     keys = [entry.key() for entry in entries]
     for index, entry in enumerate(entries):
         if entry.key() in keys[:index]:
-            raise EntryError(f"{name}:{entry.line}: stands there twice")
+            raise EntryError(f"{name}:{entry.line}: is listed twice")
         if not entry.reason:
             raise EntryError(f"{name}:{entry.line}: no reason")
     return entries

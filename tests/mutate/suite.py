@@ -26,7 +26,7 @@ DIFFERENTIAL_UNITS = 150
 FAULTS = "faults"
 FAULTS_TIME_LIMIT = 900
 
-# A mutant is in an endless loop if it takes more seconds than this and so many times the original's time.
+# A mutant is in an endless loop if it takes over TIME_LIMIT seconds and over TIME_FACTOR times the original's time.
 TIME_LIMIT = 30
 TIME_FACTOR = 10
 

@@ -4,7 +4,7 @@
 Whatever it lacks, it prints nothing, exits with 0, and each output is a whole file made of true values and
 defaults, or what a fallback leaves.
 
-Exit status: 0 every run is so, 1 some run is not, 2 the tool could not be run.
+Exit status: 0 all runs are like this, 1 some are not, 2 the tool could not be run.
 """
 
 from __future__ import annotations

@@ -153,7 +153,7 @@ TEST_F(BootDiskTest, DescriptorZeroIsHeldAndReleasedLikeAnyOther) {
 }
 
 TEST_F(BootDiskTest, ClosedDiskReleasesNothing) {
-    // An owner that takes its failure for a number would close descriptor 0.
+    // An owner that mistook its failure for descriptor 0 would close that.
     const int before = openDescriptors();
     remove(DISK_PATH);
     { const BootDisk disk(O_RDONLY); }

@@ -27,8 +27,8 @@ protected:
         return runOptions(2, arguments);
     }
 
-    /// Whether a stream allocates memory before it is opened, as libc++'s does. Then a file may be
-    /// left out when there is none.
+    /// Whether a stream allocates memory before it is opened, as libc++'s does. If memory runs out,
+    /// a file may then be missing.
     static bool streamsNeedMemory() {
         const FailingMemory memory(1, Shortage::once);
         try {

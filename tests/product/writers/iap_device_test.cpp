@@ -228,7 +228,7 @@ TEST_F(IapDeviceTest, OutputStaysOpenAfterItsFallback) {
         const ResourceLimit limit(RLIMIT_NOFILE, roomForTwo);
         updateIapConfigFiles();
     }
-    // The device output has one, the second output the other, and no stage gets a third.
+    // The device output takes one, the second output the other; nothing else can be opened.
     EXPECT_EQ(readFile(DEVICE_OUTPUT), "");
     EXPECT_EQ(readFile(IAP2_OUTPUT), "");
     EXPECT_FALSE(exists(IAP1_OUTPUT));

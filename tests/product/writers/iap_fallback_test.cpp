@@ -222,7 +222,7 @@ TEST_F(IapFallbackTest, Iap2OutputStaysOpenUntilTheEnd) {
     EXPECT_EQ(updateWithDescriptors(3), 0);
     EXPECT_EQ(readFile(IAP2_OUTPUT), "iap2 stock\n");
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
-    // With one fewer, its copy has no output, the version's file none and iap1.cfg no template.
+    // With one fewer, the stock file gets no output, the version no file, iap1.cfg no template.
     EXPECT_EQ(updateWithDescriptors(2), 0);
     EXPECT_EQ(readFile(IAP2_OUTPUT), "");
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head({"VOXA", "SN004217", "000000"}));
