@@ -52,6 +52,7 @@ Output PlannedMerge::keep() const {
 
 Output PlannedMerge::writeGenerated(const std::string& text, std::vector<ValueRegion> regions) {
     Output result = begin();
+    result.outcome = text.empty() ? Outcome::empty : Outcome::generated;
     result.keys.push_back(kit::fileKey(file_.templateFile));
     result.reasons = {!template_           ? Reason::templateMissing
                       : template_->empty() ? Reason::templateEmpty

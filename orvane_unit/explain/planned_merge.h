@@ -56,6 +56,9 @@ public:
             return text.str();
         };
         const std::string text = render(values, brief);
+        if (text.empty()) {
+            return writeGenerated(text, {}); // no line that could carry a value
+        }
         std::vector<ValueRegion> regions;
         for (const MergedValue<Values>& source : sources) {
             Values other = values;

@@ -23,6 +23,9 @@ from mutate.workshop import ORVANE, Base, Job, Program
 
 UNIT_TOOL = Program("orvane-unit", ("orvane-unit", "orvane_unit", "orvane_kit", "orvane_core"))
 
+# A mutant may write out memory that it never set. Such bytes must not differ between two programs.
+SAME_MEMORY = "-ftrivial-auto-var-init=zero"
+
 RANDOM_UNITS = 50
 RANDOM_SEED = "1"
 
@@ -224,4 +227,4 @@ class AgreementJob(Job):
 
 
 def build_base(scratch: Path, jobs: int) -> Base:
-    return Base(scratch, jobs, (ORVANE, UNIT_TOOL), ("orvane-enter",))
+    return Base(scratch, jobs, (ORVANE, UNIT_TOOL), ("orvane-enter",), SAME_MEMORY)

@@ -21,10 +21,13 @@ from mutate.scratch import call
 
 # The assertions are those of the debug build, which is part of the suite; its sanitizers would take too long.
 CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
-                 "-DCMAKE_CXX_FLAGS=-O0 -w -D_GLIBCXX_ASSERTIONS", "-DCMAKE_CXX_FLAGS_DEBUG=",
+                 "-DCMAKE_CXX_FLAGS_DEBUG=",
                  "-DCMAKE_EXE_LINKER_FLAGS=-static", "-DORVANE_KIT=ON", "-DORVANE_TESTS=ON",
                  "-DORVANE_TEST_FOLDERS=product;whole_runs",
                  "-DORVANE_FAULTS=ON")
+
+
+CXX_FLAGS = "-O0 -w -D_GLIBCXX_ASSERTIONS"
 
 
 @dataclass(frozen=True)
@@ -55,17 +58,17 @@ class TranslationUnit:
 class Base:
     """The unchanged project, built, and its parts.
 
-    `programs` are rebuilt for each mutant, `others` only here.
+    `programs` are rebuilt for each mutant, `others` only here. `more_flags` are the compiler's.
     """
 
     def __init__(self, scratch: Path, jobs: int, programs: Sequence[Program],
-                 others: Sequence[str]) -> None:
+                 others: Sequence[str], more_flags: str = "") -> None:
         self.scratch = scratch
         self.tree = scratch / "tree"
         self.build = scratch / "base"
         self.programs = programs
         call(["cmake", "-S", str(self.tree), "-B", str(self.build), "-G", "Ninja",
-              *CONFIGURATION], scratch)
+              *CONFIGURATION, f"-DCMAKE_CXX_FLAGS={CXX_FLAGS} {more_flags}"], scratch)
         call(["ninja", "-C", str(self.build), "-j", str(jobs),
               *(program.name for program in programs), *others], scratch)
         self.units = self.read_units()

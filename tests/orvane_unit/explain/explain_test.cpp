@@ -4,6 +4,7 @@
 #include "kit/enter/run_inside.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
+#include "orvane_unit/explain/planned_merge.h"
 #include "orvane_unit/report/place_text.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/orvane_unit/tree_state.h"
@@ -62,6 +63,19 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
             EXPECT_FALSE(fs::is_regular_file(output.path, ignored)) << output.path;
         }
     }
+}
+
+TEST(ExplainTest, OutputWithoutAnyLineIsEmpty) {
+    const DescribedUnit described;
+    const kit::EnteredRoot entered(described.root());
+    desk::PlannedFiles files;
+    desk::PlannedMerge merge(files, AIRPLAY_FILE);
+    const std::vector<desk::MergedValue<int>> values = {
+        {[](int& value) { ++value; }, {{desk::Reason::fromImage}, kit::paramKey(1), {}}}};
+    const Output output = merge.finish(
+        0, values, [](std::istream&, std::ostream&, int) { return MergeDecision::generate; });
+    EXPECT_EQ(output.outcome, desk::Outcome::empty);
+    EXPECT_TRUE(output.lines.empty());
 }
 
 TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
