@@ -80,7 +80,7 @@ private:
         } else if (type == fs::file_type::directory) {
             unit_.folders.emplace_back(CONFIG_SHM_NAME);
         } else if (sizeOf(image, CONFIG_SHM_NAME) <= LONGEST_IMAGE) {
-            unit_.image = describeImage(readWhole(image, CONFIG_SHM_NAME));
+            inputs_.image = readWhole(image, CONFIG_SHM_NAME);
         } else {
             describeFile(image, CONFIG_SHM_NAME, CONFIG_SHM_NAME, unit_);
         }
@@ -164,6 +164,9 @@ UnitInputs readInputs(const fs::path& source) {
 }
 
 UnitDescription descriptionOf(UnitInputs inputs) {
+    if (inputs.image) {
+        inputs.unit.image = describeImage(*inputs.image);
+    }
     if (inputs.disk) {
         inputs.unit.disk = describeDisk(*inputs.disk);
     }

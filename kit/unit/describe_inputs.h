@@ -13,8 +13,9 @@
 namespace orvane::kit {
 
 struct UnitInputs {
-    UnitDescription unit;      ///< everything but what the disk holds
-    std::optional<Bytes> disk; ///< the disk's last mebibyte, or all of a shorter one
+    UnitDescription unit;       ///< everything but what image and disk hold
+    std::optional<Bytes> image; ///< unless it is longer than LONGEST_IMAGE, and a file of `unit`
+    std::optional<Bytes> disk;  ///< the disk's last mebibyte, or all of a shorter one
 };
 
 /// Reads the inputs of the unit at `source`, as describeInputs says. Throws KitError.

@@ -124,6 +124,11 @@ void throwIfAny(const std::optional<Conflict>& conflict) {
 } // namespace
 
 void makeUnit(const UnitDescription& unit, const fs::path& root) {
+    makeUnit(unit, root, [](const fs::path& /*folder*/) {});
+}
+
+void makeUnit(const UnitDescription& unit, const fs::path& root,
+              const std::function<void(const fs::path&)>& inspect) {
     checkUnit(unit);
     throwIfAny(findPathConflict(unit));
     const Layout layout = layoutOf(unit);
@@ -133,6 +138,7 @@ void makeUnit(const UnitDescription& unit, const fs::path& root) {
             makeEntry(unit, path, kind, folder);
         }
         markUnit(folder);
+        inspect(folder);
     });
 }
 

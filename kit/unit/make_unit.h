@@ -4,6 +4,7 @@
 #include "kit/description/unit_description.h"
 
 #include <filesystem>
+#include <functional>
 
 namespace orvane::kit {
 
@@ -13,5 +14,10 @@ namespace orvane::kit {
 /// which replaces `root` when it is complete. Throws KitError; `root` is then as it was. If the
 /// process is ended half-way, that folder stays, and `root` is as it was.
 void makeUnit(const UnitDescription& unit, const std::filesystem::path& root);
+
+/// The same, but lets `inspect` look at the complete folder before it replaces `root`. What it
+/// throws is thrown on as by makeFinishedFolder.
+void makeUnit(const UnitDescription& unit, const std::filesystem::path& root,
+              const std::function<void(const std::filesystem::path&)>& inspect);
 
 } // namespace orvane::kit

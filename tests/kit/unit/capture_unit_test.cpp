@@ -42,6 +42,17 @@ protected:
         put("/dev/hd0", content);
     }
 
+    /// Requires that redaction ends with this complaint, and nothing is made.
+    void refuseToRedact(const std::string& complaint) const {
+        try {
+            capture(true);
+            FAIL() << complaint;
+        } catch (const kit::KitError& error) {
+            EXPECT_NE(std::string(error.what()).find(complaint), std::string::npos) << error.what();
+        }
+        EXPECT_FALSE(fs::exists(root()));
+    }
+
     /// Slot 9 after redaction.
     std::string redacted(const std::string& serial) const {
         putDisk(serial);
@@ -88,11 +99,17 @@ TEST_F(CaptureUnitTest, CurrentRootCanBeCapturedIntoItsOwnFolder) {
 
 TEST_F(CaptureUnitTest, SerialBecomesAnXForEachByte) {
     EXPECT_EQ(redacted("SN004217"), "XXXXXXXX");
-    EXPECT_EQ(redacted("SN"), std::string("XX\0\0\0\0\0\0", 8));
-    EXPECT_EQ(redacted("\xFF\n"), std::string("XX\0\0\0\0\0\0", 8));
-    EXPECT_EQ(redacted(std::string("AB\0CDEFG", 8)), std::string("XX\0\0\0\0\0\0", 8));
+    EXPECT_EQ(redacted("SN42"), std::string("XXXX\0\0\0\0", 8));
+    EXPECT_EQ(redacted("\xFF\n\x01\x80"), std::string("XXXX\0\0\0\0", 8));
+    EXPECT_EQ(redacted(std::string("ABCD\0EFG", 8)), std::string("XXXX\0\0\0\0", 8));
+    EXPECT_EQ(redacted(" SN42   "), "XXXXXXXX");
+}
+
+TEST_F(CaptureUnitTest, NothingButASerialThatIsThereIsSought) {
     EXPECT_EQ(redacted(std::string("\0SECRET!", 8)), std::string(8, '\0'));
     EXPECT_EQ(redacted(""), std::string(8, '\0'));
+    EXPECT_EQ(redacted("        "), "XXXXXXXX");
+    EXPECT_EQ(redacted("XX"), std::string("XX\0\0\0\0\0\0", 8)) << "redacted already";
 }
 
 TEST_F(CaptureUnitTest, SerialIsKeptUnlessRedactionIsRequested) {
@@ -126,15 +143,94 @@ TEST_F(CaptureUnitTest, SerialIsRedactedEverywhereElse) {
     EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.inf"), "N=XXXXXXXX");
 }
 
-TEST_F(CaptureUnitTest, SerialOfFourBytesIsRedactedElsewhereAndAShorterOneIsNot) {
+TEST_F(CaptureUnitTest, SerialOfLessThanFourBytesIsRefused) {
+    for (const std::string serial : {"AB1", "A", " AB1    "}) {
+        putDisk(serial);
+        refuseToRedact("so few bytes also stand in other places by chance");
+    }
     put("/fs/mp/etc/airplay.conf", "AB12 AB1 AB12");
     putDisk("AB12");
     capture(true);
     EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "XXXX AB1 XXXX");
-    fs::remove_all(root());
-    putDisk("AB1");
+}
+
+TEST_F(CaptureUnitTest, BlanksAroundTheSerialAreNoPartOfIt) {
+    putDisk("  SN42  ");
+    put("/fs/mp/etc/airplay.conf", "serial=SN42\n");
     capture(true);
-    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "AB12 AB1 AB12");
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "serial=XXXX\n");
+}
+
+TEST_F(CaptureUnitTest, SerialIsRedactedInTheImage) {
+    putDisk("SN004217");
+    std::string image(179, '\0');
+    put(IMAGE_PATH, image.replace(7, 8, "SN004217").replace(171, 8, "SN004217"));
+    capture(true);
+    EXPECT_EQ(readFile(root() / std::string(IMAGE_PATH).substr(1)),
+              image.replace(7, 8, "XXXXXXXX").replace(171, 8, "XXXXXXXX"));
+    fs::remove_all(root());
+    put(IMAGE_PATH, std::string((1U << 20U) - 3, 'i') + "SN004217"); // one described as a file
+    capture(true);
+    EXPECT_EQ(readFile(root() / std::string(IMAGE_PATH).substr(1)),
+              std::string((1U << 20U) - 3, 'i') + "XXXXXXXX");
+}
+
+TEST_F(CaptureUnitTest, OverlappingSerialsAreRedactedWhole) {
+    putDisk("ABAB", {{137, "ABABAB"}});
+    put("/fs/mp/etc/airplay.conf", "-ABABABA-");
+    capture(true);
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "-XXXXXXA-");
+    EXPECT_EQ(disk().substr(137, 7), std::string("XXXXXX\0", 7));
+    fs::remove_all(root());
+    putDisk(std::string("SNSNSNSN"), {{137, "SNSN"}});
+    capture(true);
+    EXPECT_EQ(disk().substr(129, 12), "XXXXXXXXXXXX") << "at the end of the slot, too";
+}
+
+TEST_F(CaptureUnitTest, SerialThatTheXsMakeAnewIsRedacted) {
+    putDisk("XXAX", {{137, "XXAXXAX"}});
+    put("/fs/mp/etc/airplay.conf", "XXAXAXAXAX");
+    capture(true);
+    EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), "XXXXXXXXXX");
+    EXPECT_EQ(disk().substr(137, 7), "XXXXXXX");
+}
+
+TEST_F(CaptureUnitTest, SerialIsRedactedInLongFilesAtAnyPlace) {
+    putDisk("SN004217");
+    for (const std::size_t at : {0x3FFFCU, 0x40000U, 0x7FFF9U}) {
+        std::string content(0x100000, 'c');
+        put("/fs/mp/etc/airplay.conf", content.replace(at, 8, "SN004217"));
+        fs::remove_all(root());
+        capture(true);
+        EXPECT_EQ(readFile(root() / "fs/mp/etc/airplay.conf"), content.replace(at, 8, "XXXXXXXX"));
+    }
+}
+
+TEST_F(CaptureUnitTest, SerialIsRedactedInTheNamesOfVersionFiles) {
+    putDisk("SN004217");
+    put("/fs/rwdata/.Version/SN004217.inf", "Type=Application\n");
+    put("/fs/rwdata/.Version/a.infSN004217", std::string(9000, '\0'));
+    putFolder("/fs/rwdata/.Version/b-SN004217.inf");
+    capture(true);
+    EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/XXXXXXXX.inf"), "Type=Application\n");
+    EXPECT_EQ(readFile(root() / "fs/rwdata/.Version/a.infXXXXXXXX"), std::string(9000, '\0'));
+    EXPECT_TRUE(fs::is_directory(root() / "fs/rwdata/.Version/b-XXXXXXXX.inf"));
+    EXPECT_EQ(treeOf(root() / "fs/rwdata/.Version").size(), 3U);
+}
+
+TEST_F(CaptureUnitTest, SerialThatCanNotBeReplacedIsRefused) {
+    putDisk("app.inf");
+    put("/fs/rwdata/.Version/app.inf", "Type=Application\n");
+    refuseToRedact("the serial also stands in the name of ");
+    putDisk("SN004217");
+    put("/fs/rwdata/.Version/SN004217.inf", "Type=Application\n");
+    put("/fs/rwdata/.Version/XXXXXXXX.inf", "Type=Application\n");
+    refuseToRedact("/root/fs/rwdata/.Version/SN004217.inf, and can't be replaced there");
+    putDisk("airplay");
+    put("/fs/mp/etc/airplay.conf", "stock");
+    refuseToRedact("/root/fs/mp/etc/airplay.conf, and can't be replaced there");
+    putDisk("layout 1");
+    refuseToRedact("the serial also stands in the file ");
 }
 
 TEST_F(CaptureUnitTest, DiskWithoutRoomForTheSerialHasNoneToRedact) {
