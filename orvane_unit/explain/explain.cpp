@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/explain.h"
 
+#include "config/config_store.h"
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_key.h"
 #include "kit/enter/entered_root.h"
+#include "kit/host/lost_pages.h"
 #include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
 #include "orvane_unit/explain/planned_merge.h"
@@ -152,6 +154,7 @@ std::vector<Writer> writersOf(const std::vector<std::string>& arguments) {
 } // namespace
 
 Explanation explain(const std::vector<std::string>& arguments) {
+    const kit::LostPages lost;
     Explanation outputs;
     PlannedFiles files;
     for (const Writer writer : writersOf(arguments)) {
@@ -167,6 +170,7 @@ Explanation explain(const std::vector<std::string>& arguments) {
     for (Output& output : outputs) {
         output.kindAfter = files.look(output.path, output.contentAfter);
     }
+    lost.requireNone(CONFIG_SHM_NAME);
     return outputs;
 }
 

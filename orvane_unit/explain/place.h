@@ -24,8 +24,8 @@ struct ImagePlace {
 
 /// The image ends before the value does.
 struct BehindImage {
-    std::uint32_t offset = 0;    ///< where the value would begin
-    std::size_t imageLength = 0; ///< bytes
+    std::uint32_t offset = 0;      ///< where the value would begin
+    std::uint64_t imageLength = 0; ///< bytes
 };
 
 struct DiskPlace {

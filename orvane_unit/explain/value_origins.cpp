@@ -3,6 +3,7 @@
 
 #include "config/boot_disk.h"
 #include "config/config_store.h"
+#include "config/param_catalogue.h"
 #include "config/record_area.h"
 #include "config/record_slots.h"
 #include "identity/model_names.h"
@@ -16,6 +17,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <variant>
@@ -69,7 +71,11 @@ Image readImage() {
     store.init();
     const std::int32_t opened = store.open();
     if (opened == STORE_OPENED) {
-        image.bytes.assign(reinterpret_cast<const char*>(store.data), store.length);
+        // store.length has 32 bits, and no getter consults it.
+        image.size = static_cast<std::uint64_t>(::lseek(store.descriptor, 0, SEEK_END));
+        const auto length = std::min<std::uint64_t>(image.size, CONFIG_IMAGE_SIZE);
+        image.bytes.assign(reinterpret_cast<const char*>(store.data),
+                           static_cast<std::size_t>(length));
     } else {
         // What opens and can't be measured, such as a folder, is not a memory object either.
         const bool isThere = opened == STORE_NOT_MAPPED || store.descriptor != -1;
@@ -88,7 +94,7 @@ Origin paramOrigin(const Image& image, std::uint16_t number) {
         origin.place = ImagePlace{place.offset, *bytes};
     } else {
         origin.reasons = {Reason::imageTooShort};
-        origin.place = BehindImage{place.offset, image.bytes.size()};
+        origin.place = BehindImage{place.offset, image.size};
     }
     return origin;
 }

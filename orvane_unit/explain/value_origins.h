@@ -23,7 +23,8 @@ std::uint64_t diskSize();
 /// The configuration image as a run finds it.
 struct Image {
     Reason reason = Reason::fromImage; ///< or why there is none
-    std::string bytes;
+    std::uint64_t size = 0;            ///< in bytes
+    std::string bytes;                 ///< of the parameters; fewer where the image ends
 };
 
 Image readImage();

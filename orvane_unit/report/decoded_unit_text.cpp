@@ -43,7 +43,7 @@ constexpr Column PARAM_COLUMNS[] = {{"param", 5},   {"group", 6}, {"offset", 7},
                                     {"default", 8}, {"mask", 11}, {"code", 5}};
 
 void printPart(std::ostream& out, const DecodedImage& image) {
-    out << "image: " << kit::counted(image.found.bytes.size(), "byte");
+    out << "image: " << kit::counted(image.found.size, "byte");
     if (image.found.reason != Reason::fromImage) {
         out << ", " << painted(Colour::bad, reasonInfo(image.found.reason).sentence);
     }

@@ -84,9 +84,8 @@ Json partJson(const DecodedImage& image) {
                         {"code", param.code},
                         {"meaning", param.meaning.empty() ? Json() : bytesJson(param.meaning)}});
     }
-    return {{"image", reasonInfo(image.found.reason).code},
-            {"size", image.found.bytes.size()},
-            {"rows", rows}};
+    return {
+        {"image", reasonInfo(image.found.reason).code}, {"size", image.found.size}, {"rows", rows}};
 }
 
 Json partJson(const DecodedRecords& records) {

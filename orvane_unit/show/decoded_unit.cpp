@@ -11,6 +11,7 @@
 #include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
+#include "kit/host/lost_pages.h"
 #include "kit/host/sparse_content.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"
@@ -75,7 +76,7 @@ std::vector<DecodedParam> decodeParams(const Image& image) {
         param.code = param.row.id >> 16U;
         param.size = kit::paramPlace(number).size;
         std::uint16_t value = 0; // one byte arrives in the low byte here, as in readAllParams
-        if (isOpen && param.row.offset + param.size <= image.bytes.size() &&
+        if (isOpen && param.row.offset + param.size <= image.size &&
             getParam(store, number, &value) == PARAM_OK) {
             param.raw = value;
         }
@@ -160,6 +161,7 @@ std::vector<std::string> partNames() {
 
 DecodedUnit decodeUnit(const std::filesystem::path& root) {
     const kit::EnteredRoot entered(root);
+    const kit::LostPages lost;
     DecodedUnit unit;
     unit.image.found = readImage();
     unit.image.params = decodeParams(unit.image.found);
@@ -167,6 +169,7 @@ DecodedUnit decodeUnit(const std::filesystem::path& root) {
     unit.tuning = readUnitTuning();
     unit.versions = {readVersionFiles(), findApplicationVersion(), softwareVersion()};
     unit.files = lookAtFiles();
+    lost.requireNone(CONFIG_SHM_NAME);
     return unit;
 }
 

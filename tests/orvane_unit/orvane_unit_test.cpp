@@ -6,6 +6,7 @@
 #include "kit/host/kit_error.h"
 #include "kit/unit/marker.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/support/full_memory.h"
 #include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 
@@ -288,6 +289,47 @@ TEST(OrvaneUnitTest, OutputIsColouredOnlyOnATerminal) {
     EXPECT_TRUE(isColoured(startAsOnATerminal("NO_COLOR", words)));
     EXPECT_FALSE(isColoured(startAsOnATerminal("NO_COLOR=1", words)));
     EXPECT_TRUE(isColoured(startAsOnATerminal("NO_COLOR=", words)));
+}
+
+TEST(OrvaneUnitTest, ImageThatIsAHoleInFullMemoryEndsNoCommand) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    const std::string other = described.folder() / "other";
+    expectRan(start({"new", other}), 0, "");
+    const std::string image = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM";
+    const std::string complaint =
+        "orvane-unit: cannot read " + image +
+        ": it was cut off meanwhile, or has a hole that its full file system can't fill; orvane is "
+        "ended there by SIGBUS\n";
+    const auto startInFullMemory = [&root](const Words& words) {
+        Words command = holeInFullMemory(root);
+        for (const std::string& word : commandLine(words)) {
+            command.push_back(word);
+        }
+        return runOnHost(command);
+    };
+    for (const Words& words : {Words{"explain", root}, Words{"explain", root, "-i", "--json"},
+                               Words{"show", root}, Words{"show", root, "--only", "records"},
+                               Words{"diff", root, other}, Words{"diff", other, root}}) {
+        expectRan(startInFullMemory(words), 2, "", complaint);
+    }
+    const std::string field = described.folder() / "field";
+    expectRan(startInFullMemory({"capture", root, field}), 0, "");
+    expectRan(startInFullMemory({"set", root, "param.22=1"}), 2, "",
+              "orvane-unit: cannot write " + image + ": No space left on device\n");
+    expectRan(runOnHost({"cmp", field + image, "-n", "179", "/dev/zero"}), 0, "");
+    EXPECT_EQ(startInFullMemory({"impact", root, "param.22"}).exitStatus, 0);
+    EXPECT_EQ(startInFullMemory({"describe", root}).exitStatus, 0);
+}
+
+TEST(OrvaneUnitTest, ShortSerialIsNotRedacted) {
+    const DescribedUnit described;
+    expectRan(start({"set", described.root(), "serial=AB1"}), 0, "");
+    const std::string field = described.folder() / "field";
+    expectRefused({"capture", described.root(), field, "--redact-serial"},
+                  "a serial of 3 bytes can't be redacted: so few bytes also stand in other places "
+                  "by chance");
+    EXPECT_FALSE(exists(field));
 }
 
 } // namespace

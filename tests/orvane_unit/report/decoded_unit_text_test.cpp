@@ -23,7 +23,7 @@ std::string printed(const DecodedUnit& unit, const std::string& only) {
 
 TEST(DecodedUnitTextTest, ParametersAreATable) {
     DecodedUnit unit;
-    unit.image.found.bytes = std::string(179, '\0');
+    unit.image.found.size = 179;
     unit.image.params = {{kit::paramRow(1), 4, 1, 0, ""},
                          {kit::paramRow(134), 46, 2, 0xFFFF, "audio\tprofile"},
                          {kit::paramRow(139), 49, 1, std::nullopt, "model VOXA"}};
