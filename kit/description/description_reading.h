@@ -8,9 +8,11 @@
 #include "kit/description/unit_description.h"
 #include "kit/description/value_key.h"
 #include "kit/description/value_places.h"
+#include "kit/host/sparse_content.h"
 
 #include <algorithm>
 #include <cstddef>
+#include <cstdint>
 #include <filesystem>
 #include <iterator>
 #include <map>
@@ -20,6 +22,8 @@ namespace orvane::kit {
 
 struct DescriptionReading {
     std::filesystem::path folder; ///< of the description: its host files are relative to it
+    /// What repeated texts and host files may still give together, in bytes.
+    std::uint64_t contentLeft = MOST_CONTENT;
     UnitDescription unit;
     std::map<ValueKey, Place> places; ///< of the keys that a conflict may name
 };

@@ -1,8 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/description/description_text.h"
 
+#include "kit/description/parse_description.h"
 #include "kit/description/toml_text.h"
 #include "kit/host/bytes.h"
+#include "kit/host/kit_error.h"
 #include "kit/tuning/tuning_description.h"
 #include "tuning/dps_block.h"
 
@@ -137,6 +139,11 @@ std::string descriptionText(const UnitDescription& unit) {
     addDisk(unit.disk, text);
     addFiles(unit, text);
     addLinks(unit, text);
+    if (text.size() > LONGEST_DESCRIPTION) {
+        throw KitError("the description has " + std::to_string(text.size()) +
+                       " bytes: one of more than " + std::to_string(LONGEST_DESCRIPTION) +
+                       " can't be read again");
+    }
     return text.front() == '\n' ? text.substr(1) : text;
 }
 

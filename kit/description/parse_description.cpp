@@ -3,6 +3,7 @@
 
 #include "kit/description/conflicts.h"
 #include "kit/description/description_reading.h"
+#include "kit/description/toml_keys.h"
 #include "kit/description/toml_library.h"
 #include "kit/description/toml_values.h"
 #include "kit/description/unit_description.h"
@@ -36,6 +37,7 @@ void failIfAny(const std::optional<Conflict>& conflict, const DescriptionReading
 } // namespace
 
 UnitDescription parseDescription(const std::string& text, const std::string& name) {
+    requireShortKeys(text, name);
     toml::table table;
     try {
         table = toml::parse(text, name);
@@ -55,7 +57,7 @@ UnitDescription readDescription(const std::filesystem::path& file) {
     if (std::filesystem::is_directory(file, error)) {
         throw KitError("", file, " is a folder, not a description");
     }
-    return parseDescription(readWholeFile(file), file.string());
+    return parseDescription(readWholeFile(file, LONGEST_DESCRIPTION), file.string());
 }
 
 } // namespace orvane::kit

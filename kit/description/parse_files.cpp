@@ -28,9 +28,6 @@ namespace orvane::kit {
 
 namespace {
 
-/// The most bytes of a repeated text or of a host file, so that a typing error can't fill the disk.
-constexpr std::uint64_t CONTENT_LIMIT = std::uint64_t{1} << 30;
-
 /// A path of the unit, as text or in hex after "hex:".
 std::string unitPathOf(const Place& place, std::string_view text) {
     return at(place, [text] {
@@ -66,9 +63,11 @@ Content repeatedContent(const ContentReading& content) {
         failAt(hex->source(), name + " must be a text or { hex = \"...\" }");
     }
     const Bytes part = hex != nullptr ? hexOf(*hex->get("hex"), name) : textOf(repeat, name);
-    const std::uint64_t times = numberUpTo(content.valueOf("count"),
-                                           CONTENT_LIMIT / std::max<std::uint64_t>(1, part.size()),
-                                           content.nameOf("count"));
+    std::uint64_t& left = content.reading.contentLeft;
+    const std::uint64_t size = std::max<std::uint64_t>(1, part.size());
+    const std::uint64_t times =
+        numberUpTo(content.valueOf("count"), left / size, content.nameOf("count"));
+    left -= times * part.size();
     Bytes bytes;
     bytes.reserve(part.size() * static_cast<std::size_t>(times));
     for (std::uint64_t i = 0; i < times && !part.empty(); ++i) {
@@ -81,8 +80,11 @@ Content hostContent(const ContentReading& content) {
     const toml::node& path = content.valueOf("path");
     const std::filesystem::path file =
         content.reading.folder / textOf(path, content.nameOf("path"));
-    return at(path.source(), content.what,
-              [&file] { return readRegularFile(file, CONTENT_LIMIT); });
+    std::uint64_t& left = content.reading.contentLeft;
+    Bytes bytes =
+        at(path.source(), content.what, [&file, left] { return readRegularFile(file, left); });
+    left -= bytes.size();
+    return bytes;
 }
 
 Content sparseContent(const ContentReading& content) {

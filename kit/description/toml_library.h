@@ -7,6 +7,10 @@
 //  - it assumes that it never asks whether most characters above U+00A0 are blank, but it does for
 //    "é = 1".
 // So assertions do nothing, and such a character is not a blank.
+//
+// It reads, and later removes, nested values by recursion. A description nests three of them, and
+// the library refuses more than the limit here. It has no limit for the parts of a key:
+// toml_keys.h.
 #pragma once
 
 #pragma push_macro("NDEBUG")
@@ -14,6 +18,7 @@
 // NOLINTBEGIN(cppcoreguidelines-macro-usage): the library is configured by macros
 #define TOML_ASSERT(condition) static_cast<void>(0)
 #define TOML_HEADER_ONLY 1
+#define TOML_MAX_NESTED_VALUES 16
 // NOLINTEND(cppcoreguidelines-macro-usage)
 #include <toml++/impl/preprocessor.h>
 

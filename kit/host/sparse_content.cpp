@@ -19,6 +19,7 @@ namespace {
 
 constexpr std::size_t PAGE = 4096;       ///< bytes compared at a time
 constexpr std::uint64_t CHUNK = 0x40000; ///< bytes read at a time
+constexpr std::uint64_t RUN_SIZE = 64;   ///< what a run takes besides its bytes, in bytes
 
 class RunCollector {
 public:
@@ -33,6 +34,7 @@ public:
     }
 
     SparseContent runs;
+    std::uint64_t taken = 0; ///< bytes of memory
 
 private:
     void takePage(std::string_view page, std::uint64_t offset) {
@@ -53,10 +55,12 @@ private:
             const std::uint64_t gap = offset - (begin + run.size());
             if (gap < RUN_GAP) {
                 run.append(static_cast<std::size_t>(gap), '\0').append(bytes);
+                taken += gap + bytes.size();
                 return;
             }
         }
         runs.emplace_hint(runs.end(), offset, bytes);
+        taken += RUN_SIZE + bytes.size();
     }
 };
 
@@ -97,6 +101,12 @@ SparseContent sparseContent(const Descriptor& descriptor, const std::filesystem:
                                 : KitError("", file, " has become shorter");
             }
             collector.take({buffer.data(), static_cast<std::size_t>(count)}, at);
+            if (collector.taken > MOST_CONTENT) {
+                throw KitError("", file,
+                               " holds more than can be copied: at most " +
+                                   std::to_string(MOST_CONTENT) +
+                                   " bytes besides its zeros are allowed");
+            }
             at += static_cast<std::uint64_t>(count);
         }
     }

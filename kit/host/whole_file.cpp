@@ -27,12 +27,32 @@ KitError readError(const std::filesystem::path& file) {
     return systemError("cannot read ", file);
 }
 
-Bytes readToEnd(const Descriptor& descriptor, const std::filesystem::path& file) {
+[[noreturn]] void failAsTooLong(const std::filesystem::path& file, std::uint64_t limit) {
+    throw KitError("", file,
+                   " has more than " + std::to_string(limit) + " bytes, the most allowed");
+}
+
+void failIfTooLong(const struct stat& state, const std::filesystem::path& file,
+                   std::uint64_t limit) {
+    if (S_ISREG(state.st_mode) && static_cast<std::uint64_t>(state.st_size) > limit) {
+        failAsTooLong(file, limit);
+    }
+}
+
+Bytes readToEnd(const Descriptor& descriptor, const std::filesystem::path& file,
+                std::uint64_t limit) {
+    struct stat state {};
+    if (::fstat(descriptor.number(), &state) == 0) {
+        failIfTooLong(state, file, limit); // before a long one is read
+    }
     Bytes bytes;
     std::array<char, 65536> buffer{};
     ssize_t count = 0;
     while ((count = ::read(descriptor.number(), buffer.data(), buffer.size())) > 0) {
         bytes.append(buffer.data(), static_cast<std::size_t>(count));
+        if (bytes.size() > limit) {
+            failAsTooLong(file, limit);
+        }
     }
     if (count < 0) {
         throw readError(file);
@@ -42,12 +62,12 @@ Bytes readToEnd(const Descriptor& descriptor, const std::filesystem::path& file)
 
 } // namespace
 
-Bytes readWholeFile(const std::filesystem::path& file) {
+Bytes readWholeFile(const std::filesystem::path& file, std::uint64_t limit) {
     const Descriptor descriptor = openStream(file);
     if (!descriptor.isOpen()) {
         throw readError(file);
     }
-    return readToEnd(descriptor, file);
+    return readToEnd(descriptor, file, limit);
 }
 
 std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file) {
@@ -58,7 +78,14 @@ std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file) {
     if (!descriptor.isOpen()) {
         throw readError(file);
     }
-    return readToEnd(descriptor, file);
+    return readToEnd(descriptor, file, LONGEST_READ);
+}
+
+void requireShort(const std::filesystem::path& file, std::uint64_t limit) {
+    struct stat state {};
+    if (::stat(file.c_str(), &state) == 0) {
+        failIfTooLong(state, file, limit);
+    }
 }
 
 Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
@@ -67,10 +94,7 @@ Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
     if (::fstat(descriptor.number(), &state) != 0 || !S_ISREG(state.st_mode)) {
         throw KitError("", file, " is not a regular file");
     }
-    if (static_cast<std::uint64_t>(state.st_size) > limit) {
-        throw KitError(file.string() + " has " + std::to_string(state.st_size) +
-                       " bytes: at most " + std::to_string(limit) + " are allowed");
-    }
+    failIfTooLong(state, file, limit);
     return readAt(descriptor, file, 0, static_cast<std::uint64_t>(state.st_size));
 }
 

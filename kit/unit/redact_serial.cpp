@@ -91,8 +91,12 @@ void redactFiles(const Bytes& serial, UnitDescription& unit) {
             redact(serial, bytes); // a serial has no zero, so it lies within one run
         }
     }
+    for (auto& [path, target] : unit.links) {
+        redact(serial, target);
+    }
     redactNames(serial, unit.files);
     redactNames(serial, unit.sparseFiles);
+    redactNames(serial, unit.links);
     for (std::string& path : unit.folders) {
         if (isVersionPath(path) && isVersionPath(withoutSerial(serial, path))) {
             path = withoutSerial(serial, path);

@@ -105,9 +105,9 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
 }
 
 void explainIap(PlannedFiles& files, Explanation& outputs) {
+    const VersionFiles versions = readVersionFiles(); // refuses what the tool itself would read
     IapValues values;
     readIapValues(values);
-    const VersionFiles versions = readVersionFiles();
     std::vector<MergedValue<IapValues>> sources = {
         {[](IapValues& v) { v.model = otherText(v.model); }, modelOrigin(readImage())},
         {[](IapValues& v) { v.serial = otherText(v.serial); }, serialOrigin()},

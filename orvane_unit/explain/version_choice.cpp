@@ -3,6 +3,7 @@
 
 #include "identity/software_version.h"
 #include "kit/description/value_key.h"
+#include "kit/host/whole_file.h"
 #include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
 
@@ -14,6 +15,9 @@
 namespace orvane::desk {
 
 namespace {
+
+/// A file of short lines takes many times its size in memory. In bytes.
+constexpr std::uint64_t LONGEST_VERSION_FILE = std::uint64_t{16} << 20U;
 
 /// The number, from 1, of the last line that gives `key` the value that it has in `record`; 0 when
 /// none does.
@@ -56,6 +60,7 @@ VersionFiles readVersionFiles() {
     versions.hasFolder = listing.isOpen();
     std::vector<Inf_Data> records;
     for (std::string path; listing.next(path);) {
+        kit::requireShort(path, LONGEST_VERSION_FILE);
         records.emplace_back();
         readInfFile(path, records.back());
         versions.files.push_back({path, records.back(), isApplication(records.back())});

@@ -100,6 +100,34 @@ TEST(RefusalTest, BinaryThatIsNotAProgramIsBadInput) {
     EXPECT_TRUE(fs::is_empty(described.root() / "tmp"));
 }
 
+TEST(RefusalTest, InputsWithoutALimitAreNotReadToTheirEnd) {
+    const DescribedUnit described([](kit::UnitDescription& unit) {
+        unit.sparseFiles["/fs/rwdata/.Version/long.inf"].size = std::uint64_t{1} << 40U;
+    });
+    const std::string root = described.root();
+    const std::string cases = described.folder() / "cases";
+    fs::create_directories(cases + "/one");
+    writeFile(cases + "/one/unit.toml", "");
+    fs::create_symlink("/dev/zero", cases + "/one/arguments");
+    for (const Words& words :
+         {Words{"new", described.folder() / "new", "--from", "/dev/zero"}, Words{"explain", root},
+          Words{"show", root}, Words{"diff", root, root}, Words{"impact", root, "param.22"},
+          Words{"check", cases, "--orvane", ORVANE_BINARY}}) {
+        const std::string complaint = refusalOf(words);
+        EXPECT_NE(complaint.find(" has more than "), std::string::npos) << complaint;
+    }
+    fs::remove(root + "/fs/rwdata/.Version/long.inf");
+    fs::resize_file(root + "/fs/mp/etc/airplay_static.conf", std::uint64_t{1} << 40U);
+    EXPECT_NE(
+        refusalOf({"explain", root}).find("airplay_static.conf has more than 268435456 bytes"),
+        std::string::npos);
+    writeFile(root + "/tmp/other", "");
+    fs::resize_file(root + "/tmp/other", std::uint64_t{1} << 40U);
+    EXPECT_NE(refusalOf({"run", root, "--orvane", ORVANE_BINARY})
+                  .find("/tmp/other has more than 268435456 bytes"),
+              std::string::npos);
+}
+
 } // namespace
 
 } // namespace orvane::test
