@@ -16,7 +16,7 @@ from model.snapshot import Entry
 PAGE = 4096
 
 
-def _data(descriptor: int, size: int) -> Iterator[tuple[int, int]]:
+def data_parts(descriptor: int, size: int) -> Iterator[tuple[int, int]]:
     """The start and end of each part of a file that isn't a hole."""
     end = 0
     while end < size:
@@ -36,7 +36,7 @@ def digest(path: str) -> bytes:
     with open(path, "rb", buffering=0) as file:
         size = os.fstat(file.fileno()).st_size
         ahead = 0
-        for start, end in _data(file.fileno(), size):
+        for start, end in data_parts(file.fileno(), size):
             for offset in range(max(ahead, start // PAGE * PAGE), end, PAGE):
                 page = os.pread(file.fileno(), PAGE, offset)
                 ahead = offset + PAGE
