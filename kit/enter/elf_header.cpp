@@ -2,6 +2,7 @@
 #include "kit/enter/elf_header.h"
 
 #include "kit/host/kit_error.h"
+#include "kit/host/tree_entries.h"
 
 #include <elf.h>
 #include <link.h>
@@ -43,6 +44,11 @@ ElfHeader readHeader(std::istream& in) {
 } // namespace
 
 ElfHeader readElfHeader(const std::filesystem::path& file) {
+    const std::filesystem::file_type kind = kindBehind(file);
+    if (kind != std::filesystem::file_type::regular &&
+        kind != std::filesystem::file_type::not_found) {
+        throw KitError("", file, " is " + nounOf(kind) + ", not a program");
+    }
     std::ifstream in(file, std::ios::binary);
     if (!in) {
         throw systemError("cannot read ", file);

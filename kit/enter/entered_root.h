@@ -23,6 +23,9 @@ public:
     EnteredRoot(const EnteredRoot&) = delete;
     EnteredRoot& operator=(const EnteredRoot&) = delete;
 
+    /// Whether the root was "/" already: the unit is the system that runs, not a copy of one.
+    bool isRunningSystem() const { return !outerRoot_.isOpen(); }
+
 private:
     Descriptor outerRoot_; ///< the former "/"; closed when it is the present one, too
     Descriptor outerCwd_;  ///< the former working directory

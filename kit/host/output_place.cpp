@@ -1,84 +1,101 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/output_place.h"
 
+#include "kit/host/kit_error.h"
+#include "kit/host/tree_entries.h"
+
 #include <sys/stat.h>
-#include <unistd.h>
+#include <sys/statvfs.h>
 
 #include <cerrno>
-#include <climits>
-#include <cstdlib>
-#include <memory>
+#include <deque>
+#include <filesystem>
 
 namespace orvane::kit {
 
 namespace {
 
-std::optional<std::string> canonical(const std::string& path) {
-    const std::unique_ptr<char, decltype(&std::free)> real(::realpath(path.c_str(), nullptr),
-                                                           &std::free);
-    return real ? std::optional<std::string>(real.get()) : std::nullopt;
-}
+namespace fs = std::filesystem;
 
-std::optional<OutputPlace> placeThatIsThere(const std::string& path) {
-    const std::optional<std::string> real = canonical(path);
+/// How many links the kernel follows in one path.
+constexpr int MOST_LINKS = 40;
+
+/// The name `name` in a folder, its link not followed; nothing when there can't be such a name.
+std::optional<OutputPlace> lookInFolder(const std::string& folder, const fs::path& name) {
+    const fs::path entry = fs::path(folder) / name;
     struct stat state {};
-    if (!real || ::stat(real->c_str(), &state) != 0) {
+    if (::lstat(entry.c_str(), &state) == 0) {
+        return OutputPlace{entry.string(), state.st_mode & S_IFMT};
+    }
+    if (errno == ENOENT) {
+        return OutputPlace{entry.string(), 0};
+    }
+    if (errno == ENAMETOOLONG) {
         return std::nullopt;
     }
-    return OutputPlace{*real, state.st_mode & S_IFMT};
+    throw systemError("cannot read ", entry);
 }
 
-std::string linkTarget(const std::string& path) {
-    std::string target(PATH_MAX, '\0');
-    const ssize_t length = ::readlink(path.c_str(), target.data(), target.size());
-    target.resize(length < 0 ? 0 : static_cast<std::size_t>(length));
-    return target;
+bool isOnReadOnlyMount(const OutputPlace& place) {
+    const fs::path path = place.path;
+    const fs::path there = place.kind == 0 ? path.parent_path() : path;
+    struct statvfs mount {};
+    if (::statvfs(there.c_str(), &mount) != 0) {
+        throw systemError("cannot read ", there);
+    }
+    return (mount.f_flag & ST_RDONLY) != 0;
 }
 
 } // namespace
 
-std::optional<OutputPlace> findOutputPlace(std::string path) {
-    constexpr int MOST_LINKS = 40; // the kernel's own limit
-    for (int links = 0; links <= MOST_LINKS; ++links) {
-        const std::size_t slash = path.rfind('/');
-        const std::string name = path.substr(slash + 1);
-        if (name.empty() || name == "." || name == "..") {
-            return placeThatIsThere(path);
-        }
-        const std::optional<std::string> folder = canonical(path.substr(0, slash) + "/");
-        if (!folder) {
+std::optional<OutputPlace> findOutputPlace(const std::string& path) {
+    const fs::path whole = path;
+    std::deque<fs::path> names(whole.begin(), whole.end());
+    OutputPlace place;
+    int links = 0;
+    while (!names.empty()) {
+        const fs::path name = names.front();
+        names.pop_front();
+        if (name.has_root_directory()) {
+            place = {"/", S_IFDIR};
+        } else if (place.kind != S_IFDIR) {
             return std::nullopt;
+        } else if (name == "..") {
+            place.path = fs::path(place.path).parent_path();
+        } else if (!name.empty() && name != ".") {
+            const std::optional<OutputPlace> next = lookInFolder(place.path, name);
+            if (!next || (next->kind == S_IFLNK && ++links > MOST_LINKS)) {
+                return std::nullopt;
+            }
+            if (next->kind == S_IFLNK) {
+                const fs::path target = targetOf(next->path);
+                names.insert(names.begin(), target.begin(), target.end());
+            } else {
+                place = *next;
+            }
         }
-        const std::string base = *folder == "/" ? "/" : *folder + "/";
-        path = base + name;
-        struct stat state {};
-        if (::lstat(path.c_str(), &state) != 0) {
-            return errno == ENOENT ? std::optional<OutputPlace>(OutputPlace{path, 0})
-                                   : std::nullopt;
-        }
-        if (!S_ISLNK(state.st_mode)) {
-            return OutputPlace{path, state.st_mode & S_IFMT};
-        }
-        const std::string target = linkTarget(path);
-        path = target.compare(0, 1, "/") == 0 ? target : base + target;
     }
-    return std::nullopt;
+    return place;
 }
 
-bool canBeWritten(const OutputPlace& place) {
-    if (place.kind == S_IFDIR || place.kind == S_IFSOCK) {
+bool canBeOpened(const OutputPlace& place, bool isRunningSystem) {
+    switch (place.kind) {
+    case S_IFDIR:
+    case S_IFSOCK:
         return false;
+    case S_IFIFO:
+        throw KitError("", place.path, " is a pipe: a run waits there for its other end");
+    case S_IFREG:
+    case 0:
+        return !isRunningSystem || !isOnReadOnlyMount(place);
+    default:
+        return true;
     }
-    if (place.kind != 0) {
-        return ::access(place.path.c_str(), W_OK) == 0;
-    }
-    const std::string folder = place.path.substr(0, place.path.rfind('/') + 1);
-    return ::access(folder.c_str(), W_OK | X_OK) == 0;
 }
 
-bool canBeWritten(const std::string& path) {
+bool canBeOpened(const std::string& path, bool isRunningSystem) {
     const std::optional<OutputPlace> place = findOutputPlace(path);
-    return place && canBeWritten(*place);
+    return place && canBeOpened(*place, isRunningSystem);
 }
 
 } // namespace orvane::kit

@@ -47,10 +47,20 @@ fs::file_type kindBehind(const fs::path& entry) {
     if (type != fs::file_type::none) {
         return type;
     }
-    if (error == std::errc::too_many_symbolic_link_levels) {
+    if (error == std::errc::too_many_symbolic_link_levels ||
+        error == std::errc::filename_too_long) {
         return fs::file_type::not_found;
     }
     throw KitError("cannot read ", entry, ": " + error.message());
+}
+
+std::string nounOf(fs::file_type kind) {
+    return kind == fs::file_type::regular     ? "a file"
+           : kind == fs::file_type::directory ? "a folder"
+           : kind == fs::file_type::symlink   ? "a link"
+           : kind == fs::file_type::fifo      ? "a pipe"
+           : kind == fs::file_type::socket    ? "a socket"
+                                              : "a device";
 }
 
 std::string targetOf(const fs::path& link) {

@@ -15,8 +15,11 @@ std::vector<std::filesystem::directory_entry> listFolder(const std::filesystem::
 /// What `entry` is, links not followed.
 std::filesystem::file_type kindOf(const std::filesystem::path& entry);
 
-/// What `entry` leads to, links followed; `not_found` for a broken or circular link.
+/// What `entry` leads to, links followed; `not_found` for a link that leads nowhere.
 std::filesystem::file_type kindBehind(const std::filesystem::path& entry);
+
+/// "a file", "a pipe", ...
+std::string nounOf(std::filesystem::file_type kind);
 
 /// The target of a link.
 std::string targetOf(const std::filesystem::path& link);

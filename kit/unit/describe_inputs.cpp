@@ -8,22 +8,16 @@
 #include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
-#include "kit/host/kit_error.h"
+#include "kit/host/input_kind.h"
 #include "kit/host/output_place.h"
 #include "kit/host/tree_entries.h"
 #include "kit/unit/describe_unit.h"
 #include "main/unit_files.h"
-#include "platform/shared_memory.h"
 #include "tuning/audio_profile.h"
 #include "writers/template_merge.h"
 
-#include <fcntl.h>
-#include <sys/stat.h>
-
 #include <algorithm>
-#include <cerrno>
 #include <cstdint>
-#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -33,31 +27,11 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr int FLAGS = O_RDONLY | O_NONBLOCK | O_CLOEXEC;
-
-/// Whether the last failed call was about something that is not there.
-bool isMissing() {
-    return errno == ENOENT || errno == ENOTDIR || errno == ELOOP || errno == ENAMETOOLONG;
-}
-
-/// The type of what has just been opened as `path`, also if that failed; `none` when nothing is
-/// there.
-fs::file_type typeOf(const Descriptor& descriptor, const char* path) {
-    if (!descriptor.isOpen() && isMissing()) {
-        return fs::file_type::none;
-    }
-    struct stat state {};
-    if (!descriptor.isOpen() || ::fstat(descriptor.number(), &state) != 0) {
-        throw systemError(std::string("cannot read ") + path);
-    }
-    return S_ISDIR(state.st_mode)   ? fs::file_type::directory
-           : S_ISREG(state.st_mode) ? fs::file_type::regular
-                                    : fs::file_type::unknown;
-}
-
 /// Requires that the process has entered the unit.
 class InputReader {
 public:
+    explicit InputReader(bool isRunningSystem) : isRunningSystem_(isRunningSystem) {}
+
     UnitInputs read() {
         readImage();
         readDisk();
@@ -73,27 +47,29 @@ public:
 
 private:
     void readImage() {
-        const Descriptor image(platform::openSharedMemory(CONFIG_SHM_NAME, FLAGS, 0));
-        const fs::file_type type = typeOf(image, CONFIG_SHM_NAME);
-        if (type == fs::file_type::none) {
+        const InputKind kind = lookAtPositionedInput(CONFIG_SHM_NAME);
+        if (kind == InputKind::missing) {
             unit_.absent.emplace_back(CONFIG_SHM_NAME);
-        } else if (type == fs::file_type::directory) {
+        } else if (kind == InputKind::folder) {
             unit_.folders.emplace_back(CONFIG_SHM_NAME);
-        } else if (sizeOf(image, CONFIG_SHM_NAME) <= LONGEST_IMAGE) {
-            inputs_.image = readWhole(image, CONFIG_SHM_NAME);
         } else {
-            describeFile(image, CONFIG_SHM_NAME, CONFIG_SHM_NAME, unit_);
+            const Descriptor image = openForReading(CONFIG_SHM_NAME);
+            if (sizeOf(image, CONFIG_SHM_NAME) <= LONGEST_IMAGE) {
+                inputs_.image = readWhole(image, CONFIG_SHM_NAME);
+            } else {
+                describeFile(image, CONFIG_SHM_NAME, CONFIG_SHM_NAME, unit_);
+            }
         }
     }
 
     void readDisk() {
-        const Descriptor disk(::open(BOOT_DISK, FLAGS));
-        const fs::file_type type = typeOf(disk, BOOT_DISK);
-        if (type == fs::file_type::none) {
+        const InputKind kind = lookAtPositionedInput(BOOT_DISK);
+        if (kind == InputKind::missing) {
             unit_.absent.emplace_back(BOOT_DISK);
-        } else if (type == fs::file_type::directory) {
+        } else if (kind == InputKind::folder) {
             unit_.folders.emplace_back(BOOT_DISK);
         } else {
+            const Descriptor disk = openForReading(BOOT_DISK);
             const std::uint64_t size = sizeOf(disk, BOOT_DISK);
             const std::uint64_t copied = std::min<std::uint64_t>(size, RECORD_AREA_SIZE);
             inputs_.disk = readAt(disk, BOOT_DISK, size - copied, copied);
@@ -101,7 +77,7 @@ private:
     }
 
     void readVersionFiles() {
-        if (!isFolder(VERSION_DIR)) {
+        if (lookAtSequentialInput(VERSION_DIR) != InputKind::folder) {
             return;
         }
         for (const fs::directory_entry& entry : listFolder(VERSION_DIR)) {
@@ -112,24 +88,17 @@ private:
         }
     }
 
-    /// Looks before it opens: opening a device may have an effect.
     void readFile(const std::string& path) {
-        struct stat state {};
-        if (::stat(path.c_str(), &state) != 0) {
-            if (!isMissing()) {
-                throw systemError("cannot read " + path);
-            }
-        } else if (S_ISDIR(state.st_mode)) {
+        const InputKind kind = lookAtSequentialInput(path);
+        if (kind == InputKind::folder) {
             unit_.folders.push_back(path);
-        } else if (S_ISREG(state.st_mode)) {
+        } else if (kind == InputKind::file) {
             describeFile(openForReading(path), path, path, unit_);
-        } else {
-            throw KitError(path + " is neither a file nor a folder");
         }
     }
 
     void findOutputs() {
-        if (!isFolder(OUTPUT_FOLDER)) {
+        if (kindBehind(OUTPUT_FOLDER) != fs::file_type::directory) {
             unit_.absent.emplace_back(OUTPUT_FOLDER);
             return;
         }
@@ -142,16 +111,12 @@ private:
     }
 
     void findOutput(const char* path) {
-        if (!canBeWritten(path)) {
+        if (!canBeOpened(path, isRunningSystem_)) {
             unit_.folders.emplace_back(path);
         }
     }
 
-    static bool isFolder(const char* path) {
-        std::error_code error;
-        return fs::is_directory(path, error);
-    }
-
+    bool isRunningSystem_;
     UnitInputs inputs_;
     UnitDescription& unit_ = inputs_.unit;
 };
@@ -160,7 +125,7 @@ private:
 
 UnitInputs readInputs(const fs::path& source) {
     const EnteredRoot entered(source);
-    return InputReader().read();
+    return InputReader(entered.isRunningSystem()).read();
 }
 
 UnitDescription descriptionOf(UnitInputs inputs) {

@@ -30,10 +30,10 @@ UnitDescription descriptionOf(UnitInputs inputs);
 ///  - the files of the version folder that the tool takes for version descriptions;
 ///  - templates and stock files. Links are followed inside the source. What is missing or can't be
 ///    reached there is missing in the description; a folder in the place of a file is a folder.
-///    Outputs are left out, except that one that can't be opened for writing becomes a folder, and
+///    Outputs are left out, except that one that a run can't open becomes a folder, and
 ///    a missing /tmp stays missing. Not kept are links between outputs and inputs, and the order of
 ///    the version folder's listing, which is the file system's. Never writes. Throws KitError when
-///    the source can't be entered, or something in it can't be read.
+///    the source can't be entered, or nobody can tell what a run would read in it.
 UnitDescription describeInputs(const std::filesystem::path& source);
 
 } // namespace orvane::kit

@@ -75,7 +75,8 @@ private:
         } else if (kind == fs::file_type::regular) {
             readFile(path, entry.path());
         } else {
-            throw KitError("", entry.path(), " is neither a file, a folder nor a link");
+            throw KitError("", entry.path(),
+                           " is " + nounOf(kind) + ", not a file, a folder or a link");
         }
     }
 

@@ -184,14 +184,14 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
 
     const kit::EnteredRoot entered(copy);
     const std::vector<std::string> both = {std::string{'-', AIRPLAY_OPTION, IAP_OPTION}};
-    const Explanation baseline = explain(both);
+    const Explanation baseline = explain(entered, both);
     std::vector<Impact> impacts;
     for (const Input& input : inputs) {
         Impact impact{input.key, input.values.size(), 0, {}};
         for (const std::string& value : input.values) {
             input.file->write(input.offset, value);
             const std::vector<OutputDifference> differences =
-                outputDifferences(baseline, explain(both));
+                outputDifferences(baseline, explain(entered, both));
             impact.changing += differences.empty() ? 0U : 1U;
             addLines(differences, impact);
         }

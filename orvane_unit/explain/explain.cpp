@@ -4,7 +4,6 @@
 #include "config/config_store.h"
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_key.h"
-#include "kit/enter/entered_root.h"
 #include "kit/host/lost_pages.h"
 #include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
@@ -84,6 +83,7 @@ Output generatedTuning(PlannedFiles& files, const TuningOutput& tuning) {
 }
 
 void explainAirplay(PlannedFiles& files, Explanation& outputs) {
+    const Image image = readImage(); // before the tool's own functions, which would wait at a pipe
     AirplayValues values;
     readVehicleValues(values);
     values.audioProfile = readAudioProfile();
@@ -92,7 +92,6 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
                               ? generatedTuning(files, tuning)
                               : tuningNotAsked(tuning, values.audioProfile));
     }
-    const Image image = readImage();
     const std::vector<MergedValue<AirplayValues>> sources = {
         {[](AirplayValues& v) { v.model = otherText(v.model); }, modelOrigin(image)},
         {[](AirplayValues& v) { v.brand = otherText(v.brand); }, paramOrigin(image, BRAND_PARAM)},
@@ -105,15 +104,16 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
 }
 
 void explainIap(PlannedFiles& files, Explanation& outputs) {
-    const VersionFiles versions = readVersionFiles(); // refuses what the tool itself would read
-    IapValues values;
-    readIapValues(values);
+    const Image image = readImage(); // these before the tool's own functions, as above
+    const VersionFiles versions = readVersionFiles();
     std::vector<MergedValue<IapValues>> sources = {
-        {[](IapValues& v) { v.model = otherText(v.model); }, modelOrigin(readImage())},
+        {[](IapValues& v) { v.model = otherText(v.model); }, modelOrigin(image)},
         {[](IapValues& v) { v.serial = otherText(v.serial); }, serialOrigin()},
         {[](IapValues& v) { v.firmwareVersion = otherText(v.firmwareVersion); },
          versionTextOrigin(versions)},
     };
+    IapValues values;
+    readIapValues(values);
     PlannedMerge device(files, IAP2_DEVICE_FILE);
     outputs.push_back(device.finish(values, sources, generateIap2DeviceFile));
 
@@ -153,10 +153,10 @@ std::vector<Writer> writersOf(const std::vector<std::string>& arguments) {
 
 } // namespace
 
-Explanation explain(const std::vector<std::string>& arguments) {
+Explanation explain(const kit::EnteredRoot& entered, const std::vector<std::string>& arguments) {
     const kit::LostPages lost;
     Explanation outputs;
-    PlannedFiles files;
+    PlannedFiles files(entered.isRunningSystem());
     for (const Writer writer : writersOf(arguments)) {
         if (writer == updateAirplayConfigFile) {
             explainAirplay(files, outputs);
@@ -177,7 +177,7 @@ Explanation explain(const std::vector<std::string>& arguments) {
 Explanation explainUnit(const std::filesystem::path& root,
                         const std::vector<std::string>& arguments) {
     const kit::EnteredRoot entered(root);
-    return explain(arguments);
+    return explain(entered, arguments);
 }
 
 } // namespace orvane::desk

@@ -5,6 +5,7 @@
 // files is replaced.
 #pragma once
 
+#include "kit/enter/entered_root.h"
 #include "orvane_unit/explain/explanation.h"
 
 #include <filesystem>
@@ -13,11 +14,13 @@
 
 namespace orvane::desk {
 
-/// Explains a run with the command line `arguments` in the unit that this process has as its root.
-Explanation explain(const std::vector<std::string>& arguments);
+/// Explains a run with the command line `arguments` in the unit `entered`. Throws kit::KitError
+/// where nobody can tell what the run does: at a pipe, at a device in place of a file that it
+/// reads, and at what this process may not read.
+Explanation explain(const kit::EnteredRoot& entered, const std::vector<std::string>& arguments);
 
-/// The same for the unit at `root`, "/" for the system itself. Throws kit::KitError when it can't
-/// be entered.
+/// The same for the unit at `root`, "/" for the system itself. Throws kit::KitError also when it
+/// can't be entered.
 Explanation explainUnit(const std::filesystem::path& root,
                         const std::vector<std::string>& arguments);
 

@@ -2,11 +2,11 @@
 #include "orvane_unit/explain/planned_files.h"
 
 #include "kit/host/bytes.h"
+#include "kit/host/input_kind.h"
 #include "kit/host/output_place.h"
 #include "kit/host/whole_file.h"
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <utility>
 
@@ -33,7 +33,7 @@ bool keepsBytes(const kit::OutputPlace& place) {
 
 bool PlannedFiles::openForWriting(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
-    if (!place || !(written_.count(fileName(*place)) != 0 || kit::canBeWritten(*place))) {
+    if (!place || !kit::canBeOpened(*place, isRunningSystem_)) {
         return false;
     }
     if (keepsBytes(*place)) {
@@ -51,12 +51,12 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
     if (written != written_.end()) {
         return written->second;
     }
-    // Anything else is not read: that would take bytes from a pipe, or wait for ever.
-    const bool isFolder = place->kind == S_IFDIR;
-    if ((!isFolder && place->kind != S_IFREG) || ::access(place->path.c_str(), R_OK) != 0) {
+    const kit::InputKind kind = kit::lookAtSequentialInput(place->path);
+    if (kind == kit::InputKind::missing) {
         return std::nullopt;
     }
-    return isFolder ? "" : kit::readWholeFile(place->path); // a folder opens and yields nothing
+    // A folder opens and yields nothing.
+    return kind == kit::InputKind::folder ? "" : kit::readWholeFile(place->path);
 }
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {
@@ -72,15 +72,12 @@ PathKind PlannedFiles::look(const std::string& path, std::string& content) const
     if (!place) {
         return PathKind::nothing;
     }
-    if (place->kind == S_IFDIR) {
-        return PathKind::folder;
+    if (!keepsBytes(*place)) {
+        return place->kind == S_IFDIR ? PathKind::folder : PathKind::other;
     }
     const std::optional<std::string> text = read(path);
-    if (text) {
-        content = *text;
-        return PathKind::file;
-    }
-    return place->kind == 0 ? PathKind::nothing : PathKind::other;
+    content = text.value_or("");
+    return text ? PathKind::file : PathKind::nothing;
 }
 
 } // namespace orvane::desk

@@ -16,6 +16,9 @@ namespace orvane::desk {
 /// Paths are those of the unit, which the process must have as its root.
 class PlannedFiles {
 public:
+    /// `isRunningSystem` as of kit::canBeOpened.
+    explicit PlannedFiles(bool isRunningSystem) : isRunningSystem_(isRunningSystem) {}
+
     /// Opens and truncates, as an output stream does. False when it can't be opened.
     bool openForWriting(const std::string& path);
 
@@ -29,6 +32,7 @@ public:
     PathKind look(const std::string& path, std::string& content) const;
 
 private:
+    bool isRunningSystem_;
     std::map<std::string, std::string> written_; ///< content by file: see fileName in the source
 };
 

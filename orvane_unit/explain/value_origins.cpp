@@ -10,11 +10,11 @@
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_key.h"
 #include "kit/description/value_places.h"
+#include "kit/host/input_kind.h"
 #include "orvane_unit/explain/place.h"
 #include "tuning/tuning_file.h"
 
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -41,21 +41,21 @@ std::optional<std::string> imageBytes(const Image& image, const kit::ParamPlace&
 } // namespace
 
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd) {
+    const kit::InputKind kind = kit::lookAtPositionedInput(BOOT_DISK);
     const BootDisk disk(O_RDONLY);
     if (!disk.isOpen()) {
         return Reason::diskMissing;
     }
-    struct stat state {};
-    const bool isFolder = ::stat(BOOT_DISK, &state) == 0 && S_ISDIR(state.st_mode);
     if (!disk.seekFromEnd(bytesBeforeEnd)) {
         // Whether a seek in a folder works depends on the file system.
-        return isFolder ? Reason::diskUnreadable : Reason::diskTooShort;
+        return kind == kit::InputKind::folder ? Reason::diskUnreadable : Reason::diskTooShort;
     }
     char byte = 0;
     return disk.read(&byte, 1) ? std::nullopt : std::optional<Reason>(Reason::diskUnreadable);
 }
 
 std::uint64_t diskSize() {
+    kit::lookAtPositionedInput(BOOT_DISK);
     const int descriptor = ::open(BOOT_DISK, O_RDONLY | O_CLOEXEC);
     if (descriptor < 0) {
         return 0;
@@ -66,6 +66,7 @@ std::uint64_t diskSize() {
 }
 
 Image readImage() {
+    kit::lookAtPositionedInput(CONFIG_SHM_NAME);
     Image image;
     ConfigStore store;
     store.init();
@@ -129,12 +130,12 @@ Origin serialOrigin() {
 
 TuningArea readUnitTuning() {
     TuningArea area;
-    area.blocks = readTuningBlocks();
     if (const std::optional<Reason> trouble = diskTrouble(TUNING_AREA_START)) {
         area.reason = *trouble;
     } else {
         area.offset = diskOffset(TUNING_AREA_START);
     }
+    area.blocks = readTuningBlocks();
     return area;
 }
 

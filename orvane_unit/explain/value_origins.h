@@ -14,7 +14,8 @@
 
 namespace orvane::desk {
 
-/// Why the disk can't be read at a place; nothing if it can.
+/// Why the disk can't be read at a place; nothing if it can. Throws kit::KitError where nobody can
+/// tell what a run finds there, as do the other functions that read the image or the disk.
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
 
 /// Size of the disk in bytes, also of a device; 0 when it can't be opened.

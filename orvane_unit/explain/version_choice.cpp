@@ -3,6 +3,7 @@
 
 #include "identity/software_version.h"
 #include "kit/description/value_key.h"
+#include "kit/host/input_kind.h"
 #include "kit/host/whole_file.h"
 #include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
@@ -55,11 +56,13 @@ bool isIncomplete(const std::string& version) {
 } // namespace
 
 VersionFiles readVersionFiles() {
+    kit::lookAtSequentialInput(VERSION_DIR);
     VersionFiles versions;
     VersionFileListing listing;
     versions.hasFolder = listing.isOpen();
     std::vector<Inf_Data> records;
     for (std::string path; listing.next(path);) {
+        kit::lookAtSequentialInput(path);
         kit::requireShort(path, LONGEST_VERSION_FILE);
         records.emplace_back();
         readInfFile(path, records.back());

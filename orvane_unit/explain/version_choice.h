@@ -27,6 +27,7 @@ struct VersionFiles {
     std::optional<std::size_t> chosen; ///< the first application
 };
 
+/// Throws kit::KitError where nobody can tell what a run reads.
 VersionFiles readVersionFiles();
 
 /// The origin of the version as a text, in the two iAP2 files.

@@ -13,11 +13,10 @@
 #include "kit/host/bytes.h"
 #include "kit/host/lost_pages.h"
 #include "kit/host/sparse_content.h"
+#include "kit/host/tree_entries.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"
 #include "writers/template_merge.h"
-
-#include <sys/stat.h>
 
 #include <cstddef>
 #include <utility>
@@ -25,6 +24,8 @@
 namespace orvane::desk {
 
 namespace {
+
+namespace fs = std::filesystem;
 
 std::string textBy(void (*lookup)(std::string&)) {
     std::string text;
@@ -101,8 +102,8 @@ CrcVerdict verdictOn(const DecodedRecords& records) {
 
 DecodedRecords decodeRecords() {
     DecodedRecords records;
-    records.diskSize = diskSize();
     records.diskTrouble = diskTrouble(RECORD_AREA_SIZE);
+    records.diskSize = diskSize();
     for (std::uint32_t number = 0; number < RECORD_SLOT_COUNT; ++number) {
         const kit::SlotPlace place = kit::slotPlace(number);
         DecodedSlot slot{number, place.size, place.offset, std::nullopt};
@@ -122,15 +123,16 @@ DecodedRecords decodeRecords() {
 }
 
 UnitFile look(const std::string& path, const char* role) {
-    UnitFile file{path, role, PathKind::nothing, 0};
-    struct stat state {};
-    if (::stat(path.c_str(), &state) != 0) {
-        return file;
+    const fs::file_type type = kit::kindBehind(path);
+    UnitFile file{path, role, PathKind::other, 0};
+    if (type == fs::file_type::not_found) {
+        file.kind = PathKind::nothing;
+    } else if (type == fs::file_type::directory) {
+        file.kind = PathKind::folder;
+    } else if (type == fs::file_type::regular) {
+        file.kind = PathKind::file;
+        file.size = fs::file_size(path);
     }
-    file.kind = S_ISREG(state.st_mode)   ? PathKind::file
-                : S_ISDIR(state.st_mode) ? PathKind::folder
-                                         : PathKind::other;
-    file.size = file.kind == PathKind::file ? static_cast<std::uint64_t>(state.st_size) : 0;
     return file;
 }
 

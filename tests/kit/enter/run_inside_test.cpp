@@ -163,7 +163,7 @@ TEST_F(RunInsideTest, FileThatIsNotAProgramIsNamed) {
         EXPECT_EQ(refusalOf(file), file + " is not a little-endian ELF program");
     }
     const std::string folder = (root() / "tmp").string();
-    EXPECT_EQ(refusalOf(folder), folder + " is not a little-endian ELF program");
+    EXPECT_EQ(refusalOf(folder), folder + " is a folder, not a program");
 }
 
 TEST_F(RunInsideTest, TruncatedProgramIsNamed) {

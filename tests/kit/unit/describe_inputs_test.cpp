@@ -107,6 +107,7 @@ TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolReads) {
     putLink(folder + "g.inf", "/fs/rwdata/elsewhere");
     putLink(folder + "h.inf", "nowhere");
     putLink(folder + "i.inf", "i.inf");
+    ASSERT_EQ(::mknod(at(folder + "j.inf").c_str(), S_IFSOCK | 0600U, 0), 0);
     const kit::UnitDescription unit = found();
     EXPECT_EQ(unit.files, (Files{{folder + ".inf", ""},
                                  {folder + "a.inf", "a"},
@@ -214,9 +215,25 @@ TEST_F(DescribeInputsTest, InputThatCannotBeReadIsRefusedByName) {
     }
 }
 
-TEST_F(DescribeInputsTest, InputThatIsNeitherFileNorFolderIsRefusedByName) {
-    ASSERT_EQ(::mkfifo(at("/fs/mp/etc/airplay.conf").c_str(), 0600), 0);
-    EXPECT_EQ(refusal(), "/fs/mp/etc/airplay.conf is neither a file nor a folder");
+TEST_F(DescribeInputsTest, PlaceWhereARunWaitsIsRefusedByName) {
+    for (const std::string& path : {std::string("/fs/mp/etc/airplay.conf"), std::string(IMAGE_PATH),
+                                    std::string("/dev/hd0"), std::string("/tmp/iap1.cfg")}) {
+        ASSERT_EQ(::mkfifo(at(path).c_str(), 0600), 0);
+        EXPECT_EQ(refusal(), path + " is a pipe: a run waits there for its other end");
+        fs::remove(at(path));
+    }
+}
+
+TEST_F(DescribeInputsTest, OutputsThatThisProcessMayNotWriteCanBeOpenedOnAUnit) {
+    put("/tmp/iap1.cfg", "left by a run");
+    fs::permissions(at("/tmp/iap1.cfg"), fs::perms::none);
+    fs::permissions(at("/tmp"), fs::perms::owner_exec);
+    kit::describeInputs(source()); // enters a user namespace where it has to
+    {
+        const EnforcedPermissions permissions;
+        EXPECT_TRUE(kit::describeInputs(source()).folders.empty());
+    }
+    fs::permissions(at("/tmp"), fs::perms::owner_all);
 }
 
 TEST_F(DescribeInputsTest, SourceThatIsNotAFolderIsRefused) {

@@ -120,7 +120,7 @@ TEST_F(DescribeUnitTest, EntryThatCannotBeDescribedIsRefusedByName) {
     kit::makeUnit({}, root());
     const fs::path pipe = root() / "tmp/pipe";
     ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
-    EXPECT_EQ(refusal(), pipe.string() + " is neither a file, a folder nor a link");
+    EXPECT_EQ(refusal(), pipe.string() + " is a pipe, not a file, a folder or a link");
 }
 
 TEST_F(DescribeUnitTest, EntryThatCannotBeReadIsRefusedByName) {

@@ -9,8 +9,8 @@
 
 namespace orvane::test {
 
-/// Every entry below a unit's root except the kit's mark: "folder", "link " and its target, or
-/// "file " and its content.
+/// Every entry below a unit's root except the kit's mark: "folder", "link " and its target,
+/// "file " and its content, or "other".
 inline std::map<std::string, std::string> treeOf(const std::filesystem::path& root) {
     std::map<std::string, std::string> tree;
     for (const auto& entry : std::filesystem::recursive_directory_iterator(root)) {
@@ -22,8 +22,10 @@ inline std::map<std::string, std::string> treeOf(const std::filesystem::path& ro
             tree[path] = "link " + std::filesystem::read_symlink(entry.path()).string();
         } else if (entry.is_directory()) {
             tree[path] = "folder";
-        } else {
+        } else if (entry.is_regular_file()) {
             tree[path] = "file " + readFile(entry.path());
+        } else {
+            tree[path] = "other";
         }
     }
     return tree;

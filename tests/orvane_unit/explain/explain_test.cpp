@@ -1,19 +1,27 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "config/boot_disk.h"
+#include "config/config_store.h"
 #include "kit/description/unit_layout.h"
+#include "kit/enter/captured_run.h"
 #include "kit/enter/entered_root.h"
 #include "kit/enter/run_inside.h"
+#include "kit/host/kit_error.h"
+#include "kit/unit/describe_inputs.h"
 #include "kit/unit/marker.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/planned_merge.h"
 #include "orvane_unit/report/place_text.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/orvane_unit/tree_state.h"
+#include "tests/support/permissions.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
 
-#include <sys/stat.h>
-#include <sys/sysmacros.h>
+#include <sched.h>
+#include <sys/mount.h>
+#include <sys/statvfs.h>
+#include <unistd.h>
 
 #include <algorithm>
 
@@ -68,7 +76,7 @@ void expectRunLeaves(const DescribedUnit& described, const Explanation& explanat
 TEST(ExplainTest, OutputWithoutAnyLineIsEmpty) {
     const DescribedUnit described;
     const kit::EnteredRoot entered(described.root());
-    desk::PlannedFiles files;
+    desk::PlannedFiles files(entered.isRunningSystem());
     desk::PlannedMerge merge(files, AIRPLAY_FILE);
     const std::vector<desk::MergedValue<int>> values = {
         {[](int& value) { ++value; }, {{desk::Reason::fromImage}, kit::paramKey(1), {}}}};
@@ -76,6 +84,30 @@ TEST(ExplainTest, OutputWithoutAnyLineIsEmpty) {
         0, values, [](std::istream&, std::ostream&, int) { return MergeDecision::generate; });
     EXPECT_EQ(output.outcome, desk::Outcome::empty);
     EXPECT_TRUE(output.lines.empty());
+}
+
+/// In a child: mounts that no other process sees.
+void enterOwnMounts() {
+    const std::string user = "0 " + std::to_string(::geteuid()) + " 1";
+    const std::string group = "0 " + std::to_string(::getegid()) + " 1";
+    if (::unshare(CLONE_NEWNS) != 0) {
+        ASSERT_EQ(::unshare(CLONE_NEWUSER | CLONE_NEWNS), 0);
+        writeFile("/proc/self/setgroups", "deny");
+        writeFile("/proc/self/uid_map", user);
+        writeFile("/proc/self/gid_map", group);
+    }
+    ASSERT_EQ(::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr), 0);
+}
+
+void mountReadOnly(const fs::path& folder) {
+    ASSERT_EQ(::mount(folder.c_str(), folder.c_str(), nullptr, MS_BIND, nullptr), 0);
+    struct statvfs mount {};
+    ASSERT_EQ(::statvfs(folder.c_str(), &mount), 0);
+    // A user namespace may not lift these.
+    const unsigned long kept = mount.f_flag & (ST_NOSUID | ST_NODEV | ST_NOEXEC | ST_NOATIME);
+    ASSERT_EQ(
+        ::mount(nullptr, folder.c_str(), nullptr, MS_REMOUNT | MS_BIND | MS_RDONLY | kept, nullptr),
+        0);
 }
 
 TEST(ExplainTest, ValuesNameTheirKeysAndPlaces) {
@@ -195,6 +227,121 @@ TEST(ExplainTest, OutputsThatAreLinksAgreeWithARun) {
         SCOPED_TRACE(std::string(link.from) + " -> " + link.to);
         expectRunLeaves(described, explanation, {"-a", "-i"});
     }
+}
+
+TEST(ExplainTest, OutputsThatAreHardLinksAgreeWithARun) {
+    struct Link {
+        const char* from;
+        const char* to;
+    };
+    const Link links[] = {
+        {IAP2_DEVICE_FILE.output, IAP1_FILE.output},
+        {IAP1_FILE.output, IAP2_FILE.output},
+        {AIRPLAY_FILE.output, IAP1_FILE.output},
+        {IAP2_DEVICE_FILE.output, IAP2_FILE.templateFile},
+        {IAP2_FILE.output, IAP1_FILE.stockFile},
+    };
+    for (const Link& link : links) {
+        const DescribedUnit described(
+            [&link](UnitDescription& unit) { unit.files[link.to] = "one file\n"; });
+        fs::create_hard_link(described.root() / (link.to + 1), described.root() / (link.from + 1));
+        const Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
+        SCOPED_TRACE(std::string(link.from) + " = " + link.to);
+        expectRunLeaves(described, explanation, {"-a", "-i"});
+    }
+}
+
+TEST(ExplainTest, ChainsOfLinksAgreeWithARun) {
+    for (const int length : {20, 41, 60}) { // up to 20 the kernel may count all of them twice
+        const DescribedUnit described([length](UnitDescription& unit) {
+            for (const char* path : {AIRPLAY_FILE.output, IAP2_FILE.templateFile}) {
+                unit.files.erase(path);
+                std::string from = path;
+                for (int i = 1; i < length; ++i) {
+                    const std::string to = "/fs/rwdata/" + from.substr(from.rfind('/') + 1) + "x";
+                    unit.links[from] = to;
+                    from = to;
+                }
+                unit.links[from] = "/fs/rwdata/end";
+            }
+            unit.files["/fs/rwdata/end"] = "at the end\n";
+        });
+        SCOPED_TRACE(length);
+        const Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
+        EXPECT_EQ(outputOf(explanation, AIRPLAY_FILE.output).outcome,
+                  length > 40 ? desk::Outcome::kept : desk::Outcome::generated);
+        expectRunLeaves(described, explanation, {"-a", "-i"});
+    }
+}
+
+TEST(ExplainTest, UnitThatMayNotBeWrittenHereIsWrittenOnTheUnit) {
+    const DescribedUnit described(
+        [](UnitDescription& unit) { unit.files[IAP1_FILE.output] = "of an earlier run\n"; });
+    fs::permissions(described.root() / (IAP1_FILE.output + 1), fs::perms::owner_read);
+    fs::permissions(described.root() / "tmp", fs::perms::owner_read | fs::perms::owner_exec);
+    desk::explainUnit(described.root(), {}); // enters a user namespace where it has to
+    const EnforcedPermissions permissions;
+    for (const Output& output : desk::explainUnit(described.root(), {"-i"})) {
+        EXPECT_EQ(output.outcome, desk::Outcome::generated) << output.path;
+    }
+    EXPECT_TRUE(kit::describeInputs(described.root()).folders.empty());
+    fs::permissions(described.root() / "tmp", fs::perms::owner_all);
+}
+
+TEST(ExplainTest, ReadOnlyMountMattersOnTheSystemThatRuns) {
+    const DescribedUnit described;
+    const kit::RunResult result = kit::runCaptured([&described] {
+        enterOwnMounts();
+        mountReadOnly(described.root());
+        const kit::EnteredRoot entered(described.root());
+        const bool isKept = outputOf(desk::explainUnit("/", {"-i"}), IAP1_FILE.output).outcome ==
+                            desk::Outcome::kept;
+        const bool isFolder = kit::describeInputs("/").folders.size() == 6;
+        _exit((isKept ? 1 : 0) + (isFolder ? 2 : 0));
+    });
+    EXPECT_EQ(result.exitStatus, 3);
+}
+
+/// The complaint about what this process may not read, as the unit's own tool may.
+std::string complaintAbout(const DescribedUnit& described, const std::string& path,
+                           const std::vector<std::string>& arguments) {
+    const fs::path place = described.root() / path.substr(1);
+    const fs::perms former = fs::status(place).permissions();
+    desk::explainUnit(described.root(), {}); // enters a user namespace where it has to
+    fs::permissions(place, fs::perms::none);
+    std::string said;
+    {
+        const EnforcedPermissions permissions;
+        try {
+            desk::explainUnit(described.root(), arguments);
+        } catch (const kit::KitError& error) {
+            said = error.what();
+        }
+    }
+    fs::permissions(place, former);
+    return said;
+}
+
+TEST(ExplainTest, InputThatMayNotBeReadHereIsNotMissing) {
+    const DescribedUnit described([](UnitDescription& unit) {
+        unit.files.erase(IAP2_FILE.templateFile); // so its stock file is read
+        unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n";
+    });
+    for (const char* path : {CONFIG_SHM_NAME, BOOT_DISK, "/fs/rwdata/.Version/app.inf",
+                             IAP1_FILE.templateFile, IAP2_FILE.stockFile}) {
+        EXPECT_EQ(complaintAbout(described, path, {"-i"}),
+                  std::string("cannot read ") + path + ": Permission denied");
+    }
+    EXPECT_EQ(complaintAbout(described, "/fs/rwdata/.Version", {"-i"}),
+              "cannot read /fs/rwdata/.Version/: Permission denied");
+    EXPECT_EQ(complaintAbout(described, "/fs/mp", {"-a"}),
+              "cannot read /fs/mp/etc: Permission denied");
+    EXPECT_EQ(complaintAbout(described, TELEPHONY_TUNING_FILE, {"-a"}),
+              std::string("cannot read ") + TELEPHONY_TUNING_FILE + ": Permission denied");
+    // What a run does not read does not matter.
+    EXPECT_EQ(complaintAbout(described, BOOT_DISK, {"-a"}), "");
+    EXPECT_EQ(complaintAbout(described, AIRPLAY_FILE.stockFile, {"-a"}), "");
+    EXPECT_EQ(complaintAbout(described, IAP1_FILE.templateFile, {"-a"}), "");
 }
 
 TEST(ExplainTest, OutputThatIsNotWrittenKeepsItsContent) {

@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kit/host/input_kind.h"
+
+#include "kit/host/descriptor.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
+#include "kit/host/tree_entries.h"
+
+#include <unistd.h>
+
+#include <filesystem>
+
+namespace orvane::kit {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+InputKind lookAtInput(const std::string& path) {
+    const fs::file_type type = kindBehind(path);
+    if (type == fs::file_type::not_found || type == fs::file_type::socket) {
+        return InputKind::missing;
+    }
+    if (type == fs::file_type::fifo) {
+        throw KitError("", path, " is a pipe: a run waits there for its other end");
+    }
+    if (type != fs::file_type::regular && type != fs::file_type::directory) {
+        return InputKind::device;
+    }
+    openForReading(path); // throws if this process may not
+    return type == fs::file_type::regular ? InputKind::file : InputKind::folder;
+}
+
+} // namespace
+
+InputKind lookAtSequentialInput(const std::string& path) {
+    const InputKind kind = lookAtInput(path);
+    if (kind == InputKind::device) {
+        throw KitError("", path, " is a device: only a run can tell what it yields");
+    }
+    return kind;
+}
+
+InputKind lookAtPositionedInput(const std::string& path) {
+    const InputKind kind = lookAtInput(path);
+    if (kind == InputKind::device &&
+        ::lseek(openForReading(path).number(), 0, SEEK_END) == static_cast<off_t>(-1)) {
+        throw KitError("", path,
+                       " is a device without positions: only a run can tell what it yields");
+    }
+    return kind;
+}
+
+} // namespace orvane::kit

@@ -1,0 +1,28 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What is at the path of an input. Both functions look before anything is opened, so that nobody
+// waits at a pipe, and tell what is missing from what this process may not read: on a unit the tool
+// may read everything.
+#pragma once
+
+#include <string>
+
+namespace orvane::kit {
+
+enum class InputKind {
+    missing, ///< nothing, or what can't be opened: a link that leads nowhere, a socket
+    file,
+    folder,
+    device,
+};
+
+/// Looks at an input that a run reads from its start to its end. Never a device. Throws KitError
+/// for a pipe or a device, from which nobody knows what a run would read, and for what this process
+/// may not read.
+InputKind lookAtSequentialInput(const std::string& path);
+
+/// The same for an input that a run reads at positions, as the disk. A device is refused only if it
+/// has no positions.
+InputKind lookAtPositionedInput(const std::string& path);
+
+} // namespace orvane::kit
