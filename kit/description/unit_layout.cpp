@@ -81,6 +81,19 @@ Layout layoutOf(const UnitDescription& unit) {
     return layout;
 }
 
+void addAbsent(const Layout& layout,
+               const std::function<bool(const std::string& path, EntryKind kind)>& isThere,
+               UnitDescription& unit) {
+    for (const auto& [path, kind] : layout) {
+        const bool isKnown =
+            std::any_of(unit.absent.begin(), unit.absent.end(),
+                        [&p = path](const std::string& absent) { return isAtOrBelow(p, absent); });
+        if (!isKnown && !isThere(path, kind)) {
+            unit.absent.push_back(path);
+        }
+    }
+}
+
 std::string pathAbove(const std::string& path) {
     return path.substr(0, path.rfind('/'));
 }

@@ -5,6 +5,7 @@
 
 #include "kit/description/unit_description.h"
 
+#include <functional>
 #include <map>
 #include <string>
 
@@ -22,6 +23,12 @@ using Layout = std::map<std::string, EntryKind>;
 /// folders give way to whatever `unit` names at their path, and to anything but a folder above it.
 /// Requires that findPathConflict finds nothing.
 Layout layoutOf(const UnitDescription& unit);
+
+/// Adds to `unit` as absent the entries of `layout` that are not there. What lies below an absent
+/// one is not looked at.
+void addAbsent(const Layout& layout,
+               const std::function<bool(const std::string& path, EntryKind kind)>& isThere,
+               UnitDescription& unit);
 
 /// The path without its last name: "/tmp" for "/tmp/x", empty for "/tmp".
 std::string pathAbove(const std::string& path);

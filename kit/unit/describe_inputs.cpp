@@ -5,6 +5,7 @@
 #include "config/config_store.h"
 #include "config/record_slots.h"
 #include "identity/software_version.h"
+#include "kit/description/unit_layout.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
@@ -18,6 +19,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <map>
 #include <utility>
 #include <vector>
 
@@ -42,17 +44,16 @@ public:
         }
         findOutputs();
         std::sort(unit_.folders.begin(), unit_.folders.end());
+        addAbsent(layoutOf({}), isThere, unit_);
         return std::move(inputs_);
     }
 
 private:
     void readImage() {
         const InputKind kind = lookAtPositionedInput(CONFIG_SHM_NAME);
-        if (kind == InputKind::missing) {
-            unit_.absent.emplace_back(CONFIG_SHM_NAME);
-        } else if (kind == InputKind::folder) {
+        if (kind == InputKind::folder) {
             unit_.folders.emplace_back(CONFIG_SHM_NAME);
-        } else {
+        } else if (kind != InputKind::missing) {
             const Descriptor image = openForReading(CONFIG_SHM_NAME);
             if (sizeOf(image, CONFIG_SHM_NAME) <= LONGEST_IMAGE) {
                 inputs_.image = readWhole(image, CONFIG_SHM_NAME);
@@ -64,11 +65,9 @@ private:
 
     void readDisk() {
         const InputKind kind = lookAtPositionedInput(BOOT_DISK);
-        if (kind == InputKind::missing) {
-            unit_.absent.emplace_back(BOOT_DISK);
-        } else if (kind == InputKind::folder) {
+        if (kind == InputKind::folder) {
             unit_.folders.emplace_back(BOOT_DISK);
-        } else {
+        } else if (kind != InputKind::missing) {
             const Descriptor disk = openForReading(BOOT_DISK);
             const std::uint64_t size = sizeOf(disk, BOOT_DISK);
             const std::uint64_t copied = std::min<std::uint64_t>(size, RECORD_AREA_SIZE);
@@ -81,25 +80,26 @@ private:
             return;
         }
         for (const fs::directory_entry& entry : listFolder(VERSION_DIR)) {
-            const std::string path = VERSION_DIR + entry.path().filename().string();
-            if (isVersionFile(path)) {
-                readFile(path);
+            const std::string name = entry.path().filename().string();
+            const std::string path = VERSION_DIR + name;
+            if (isVersionFile(path) && readFile(path) == InputKind::missing) {
+                unit_.links[path] = name; // it is listed, and can't be opened
             }
         }
     }
 
-    void readFile(const std::string& path) {
+    InputKind readFile(const std::string& path) {
         const InputKind kind = lookAtSequentialInput(path);
         if (kind == InputKind::folder) {
             unit_.folders.push_back(path);
         } else if (kind == InputKind::file) {
             describeFile(openForReading(path), path, path, unit_);
         }
+        return kind;
     }
 
     void findOutputs() {
-        if (kindBehind(OUTPUT_FOLDER) != fs::file_type::directory) {
-            unit_.absent.emplace_back(OUTPUT_FOLDER);
+        if (!isThere(OUTPUT_FOLDER, EntryKind::folder)) {
             return;
         }
         for (const AccessoryFile& file : ACCESSORY_FILES) {
@@ -114,6 +114,12 @@ private:
         if (!canBeOpened(path, isRunningSystem_)) {
             unit_.folders.emplace_back(path);
         }
+    }
+
+    /// Whether the source has an entry that every unit has: a folder, the image, or the disk.
+    static bool isThere(const std::string& path, EntryKind kind) {
+        return kind == EntryKind::folder ? kindBehind(path) == fs::file_type::directory
+                                         : lookAtPositionedInput(path) != InputKind::missing;
     }
 
     bool isRunningSystem_;

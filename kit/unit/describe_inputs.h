@@ -28,12 +28,14 @@ UnitDescription descriptionOf(UnitInputs inputs);
 /// need not have made it), as a description of a unit in which a run does the same:
 ///  - the configuration image, and the last mebibyte of the boot disk, or all of a shorter one;
 ///  - the files of the version folder that the tool takes for version descriptions;
-///  - templates and stock files. Links are followed inside the source. What is missing or can't be
-///    reached there is missing in the description; a folder in the place of a file is a folder.
-///    Outputs are left out, except that one that a run can't open becomes a folder, and
-///    a missing /tmp stays missing. Not kept are links between outputs and inputs, and the order of
-///    the version folder's listing, which is the file system's. Never writes. Throws KitError when
-///    the source can't be entered, or nobody can tell what a run would read in it.
+///  - templates and stock files. Links are followed inside the source. What is missing there, or
+///    can't be opened by anybody, is missing in the description, folders included; a version file
+///    that is listed and can't be opened becomes a link to itself, which can't be either. A folder
+///    in the place of a file is a folder. A disk that tells no size, such as /dev/zero, becomes a
+///    mebibyte of what it yields. Outputs are left out, except that one that a run can't open
+///    becomes a folder. Not kept are links between outputs and inputs, and the order of the version
+///    folder's listing, which is the file system's. Never writes. Throws KitError when the source
+///    can't be entered, or nobody can tell what a run would read in it or where it would wait.
 UnitDescription describeInputs(const std::filesystem::path& source);
 
 } // namespace orvane::kit

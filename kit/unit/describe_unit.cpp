@@ -21,19 +21,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Adds the paths that every unit has and this one lacks.
-void findAbsent(const std::vector<std::string>& there, UnitDescription& unit) {
-    for (const auto& [path, kind] : layoutOf(unit)) {
-        const bool isThere = std::binary_search(there.begin(), there.end(), path);
-        const bool isKnown =
-            std::any_of(unit.absent.begin(), unit.absent.end(),
-                        [&p = path](const std::string& absent) { return isAtOrBelow(p, absent); });
-        if (!isThere && !isKnown) {
-            unit.absent.push_back(path);
-        }
-    }
-}
-
 class UnitReader {
 public:
     explicit UnitReader(fs::path root) : root_(std::move(root)) {}
@@ -46,7 +33,13 @@ public:
         }
         std::sort(there_.begin(), there_.end());
         std::sort(unit_.folders.begin(), unit_.folders.end());
-        findAbsent(there_, unit_);
+        // What every unit has and this one lacks.
+        addAbsent(
+            layoutOf(unit_),
+            [this](const std::string& path, EntryKind /*kind*/) {
+                return std::binary_search(there_.begin(), there_.end(), path);
+            },
+            unit_);
         return std::move(unit_);
     }
 

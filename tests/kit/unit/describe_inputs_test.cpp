@@ -48,11 +48,11 @@ protected:
 TEST_F(DescribeInputsTest, EmptySourceLacksImageAndDisk) {
     const kit::UnitDescription unit = found();
     kit::UnitDescription expected;
-    expected.absent = {IMAGE_PATH, "/dev/hd0"};
+    expected.absent = {"/dev/hd0", IMAGE_PATH};
     EXPECT_TRUE(unit == expected);
     fs::remove_all(source());
     fs::create_directory(source());
-    expected.absent.emplace_back("/tmp");
+    expected.absent = {"/dev", "/fs", "/tmp"};
     EXPECT_TRUE(found() == expected);
 }
 
@@ -115,14 +115,27 @@ TEST_F(DescribeInputsTest, VersionFilesAreThoseThatTheToolReads) {
                                  {folder + "f.inf", "Type=Application\n"},
                                  {folder + "g.inf", "Type=Application\n"}}));
     EXPECT_EQ(unit.folders, Paths{folder + "d.inf"});
-    EXPECT_TRUE(unit.links.empty());
+    // These are listed, and can't be opened.
+    EXPECT_EQ(unit.links, (Files{{folder + "h.inf", "h.inf"},
+                                 {folder + "i.inf", "i.inf"},
+                                 {folder + "j.inf", "j.inf"}}));
 }
 
-TEST_F(DescribeInputsTest, VersionFolderMayBeMissingOrNotAFolder) {
+TEST_F(DescribeInputsTest, VersionFolderThatIsMissingOrNotAFolderIsAbsent) {
+    const Paths expected = {"/dev/hd0", "/fs/rwdata/.Version", IMAGE_PATH};
     fs::remove_all(at("/fs/rwdata/.Version"));
-    EXPECT_TRUE(found().files.empty());
+    EXPECT_EQ(found().absent, expected);
     put("/fs/rwdata/.Version", "no folder");
+    EXPECT_EQ(found().absent, expected);
     EXPECT_TRUE(found().files.empty());
+}
+
+TEST_F(DescribeInputsTest, HighestFolderThatIsMissingIsAbsent) {
+    fs::remove_all(at("/fs/mp/etc/mm"));
+    EXPECT_EQ(found().absent, (Paths{"/dev/hd0", "/fs/mp/etc/mm", IMAGE_PATH}));
+    fs::remove_all(at("/fs/mp"));
+    fs::remove_all(at("/dev"));
+    EXPECT_EQ(found().absent, (Paths{"/dev", "/fs/mp", IMAGE_PATH}));
 }
 
 const std::string PRODUCT_FILES[] = {
@@ -187,14 +200,14 @@ TEST_F(DescribeInputsTest, OnlyOutputsThatCannotBeWrittenAreDescribed) {
 
 TEST_F(DescribeInputsTest, OutputFolderThatIsNotAFolderIsAbsent) {
     fs::remove(at("/tmp"));
-    EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0", "/tmp"}));
+    EXPECT_EQ(found().absent, (Paths{"/dev/hd0", IMAGE_PATH, "/tmp"}));
     put("/tmp", "no folder");
-    EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0", "/tmp"}));
+    EXPECT_EQ(found().absent, (Paths{"/dev/hd0", IMAGE_PATH, "/tmp"}));
     fs::remove(at("/tmp"));
     putLink("/tmp", "nowhere");
-    EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0", "/tmp"}));
+    EXPECT_EQ(found().absent, (Paths{"/dev/hd0", IMAGE_PATH, "/tmp"}));
     putFolder("/nowhere/iap1.cfg");
-    EXPECT_EQ(found().absent, (Paths{IMAGE_PATH, "/dev/hd0"}));
+    EXPECT_EQ(found().absent, (Paths{"/dev/hd0", IMAGE_PATH}));
     EXPECT_EQ(found().folders, Paths{"/tmp/iap1.cfg"});
 }
 

@@ -3,8 +3,11 @@
 // Every reason, in a unit made to give it; the real binary runs in the same unit.
 #include "config/boot_disk.h"
 #include "config/config_store.h"
+#include "kit/description/value_key.h"
 #include "kit/enter/run_inside.h"
+#include "kit/unit/capture_unit.h"
 #include "orvane_unit/explain/explain.h"
+#include "orvane_unit/report/place_text.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"
@@ -12,6 +15,8 @@
 
 #include <algorithm>
 #include <functional>
+#include <iterator>
+#include <regex>
 #include <set>
 
 namespace orvane::test {
@@ -186,6 +191,77 @@ TEST_P(ExplainReasonsTest, RunAgreesWithTheExplanation) {
             EXPECT_FALSE(fs::exists(file)) << output.path;
             break;
         }
+    }
+}
+
+/// Everything that an explanation says, without places on the disk: a captured disk is shorter.
+std::string answersOf(const desk::Explanation& explanation) {
+    static const std::regex DISK_PLACE("disk bytes? (from )?[0-9]+");
+    std::string text;
+    for (const desk::Output& output : explanation) {
+        text += output.path + " " + std::to_string(static_cast<int>(output.outcome)) + " left " +
+                std::to_string(static_cast<int>(output.kindAfter)) + " " + output.contentAfter;
+        for (const Reason reason : output.reasons) {
+            text += std::string(" ") + reasonInfo(reason).code;
+        }
+        for (const kit::ValueKey& key : output.keys) {
+            text += " " + keyText(key);
+        }
+        for (const desk::Line& line : output.lines) {
+            text += "\n" + line.text + keyText(line.origin.key) + " " +
+                    std::regex_replace(desk::placeText(line.origin), DISK_PLACE, "disk");
+            for (const Reason reason : line.origin.reasons) {
+                text += std::string(" ") + reasonInfo(reason).code;
+            }
+        }
+        text += "\n";
+    }
+    return text;
+}
+
+void expectCaptureExplainsTheSame(const DescribedUnit& described) {
+    const fs::path captured = described.folder() / "captured";
+    kit::captureUnit(described.root(), captured, false);
+    EXPECT_EQ(answersOf(desk::explainUnit(captured, {"-ai"})),
+              answersOf(desk::explainUnit(described.root(), {"-ai"})));
+}
+
+TEST_P(ExplainReasonsTest, CapturedUnitHasTheSameExplanation) {
+    expectCaptureExplainsTheSame(DescribedUnit(row().change));
+}
+
+/// More of what may be missing, empty or something else.
+TEST(CapturedReasonsTest, AbsenceIsCapturedEverywhere) {
+    const std::function<void(UnitDescription&)> changes[] = {
+        without("/tmp"),
+        without("/dev"),
+        without("/fs/tmpfs"),
+        both(without(VERSION_FILE), without("/fs/rwdata")),
+        [](UnitDescription& unit) {
+            unit.files.clear();
+            unit.absent = {"/fs/mp/etc/mm"};
+        },
+        [](UnitDescription& unit) {
+            unit.files.clear();
+            unit.absent = {"/fs", "/dev"};
+        },
+        [](UnitDescription& unit) {
+            unit.files.erase(VERSION_FILE);
+            unit.files["/fs/rwdata/.Version"] = "no folder";
+        },
+        [](UnitDescription& unit) { unit.files["/tmp"] = "no folder"; },
+        [](UnitDescription& unit) { unit.links["/tmp"] = "/none"; },
+        [](UnitDescription& unit) { unit.links["/tmp"] = "/fs/tmpfs"; },
+        [](UnitDescription& unit) { unit.links["/fs/rwdata/.Version/b.inf"] = "/none/at/all"; },
+        both(without(IAP2_FILE.templateFile), empty(IAP2_FILE.stockFile)),
+        both(without(IAP1_FILE.templateFile), folder(IAP2_FILE.output)),
+        both(folder(IAP1_FILE.stockFile), empty(IAP2_FILE.templateFile)),
+        folder("/fs/rwdata/.Version/b.inf"),
+        empty("/fs/rwdata/.Version/a.inf"),
+    };
+    for (std::size_t i = 0; i < std::size(changes); ++i) {
+        SCOPED_TRACE(i);
+        expectCaptureExplainsTheSame(DescribedUnit(changes[i]));
     }
 }
 
