@@ -17,6 +17,8 @@
 #include "tuning/audio_profile.h"
 #include "writers/template_merge.h"
 
+#include <unistd.h>
+
 #include <algorithm>
 #include <cstdint>
 #include <map>
@@ -72,7 +74,17 @@ private:
             const std::uint64_t size = sizeOf(disk, BOOT_DISK);
             const std::uint64_t copied = std::min<std::uint64_t>(size, RECORD_AREA_SIZE);
             inputs_.disk = readAt(disk, BOOT_DISK, size - copied, copied);
+            if (size < RECORD_AREA_SIZE && takesAnySeek(disk)) {
+                inputs_.disk = readAt(disk, BOOT_DISK, 0, RECORD_AREA_SIZE);
+                inputs_.disk->resize(RECORD_AREA_SIZE);
+            }
         }
+    }
+
+    /// Whether a short disk is a device without a size, such as /dev/zero: a run reads the same
+    /// there wherever it seeks, and zeros where it reads nothing.
+    static bool takesAnySeek(const Descriptor& disk) {
+        return ::lseek(disk.number(), -RECORD_AREA_SIZE, SEEK_END) != -1;
     }
 
     void readVersionFiles() {
