@@ -4,6 +4,7 @@
 #include "config/config_store.h"
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_key.h"
+#include "kit/host/kit_error.h"
 #include "kit/host/lost_pages.h"
 #include "main/options.h"
 #include "orvane_unit/explain/planned_files.h"
@@ -103,6 +104,16 @@ void explainAirplay(PlannedFiles& files, Explanation& outputs) {
     outputs.push_back(merge.finish(values, sources, generateAirplayFile));
 }
 
+/// Requires that `iap2`, on whose output the next file depends, takes what is written to it.
+void requireWritten(const PlannedMerge& iap2) {
+    if (!iap2.output.fail() && !iap2.output.str().empty() &&
+        PlannedFiles::isDevice(IAP2_FILE.output)) {
+        throw kit::KitError(std::string(IAP2_FILE.output) + " is a device: only a run can tell " +
+                            "whether it takes what is written, on which " + IAP1_FILE.output +
+                            " depends");
+    }
+}
+
 void explainIap(PlannedFiles& files, Explanation& outputs) {
     const Image image = readImage(); // these before the tool's own functions, as above
     const VersionFiles versions = readVersionFiles();
@@ -120,6 +131,7 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
     PlannedMerge iap2(files, IAP2_FILE);
     outputs.push_back(iap2.finish(values, sources, generateIap2File));
 
+    requireWritten(iap2);
     switchToVersionDigits(values);
     sources.back().origin = versionDigitsOrigin(versions);
     PlannedMerge iap1(files, IAP1_FILE);

@@ -66,6 +66,11 @@ void PlannedFiles::write(const std::string& path, const std::string& text) {
     }
 }
 
+bool PlannedFiles::isDevice(const std::string& path) {
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
+    return place && (place->kind == S_IFCHR || place->kind == S_IFBLK);
+}
+
 PathKind PlannedFiles::look(const std::string& path, std::string& content) const {
     content.clear();
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);

@@ -28,6 +28,9 @@ public:
     /// Appends to what was opened for writing.
     void write(const std::string& path, const std::string& text);
 
+    /// Whether `path` leads to a device, which may refuse what is written.
+    static bool isDevice(const std::string& path);
+
     /// What is at `path` now, links followed.
     PathKind look(const std::string& path, std::string& content) const;
 

@@ -216,9 +216,49 @@ TEST_F(UnitKindsTest, SocketCannotBeOpenedSoItIsLikeNothing) {
     expectRunAgrees();
 }
 
+TEST_F(UnitKindsTest, VersionFileThatCannotBeOpenedIsStillListed) {
+    put(VERSION_FILE, S_IFSOCK);
+    const std::string shown = start({"explain", root(), "-i"}).standardOutput;
+    EXPECT_NE(shown.find("1 version description files in"), std::string::npos) << shown;
+    EXPECT_EQ(start({"capture", root(), captured()}).exitStatus, 0);
+    EXPECT_EQ(answersFor(captured()), answersFor(root()));
+    const std::string again = start({"explain", captured(), "-i"}).standardOutput;
+    EXPECT_NE(again.find("1 version description files in"), std::string::npos) << again;
+}
+
 TEST_F(UnitKindsTest, SocketInPlaceOfAnOutputIsKept) {
     put(IAP2_FILE.output, S_IFSOCK);
     EXPECT_EQ(explained(root(), {"-i"}).at("outputs").at(1).at("outcome"), "kept");
+    expectRunAgrees();
+}
+
+TEST_F(UnitKindsTest, DiskWithoutASizeHasNoOffsets) {
+    for (const char* device : {"zero", "null"}) {
+        SCOPED_TRACE(device);
+        putDevice(BOOT_DISK, device);
+        const std::string shown = start({"explain", root(), "-i"}).standardOutput;
+        EXPECT_NE(shown.find("record slot 9, a disk without a size: 00 00 00 00 00 00 00 00"),
+                  std::string::npos)
+            << shown;
+        EXPECT_NE(shown.find("serial-blank"), std::string::npos);
+        EXPECT_EQ(start({"show", root(), "--only", "records"})
+                      .standardOutput.find("disk: without a size\n"),
+                  0U);
+        expectRunAgrees();
+        fs::remove_all(captured());
+        EXPECT_EQ(start({"capture", root(), captured()}).exitStatus, 0);
+        EXPECT_EQ(answersFor(captured()), answersFor(root()));
+        const kit::RunResult diff = start({"diff", root(), captured()});
+        EXPECT_EQ(diff.exitStatus, 0) << diff.standardOutput;
+    }
+}
+
+TEST_F(UnitKindsTest, TuningFromADiskWithoutASizeIsExplained) {
+    EXPECT_EQ(start({"set", root(), "param.134=0xffff"}).exitStatus, 0);
+    putDevice(BOOT_DISK, "zero");
+    const std::string shown = start({"explain", root(), "-a", "--json"}).standardOutput;
+    EXPECT_NE(shown.find("block 3, a disk without a size: 00"), std::string::npos) << shown;
+    EXPECT_EQ(shown.find("disk byte"), std::string::npos);
     expectRunAgrees();
 }
 
@@ -268,6 +308,20 @@ TEST_F(UnitKindsTest, DeviceInPlaceOfAnOutputTakesWhatIsWritten) {
         EXPECT_EQ(output.at("left"), "other");
         expectRunAgrees();
     }
+}
+
+TEST_F(UnitKindsTest, DeviceThatMayRefuseIap2LeavesIap1Unknown) {
+    putDevice(IAP2_FILE.output, "full");
+    const std::string complaint =
+        "/tmp/iap2.cfg is a device: only a run can tell whether it takes what is written, on "
+        "which /tmp/iap1.cfg depends";
+    expectRefused({"explain", root(), "-i"}, complaint);
+    EXPECT_EQ(start({"explain", root(), "-a"}).exitStatus, 0);
+    writeFile(at(IAP2_FILE.templateFile), ""); // then it fails whatever the device does
+    EXPECT_EQ(explained(root(), {"-i"}).at("outputs").at(2).at("outcome"), "stock");
+    expectRunAgrees();
+    fs::remove(at(IAP2_FILE.templateFile)); // then nothing is written to the first stream
+    expectRunAgrees();
 }
 
 TEST_F(UnitKindsTest, ReadOnlyMountOfAUnitSaysNothingAboutItsOutputs) {
