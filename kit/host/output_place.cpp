@@ -78,6 +78,18 @@ std::optional<OutputPlace> findOutputPlace(const std::string& path) {
     return place;
 }
 
+std::string fileName(const OutputPlace& place) {
+    struct stat state {};
+    if (place.kind == 0 || ::stat(place.path.c_str(), &state) != 0) {
+        return place.path;
+    }
+    return std::to_string(state.st_dev) + ":" + std::to_string(state.st_ino);
+}
+
+bool keepsBytes(const OutputPlace& place) {
+    return place.kind == 0 || place.kind == S_IFREG;
+}
+
 bool canBeOpened(const OutputPlace& place, bool isRunningSystem) {
     switch (place.kind) {
     case S_IFDIR:

@@ -22,6 +22,13 @@ struct OutputPlace {
 /// system follows. Throws KitError when this process may not look at a folder in it.
 std::optional<OutputPlace> findOutputPlace(const std::string& path);
 
+/// One name for all paths of a file: its device and number; for a file that is not there yet, its
+/// path without links.
+std::string fileName(const OutputPlace& place);
+
+/// Whether what is written there can be read again: not so in a device or pipe.
+bool keepsBytes(const OutputPlace& place);
+
 /// Whether a run on the unit can open the file there, or make it. A folder or socket can't be
 /// opened; a device counts as one that can. A read-only mount matters only on the system that runs:
 /// that of a unit's copy says nothing about the unit. Throws KitError for a pipe, at which the run

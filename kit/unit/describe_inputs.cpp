@@ -12,6 +12,7 @@
 #include "kit/host/input_kind.h"
 #include "kit/host/output_place.h"
 #include "kit/host/tree_entries.h"
+#include "kit/tuning/tuning_description.h"
 #include "kit/unit/describe_unit.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"
@@ -31,6 +32,15 @@ namespace {
 
 namespace fs = std::filesystem;
 
+using Paths = std::vector<std::string>;
+
+/// The paths of one file that a run opens.
+struct FilePaths {
+    bool isThere = false;
+    Paths inputs;
+    Paths outputs;
+};
+
 /// Requires that the process has entered the unit.
 class InputReader {
 public:
@@ -45,6 +55,7 @@ public:
             readFile(file.stockFile);
         }
         findOutputs();
+        linkSharedFiles();
         std::sort(unit_.folders.begin(), unit_.folders.end());
         addAbsent(layoutOf({}), isThere, unit_);
         return std::move(inputs_);
@@ -125,6 +136,48 @@ private:
     void findOutput(const char* path) {
         if (!canBeOpened(path, isRunningSystem_)) {
             unit_.folders.emplace_back(path);
+        }
+    }
+
+    /// What a run writes to one path of a file, it reads or overwrites at the others: such paths
+    /// stay one file if an output is among them.
+    void linkSharedFiles() {
+        std::map<std::string, FilePaths> files;
+        for (const AccessoryFile& file : ACCESSORY_FILES) {
+            addPath(file.templateFile, &FilePaths::inputs, files);
+            addPath(file.stockFile, &FilePaths::inputs, files);
+            addPath(file.output, &FilePaths::outputs, files);
+        }
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            addPath(output.path, &FilePaths::outputs, files);
+        }
+        for (const auto& [name, paths] : files) {
+            if (!paths.outputs.empty()) {
+                const bool hasContent = paths.isThere && !paths.inputs.empty();
+                const Paths& kept = hasContent ? paths.inputs : paths.outputs;
+                link(paths.inputs, kept.front());
+                link(paths.outputs, kept.front());
+            }
+        }
+    }
+
+    static void addPath(const char* path, Paths FilePaths::*role,
+                        std::map<std::string, FilePaths>& files) {
+        const std::optional<OutputPlace> place = findOutputPlace(path);
+        if (place && keepsBytes(*place)) {
+            FilePaths& file = files[fileName(*place)];
+            file.isThere = place->kind != 0;
+            (file.*role).emplace_back(path);
+        }
+    }
+
+    void link(const Paths& paths, const std::string& target) {
+        for (const std::string& path : paths) {
+            if (path != target) {
+                unit_.files.erase(path);
+                unit_.sparseFiles.erase(path);
+                unit_.links[path] = target;
+            }
         }
     }
 

@@ -12,32 +12,13 @@
 
 namespace orvane::desk {
 
-namespace {
-
-/// One name for all paths of a file: its device and number; for a file that is not there yet, its
-/// path without links.
-std::string fileName(const kit::OutputPlace& place) {
-    struct stat state {};
-    if (place.kind == 0 || ::stat(place.path.c_str(), &state) != 0) {
-        return place.path;
-    }
-    return std::to_string(state.st_dev) + ":" + std::to_string(state.st_ino);
-}
-
-/// Whether what is written there can be read again: not so in a device or pipe.
-bool keepsBytes(const kit::OutputPlace& place) {
-    return place.kind == 0 || place.kind == S_IFREG;
-}
-
-} // namespace
-
 bool PlannedFiles::openForWriting(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
     if (!place || !kit::canBeOpened(*place, isRunningSystem_)) {
         return false;
     }
-    if (keepsBytes(*place)) {
-        written_[fileName(*place)].clear();
+    if (kit::keepsBytes(*place)) {
+        written_[kit::fileName(*place)].clear();
     }
     return true;
 }
@@ -47,7 +28,7 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
     if (!place) {
         return std::nullopt;
     }
-    const auto written = written_.find(fileName(*place));
+    const auto written = written_.find(kit::fileName(*place));
     if (written != written_.end()) {
         return written->second;
     }
@@ -61,8 +42,8 @@ std::optional<std::string> PlannedFiles::read(const std::string& path) const {
 
 void PlannedFiles::write(const std::string& path, const std::string& text) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
-    if (place && keepsBytes(*place)) {
-        written_[fileName(*place)] += text;
+    if (place && kit::keepsBytes(*place)) {
+        written_[kit::fileName(*place)] += text;
     }
 }
 
@@ -77,7 +58,7 @@ PathKind PlannedFiles::look(const std::string& path, std::string& content) const
     if (!place) {
         return PathKind::nothing;
     }
-    if (!keepsBytes(*place)) {
+    if (!kit::keepsBytes(*place)) {
         return place->kind == S_IFDIR ? PathKind::folder : PathKind::other;
     }
     const std::optional<std::string> text = read(path);

@@ -36,7 +36,7 @@ public:
 
 private:
     bool isRunningSystem_;
-    std::map<std::string, std::string> written_; ///< content by file: see fileName in the source
+    std::map<std::string, std::string> written_; ///< content by kit::fileName
 };
 
 } // namespace orvane::desk

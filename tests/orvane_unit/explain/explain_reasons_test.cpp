@@ -6,6 +6,8 @@
 #include "kit/description/value_key.h"
 #include "kit/enter/run_inside.h"
 #include "kit/unit/capture_unit.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/unit_values.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/place_text.h"
 #include "tests/kit/unit/described_unit.h"
@@ -263,6 +265,50 @@ TEST(CapturedReasonsTest, AbsenceIsCapturedEverywhere) {
         SCOPED_TRACE(i);
         expectCaptureExplainsTheSame(DescribedUnit(changes[i]));
     }
+}
+
+TEST(CapturedReasonsTest, PathsThatAreOneFileStayOneFile) {
+    struct Link {
+        const char* from;
+        const char* to;
+    };
+    const Link links[] = {
+        {IAP2_DEVICE_FILE.output, IAP1_FILE.output},
+        {IAP1_FILE.output, IAP2_FILE.output},
+        {TELEPHONY_TUNING_FILE, AIRPLAY_FILE.output},
+        {AIRPLAY_FILE.output, IAP2_FILE.templateFile},
+        {IAP2_DEVICE_FILE.output, IAP2_FILE.templateFile},
+        {IAP2_FILE.output, IAP1_FILE.stockFile},
+        {IAP2_FILE.templateFile, AIRPLAY_FILE.output}, // missing, until the run has made it
+        {IAP2_FILE.templateFile, IAP1_FILE.stockFile}, // no output
+        {AIRPLAY_FILE.output, "fresh"},
+    };
+    for (const bool hasOutput : {false, true}) {
+        for (const Link& link : links) {
+            const DescribedUnit described([&](UnitDescription& unit) {
+                generatedProfile(unit);
+                unit.files.erase(link.from);
+                unit.links[link.from] = link.to;
+                if (hasOutput) {
+                    unit.files[AIRPLAY_FILE.output] = "of an earlier run\n";
+                    unit.files.erase(link.from);
+                }
+            });
+            SCOPED_TRACE(std::string(link.from) + " -> " + link.to);
+            expectCaptureExplainsTheSame(described);
+            const fs::path captured = described.folder() / "captured";
+            EXPECT_TRUE(kit::differingValues(kit::unitValues(kit::describeInputs(described.root())),
+                                             kit::unitValues(kit::describeInputs(captured)))
+                            .empty());
+        }
+    }
+}
+
+TEST(CapturedReasonsTest, HardLinksStayOneFile) {
+    const DescribedUnit described;
+    fs::create_hard_link(described.root() / (IAP2_FILE.templateFile + 1),
+                         described.root() / (IAP2_DEVICE_FILE.output + 1));
+    expectCaptureExplainsTheSame(described);
 }
 
 std::string rowName(const ::testing::TestParamInfo<std::size_t>& row) {
