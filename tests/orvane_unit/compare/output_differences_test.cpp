@@ -211,7 +211,7 @@ TEST(OutputDifferencesTest, FolderInPlaceOfAnOutputIsTheCause) {
     EXPECT_EQ(pathsOf(found.at("folder." + path)), (Paths{IAP2_FILE.output, IAP1_FILE.output}));
 }
 
-/// An output is a link to the template of a later one: no single input explains that.
+/// An output is a link to the template of a later one: no line has its value from a link.
 TEST(OutputDifferencesTest, LinesWithoutAValueComeLast) {
     const DescribedUnit first;
     const DescribedUnit second([](UnitDescription& unit) {
@@ -223,12 +223,14 @@ TEST(OutputDifferencesTest, LinesWithoutAValueComeLast) {
                              kit::unitValues(kit::describeInputs(second.root()))),
         desk::outputDifferences(desk::explainUnit(first.root(), {"-i"}),
                                 desk::explainUnit(second.root(), {"-i"})));
-    ASSERT_EQ(found.size(), 2U);
-    EXPECT_TRUE(found[0].change.key == kit::paramKey(50));
+    ASSERT_EQ(found.size(), 3U);
+    EXPECT_EQ(keyText(found[0].change.key), "param.50");
     EXPECT_TRUE(found[0].outputs.empty());
-    EXPECT_TRUE(found[1].change.key.isEmpty());
-    ASSERT_EQ(found[1].outputs.size(), 1U);
-    EXPECT_EQ(found[1].outputs[0].path, IAP1_FILE.output);
+    EXPECT_EQ(keyText(found[1].change.key), std::string("link.") + IAP2_FILE.output);
+    EXPECT_TRUE(found[1].outputs.empty());
+    EXPECT_TRUE(found[2].change.key.isEmpty());
+    ASSERT_EQ(found[2].outputs.size(), 1U);
+    EXPECT_EQ(found[2].outputs[0].path, IAP1_FILE.output);
 }
 
 } // namespace
