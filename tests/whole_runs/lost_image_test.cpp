@@ -14,6 +14,7 @@
 
 #include <csignal>
 #include <cstdint>
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -39,7 +40,8 @@ TEST_F(LostImageTest, ImageThatIsCutOffWhileItIsMappedEndsTheProcess) {
 TEST_F(LostImageTest, ImageThatIsAHoleInFullMemoryEndsTheProcess) {
     leave();
     std::vector<std::string> command = holeInFullMemory(hostRoot());
-    // Else a sanitizer reports the signal, and ends in its own way.
+    // Else a sanitizer reports the signal, and ends in its own way. It finds its options in /proc.
+    std::filesystem::create_directory(hostRoot() / "proc");
     command.insert(command.end(), {"env", "ASAN_OPTIONS=handle_sigbus=0:detect_leaks=0"});
     for (const std::string& word : buildCommand(ORVANE_ENTER_BINARY)) {
         command.push_back(word);
