@@ -3,14 +3,16 @@
 
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
+#include "kit/host/interruption.h"
 #include "kit/host/kit_error.h"
 
 #include <fcntl.h>
+#include <signal.h>
 #include <sys/mman.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <cerrno>
 #include <cstdlib>
 #include <exception>
 #include <string>
@@ -47,15 +49,68 @@ void putDescriptor(const Descriptor& from, int to) {
     }
 }
 
+/// While it exists, SIGCHLD waits to be asked for.
+class ChildSignal {
+public:
+    ChildSignal() {
+        sigset_t signals{};
+        ::sigemptyset(&signals);
+        ::sigaddset(&signals, SIGCHLD);
+        ::sigprocmask(SIG_BLOCK, &signals, &former_);
+    }
+    ~ChildSignal() { restore(); }
+    ChildSignal(const ChildSignal&) = delete;
+    ChildSignal& operator=(const ChildSignal&) = delete;
+
+    void restore() const { ::sigprocmask(SIG_SETMASK, &former_, nullptr); }
+
+private:
+    sigset_t former_{};
+};
+
+/// The status with which `child` ends. When this process is interrupted, the child is killed.
+/// Requires that SIGCHLD and the interruptions wait.
+int statusOf(pid_t child) {
+    sigset_t signals = interruptions();
+    ::sigaddset(&signals, SIGCHLD);
+    int status = 0;
+    for (;;) {
+        const pid_t ended = ::waitpid(child, &status, WNOHANG);
+        if (ended == child) {
+            return status;
+        }
+        if (ended < 0) {
+            throw systemError("cannot wait for the program");
+        }
+        const int signal = ::sigwaitinfo(&signals, nullptr);
+        if (signal > 0 && signal != SIGCHLD) {
+            ::kill(child, SIGKILL);
+            ::waitpid(child, &status, 0);
+            ::kill(::getpid(), signal); // it waits again
+            throwIfInterrupted();
+        }
+    }
+}
+
 struct Outputs {
     MemoryFile standardOutput;
     MemoryFile standardError;
     MemoryFile failedStart; ///< why the child could not become the program; empty when it could
 };
 
-[[noreturn]] void runChild(const std::function<void()>& becomeProgram, const Outputs& outputs) {
+/// In the child: from now on it ends with its parent, so that it changes no unit for a dead caller.
+void endWithParent(pid_t parent) {
+    if (::prctl(PR_SET_PDEATHSIG, SIGKILL) != 0 || ::getppid() != parent) {
+        throw KitError("the program has lost its caller");
+    }
+}
+
+[[noreturn]] void runChild(const std::function<void()>& becomeProgram, const Outputs& outputs,
+                           pid_t parent) {
     std::string reason = "the program was not started";
     try {
+        endWithParent(parent);
+        allowInterruption();
         putDescriptor(Descriptor(::open("/dev/null", O_RDONLY | O_CLOEXEC)), STDIN_FILENO);
         putDescriptor(outputs.standardOutput.descriptor(), STDOUT_FILENO);
         putDescriptor(outputs.standardError.descriptor(), STDERR_FILENO);
@@ -73,20 +128,20 @@ struct Outputs {
 } // namespace
 
 RunResult runCaptured(const std::function<void()>& becomeProgram) {
+    const DeferredInterruption deferred;
+    const ChildSignal childSignal;
     const Outputs outputs;
+    const pid_t parent = ::getpid();
     const pid_t child = ::fork();
     if (child < 0) {
         throw systemError("cannot fork");
     }
     if (child == 0) {
-        runChild(becomeProgram, outputs);
+        childSignal.restore();
+        runChild(becomeProgram, outputs, parent);
     }
-    int status = 0;
-    while (::waitpid(child, &status, 0) < 0) {
-        if (errno != EINTR) {
-            throw systemError("cannot wait for the program");
-        }
-    }
+    const int status = statusOf(child);
+    throwIfInterrupted();
     RunResult result;
     result.exitStatus = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
     result.standardOutput = outputs.standardOutput.content();

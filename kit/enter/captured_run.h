@@ -17,7 +17,9 @@ struct RunResult {
 
 /// Forks. The child has /dev/null as standard input, its two outputs are captured whole, and it
 /// calls `becomeProgram`, which executes a program or throws KitError; what that throws is thrown
-/// here. Returns when the child has ended: what its own children write later is left out.
+/// here. Returns when the child has ended: what its own children write later is left out. SIGINT,
+/// SIGTERM and SIGHUP end this process only when the child has been killed; the child is also
+/// killed when this process is.
 RunResult runCaptured(const std::function<void()>& becomeProgram);
 
 } // namespace orvane::kit

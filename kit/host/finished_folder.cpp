@@ -1,15 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/finished_folder.h"
 
+#include "kit/host/folder_lock.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/rename_entry.h"
+#include "kit/host/tree_entries.h"
+#include "kit/host/unfinished_folder.h"
 
-#include <unistd.h>
+#include <sys/types.h>
 
-#include <cerrno>
-#include <cstdio>
-#include <string>
+#include <algorithm>
 #include <system_error>
-#include <utility>
+#include <vector>
 
 namespace orvane::kit {
 
@@ -17,45 +19,14 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Leaves room in a name of 255 bytes for what is added.
-constexpr std::size_t NAME_KEPT = 200;
+using Fill = std::function<void(const fs::path&)>;
 
-/// The place of `folder` in an existing folder, without links, ending with a name.
-fs::path finalPlace(const fs::path& folder, bool isThere) {
-    if (isThere) {
-        return fs::canonical(folder);
-    }
-    const fs::path plain = folder.has_filename() ? folder : folder.parent_path();
-    const fs::path above = plain.parent_path();
-    return fs::canonical(above.empty() ? "." : above) / plain.filename();
+constexpr mode_t ANYBODY = 0777; // less the umask
+
+/// For a failure without a path inside the folder: the system's own text.
+[[noreturn]] void failAtFolder(const fs::path& folder, const std::error_code& error) {
+    throw KitError("cannot make ", folder, ": " + error.message());
 }
-
-/// Makes an empty folder next to `place`.
-fs::path makeBeside(const fs::path& place) {
-    const std::string stem = "." + place.filename().string().substr(0, NAME_KEPT) + ".unfinished-" +
-                             std::to_string(::getpid()) + "-";
-    for (int number = 0;; ++number) {
-        fs::path beside = place.parent_path() / (stem + std::to_string(number));
-        if (fs::create_directory(beside)) {
-            return beside;
-        }
-    }
-}
-
-/// Removes the unfinished folder, unless it has been renamed.
-class Cleaner {
-public:
-    explicit Cleaner(fs::path beside) : beside_(std::move(beside)) {}
-    ~Cleaner() {
-        std::error_code ignored;
-        fs::remove_all(beside_, ignored);
-    }
-    Cleaner(const Cleaner&) = delete;
-    Cleaner& operator=(const Cleaner&) = delete;
-
-private:
-    fs::path beside_;
-};
 
 /// If making a link failed, the second of the two paths is the link.
 KitError errorOf(const fs::filesystem_error& failure) {
@@ -63,47 +34,109 @@ KitError errorOf(const fs::filesystem_error& failure) {
     return {"cannot make ", path, ": " + failure.code().message()};
 }
 
-/// For a failure without a path inside the folder: the system's own text.
-[[noreturn]] void failAtFolder(const fs::path& folder, const std::error_code& error) {
-    throw KitError("cannot make ", folder, ": " + error.message());
+void fillUnfinished(const fs::path& unfinished, const fs::path& folder, const Fill& fill) {
+    try {
+        fill(unfinished);
+    } catch (const fs::filesystem_error& failure) {
+        throw errorOf(failure).moved(unfinished, folder);
+    } catch (const KitError& failure) {
+        throw failure.moved(unfinished, folder);
+    }
+}
+
+/// The place of an absent `folder` in an existing one, without links, ending with a name.
+fs::path finalPlace(const fs::path& folder) {
+    const fs::path plain = folder.has_filename() ? folder : folder.parent_path();
+    const fs::path above = plain.parent_path();
+    return fs::canonical(above.empty() ? "." : above) / plain.filename();
+}
+
+void makeAbsentFolder(const fs::path& folder, const Fill& fill) {
+    std::error_code error;
+    if (folder.empty()) {
+        failAtFolder(folder, std::make_error_code(std::errc::no_such_file_or_directory));
+    }
+    if (fs::is_symlink(fs::symlink_status(folder, error))) {
+        failAtFolder(folder, std::make_error_code(std::errc::file_exists));
+    }
+    try {
+        const fs::path place = finalPlace(folder);
+        const UnfinishedFolder unfinished(place.parent_path(), place.filename().string(), ANYBODY);
+        fillUnfinished(unfinished.path(), folder, fill);
+        error = renameToFree(unfinished.path(), place);
+    } catch (const fs::filesystem_error& failure) {
+        error = failure.code();
+    }
+    if (error) {
+        failAtFolder(folder, error);
+    }
+}
+
+/// Requires that `folder` is a folder in which every entry `mayStay`.
+template <class Predicate>
+void requireEmpty(const fs::path& folder, const Predicate& mayStay) {
+    std::error_code error;
+    bool isEmpty = fs::is_directory(folder, error);
+    if (isEmpty) {
+        const std::vector<fs::directory_entry> entries = listFolder(folder);
+        isEmpty = std::all_of(entries.begin(), entries.end(), mayStay);
+    }
+    if (!isEmpty) {
+        throw KitError("", folder, " is there already and is not an empty folder");
+    }
+}
+
+/// Moves everything in `unfinished` to `folder`, `last` at the end; or nothing.
+std::error_code moveUp(const fs::path& unfinished, const fs::path& folder,
+                       const std::string& last) {
+    std::vector<fs::path> names;
+    for (const fs::path& entry : listFolder(unfinished)) {
+        names.push_back(entry.filename());
+    }
+    std::stable_partition(names.begin(), names.end(),
+                          [&last](const fs::path& name) { return name != last; });
+    for (auto name = names.begin(); name != names.end(); ++name) {
+        const std::error_code error = renameToFree(unfinished / *name, folder / *name);
+        if (error) {
+            std::for_each(names.begin(), name, [&](const fs::path& moved) {
+                renameToFree(folder / moved, unfinished / moved);
+            });
+            return error;
+        }
+    }
+    return {};
+}
+
+void fillEmptyFolder(const fs::path& folder, const std::string& last, const Fill& fill) {
+    const auto isUnfinished = [](const fs::path& entry) {
+        return isUnfinishedName(entry.filename().string());
+    };
+    requireEmpty(folder, isUnfinished);
+    const FolderLock lock(folder);
+    requireEmpty(folder, isUnfinished); // another process may have filled it
+    std::error_code error;
+    try {
+        const UnfinishedFolder unfinished(folder, "unit", ANYBODY);
+        fillUnfinished(unfinished.path(), folder, fill);
+        requireEmpty(folder,
+                     [&unfinished](const fs::path& entry) { return entry == unfinished.path(); });
+        error = moveUp(unfinished.path(), folder, last);
+    } catch (const fs::filesystem_error& failure) {
+        error = failure.code();
+    }
+    if (error) {
+        failAtFolder(folder, error);
+    }
 }
 
 } // namespace
 
-void makeFinishedFolder(const fs::path& folder, const std::function<void(const fs::path&)>& fill) {
+void makeFinishedFolder(const fs::path& folder, const std::string& last, const Fill& fill) {
     std::error_code error;
-    const fs::file_status status = fs::status(folder, error);
-    const bool isThere = fs::exists(status);
-    if (isThere && (!fs::is_directory(status) || !fs::is_empty(folder, error) || error)) {
-        throw KitError("", folder, " is there already and is not an empty folder");
-    }
-    if (folder.empty()) {
-        failAtFolder(folder, std::make_error_code(std::errc::no_such_file_or_directory));
-    }
-    if (!isThere && fs::is_symlink(fs::symlink_status(folder, error))) {
-        failAtFolder(folder, std::make_error_code(std::errc::file_exists));
-    }
-    fs::path place;
-    fs::path beside;
-    try {
-        place = finalPlace(folder, isThere);
-        beside = makeBeside(place);
-    } catch (const fs::filesystem_error& failure) {
-        failAtFolder(folder, failure.code());
-    }
-    const Cleaner cleaner(beside);
-    try {
-        fill(beside);
-    } catch (const fs::filesystem_error& failure) {
-        throw errorOf(failure).moved(beside, folder);
-    } catch (const KitError& failure) {
-        throw failure.moved(beside, folder);
-    }
-    if (isThere) {
-        fs::permissions(beside, status.permissions(), error);
-    }
-    if (std::rename(beside.c_str(), place.c_str()) != 0) {
-        failAtFolder(folder, std::error_code(errno, std::generic_category()));
+    if (fs::exists(fs::status(folder, error))) {
+        fillEmptyFolder(folder, last, fill);
+    } else {
+        makeAbsentFolder(folder, fill);
     }
 }
 

@@ -3,7 +3,6 @@
 
 #include "kit/host/kit_error.h"
 
-#include <cstdlib>
 #include <string>
 #include <system_error>
 
@@ -11,17 +10,9 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-ScratchFolder::ScratchFolder() {
-    std::string name = fs::temp_directory_path() / "orvane-unit-XXXXXX";
-    if (::mkdtemp(name.data()) == nullptr) {
-        throw systemError("cannot make " + name);
-    }
-    path_ = name;
-}
-
-ScratchFolder::~ScratchFolder() {
-    std::error_code ignored;
-    fs::remove_all(path_, ignored);
+ScratchFolder::ScratchFolder() try : folder_(fs::temp_directory_path(), "orvane-unit", 0700) {
+} catch (const fs::filesystem_error& failure) {
+    throw KitError("cannot make ", failure.path1(), ": " + failure.code().message());
 }
 
 } // namespace orvane::kit

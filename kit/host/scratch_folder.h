@@ -1,23 +1,22 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "kit/host/unfinished_folder.h"
+
 #include <filesystem>
 
 namespace orvane::kit {
 
-/// A new folder among the system's temporary ones, removed with its owner.
+/// A new folder among the system's temporary ones, for this user only, removed with its owner.
 class ScratchFolder {
 public:
     /// Throws KitError.
     ScratchFolder();
-    ~ScratchFolder();
-    ScratchFolder(const ScratchFolder&) = delete;
-    ScratchFolder& operator=(const ScratchFolder&) = delete;
 
-    const std::filesystem::path& path() const { return path_; }
+    const std::filesystem::path& path() const { return folder_.path(); }
 
 private:
-    std::filesystem::path path_;
+    UnfinishedFolder folder_;
 };
 
 } // namespace orvane::kit

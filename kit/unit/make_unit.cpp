@@ -12,6 +12,7 @@
 #include "kit/host/descriptor.h"
 #include "kit/host/finished_folder.h"
 #include "kit/host/host_file.h"
+#include "kit/host/interruption.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/little_endian.h"
 #include "kit/tuning/tuning_encode.h"
@@ -133,8 +134,9 @@ void makeUnit(const UnitDescription& unit, const fs::path& root,
     throwIfAny(findPathConflict(unit));
     const Layout layout = layoutOf(unit);
     throwIfAny(findSizeConflict(unit, layout));
-    makeFinishedFolder(root, [&](const fs::path& folder) {
+    makeFinishedFolder(root, MARKER_NAME, [&](const fs::path& folder) {
         for (const auto& [path, kind] : layout) {
+            throwIfInterrupted();
             makeEntry(unit, path, kind, folder);
         }
         markUnit(folder);

@@ -9,6 +9,7 @@
 #include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/changed_file.h"
+#include "kit/host/interruption.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/little_endian.h"
 #include "kit/host/scratch_folder.h"
@@ -188,6 +189,7 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
     std::vector<Impact> impacts;
     for (const Input& input : inputs) {
         Impact impact{input.key, input.values.size(), 0, {}};
+        kit::throwIfInterrupted();
         for (const std::string& value : input.values) {
             input.file->write(input.offset, value);
             const std::vector<OutputDifference> differences =

@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "kit/host/descriptor.h"
+#include "kit/host/interruption.h"
+
+#include <sys/types.h>
+
+#include <filesystem>
+#include <string>
+
+namespace orvane::kit {
+
+/// A new folder that is removed with its owner, unless it has been renamed by then. Its name is "."
+/// + a stem + ".unfinished-", the number of this process, "-" and a number. SIGINT, SIGTERM and
+/// SIGHUP wait while it exists. A process that is killed leaves it behind, without the lock that
+/// each such folder has: the next one made in the same folder removes it.
+class UnfinishedFolder {
+public:
+    /// Makes it in the folder `above`, with the access rights `mode`, less the umask. Throws
+    /// std::filesystem::filesystem_error.
+    UnfinishedFolder(const std::filesystem::path& above, const std::string& stem, mode_t mode);
+    ~UnfinishedFolder();
+    UnfinishedFolder(const UnfinishedFolder&) = delete;
+    UnfinishedFolder& operator=(const UnfinishedFolder&) = delete;
+
+    const std::filesystem::path& path() const { return path_; }
+
+private:
+    DeferredInterruption deferred_; ///< first, so that it ends last
+    std::filesystem::path path_;
+    Descriptor lock_;
+};
+
+/// Whether an entry's name is that of an unfinished folder.
+bool isUnfinishedName(const std::string& name);
+
+} // namespace orvane::kit
