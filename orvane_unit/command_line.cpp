@@ -9,6 +9,7 @@
 #include "kit/description/sample.h"
 #include "kit/enter/captured_run.h"
 #include "kit/enter/run_inside.h"
+#include "kit/host/folder_lock.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 #include "kit/unit/capture_unit.h"
@@ -243,6 +244,7 @@ public:
 
     ExitStatus run() const override {
         kit::requireKitUnit(root_);
+        const kit::FolderLock lock(root_);
         const TmpTree before = readTmp(root_);
         const kit::RunResult result = kit::runInside(root_, {findOrvane(binary_), arguments_});
         const TmpTree after = readTmp(root_);

@@ -5,8 +5,10 @@
 #include "kit/host/kit_error.h"
 
 #include <fcntl.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 
+#include <cerrno>
 #include <string>
 #include <utility>
 
@@ -29,6 +31,18 @@ std::uint64_t ChangedFile::size() const {
 
 Bytes ChangedFile::read(std::uint64_t offset, std::uint64_t length) const {
     return readAt(descriptor_, path_, offset, length);
+}
+
+void ChangedFile::reserve(std::uint64_t offset, std::uint64_t length) const {
+    rlimit limit{};
+    const bool isLimited = ::getrlimit(RLIMIT_FSIZE, &limit) == 0 &&
+                           limit.rlim_cur != RLIM_INFINITY && offset + length > limit.rlim_cur;
+    errno = isLimited ? EFBIG
+                      : ::posix_fallocate(descriptor_.number(), static_cast<off_t>(offset),
+                                          static_cast<off_t>(length));
+    if (errno != 0) {
+        throw systemError("cannot write ", path_);
+    }
 }
 
 void ChangedFile::write(std::uint64_t offset, const Bytes& bytes) const {

@@ -19,6 +19,9 @@ public:
     std::uint64_t size() const;
     /// `length` bytes from `offset` on, which must lie in the file.
     Bytes read(std::uint64_t offset, std::uint64_t length) const;
+    /// Makes sure that a write there has the room that it needs: on the disk, since a hole takes
+    /// none, and below the limit that this process has for files. Changes no byte.
+    void reserve(std::uint64_t offset, std::uint64_t length) const;
     void write(std::uint64_t offset, const Bytes& bytes) const;
 
 private:

@@ -7,6 +7,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstddef>
 #include <string>
 
@@ -27,6 +28,7 @@ void writeAt(const Descriptor& descriptor, const std::filesystem::path& file, st
         const ssize_t count = ::pwrite(descriptor.number(), bytes.data() + done,
                                        bytes.size() - done, static_cast<off_t>(offset + done));
         if (count <= 0) {
+            errno = count == 0 ? ENOSPC : errno; // written nothing, and said nothing
             throw systemError("cannot write ", file);
         }
         done += static_cast<std::size_t>(count);

@@ -7,6 +7,8 @@
 #include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/changed_file.h"
+#include "kit/host/folder_lock.h"
+#include "kit/host/interruption.h"
 #include "kit/host/kit_error.h"
 #include "kit/unit/edit_assignment.h"
 #include "kit/unit/marker.h"
@@ -24,16 +26,18 @@ ChangedFile fileOf(const ValuePlace& place) {
 }
 
 /// Throws for a value that the unit has no place for.
-void checkPlace(const Assignment& assignment) {
-    std::string fault;
-    try {
-        fault = placeFault(assignment.key, fileOf(valuePlace(assignment.key)).size());
-    } catch (const KitError& error) {
-        fault = error.what();
-    }
+void requirePlace(const Assignment& assignment) {
+    const std::string fault = placeFault(assignment.key, fileOf(valuePlace(assignment.key)).size());
     if (!fault.empty()) {
-        throw KitError(assignment.text + ": " + fault);
+        throw KitError(fault);
     }
+}
+
+/// Throws for a value that the host's disk has no room for.
+void requireRoom(const Assignment& assignment) {
+    const ValuePlace place = valuePlace(assignment.key);
+    const ChangedFile file = fileOf(place);
+    file.reserve(place.offsetIn(file.size()), place.mask.size());
 }
 
 /// Sets the bits of the value and no other.
@@ -52,6 +56,38 @@ void set(const Assignment& assignment) {
     file.write(offset, bytes);
 }
 
+/// `step` for each assignment. Throws KitError with the assignment in front when that fails.
+void forEach(const std::vector<Assignment>& assignments, void (*step)(const Assignment&)) {
+    for (const Assignment& assignment : assignments) {
+        try {
+            step(assignment);
+        } catch (const KitError& error) {
+            throw KitError(assignment.text + ": " + error.what());
+        }
+    }
+}
+
+/// "nothing has been set", or what has.
+std::string done(const std::vector<Assignment>& assignments, std::size_t count) {
+    std::string texts;
+    for (std::size_t i = 0; i < count; ++i) {
+        texts += (i == 0 ? "" : ", ") + assignments[i].text;
+    }
+    return count == 0 ? "nothing has been set" : "only this has been set: " + texts;
+}
+
+/// Carries out what has been checked.
+void setAll(const std::vector<Assignment>& assignments) {
+    const DeferredInterruption deferred;
+    for (std::size_t i = 0; i < assignments.size(); ++i) {
+        try {
+            set(assignments[i]);
+        } catch (const KitError& error) {
+            throw KitError(assignments[i].text + ": " + error.what() + "; " + done(assignments, i));
+        }
+    }
+}
+
 } // namespace
 
 void setValues(const std::filesystem::path& root, const std::vector<std::string>& assignments) {
@@ -61,13 +97,11 @@ void setValues(const std::filesystem::path& root, const std::vector<std::string>
         edits.push_back(readAssignment(text));
     }
     requireDistinct(edits);
+    const FolderLock lock(root);
     const EnteredRoot entered(root);
-    for (const Assignment& edit : edits) {
-        checkPlace(edit);
-    }
-    for (const Assignment& edit : edits) {
-        set(edit);
-    }
+    forEach(edits, requirePlace);
+    forEach(edits, requireRoom);
+    setAll(edits);
 }
 
 } // namespace orvane::kit

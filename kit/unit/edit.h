@@ -22,10 +22,11 @@ namespace orvane::kit {
 ///    writes it
 ///
 /// Numbers are decimal or, after "0x", hexadecimal. The bits of a block that no field reads stay as
-/// they are. All assignments are checked before the first one is carried out. Throws KitError, the
-/// assignment in front, for a wrong key or value, a value that two assignments set, and an image or
-/// disk that is missing, not a regular file or too short; for a faulty tuning file like
-/// parseTuningText.
+/// they are. All assignments are checked, and have the room that they need, before the first one is
+/// carried out; the unit is locked meanwhile. Throws KitError, the assignment in front, for a wrong
+/// key or value, a value that two assignments set, an image or disk that is missing, not a regular
+/// file or too short, and a full disk; for a faulty tuning file like parseTuningText. An assignment
+/// that can't be written all the same is named together with those that have been carried out.
 void setValues(const std::filesystem::path& root, const std::vector<std::string>& assignments);
 
 } // namespace orvane::kit

@@ -1,0 +1,320 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// The program orvane-unit when it is interrupted, killed, started twice at once, or without room:
+// nothing is lost, nothing is left.
+#include "kit/enter/captured_run.h"
+#include "kit/host/folder_lock.h"
+#include "tests/kit/unit/described_unit.h"
+#include "tests/support/folder_names.h"
+#include "tests/support/host_command.h"
+#include "tests/support/temporary_folder.h"
+#include "tests/support/unit_test.h"
+
+#include <gtest/gtest.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <fstream>
+#include <regex>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+using CommandLine = std::vector<std::string>;
+
+const bool IS_EMULATED = buildCommand(ORVANE_UNIT_BINARY).size() > 1;
+
+CommandLine operator+(CommandLine first, const CommandLine& second) {
+    first.insert(first.end(), second.begin(), second.end());
+    return first;
+}
+
+CommandLine orvaneUnit(const CommandLine& words) {
+    return buildCommand(ORVANE_UNIT_BINARY) + words;
+}
+
+/// A unit, a folder of one case, and a folder for the program's temporary files.
+class NothingLostTest : public ::testing::Test {
+protected:
+    NothingLostTest() {
+        fs::create_directories(folder() / "cases/one");
+        fs::create_directory(temporary());
+        writeFile(folder() / "cases/one/unit.toml", "");
+    }
+
+    const fs::path& folder() const { return unit_.folder(); }
+    std::string unit() const { return unit_.root(); }
+    fs::path temporary() const { return folder() / "temporary"; }
+
+    /// Runs the program, and lets the system send it `signal` at its first call of `systemCall`.
+    kit::RunResult interrupted(const std::string& systemCall, const std::string& signal,
+                               const CommandLine& words) const {
+        return runOnHost(
+            CommandLine{"strace", "-qq", "-o", "/dev/null", "-e",
+                        "inject=" + systemCall + ":signal=" + signal + ":when=1", "-E",
+                        "ASAN_OPTIONS=detect_leaks=0", // LeakSanitizer would trace the process, too
+                        "-E", "TMPDIR=" + temporary().string()} +
+            orvaneUnit(words));
+    }
+
+    std::string explained() const {
+        return runOnHost(orvaneUnit({"explain", unit()})).standardOutput;
+    }
+
+private:
+    DescribedUnit unit_;
+};
+
+struct Interruption {
+    const char* name;
+    int number;
+};
+constexpr Interruption INTERRUPTIONS_TRIED[] = {
+    {"SIGINT", SIGINT}, {"SIGTERM", SIGTERM}, {"SIGHUP", SIGHUP}};
+
+TEST_F(NothingLostTest, InterruptedCommandsLeaveNothing) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    fs::create_directory(folder() / "empty");
+    const std::set<std::string> before = folderNames(folder());
+    const std::string cases = folder() / "cases";
+    for (const Interruption& signal : INTERRUPTIONS_TRIED) {
+        SCOPED_TRACE(signal.name);
+        const auto expectInterrupted = [&](const char* systemCall, const CommandLine& words) {
+            SCOPED_TRACE(words[0]);
+            const kit::RunResult result = interrupted(systemCall, signal.name, words);
+            EXPECT_EQ(result.exitStatus, 128 + signal.number);
+            EXPECT_EQ(result.standardOutput + result.standardError, "");
+            EXPECT_EQ(folderNames(folder()), before);
+            EXPECT_EQ(folderNames(folder() / "empty"), std::set<std::string>{});
+            EXPECT_EQ(folderNames(temporary()), std::set<std::string>{});
+        };
+        expectInterrupted("ftruncate", {"new", folder() / "made"});
+        expectInterrupted("ftruncate", {"new", folder() / "empty"});
+        expectInterrupted("ftruncate", {"capture", unit(), folder() / "made"});
+        expectInterrupted("ftruncate", {"impact", unit()});
+        expectInterrupted("pwrite64", {"impact", unit()});
+        expectInterrupted("ftruncate", {"check", cases});
+        expectInterrupted("wait4", {"check", cases});
+        expectInterrupted("wait4", {"run", unit(), "--", "-a"});
+        expectInterrupted("flock", {"new", folder() / "made"});
+    }
+}
+
+/// Whether a program runs with this argument, other than orvane-unit itself.
+bool isRunning(const std::string& argument) {
+    for (const fs::directory_entry& process : fs::directory_iterator("/proc")) {
+        std::ifstream file(process.path() / "cmdline");
+        std::string words;
+        std::getline(file, words);
+        if (words.find(argument) != std::string::npos &&
+            words.find("orvane-unit") == std::string::npos) {
+            return true;
+        }
+    }
+    return false;
+}
+
+pid_t startInBackground(CommandLine command) {
+    const pid_t child = fork();
+    if (child == 0) {
+        std::vector<char*> argv;
+        for (std::string& word : command) {
+            argv.push_back(word.data());
+        }
+        argv.push_back(nullptr);
+        execvp(argv[0], argv.data());
+        _exit(1);
+    }
+    return child;
+}
+
+TEST_F(NothingLostTest, InterruptionAndKillEndTheProgramThatRuns) {
+    const std::string forever = std::to_string(100000000 + getpid());
+    for (const int signal : {SIGTERM, SIGKILL}) {
+        SCOPED_TRACE(signal);
+        const pid_t started =
+            startInBackground(orvaneUnit({"run", unit(), "--orvane", "/bin/sleep", "--", forever}));
+        int status = 0;
+        while (!isRunning(forever)) {
+            ASSERT_EQ(waitpid(started, &status, WNOHANG), 0) << status;
+        }
+        kill(started, signal);
+        EXPECT_EQ(waitpid(started, &status, 0), started);
+        EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == signal) << status;
+        while (signal == SIGKILL && isRunning(forever)) { // the system is about to kill it
+        }
+        EXPECT_FALSE(isRunning(forever));
+    }
+}
+
+TEST_F(NothingLostTest, IgnoredHangUpInterruptsNothing) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    const kit::RunResult result =
+        runOnHost(CommandLine{"sh", "-c", "trap '' HUP; exec \"$@\"", "sh", "strace", "-qq", "-o",
+                              "/dev/null", "-e", "inject=ftruncate:signal=SIGHUP:when=1", "-E",
+                              "ASAN_OPTIONS=detect_leaks=0"} +
+                  orvaneUnit({"new", folder() / "made"}));
+    EXPECT_EQ(result.exitStatus, 0);
+    EXPECT_TRUE(exists(folder() / "made/.orvane-unit"));
+}
+
+TEST_F(NothingLostTest, NextCallRemovesWhatAKillLeaves) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    fs::create_directory(folder() / "empty");
+    const std::set<std::string> before = folderNames(folder());
+    const std::string cases = folder() / "cases";
+    EXPECT_EQ(interrupted("ftruncate", "SIGKILL", {"new", folder() / "made"}).exitStatus, 137);
+    EXPECT_EQ(folderNames(folder()).size(), before.size() + 1);
+    EXPECT_EQ(runOnHost(orvaneUnit({"new", folder() / "other"})).exitStatus, 0);
+    fs::remove_all(folder() / "other");
+    EXPECT_EQ(folderNames(folder()), before);
+
+    EXPECT_EQ(interrupted("ftruncate", "SIGKILL", {"new", folder() / "empty"}).exitStatus, 137);
+    EXPECT_EQ(folderNames(folder() / "empty").size(), 1U);
+    EXPECT_EQ(runOnHost(orvaneUnit({"new", folder() / "empty"})).exitStatus, 0);
+    EXPECT_EQ(folderNames(folder() / "empty"),
+              (std::set<std::string>{".orvane-unit", "dev", "fs", "tmp"}));
+
+    EXPECT_EQ(interrupted("wait4", "SIGKILL", {"check", cases}).exitStatus, 137);
+    EXPECT_EQ(folderNames(temporary()).size(), 1U);
+    runOnHost(CommandLine{"env", "TMPDIR=" + temporary().string()} + orvaneUnit({"check", cases}));
+    EXPECT_EQ(folderNames(temporary()), std::set<std::string>{});
+}
+
+TEST_F(NothingLostTest, InterruptedSetIsDoneWholly) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    EXPECT_EQ(
+        interrupted("pwrite64", "SIGTERM", {"set", unit(), "param.22=0", "serial=NEW"}).exitStatus,
+        128 + SIGTERM);
+    EXPECT_NE(explained().find("rightHandDrive = 0"), std::string::npos);
+    EXPECT_NE(explained().find("serial=NEW "), std::string::npos);
+}
+
+TEST_F(NothingLostTest, FailedWriteNamesItsAssignmentAndWhatHasBeenSet) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    const CommandLine set = orvaneUnit({"set", unit(), "param.22=0", "serial=NEW", "param.139=12"});
+    const auto failAt = [&](const std::string& which) {
+        return runOnHost(CommandLine{"strace", "-qq", "-o", "/dev/null", "-e",
+                                     "inject=pwrite64:error=EIO:when=" + which, "-E",
+                                     "ASAN_OPTIONS=detect_leaks=0"} +
+                         set);
+    };
+    kit::RunResult result = failAt("1");
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_EQ(result.standardError, std::string("orvane-unit: param.22=0: cannot write ") +
+                                        IMAGE_PATH +
+                                        ": Input/output error; nothing has been set\n");
+    result = failAt("3");
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_EQ(result.standardError,
+              std::string("orvane-unit: param.139=12: cannot write ") + IMAGE_PATH +
+                  ": Input/output error; only this has been set: param.22=0, serial=NEW\n");
+    EXPECT_NE(explained().find("rightHandDrive = 0"), std::string::npos);
+    EXPECT_NE(explained().find("serial=NEW "), std::string::npos);
+    EXPECT_NE(explained().find("Quarion Velmira"), std::string::npos);
+}
+
+/// The unit lies on a file system of its own that has no room left; its disk is a hole.
+TEST_F(NothingLostTest, SetOnAFullDiskChangesNothing) {
+    const std::string mounted = folder() / "mounted";
+    fs::create_directory(mounted);
+    writeFile(folder() / "unit.toml", "[image.params]\n22 = 1\n");
+    const std::string script = R"(
+mount -t tmpfs -o size=64k tmpfs "$1" || exit 77
+shift
+"$@" new "$0/unit" --from "$0/../unit.toml" || exit 78
+dd if=/dev/zero of="$0/rest" bs=4096 2>/dev/null
+"$@" set "$0/unit" param.22=0 serial=NEW 2>"$0/../complaint"
+echo $?
+"$@" show "$0/unit" --only params | grep '^ *22 '
+)";
+    CommandLine command = {"unshare", "--mount"};
+    if (geteuid() != 0) {
+        command.push_back("--map-root-user");
+    }
+    const kit::RunResult result =
+        runOnHost(command + CommandLine{"sh", "-c", script, mounted, mounted} + orvaneUnit({}));
+    if (result.exitStatus == 77 || result.standardError.find("unshare") == 0) {
+        GTEST_SKIP() << "no file system can be mounted: " << result.standardError;
+    }
+    EXPECT_EQ(result.standardOutput.substr(0, 2), "2\n") << result.standardError;
+    EXPECT_NE(result.standardOutput.find(" 0x01 "), std::string::npos) << result.standardOutput;
+    EXPECT_EQ(readFile(folder() / "complaint"),
+              "orvane-unit: serial=NEW: cannot write /dev/hd0: No space left on device\n");
+}
+
+TEST_F(NothingLostTest, UnitThatIsBeingChangedIsLeftAlone) {
+    const std::string complaint = "orvane-unit: " + unit() + " is being changed by process " +
+                                  std::to_string(getpid()) + "\n";
+    const std::string before = explained();
+    const kit::FolderLock lock(unit());
+    for (const CommandLine& words :
+         {CommandLine{"set", unit(), "param.22=0"}, CommandLine{"run", unit(), "--", "-a"}}) {
+        const kit::RunResult result = runOnHost(orvaneUnit(words));
+        EXPECT_EQ(result.exitStatus, 2);
+        EXPECT_EQ(result.standardOutput, "");
+        EXPECT_EQ(result.standardError, complaint);
+    }
+    EXPECT_EQ(explained(), before);
+    EXPECT_TRUE(fs::is_empty(unit() + "/tmp"));
+}
+
+/// Each caller waits for the other, and tries again if that takes longer than it waits.
+TEST_F(NothingLostTest, ChangesAtOnceAreAllKept) {
+    const std::string script = R"(
+again() {
+    until "$@" 2>"$complaint"; do
+        grep -q 'is being changed by' "$complaint" || exit 1
+    done
+}
+(complaint=$0.1; again "$@" tuning.3.qwaAECSwitch=qwaOn) &
+first=$!
+(complaint=$0.2; again "$@" tuning.3.qwaAGCSwitch=qwaOn) &
+wait $! && wait $first
+)";
+    const kit::RunResult result = runOnHost(
+        CommandLine{"sh", "-c", script, folder() / "complaint"} + orvaneUnit({"set", unit()}));
+    EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+    const std::string shown =
+        runOnHost(orvaneUnit({"show", unit(), "--only", "tuning"})).standardOutput;
+    EXPECT_TRUE(std::regex_search(shown, std::regex("qwaAECSwitch +2 +qwaOn"))) << shown;
+    EXPECT_TRUE(std::regex_search(shown, std::regex("qwaAGCSwitch +2 +qwaOn"))) << shown;
+}
+
+TEST_F(NothingLostTest, NewAndCaptureFillTheWorkingDirectoryOfTheirCaller) {
+    const std::string empty = folder() / "empty";
+    for (const CommandLine& words :
+         {CommandLine{"new", "."}, CommandLine{"new", empty + "/."},
+          CommandLine{"capture", unit(), "."}, CommandLine{"capture", unit(), empty}}) {
+        SCOPED_TRACE(words[0] + " " + words.back());
+        fs::create_directory(empty);
+        // ls looks into the folder in which it has been started, not into one of the same name.
+        const kit::RunResult result = runOnHost(
+            CommandLine{"sh", "-c", "cd \"$0\" && \"$@\" && ls -A", empty} + orvaneUnit(words));
+        EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+        EXPECT_EQ(result.standardOutput, ".orvane-unit\ndev\nfs\ntmp\n");
+        fs::remove_all(empty);
+    }
+}
+
+} // namespace
+
+} // namespace orvane::test
