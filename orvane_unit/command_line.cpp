@@ -359,6 +359,24 @@ private:
     bool redactsSerial_ = false;
 };
 
+/// The faults of all cases, each once: most are about one file, but a full disk strikes all.
+void throwFaults(const CheckReport& report) {
+    std::vector<std::string> faults;
+    for (const CaseResult& result : report.cases) {
+        if (!result.fault.empty() &&
+            std::find(faults.begin(), faults.end(), result.fault) == faults.end()) {
+            faults.push_back(result.fault);
+        }
+    }
+    std::string lines;
+    for (const std::string& fault : faults) {
+        lines += (lines.empty() ? "" : "\n") + fault;
+    }
+    if (!lines.empty()) {
+        throw kit::KitError(lines);
+    }
+}
+
 class CheckCommand : public Command {
 public:
     explicit CheckCommand(CLI::App& app)
@@ -377,6 +395,7 @@ public:
         } else {
             printCheck(std::cout, report);
         }
+        throwFaults(report);
         return std::all_of(report.cases.begin(), report.cases.end(),
                            [](const CaseResult& result) { return result.isAsExpected(); })
                    ? EXIT_AS_INTENDED

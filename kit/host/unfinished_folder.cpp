@@ -61,8 +61,21 @@ Descriptor lockNew(const fs::path& path) {
     return isKept ? std::move(folder) : Descriptor();
 }
 
-/// Removes what killed processes have left in `above`: what no living one has a lock on. What can't
-/// be listed, locked or removed stays.
+} // namespace
+
+bool isUnfinishedName(const std::string& name) {
+    const std::size_t middle = name.rfind(MIDDLE);
+    if (name.compare(0, 1, ".") != 0 || middle == std::string::npos) {
+        return false;
+    }
+    constexpr char DIGITS[] = "0123456789";
+    const std::size_t process = middle + sizeof MIDDLE - 1;
+    const std::size_t hyphen = name.find_first_not_of(DIGITS, process);
+    return hyphen != std::string::npos && hyphen > process && name[hyphen] == '-' &&
+           hyphen + 1 < name.size() &&
+           name.find_first_not_of(DIGITS, hyphen + 1) == std::string::npos;
+}
+
 void removeLeftovers(const fs::path& above) {
     std::error_code error;
     for (fs::directory_iterator entry(above, error); !error && entry != fs::directory_iterator();
@@ -77,21 +90,6 @@ void removeLeftovers(const fs::path& above) {
             fs::remove_all(entry->path(), ignored);
         }
     }
-}
-
-} // namespace
-
-bool isUnfinishedName(const std::string& name) {
-    const std::size_t middle = name.rfind(MIDDLE);
-    if (name.compare(0, 1, ".") != 0 || middle == std::string::npos) {
-        return false;
-    }
-    constexpr char DIGITS[] = "0123456789";
-    const std::size_t process = middle + sizeof MIDDLE - 1;
-    const std::size_t hyphen = name.find_first_not_of(DIGITS, process);
-    return hyphen != std::string::npos && hyphen > process && name[hyphen] == '-' &&
-           hyphen + 1 < name.size() &&
-           name.find_first_not_of(DIGITS, hyphen + 1) == std::string::npos;
 }
 
 UnfinishedFolder::UnfinishedFolder(const fs::path& above, const std::string& stem, mode_t mode) {

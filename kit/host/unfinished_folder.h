@@ -14,11 +14,11 @@ namespace orvane::kit {
 /// A new folder that is removed with its owner, unless it has been renamed by then. Its name is "."
 /// + a stem + ".unfinished-", the number of this process, "-" and a number. SIGINT, SIGTERM and
 /// SIGHUP wait while it exists. A process that is killed leaves it behind, without the lock that
-/// each such folder has: the next one made in the same folder removes it.
+/// each such folder has: removeLeftovers() removes it.
 class UnfinishedFolder {
 public:
-    /// Makes it in the folder `above`, with the access rights `mode`, less the umask. Throws
-    /// std::filesystem::filesystem_error.
+    /// Makes it in the folder `above`, from which it first removes the leftovers, with the access
+    /// rights `mode`, less the umask. Throws std::filesystem::filesystem_error.
     UnfinishedFolder(const std::filesystem::path& above, const std::string& stem, mode_t mode);
     ~UnfinishedFolder();
     UnfinishedFolder(const UnfinishedFolder&) = delete;
@@ -31,6 +31,10 @@ private:
     std::filesystem::path path_;
     Descriptor lock_;
 };
+
+/// Removes the unfinished folders in `above` that killed processes of this user have left: those on
+/// which no process has a lock. What can't be listed, locked or removed stays.
+void removeLeftovers(const std::filesystem::path& above);
 
 /// Whether an entry's name is that of an unfinished folder.
 bool isUnfinishedName(const std::string& name);

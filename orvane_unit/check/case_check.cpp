@@ -3,24 +3,26 @@
 
 #include "kit/description/parse_description.h"
 #include "kit/enter/captured_run.h"
+#include "kit/enter/entered_root.h"
+#include "kit/enter/program_start.h"
 #include "kit/enter/run_inside.h"
-#include "kit/host/bytes.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/output_place.h"
 #include "kit/host/scratch_folder.h"
 #include "kit/host/tree_entries.h"
+#include "kit/host/unfinished_folder.h"
 #include "kit/host/whole_file.h"
 #include "kit/unit/make_unit.h"
+#include "orvane_unit/check/expectation.h"
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
 
 #include <array>
 #include <cstddef>
-#include <fstream>
 #include <map>
 #include <optional>
 #include <sstream>
-#include <system_error>
 #include <utility>
 
 namespace orvane::desk {
@@ -29,12 +31,19 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr char NO_TMP[] = "(absent)";
+/// Also of a folder that can't be read: that is a fault of a case.
+bool isCase(const fs::path& folder) {
+    try {
+        return kit::kindBehind(folder / "unit.toml") != fs::file_type::not_found;
+    } catch (const kit::KitError&) {
+        return true;
+    }
+}
 
 std::vector<fs::path> caseFolders(const fs::path& folder) {
     std::vector<fs::path> folders;
     for (const fs::path& entry : kit::listFolder(folder)) {
-        if (kit::kindBehind(entry / "unit.toml") != fs::file_type::not_found) {
+        if (isCase(entry)) {
             folders.push_back(entry);
         }
     }
@@ -42,16 +51,6 @@ std::vector<fs::path> caseFolders(const fs::path& folder) {
         throw kit::KitError("no folder in " + folder.string() + " holds a unit.toml");
     }
     return folders;
-}
-
-void writeWhole(const fs::path& file, const std::string& text) {
-    fs::create_directories(file.parent_path());
-    std::ofstream out(file, std::ios::binary);
-    out << text;
-    out.close();
-    if (!out) {
-        throw kit::KitError("cannot write " + file.string());
-    }
 }
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
@@ -67,38 +66,38 @@ std::vector<std::string> argumentsOf(const fs::path& folder) {
     return arguments;
 }
 
-std::string listOf(const TmpTree& tree) {
-    if (!tree.isThere) {
-        return std::string(NO_TMP) + "\n";
-    }
-    std::string list;
-    for (const auto& [path, content] : tree.entries) {
-        list += path + "\n";
-    }
-    return list;
-}
-
-std::set<std::string> linesOf(const std::string& text) {
-    std::set<std::string> lines;
-    std::istringstream in(text);
-    for (std::string line; std::getline(in, line);) {
-        lines.insert(line);
-    }
-    return lines;
-}
-
-void compareEntries(const std::set<std::string>& found, const std::set<std::string>& expected,
-                    std::vector<std::string>& differences) {
-    for (const std::string& name : expected) {
-        if (found.count(name) == 0) {
-            differences.push_back(pathInTmp(name) + " is missing");
+/// The files that `paths` of the unit lead to, by links or not.
+std::set<std::string> placesOf(const fs::path& root, const std::vector<std::string>& paths) {
+    const kit::EnteredRoot entered(root);
+    std::set<std::string> places;
+    for (const std::string& path : paths) {
+        if (const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path)) {
+            places.insert(place->path);
         }
     }
-    for (const std::string& name : found) {
-        if (expected.count(name) == 0) {
-            differences.push_back(pathInTmp(name) + " is not expected");
+    return places;
+}
+
+/// Whether each line is a C library's complaint about an option: "orvane: invalid option -- 'x'".
+bool isAboutOptions(const std::string& text, const std::string& program) {
+    std::istringstream lines(text);
+    for (std::string line; std::getline(lines, line);) {
+        if (line.compare(0, program.size() + 2, program + ": ") != 0 ||
+            line.find("option") == std::string::npos) {
+            return false;
         }
     }
+    return true;
+}
+
+/// What has become of an entry of /tmp; null when it is as it was.
+const char* changeOf(const std::string& path, const TmpTree& before, const TmpTree& after) {
+    const auto old = before.entries.find(path);
+    const auto now = after.entries.find(path);
+    return now == after.entries.end()    ? "removed"
+           : old == before.entries.end() ? "made"
+           : old->second != now->second  ? "changed"
+                                         : nullptr;
 }
 
 /// What holds without an expectation: the tool always ends with 0 and prints nothing on standard
@@ -108,50 +107,33 @@ void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences
         differences.push_back("exit status " + std::to_string(run.exitStatus));
     }
     if (!run.standardOutput.empty()) {
-        differences.push_back("standard output is not empty");
+        differences.emplace_back("standard output is not empty");
     }
 }
 
-void compare(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run,
-             std::vector<std::string>& differences) {
-    if (run.standardError != kit::readWholeFileIfThere(expected / "stderr").value_or("")) {
-        differences.push_back("standard error differs");
+/// What else tells that the program that has run is not the tool, which complains of options only
+/// and changes nothing but its outputs.
+std::vector<std::string> foreignTraits(const fs::path& root, const std::string& program,
+                                       const std::set<std::string>& outputs, const TmpTree& before,
+                                       const RunOutcome& outcome) {
+    std::vector<std::string> traits;
+    if (!isAboutOptions(outcome.end.standardError, program)) {
+        traits.emplace_back("standard error has more than complaints about options");
     }
-    const std::optional<std::string> list = kit::readWholeFileIfThere(expected / "tmp.list");
-    if (!list) {
-        differences.push_back("expected/tmp.list is missing");
-        return;
-    }
-    const std::set<std::string> wanted = linesOf(*list);
-    compareEntries(linesOf(listOf(tree)), wanted, differences);
-    for (const auto& [path, content] : tree.entries) {
-        if (content && wanted.count(path) != 0 &&
-            *content != kit::readWholeFileIfThere(expected / "tmp" / path)) {
-            differences.push_back(pathInTmp(path) + " differs");
+    TmpTree both = before;
+    both.entries.insert(outcome.tmp.entries.begin(), outcome.tmp.entries.end());
+    for (const auto& [name, content] : both.entries) {
+        const std::string path = pathInTmp(name);
+        const char* const change = changeOf(name, before, outcome.tmp);
+        if (change == nullptr) {
+            continue;
+        }
+        const std::set<std::string> place = placesOf(root, {path});
+        if (place.empty() || outputs.count(*place.begin()) == 0) {
+            traits.push_back(path + " has been " + change + " and is not an output");
         }
     }
-}
-
-void record(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
-    fs::remove_all(expected);
-    writeWhole(expected / "tmp.list", listOf(tree));
-    if (!run.standardError.empty()) {
-        writeWhole(expected / "stderr", run.standardError);
-    }
-    for (const auto& [path, content] : tree.entries) {
-        if (content) {
-            writeWhole(expected / "tmp" / path, *content);
-        }
-    }
-}
-
-void update(const fs::path& expected, const TmpTree& tree, const kit::RunResult& run) {
-    try {
-        record(expected, tree, run);
-    } catch (const fs::filesystem_error& error) {
-        throw kit::KitError("cannot write " + error.path1().string() + ": " +
-                            error.code().message());
-    }
+    return traits;
 }
 
 /// Adds the outputs that are not as the explanation says.
@@ -170,29 +152,77 @@ void compareWithRun(const Explanation& explanation, const TmpTree& tree,
     }
 }
 
-CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool updates) {
-    const kit::ScratchFolder scratch;
-    const fs::path root = scratch.path() / "unit";
-    kit::makeUnit(kit::readDescription(folder / "unit.toml"), root);
-    const std::vector<std::string> arguments = argumentsOf(folder);
-
-    CaseResult result;
-    result.name = folder.filename().string();
-    const Explanation explanation = explainUnit(root, arguments);
+/// Adds the reasons that an explanation gives.
+void addReasons(const Explanation& explanation, std::set<Reason>& reasons) {
     for (const Output& output : explanation) {
-        result.reasons.insert(output.reasons.begin(), output.reasons.end());
+        reasons.insert(output.reasons.begin(), output.reasons.end());
         for (const Line& line : output.lines) {
-            result.reasons.insert(line.origin.reasons.begin(), line.origin.reasons.end());
+            reasons.insert(line.origin.reasons.begin(), line.origin.reasons.end());
         }
     }
-    const kit::RunResult run = kit::runInside(root, {binary, arguments});
-    const TmpTree tree = readTmp(root);
-    compareWithRun(explanation, tree, result.surprises);
-    compareEnd(run, result.differences);
-    if (updates) {
-        update(folder / "expected", tree, run);
-    } else {
-        compare(folder / "expected", tree, run, result.differences);
+}
+
+struct CaseRun {
+    RunOutcome outcome;
+    std::vector<std::string> foreignTraits;
+};
+
+/// Runs the case in a unit that it makes at `root`, and compares with what holds for every run.
+CaseRun runCase(const fs::path& folder, const fs::path& binary, const fs::path& root,
+                CaseResult& result) {
+    kit::makeUnit(kit::readDescription(folder / "unit.toml"), root);
+    const std::vector<std::string> arguments = argumentsOf(folder);
+    const Explanation explanation = explainUnit(root, arguments);
+    addReasons(explanation, result.reasons);
+    std::vector<std::string> paths;
+    for (const Output& output : explanation) {
+        paths.push_back(output.path);
+    }
+    const std::set<std::string> outputs = placesOf(root, paths);
+    const TmpTree before = readTmp(root);
+    RunOutcome outcome;
+    outcome.end = kit::runInside(root, {binary, arguments});
+    outcome.tmp = readTmp(root);
+    compareWithRun(explanation, outcome.tmp, result.surprises);
+    compareEnd(outcome.end, result.differences);
+    std::vector<std::string> foreign =
+        foreignTraits(root, binary.filename().string(), outputs, before, outcome);
+    return {std::move(outcome), std::move(foreign)};
+}
+
+void addAll(const std::vector<std::string>& more, std::vector<std::string>& lines) {
+    lines.insert(lines.end(), more.begin(), more.end());
+}
+
+/// The outcome becomes the expectation only if a check would find nothing else against it.
+void update(const fs::path& folder, const CaseRun& run, CaseResult& result) {
+    kit::removeLeftovers(folder); // also where nothing is written now
+    addAll(run.foreignTraits, result.differences);
+    if (!result.isAsExpected()) {
+        return;
+    }
+    if (differencesFromExpected(folder, run.outcome).empty()) {
+        result.update = CaseUpdate::needless;
+        return;
+    }
+    replaceExpected(folder, run.outcome);
+    result.update = CaseUpdate::done;
+}
+
+CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool updates) {
+    CaseResult result;
+    result.name = folder.filename().string();
+    result.update = updates ? CaseUpdate::refused : CaseUpdate::none;
+    try {
+        const kit::ScratchFolder scratch;
+        const CaseRun run = runCase(folder, binary, scratch.path() / "unit", result);
+        if (updates) {
+            update(folder, run, result);
+        } else {
+            addAll(differencesFromExpected(folder, run.outcome), result.differences);
+        }
+    } catch (const kit::KitError& error) {
+        result.fault = error.what();
     }
     return result;
 }
@@ -200,6 +230,7 @@ CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool update
 } // namespace
 
 CheckReport checkCases(const fs::path& folder, const fs::path& binary, bool updates) {
+    kit::findProgramStart({binary, {}}); // one refusal in place of one for each case
     CheckReport report;
     report.isUpdate = updates;
     std::set<Reason> reached;

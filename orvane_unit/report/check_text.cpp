@@ -16,10 +16,25 @@ namespace orvane::desk {
 
 namespace {
 
+/// What has become of a case.
+std::string verdictOf(const CaseResult& result) {
+    switch (result.update) {
+    case CaseUpdate::done:
+        return painted(Colour::good, "updated");
+    case CaseUpdate::needless:
+        return painted(Colour::good, "unchanged");
+    case CaseUpdate::refused:
+        return painted(Colour::bad, "not updated");
+    case CaseUpdate::none:
+        break;
+    }
+    return result.isAsExpected()  ? painted(Colour::good, "ok")
+           : result.fault.empty() ? painted(Colour::bad, "differs")
+                                  : painted(Colour::bad, "not checked");
+}
+
 void printCase(std::ostream& out, const CaseResult& result, std::size_t width) {
-    out << padded(result.name, width) << "  "
-        << (result.isAsExpected() ? painted(Colour::good, "ok") : painted(Colour::bad, "differs"))
-        << '\n';
+    out << padded(result.name, width) << "  " << verdictOf(result) << '\n';
     for (const std::vector<std::string>* lines : {&result.differences, &result.surprises}) {
         for (const std::string& line : *lines) {
             out << "    " << kit::printable(line) << '\n';
@@ -27,21 +42,37 @@ void printCase(std::ostream& out, const CaseResult& result, std::size_t width) {
     }
 }
 
+std::size_t countOf(const CheckReport& report, CaseUpdate update) {
+    return static_cast<std::size_t>(
+        std::count_if(report.cases.begin(), report.cases.end(),
+                      [update](const CaseResult& result) { return result.update == update; }));
+}
+
+void printCounts(std::ostream& out, const CheckReport& report) {
+    out << kit::counted(report.cases.size(), "unit") << ", ";
+    if (report.isUpdate) {
+        out << countOf(report, CaseUpdate::done) << " updated, "
+            << countOf(report, CaseUpdate::needless) << " unchanged, "
+            << countOf(report, CaseUpdate::refused) << " not updated\n";
+    } else {
+        out << std::count_if(report.cases.begin(), report.cases.end(),
+                             [](const CaseResult& result) { return !result.isAsExpected(); })
+            << " not as expected\n";
+    }
+}
+
 } // namespace
 
 void printCheck(std::ostream& out, const CheckReport& report) {
     std::size_t width = 0;
-    std::size_t failed = 0;
     for (const CaseResult& result : report.cases) {
         width = std::max(width, result.name.size());
-        failed += result.isAsExpected() ? 0U : 1U;
     }
     for (const CaseResult& result : report.cases) {
         printCase(out, result, width);
     }
-    out << kit::counted(report.cases.size(), "unit") << ", " << failed << " not as expected"
-        << (report.isUpdate ? "; expectations updated" : "") << '\n'
-        << "reasons reached: " << REASON_COUNT - report.unreached.size() << " of " << REASON_COUNT;
+    printCounts(out, report);
+    out << "reasons reached: " << REASON_COUNT - report.unreached.size() << " of " << REASON_COUNT;
     const char* separator = "; not reached: ";
     for (const char* code : report.unreached) {
         out << separator << code;

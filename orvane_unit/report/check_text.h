@@ -7,8 +7,8 @@
 
 namespace orvane::desk {
 
-/// Prints each case with what is not as expected, then the number of cases and the reasons that
-/// none of them reaches.
+/// Prints each case with what is not as expected, but for its fault, then the number of cases and
+/// the reasons that none of them reaches.
 void printCheck(std::ostream& out, const CheckReport& report);
 
 } // namespace orvane::desk

@@ -275,6 +275,9 @@ std::string checkJson(const std::string& folder, const CheckReport& report) {
             {{"name", bytesJson(result.name)},
              {"differences", textsJson(result.differences)},
              {"surprises", textsJson(result.surprises)},
+             {"fault", result.fault.empty() ? Json(nullptr) : bytesJson(result.fault)},
+             {"update",
+              result.update == CaseUpdate::none ? Json(nullptr) : Json(nameOf(result.update))},
              {"reasons", codesJson({result.reasons.begin(), result.reasons.end()})}});
     }
     json["unreached"] = report.unreached;

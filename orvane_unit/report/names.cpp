@@ -28,6 +28,12 @@ constexpr Named<CrcVerdict> CRC_VERDICTS[] = {
     {CrcVerdict::unreadable, "unreadable"},
 };
 
+constexpr Named<CaseUpdate> CASE_UPDATES[] = {
+    {CaseUpdate::done, "updated"},
+    {CaseUpdate::needless, "unchanged"},
+    {CaseUpdate::refused, "not-updated"},
+};
+
 constexpr Named<PathKind> PATH_KINDS[] = {
     {PathKind::nothing, "nothing"},
     {PathKind::file, "file"},
@@ -61,6 +67,10 @@ const char* nameOf(Outcome outcome) {
 
 const char* nameOf(CrcVerdict verdict) {
     return nameIn(CRC_VERDICTS, verdict);
+}
+
+const char* nameOf(CaseUpdate update) {
+    return nameIn(CASE_UPDATES, update);
 }
 
 const char* nameOf(PathKind kind) {

@@ -189,10 +189,68 @@ TEST_F(NothingLostTest, NextCallRemovesWhatAKillLeaves) {
     EXPECT_EQ(folderNames(folder() / "empty"),
               (std::set<std::string>{".orvane-unit", "dev", "fs", "tmp"}));
 
-    EXPECT_EQ(interrupted("wait4", "SIGKILL", {"check", cases}).exitStatus, 137);
+    EXPECT_EQ(interrupted("ftruncate", "SIGKILL", {"check", cases}).exitStatus, 137);
     EXPECT_EQ(folderNames(temporary()).size(), 1U);
     runOnHost(CommandLine{"env", "TMPDIR=" + temporary().string()} + orvaneUnit({"check", cases}));
     EXPECT_EQ(folderNames(temporary()), std::set<std::string>{});
+}
+
+TEST_F(NothingLostTest, KilledUpdateLeavesTheOldExpectationOrTheNew) {
+    if (IS_EMULATED) {
+        GTEST_SKIP() << "strace would see the calls of the emulator";
+    }
+    const std::string cases = folder() / "cases";
+    const fs::path one = folder() / "cases/one";
+    const fs::path expected = one / "expected";
+    const auto list = [&] { return readFile(expected / "tmp.list"); };
+    ASSERT_EQ(runOnHost(orvaneUnit({"check", cases, "--update"})).exitStatus, 0);
+    const std::string made = list();
+    int kept = 0;
+    int replaced = 0;
+    for (const std::string call : {"link", "renameat2", "unlinkat"}) {
+        for (int number = 1; number <= 3; ++number) {
+            SCOPED_TRACE(call + " " + std::to_string(number));
+            fs::remove_all(expected);
+            fs::create_directories(expected / "tmp");
+            writeFile(expected / "tmp.list", "older\n");
+            writeFile(expected / "tmp/older", "text");
+            writeFile(expected / "notes", "of a person");
+            const kit::RunResult result = runOnHost(
+                CommandLine{"strace", "-qq", "-o", "/dev/null", "-e",
+                            "inject=" + call + ":signal=SIGKILL:when=" + std::to_string(number),
+                            "-E", "ASAN_OPTIONS=detect_leaks=0", "-E",
+                            "TMPDIR=" + temporary().string()} +
+                orvaneUnit({"check", cases, "--update"}));
+            EXPECT_TRUE(result.exitStatus == 0 || result.exitStatus == 128 + SIGKILL);
+            const bool isOld = list() == "older\n";
+            (isOld ? kept : replaced) += 1;
+            EXPECT_TRUE(isOld || list() == made) << list();
+            EXPECT_EQ(exists(expected / "tmp/older"), isOld);
+            EXPECT_EQ(exists(expected / "tmp/airplay.conf"), !isOld);
+            EXPECT_EQ(readFile(expected / "notes"), "of a person");
+            runOnHost(CommandLine{"env", "TMPDIR=" + temporary().string()} +
+                      orvaneUnit({"check", cases, "--update"}));
+            EXPECT_EQ(list(), made);
+            EXPECT_EQ(folderNames(one), (std::set<std::string>{"expected", "unit.toml"}));
+        }
+    }
+    EXPECT_GT(kept, 0);
+    EXPECT_GT(replaced, 0);
+    EXPECT_EQ(folderNames(temporary()), std::set<std::string>{});
+}
+
+TEST_F(NothingLostTest, CheckGoesOnAfterABadCaseAndThenFails) {
+    fs::create_directory(folder() / "cases/bad");
+    const std::string description = folder() / "cases/bad/unit.toml";
+    writeFile(description, "folders = 1\n");
+    const kit::RunResult result = runOnHost(orvaneUnit({"check", folder() / "cases", "--update"}));
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_EQ(result.standardOutput.find("bad  not updated\none  updated\n"
+                                         "2 units, 1 updated, 0 unchanged, 1 not updated\n"),
+              0U)
+        << result.standardOutput;
+    EXPECT_EQ(result.standardError.find("orvane-unit: " + description + ":1:"), 0U)
+        << result.standardError;
 }
 
 TEST_F(NothingLostTest, InterruptedSetIsDoneWholly) {

@@ -119,19 +119,24 @@ TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
                                                    {"moving", 12},
                                                    {"lines", {"/tmp/airplay.conf:23"}}}})));
     desk::CheckReport check;
-    check.cases = {{"one", {"differs"}, {}, {desk::Reason::generated}}};
+    check.cases = {{"one", {"differs"}, {}, {desk::Reason::generated}, "", desk::CaseUpdate::none},
+                   {"two", {}, {}, {}, "no such file", desk::CaseUpdate::refused}};
     check.unreached = {"disk-missing"};
     const json report = parsed(desk::checkJson("F", check), "check");
     EXPECT_EQ(report.at("cases").at(0), (json{{"name", "one"},
                                               {"differences", {"differs"}},
                                               {"surprises", json::array()},
+                                              {"fault", nullptr},
+                                              {"update", nullptr},
                                               {"reasons", {"generated"}}}));
+    EXPECT_EQ(report.at("cases").at(1).at("fault"), "no such file");
+    EXPECT_EQ(report.at("cases").at(1).at("update"), "not-updated");
     EXPECT_EQ(report.at("unreached"), json::array({"disk-missing"}));
 }
 
 TEST(JsonTest, TextThatIsNotUtf8IsHexEverywhere) {
     desk::CheckReport check;
-    check.cases = {{"\xff", {"/tmp/\xfe is missing"}, {"\x80"}, {}}};
+    check.cases = {{"\xff", {"/tmp/\xfe is missing"}, {"\x80"}, {}, "", desk::CaseUpdate::none}};
     const json report = parsed(desk::checkJson("\xc0", check), "check");
     EXPECT_EQ(report.at("folder"), (json{{"hex", "c0"}}));
     EXPECT_EQ(report.at("cases").at(0).at("name"), (json{{"hex", "ff"}}));

@@ -9,6 +9,7 @@ namespace orvane::test {
 
 namespace {
 
+using desk::CaseUpdate;
 using desk::CrcVerdict;
 using desk::Outcome;
 using desk::PathKind;
@@ -23,6 +24,9 @@ TEST(NamesTest, EveryValueHasItsPublishedName) {
     EXPECT_STREQ(nameOf(CrcVerdict::blank), "blank");
     EXPECT_STREQ(nameOf(CrcVerdict::ambiguous), "ambiguous");
     EXPECT_STREQ(nameOf(CrcVerdict::unreadable), "unreadable");
+    EXPECT_STREQ(nameOf(CaseUpdate::done), "updated");
+    EXPECT_STREQ(nameOf(CaseUpdate::needless), "unchanged");
+    EXPECT_STREQ(nameOf(CaseUpdate::refused), "not-updated");
     EXPECT_STREQ(nameOf(PathKind::nothing), "nothing");
     EXPECT_STREQ(nameOf(PathKind::file), "file");
     EXPECT_STREQ(nameOf(PathKind::folder), "folder");
