@@ -36,11 +36,13 @@
 #include "orvane_unit/show/decoded_unit.h"
 
 #include <CLI/CLI.hpp>
+#include <signal.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cstddef>
 #include <exception>
+#include <filesystem>
 #include <iostream>
 #include <memory>
 #include <sstream>
@@ -472,6 +474,7 @@ void complain(const std::string& what) {
 } // namespace
 
 int runCommandLine(int argc, const char* const* argv) {
+    ::signal(SIGXFSZ, SIG_IGN); // a write past the limit for files then fails like any other
     try {
         return chooseAndRun(argc, argv);
     } catch (const std::exception& error) {

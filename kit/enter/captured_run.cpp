@@ -111,6 +111,7 @@ void endWithParent(pid_t parent) {
     try {
         endWithParent(parent);
         allowInterruption();
+        ::signal(SIGXFSZ, SIG_DFL); // as a program finds it, whatever its starter does about it
         putDescriptor(Descriptor(::open("/dev/null", O_RDONLY | O_CLOEXEC)), STDIN_FILENO);
         putDescriptor(outputs.standardOutput.descriptor(), STDOUT_FILENO);
         putDescriptor(outputs.standardError.descriptor(), STDERR_FILENO);

@@ -17,6 +17,7 @@
 #include "orvane_unit/check/tmp_tree.h"
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/explain/given_options.h"
 
 #include <array>
 #include <cstddef>
@@ -78,16 +79,17 @@ std::set<std::string> placesOf(const fs::path& root, const std::vector<std::stri
     return places;
 }
 
-/// Whether each line is a C library's complaint about an option: "orvane: invalid option -- 'x'".
-bool isAboutOptions(const std::string& text, const std::string& program) {
+/// Whether `text` is one line for each unknown option, as the C library prints it:
+/// "orvane: invalid option -- 'x'".
+bool isAboutOptions(const std::string& text, const std::string& program, std::size_t unknown) {
+    std::size_t count = 0;
     std::istringstream lines(text);
-    for (std::string line; std::getline(lines, line);) {
-        if (line.compare(0, program.size() + 2, program + ": ") != 0 ||
-            line.find("option") == std::string::npos) {
+    for (std::string line; std::getline(lines, line); ++count) {
+        if (line.compare(0, program.size() + 2, program + ": ") != 0) {
             return false;
         }
     }
-    return true;
+    return count == unknown;
 }
 
 /// What has become of an entry of /tmp; null when it is as it was.
@@ -111,15 +113,10 @@ void compareEnd(const kit::RunResult& run, std::vector<std::string>& differences
     }
 }
 
-/// What else tells that the program that has run is not the tool, which complains of options only
-/// and changes nothing but its outputs.
-std::vector<std::string> foreignTraits(const fs::path& root, const std::string& program,
-                                       const std::set<std::string>& outputs, const TmpTree& before,
-                                       const RunOutcome& outcome) {
-    std::vector<std::string> traits;
-    if (!isAboutOptions(outcome.end.standardError, program)) {
-        traits.emplace_back("standard error has more than complaints about options");
-    }
+/// What the program that has run has changed in /tmp and the tool would not: anything but outputs.
+std::vector<std::string> strangeChanges(const fs::path& root, const std::set<std::string>& outputs,
+                                        const TmpTree& before, const RunOutcome& outcome) {
+    std::vector<std::string> changes;
     TmpTree both = before;
     both.entries.insert(outcome.tmp.entries.begin(), outcome.tmp.entries.end());
     for (const auto& [name, content] : both.entries) {
@@ -130,10 +127,10 @@ std::vector<std::string> foreignTraits(const fs::path& root, const std::string& 
         }
         const std::set<std::string> place = placesOf(root, {path});
         if (place.empty() || outputs.count(*place.begin()) == 0) {
-            traits.push_back(path + " has been " + change + " and is not an output");
+            changes.push_back(path + " has been " + change + " and is not an output");
         }
     }
-    return traits;
+    return changes;
 }
 
 /// Adds the outputs that are not as the explanation says.
@@ -164,7 +161,7 @@ void addReasons(const Explanation& explanation, std::set<Reason>& reasons) {
 
 struct CaseRun {
     RunOutcome outcome;
-    std::vector<std::string> foreignTraits;
+    std::vector<std::string> foreignTraits; ///< what else tells that the program is not the tool
 };
 
 /// Runs the case in a unit that it makes at `root`, and compares with what holds for every run.
@@ -185,9 +182,12 @@ CaseRun runCase(const fs::path& folder, const fs::path& binary, const fs::path& 
     outcome.tmp = readTmp(root);
     compareWithRun(explanation, outcome.tmp, result.surprises);
     compareEnd(outcome.end, result.differences);
-    std::vector<std::string> foreign =
-        foreignTraits(root, binary.filename().string(), outputs, before, outcome);
-    return {std::move(outcome), std::move(foreign)};
+    std::vector<std::string> traits = strangeChanges(root, outputs, before, outcome);
+    if (!isAboutOptions(outcome.end.standardError, binary.filename().string(),
+                        countUnknownOptions(arguments))) {
+        traits.emplace_back("standard error is not a line for each unknown option");
+    }
+    return {std::move(outcome), std::move(traits)};
 }
 
 void addAll(const std::vector<std::string>& more, std::vector<std::string>& lines) {

@@ -6,7 +6,7 @@
 #include "kit/description/value_key.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/lost_pages.h"
-#include "main/options.h"
+#include "orvane_unit/explain/given_options.h"
 #include "orvane_unit/explain/planned_files.h"
 #include "orvane_unit/explain/planned_merge.h"
 #include "orvane_unit/explain/reasons.h"
@@ -18,8 +18,6 @@
 #include "tuning/tuning_file.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
-
-#include <unistd.h>
 
 #include <array>
 #include <cstddef>
@@ -141,26 +139,6 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
                     [&iap2](std::istream& templateFile, std::ostream& output, const IapValues& v) {
                         return generateIap1File(templateFile, output, iap2.output, v);
                     }));
-}
-
-/// The writers that a command line asks for, in their order, as the product's own parser reads it.
-/// What the parser prints on standard error is dropped.
-std::vector<Writer> writersOf(const std::vector<std::string>& arguments) {
-    std::vector<std::string> words = {"orvane"};
-    words.insert(words.end(), arguments.begin(), arguments.end());
-    std::vector<char*> argv;
-    for (std::string& word : words) {
-        argv.push_back(word.data());
-    }
-    argv.push_back(nullptr);
-    const int diagnostics = std::exchange(::opterr, 0);
-    ::optind = 0; // forgets the words of an earlier call, too; 1 would not
-    std::vector<Writer> writers;
-    while (const Writer writer = nextWriter(static_cast<int>(words.size()), argv.data())) {
-        writers.push_back(writer);
-    }
-    ::opterr = diagnostics;
-    return writers;
 }
 
 } // namespace

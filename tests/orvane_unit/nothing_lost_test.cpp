@@ -7,6 +7,7 @@
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/host_command.h"
+#include "tests/support/resource_limit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
@@ -317,6 +318,23 @@ echo $?
     EXPECT_NE(result.standardOutput.find(" 0x01 "), std::string::npos) << result.standardOutput;
     EXPECT_EQ(readFile(folder() / "complaint"),
               "orvane-unit: serial=NEW: cannot write /dev/hd0: No space left on device\n");
+}
+
+TEST_F(NothingLostTest, LimitForFilesIsAnErrorLikeAFullDisk) {
+    const std::set<std::string> before = folderNames(folder());
+    {
+        const ResourceLimit limit(RLIMIT_FSIZE, 4096); // also of what the program prints
+        const std::string refused = ": File too large\n";
+        const kit::RunResult made = runOnHost(orvaneUnit({"new", folder() / "made"}));
+        EXPECT_EQ(made.exitStatus, 2);
+        EXPECT_NE(made.standardError.find(refused), std::string::npos) << made.standardError;
+        const kit::RunResult set =
+            runOnHost(orvaneUnit({"set", unit(), "param.22=0", "serial=NEW"}));
+        EXPECT_EQ(set.exitStatus, 2);
+        EXPECT_EQ(set.standardError, "orvane-unit: serial=NEW: cannot write /dev/hd0" + refused);
+    }
+    EXPECT_EQ(folderNames(folder()), before);
+    EXPECT_NE(explained().find("rightHandDrive = 1"), std::string::npos);
 }
 
 TEST_F(NothingLostTest, UnitThatIsBeingChangedIsLeftAlone) {

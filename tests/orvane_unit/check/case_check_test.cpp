@@ -219,7 +219,7 @@ TEST_F(CaseCheckTest, UpdateRefusesAProgramThatIsNotTheTool) {
     };
     expectRefused("exit 3", "exit status 3");
     expectRefused("echo text", "standard output is not empty");
-    expectRefused("echo text >&2", "standard error has more than complaints about options");
+    expectRefused("echo text >&2", "standard error is not a line for each unknown option");
     expectRefused("echo > /tmp/mine", "/tmp/mine has been made and is not an output");
     writeFile(folder() / "one/unit.toml", "[files]\n\"/tmp/mine\" = \"\"\n");
     expectRefused("echo > /tmp/mine", "/tmp/mine has been changed and is not an output");
@@ -234,6 +234,14 @@ TEST_F(CaseCheckTest, UpdateRefusesARunThatIsNotAsExplained) {
     EXPECT_EQ(result.update, desk::CaseUpdate::refused);
     EXPECT_EQ(result.surprises, Lines{"/tmp/airplay.conf is not what the explanation says"});
     EXPECT_EQ(expectation(), before);
+}
+
+TEST_F(CaseCheckTest, UpdateRefusesAProgramThatDoesNotComplainOfAnUnknownOption) {
+    writeFile(folder() / "one/arguments", "-xy\n-a\n");
+    EXPECT_EQ(updated().update, desk::CaseUpdate::done);
+    writeFile(folder() / "one/arguments", "-xy\n");
+    EXPECT_EQ(updated("/bin/true").differences,
+              Lines{"standard error is not a line for each unknown option"});
 }
 
 TEST_F(CaseCheckTest, OutputThatIsALinkIsRecorded) {
