@@ -4,6 +4,7 @@
 #include "kit/host/folder_lock.h"
 #include "kit/host/kit_error.h"
 #include "tests/support/folder_names.h"
+#include "tests/support/holder_named.h"
 #include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
@@ -181,8 +182,7 @@ TEST_F(FinishedFolderTest, NothingIsMovedWhenOneEntryCannotBe) {
 TEST_F(FinishedFolderTest, EmptyFolderThatAnotherProcessFillsIsRefused) {
     fs::create_directory(place());
     const kit::FolderLock lock(place());
-    EXPECT_EQ(refusalOf(place()),
-              place().string() + " is being changed by process " + std::to_string(getpid()));
+    expectHolderNamed(refusalOf(place()), place());
     EXPECT_EQ(folderNames(place()), Names{});
 }
 

@@ -2,6 +2,7 @@
 #include "kit/enter/captured_run.h"
 #include "kit/host/folder_lock.h"
 #include "kit/host/kit_error.h"
+#include "tests/support/holder_named.h"
 #include "tests/support/temporary_folder.h"
 
 #include <gtest/gtest.h>
@@ -36,8 +37,7 @@ TEST(FolderLockTest, LockEndsWithItsOwner) {
 TEST(FolderLockTest, HolderIsNamed) {
     const TemporaryFolder folder;
     const kit::FolderLock lock(folder.path());
-    EXPECT_EQ(refusalOf(folder.path()),
-              folder.path().string() + " is being changed by process " + std::to_string(getpid()));
+    expectHolderNamed(refusalOf(folder.path()), folder.path());
 }
 
 TEST(FolderLockTest, OtherFoldersAreFree) {
