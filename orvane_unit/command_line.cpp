@@ -45,6 +45,7 @@
 #include <filesystem>
 #include <iostream>
 #include <memory>
+#include <set>
 #include <sstream>
 #include <stdexcept>
 #include <string>
@@ -53,6 +54,14 @@
 namespace orvane::desk {
 
 namespace {
+
+/// Prints a complaint, which has a line for each thing that is wrong.
+void complain(const std::string& what) {
+    std::istringstream lines(what);
+    for (std::string line; std::getline(lines, line);) {
+        std::cerr << "orvane-unit: " << kit::printable(line) << '\n';
+    }
+}
 
 /// A subcommand. The parser fills its members with the options.
 class Command {
@@ -361,22 +370,16 @@ private:
     bool redactsSerial_ = false;
 };
 
-/// The faults of all cases, each once: most are about one file, but a full disk strikes all.
-void throwFaults(const CheckReport& report) {
-    std::vector<std::string> faults;
+/// Complains of the faults of all cases, of each once: most are about one file, but a full disk
+/// strikes all. False when there is none.
+bool complainOfFaults(const CheckReport& report) {
+    std::set<std::string> faults;
     for (const CaseResult& result : report.cases) {
-        if (!result.fault.empty() &&
-            std::find(faults.begin(), faults.end(), result.fault) == faults.end()) {
-            faults.push_back(result.fault);
+        if (!result.fault.empty() && faults.insert(result.fault).second) {
+            complain(result.fault);
         }
     }
-    std::string lines;
-    for (const std::string& fault : faults) {
-        lines += (lines.empty() ? "" : "\n") + fault;
-    }
-    if (!lines.empty()) {
-        throw kit::KitError(lines);
-    }
+    return !faults.empty();
 }
 
 class CheckCommand : public Command {
@@ -397,7 +400,9 @@ public:
         } else {
             printCheck(std::cout, report);
         }
-        throwFaults(report);
+        if (complainOfFaults(report)) {
+            return EXIT_BAD_INPUT;
+        }
         return std::all_of(report.cases.begin(), report.cases.end(),
                            [](const CaseResult& result) { return result.isAsExpected(); })
                    ? EXIT_AS_INTENDED
@@ -461,14 +466,6 @@ int chooseAndRun(int argc, const char* const* argv) {
     const auto chosen = std::find_if(commands.begin(), commands.end(),
                                      [](const auto& command) { return command->isChosen(); });
     return (*chosen)->run();
-}
-
-/// Prints a complaint, which has a line for each thing that is wrong.
-void complain(const std::string& what) {
-    std::istringstream lines(what);
-    for (std::string line; std::getline(lines, line);) {
-        std::cerr << "orvane-unit: " << kit::printable(line) << '\n';
-    }
 }
 
 } // namespace
