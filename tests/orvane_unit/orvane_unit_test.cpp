@@ -316,7 +316,7 @@ TEST(OrvaneUnitTest, ImageThatIsAHoleInFullMemoryEndsNoCommand) {
     const std::string field = described.folder() / "field";
     expectRan(startInFullMemory({"capture", root, field}), 0, "");
     expectRan(startInFullMemory({"set", root, "param.22=1"}), 2, "",
-              "orvane-unit: cannot write " + image + ": No space left on device\n");
+              "orvane-unit: param.22=1: cannot write " + image + ": No space left on device\n");
     expectRan(runOnHost({"cmp", field + image, "-n", "179", "/dev/zero"}), 0, "");
     EXPECT_EQ(startInFullMemory({"impact", root, "param.22"}).exitStatus, 0);
     EXPECT_EQ(startInFullMemory({"describe", root}).exitStatus, 0);

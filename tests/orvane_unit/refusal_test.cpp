@@ -7,6 +7,7 @@
 #include "kit/unit/marker.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/host_command.h"
+#include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
 namespace orvane::test {
@@ -18,11 +19,15 @@ using Words = std::vector<std::string>;
 
 constexpr char PROGRAM[] = "orvane-unit: ";
 
-/// The program's complaint; requires exit status 2 and no other output.
-std::string refusalOf(const Words& words) {
+kit::RunResult start(const Words& words) {
     Words command = buildCommand(ORVANE_UNIT_BINARY);
     command.insert(command.end(), words.begin(), words.end());
-    const kit::RunResult result = runOnHost(command);
+    return runOnHost(command);
+}
+
+/// The program's complaint; requires exit status 2 and no other output.
+std::string refusalOf(const Words& words) {
+    const kit::RunResult result = start(words);
     EXPECT_EQ(result.exitStatus, 2);
     EXPECT_EQ(result.standardOutput, "");
     EXPECT_EQ(result.standardError.compare(0, sizeof PROGRAM - 1, PROGRAM), 0)
@@ -105,14 +110,9 @@ TEST(RefusalTest, InputsWithoutALimitAreNotReadToTheirEnd) {
         unit.sparseFiles["/fs/rwdata/.Version/long.inf"].size = std::uint64_t{1} << 40U;
     });
     const std::string root = described.root();
-    const std::string cases = described.folder() / "cases";
-    fs::create_directories(cases + "/one");
-    writeFile(cases + "/one/unit.toml", "");
-    fs::create_symlink("/dev/zero", cases + "/one/arguments");
     for (const Words& words :
          {Words{"new", described.folder() / "new", "--from", "/dev/zero"}, Words{"explain", root},
-          Words{"show", root}, Words{"diff", root, root}, Words{"impact", root, "param.22"},
-          Words{"check", cases, "--orvane", ORVANE_BINARY}}) {
+          Words{"show", root}, Words{"diff", root, root}, Words{"impact", root, "param.22"}}) {
         const std::string complaint = refusalOf(words);
         EXPECT_NE(complaint.find(" has more than "), std::string::npos) << complaint;
     }
@@ -126,6 +126,17 @@ TEST(RefusalTest, InputsWithoutALimitAreNotReadToTheirEnd) {
     EXPECT_NE(refusalOf({"run", root, "--orvane", ORVANE_BINARY})
                   .find("/tmp/other has more than 268435456 bytes"),
               std::string::npos);
+}
+
+TEST(RefusalTest, ArgumentsWithoutALimitAreNotReadToTheirEnd) {
+    const TemporaryFolder cases;
+    fs::create_directory(cases.path() / "one");
+    writeFile(cases.path() / "one/unit.toml", "");
+    fs::create_symlink("/dev/zero", cases.path() / "one/arguments");
+    const kit::RunResult result = start({"check", cases.path(), "--orvane", ORVANE_BINARY});
+    EXPECT_EQ(result.exitStatus, 2);
+    EXPECT_NE(result.standardError.find(" has more than "), std::string::npos)
+        << result.standardError;
 }
 
 } // namespace
