@@ -4,7 +4,6 @@
 #include "kit/description/description_values.h"
 #include "kit/host/text.h"
 
-#include <algorithm>
 #include <cstddef>
 
 namespace orvane::kit {
@@ -14,26 +13,33 @@ namespace {
 constexpr std::size_t HEX_LINE = 32; ///< bytes
 constexpr char DIGITS[] = "0123456789abcdef";
 
-bool isControl(char c) {
-    return static_cast<unsigned char>(c) < 0x20 || c == 0x7F;
-}
-
-std::string escaped(char c) {
-    switch (c) {
-    case '\n':
+/// The character as an escape of a basic string.
+std::string escaped(char32_t character) {
+    switch (character) {
+    case U'\n':
         return "\\n";
-    case '\r':
+    case U'\r':
         return "\\r";
-    case '\t':
+    case U'\t':
         return "\\t";
-    case '"':
-    case '\\':
-        return std::string("\\") + c;
+    case U'"':
+        return "\\\"";
+    case U'\\':
+        return "\\\\";
     default:
         break;
     }
-    const auto byte = static_cast<unsigned char>(c);
-    return std::string("\\u00") + DIGITS[byte >> 4U] + DIGITS[byte & 0xFU];
+    const bool isLong = character > 0xFFFFU;
+    std::string text = isLong ? "\\U" : "\\u";
+    for (unsigned shift = isLong ? 32 : 16; shift != 0; shift -= 4) {
+        text += DIGITS[character >> (shift - 4) & 0xFU];
+    }
+    return text;
+}
+
+/// Whether the character stands for itself in a basic string, where nothing is before or after it.
+bool isPlain(char32_t character) {
+    return isPrintable(character) && character != U'"' && character != U'\\';
 }
 
 /// `bytes` in hex, on one or more lines.
@@ -56,17 +62,22 @@ std::string betweenQuotes(const std::string& text) {
 } // namespace
 
 bool isReadable(std::string_view text) {
-    const auto unreadable = std::count_if(text.begin(), text.end(), [](char c) {
-        return isControl(c) && c != '\n' && c != '\t' && c != '\r';
+    if (!isUtf8(text)) {
+        return false;
+    }
+    std::size_t unreadable = 0;
+    forEachCharacter(text, [&unreadable](char32_t character, std::string_view /*bytes*/) {
+        const bool isLayout = character == U'\n' || character == U'\t' || character == U'\r';
+        unreadable += isPrintable(character) || isLayout ? 0U : 1U;
     });
-    return static_cast<std::size_t>(unreadable) * 8 <= text.size() && isUtf8(text);
+    return unreadable * 8 <= text.size();
 }
 
 std::string tomlText(std::string_view text) {
     std::string result = "\"";
-    for (const char c : text) {
-        result += isControl(c) || c == '"' || c == '\\' ? escaped(c) : std::string(1, c);
-    }
+    forEachCharacter(text, [&result](char32_t character, std::string_view bytes) {
+        result += isPlain(character) ? std::string(bytes) : escaped(character);
+    });
     return result + '"';
 }
 
@@ -76,14 +87,15 @@ std::string tomlLines(std::string_view text) {
         return tomlText(text);
     }
     std::string result = "\"\"\"\n"; // the first line end is not part of the text
-    for (std::size_t at = 0; at < text.size(); ++at) {
-        const char c = text[at];
+    std::size_t rest = text.size();
+    forEachCharacter(text, [&result, &rest](char32_t character, std::string_view bytes) {
+        rest -= bytes.size();
         // A quote needs an escape only next to another one and before the three at the end.
-        const bool isPlainQuote = c == '"' && result.back() != '"' && at + 1 < text.size();
-        const bool isPlain =
-            c == '\n' || c == '\t' || isPlainQuote || (!isControl(c) && c != '"' && c != '\\');
-        result += isPlain ? std::string(1, c) : escaped(c);
-    }
+        const bool isPlainQuote = character == U'"' && result.back() != '"' && rest != 0;
+        const bool isLayout = character == U'\n' || character == U'\t';
+        result += isPlain(character) || isPlainQuote || isLayout ? std::string(bytes)
+                                                                 : escaped(character);
+    });
     return result + R"(""")";
 }
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// Texts and bytes in the form of a TOML document.
+// Texts and bytes in the form of a TOML document. What is not printable is escaped, so that a
+// document can be shown on a terminal.
 #pragma once
 
 #include <string>
@@ -8,8 +9,8 @@
 
 namespace orvane::kit {
 
-/// Whether `text` is readable in a document: UTF-8, and at most one control character in eight,
-/// apart from line ends and tabs.
+/// Whether `text` is readable in a document: UTF-8, and at most one character in eight bytes is not
+/// printable, apart from line ends and tabs.
 bool isReadable(std::string_view text);
 
 /// The UTF-8 text `text` in quotes, on one line.

@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <string_view>
 
@@ -12,9 +13,20 @@ namespace orvane::kit {
 /// Whether `text` is well-formed UTF-8: shortest forms only, no surrogates, nothing above U+10FFFF.
 bool isUtf8(std::string_view text);
 
+/// Whether a terminal shows `character` as itself. It obeys control characters, does not show
+/// others at all, and reverses what follows some.
+bool isPrintable(char32_t character);
+
+/// Calls `take` for each character of `text`, which is UTF-8, with the bytes of the character.
+void forEachCharacter(std::string_view text,
+                      const std::function<void(char32_t, std::string_view)>& take);
+
 /// `bytes` as one line of text: anything that is not printable UTF-8 is escaped, as in \n, \\ or
-/// \x1b.
+/// \x1b. Whatever comes from a unit, a file or the command line is printed in this form.
 std::string printable(std::string_view bytes);
+
+/// The same for each line of `bytes`. Line ends and tabs stay.
+std::string printableLines(std::string_view bytes);
 
 /// `bytes` in hex, two digits each, with blanks between them.
 std::string hexText(std::string_view bytes);

@@ -34,7 +34,7 @@ std::string verdictOf(const CaseResult& result) {
 }
 
 void printCase(std::ostream& out, const CaseResult& result, std::size_t width) {
-    out << padded(result.name, width) << "  " << verdictOf(result) << '\n';
+    out << padded(kit::printable(result.name), width) << "  " << verdictOf(result) << '\n';
     for (const std::vector<std::string>* lines : {&result.differences, &result.surprises}) {
         for (const std::string& line : *lines) {
             out << "    " << kit::printable(line) << '\n';
@@ -66,7 +66,7 @@ void printCounts(std::ostream& out, const CheckReport& report) {
 void printCheck(std::ostream& out, const CheckReport& report) {
     std::size_t width = 0;
     for (const CaseResult& result : report.cases) {
-        width = std::max(width, result.name.size());
+        width = std::max(width, kit::printable(result.name).size());
     }
     for (const CaseResult& result : report.cases) {
         printCase(out, result, width);

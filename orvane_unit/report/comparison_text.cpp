@@ -36,7 +36,7 @@ void printDifference(std::ostream& out, const OutputDifference& output) {
 }
 
 std::string valueText(const std::string& value) {
-    return value.empty() ? "(empty)" : value;
+    return value.empty() ? "(empty)" : kit::printable(value);
 }
 
 bool isByteOfSlot(const ValueKey& key) {

@@ -21,15 +21,42 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <iomanip>
 #include <map>
 #include <optional>
 #include <set>
+#include <sstream>
+#include <string_view>
 
 namespace orvane::desk {
 
 namespace {
 
 using Json = nlohmann::ordered_json;
+
+/// A character in a text of JSON: two escapes if it takes two units of UTF-16.
+std::string escaped(char32_t character) {
+    const auto unit = [](char32_t value) {
+        std::ostringstream text;
+        text << "\\u" << std::hex << std::setw(4) << std::setfill('0')
+             << static_cast<std::uint32_t>(value);
+        return text.str();
+    };
+    if (character <= 0xFFFFU) {
+        return unit(character);
+    }
+    const char32_t above = character - 0x10000U;
+    return unit(0xD800U + (above >> 10U)) + unit(0xDC00U + (above & 0x3FFU));
+}
+
+/// `json` on one line. Outside its texts everything is printable, so escapes stand only in them.
+std::string lineOf(const Json& json) {
+    std::string text;
+    kit::forEachCharacter(json.dump(), [&text](char32_t character, std::string_view bytes) {
+        text += kit::isPrintable(character) ? std::string(bytes) : escaped(character);
+    });
+    return text;
+}
 
 Json begin(const char* command) {
     return {{"format", JSON_FORMAT}, {"command", command}};
@@ -202,7 +229,7 @@ std::string explanationJson(const std::string& root, const std::string& letters,
         }
         json["outputs"].push_back(entry);
     }
-    return json.dump();
+    return lineOf(json);
 }
 
 std::string decodedUnitJson(const std::string& root, const DecodedUnit& unit,
@@ -214,7 +241,7 @@ std::string decodedUnitJson(const std::string& root, const DecodedUnit& unit,
             json[name] = partJson(part);
         }
     });
-    return json.dump();
+    return lineOf(json);
 }
 
 std::string runJson(const std::string& root, const kit::RunResult& result, const TmpTree& before,
@@ -230,7 +257,7 @@ std::string runJson(const std::string& root, const kit::RunResult& result, const
                                  {"before", bytesOrNull(before.file(path))},
                                  {"after", bytesOrNull(content)}});
     }
-    return json.dump();
+    return lineOf(json);
 }
 
 std::string consequencesJson(const std::string& first, const std::string& second,
@@ -249,7 +276,7 @@ std::string consequencesJson(const std::string& first, const std::string& second
                                   {"second", bytesJson(consequence.change.after)},
                                   {"outputs", outputs}});
     }
-    return json.dump();
+    return lineOf(json);
 }
 
 std::string impactsJson(const std::string& root, const std::vector<Impact>& impacts) {
@@ -262,7 +289,7 @@ std::string impactsJson(const std::string& root, const std::vector<Impact>& impa
                                   {"moving", impact.changing},
                                   {"lines", impact.lines}});
     }
-    return json.dump();
+    return lineOf(json);
 }
 
 std::string checkJson(const std::string& folder, const CheckReport& report) {
@@ -281,7 +308,7 @@ std::string checkJson(const std::string& folder, const CheckReport& report) {
              {"reasons", codesJson({result.reasons.begin(), result.reasons.end()})}});
     }
     json["unreached"] = report.unreached;
-    return json.dump();
+    return lineOf(json);
 }
 
 } // namespace orvane::desk

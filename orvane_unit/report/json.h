@@ -2,7 +2,8 @@
 //
 // The reports as JSON, one object on one line each. All have "format" (JSON_FORMAT, raised when a
 // change would break a reader), "command" and what the command was about; docs/orvane-unit.md has
-// the rest. Bytes are a text where they are UTF-8, else {"hex": "..."}.
+// the rest. Bytes are a text where they are UTF-8, else {"hex": "..."}. Characters that are not
+// printable are escaped.
 #pragma once
 
 #include "kit/enter/captured_run.h"

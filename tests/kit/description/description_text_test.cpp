@@ -2,12 +2,14 @@
 #include "kit/description/description_text.h"
 #include "kit/description/parse_description.h"
 #include "kit/description/toml_text.h"
+#include "kit/host/text.h"
 #include "tests/kit/description/description_equality.h"
 #include "tests/kit/description/random_unit.h"
 
 #include <gtest/gtest.h>
 
 #include <string>
+#include <string_view>
 
 namespace orvane::test {
 
@@ -212,6 +214,26 @@ TEST(TomlText, ReadableIsUtf8WithFewControlCharacters) {
                              "long enough \xE2\x82", "\xFF"}) {
         EXPECT_FALSE(kit::isReadable(text)) << kit::tomlHex(text);
     }
+}
+
+TEST(DescriptionText, ContainsNothingThatATerminalObeys) {
+    const std::string obeyed =
+        "\x1b[2J\x7f\u009b\u00ad\u061c\u200b\u200f\u2028\u202e\u202c\u2066\u2069\ufeff"
+        "\U000e0001";
+    const std::string readable = std::string(80, 'x') + obeyed;
+    kit::UnitDescription unit;
+    unit.files = {{"/" + obeyed, readable}, {"/lines", readable + "\n\tand\n" + readable}};
+    unit.links = {{"/link", obeyed}};
+    unit.folders = {"/folder" + obeyed};
+    unit.disk.aux = "some text\u202etext\u202c";
+    const std::string text = kit::descriptionText(unit);
+    kit::forEachCharacter(text, [](char32_t character, std::string_view bytes) {
+        EXPECT_TRUE(kit::isPrintable(character) || character == U'\n' || character == U'\t')
+            << kit::hexText(bytes);
+    });
+    EXPECT_NE(text.find(R"("some text\u202etext\u202c")"), std::string::npos);
+    EXPECT_NE(text.find(R"(\U000e0001)"), std::string::npos);
+    EXPECT_TRUE(parse(text) == unit);
 }
 
 } // namespace

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <string_view>
 
 namespace orvane::test {
 
@@ -22,10 +23,13 @@ TEST(TextTest, PrintableEscapesAnythingThatIsNotText) {
         {std::string("\0", 1), "\\x00"},
         {"\x7f", "\\x7f"},
         {"M\xc3\xbcller", "M\xc3\xbcller"},
-        {"\xc3", "\\xc3"},                   // truncated
-        {"\xc0\xaf", "\\xc0\\xaf"},          // longer than needed
-        {"\xed\xa0\x80", "\\xed\\xa0\\x80"}, // a surrogate
-        {"\xc2\x85", "\\xc2\\x85"},          // a control character
+        {"\xc3", "\\xc3"},                                    // truncated
+        {"\xc0\xaf", "\\xc0\\xaf"},                           // longer than needed
+        {"\xed\xa0\x80", "\\xed\\xa0\\x80"},                  // a surrogate
+        {"\xc2\x85", "\\xc2\\x85"},                           // a control character
+        {"\xc2\x9b", "\\xc2\\x9b"},                           // one that begins an escape sequence
+        {"\u202ea\u202c", "\\xe2\\x80\\xaea\\xe2\\x80\\xac"}, // would be reversed
+        {"\xf3\xa0\x80\x81", "\\xf3\\xa0\\x80\\x81"},         // invisible
         {"\xf0\x9f\x9a\x97", "\xf0\x9f\x9a\x97"},
         {"ok\xff"
          "ok",
@@ -34,6 +38,36 @@ TEST(TextTest, PrintableEscapesAnythingThatIsNotText) {
     for (const Row& row : rows) {
         EXPECT_EQ(kit::printable(row.bytes), row.text);
     }
+}
+
+TEST(TextTest, ControlAndFormatCharactersAreNotPrintable) {
+    for (const char32_t character :
+         {U'\0',     U'\n',     U'\x1b',   U'\x7f',   U'\x80',       U'\x9b',      U'\x9f',
+          U'\xad',   U'\u061c', U'\u200b', U'\u200f', U'\u2028',     U'\u2029',    U'\u202a',
+          U'\u202e', U'\u2066', U'\u2069', U'\ufeff', U'\U000e0001', U'\U000e007f'}) {
+        EXPECT_FALSE(kit::isPrintable(character)) << static_cast<unsigned long>(character);
+    }
+    for (const char32_t character :
+         {U' ', U'~', U'\xa0', U'\xae', U'\u200a', U'\u2010', U'\u2027', U'\u202f', U'\u2065',
+          U'\u2070', U'\U0001f697', U'\U0010fffd'}) {
+        EXPECT_TRUE(kit::isPrintable(character)) << static_cast<unsigned long>(character);
+    }
+}
+
+TEST(TextTest, CharactersComeWithTheirBytes) {
+    std::string seen;
+    kit::forEachCharacter("a\xc3\xbc\xf0\x9f\x9a\x97",
+                          [&seen](char32_t character, std::string_view bytes) {
+                              seen += std::to_string(static_cast<unsigned long>(character)) + "=" +
+                                      std::string(bytes) + ";";
+                          });
+    EXPECT_EQ(seen, "97=a;252=\xc3\xbc;128663=\xf0\x9f\x9a\x97;");
+}
+
+TEST(TextTest, PrintableLinesKeepTheirEndsAndTabs) {
+    EXPECT_EQ(kit::printableLines(""), "");
+    EXPECT_EQ(kit::printableLines("one\n\n\ttwo\x1b[2J\n"), "one\n\n\ttwo\\x1b[2J\n");
+    EXPECT_EQ(kit::printableLines("\r\xff"), "\\x0d\\xff");
 }
 
 TEST(TextTest, CountedUsesSingularAndPlural) {

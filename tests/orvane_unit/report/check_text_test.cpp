@@ -26,13 +26,13 @@ TEST(CheckTextTest, EachCaseIsALineWithItsFaultsBelow) {
                      {},
                      "",
                      CaseUpdate::none},
-                    {"three", {}, {"/tmp/z"}, {}, "", CaseUpdate::none},
+                    {"\u009bx", {}, {"/tmp/z"}, {}, "", CaseUpdate::none},
                     {"four", {}, {}, {}, "no such file", CaseUpdate::none}};
-    EXPECT_EQ(printed(report), "one     ok\n"
-                               "second  differs\n"
+    EXPECT_EQ(printed(report), "one        ok\n"
+                               "second     differs\n"
                                "    /tmp/x differs\n    /tmp/\\xff is missing\n    /tmp/y\n"
-                               "three   differs\n    /tmp/z\n"
-                               "four    not checked\n"
+                               "\\xc2\\x9bx  differs\n    /tmp/z\n"
+                               "four       not checked\n"
                                "4 units, 3 not as expected\n"
                                "reasons reached: 33 of 33\n");
 }

@@ -155,6 +155,16 @@ TEST(JsonTest, TextThatIsNotUtf8IsHexEverywhere) {
     EXPECT_NE(shown.dump().find(R"({"key":{"hex":"fd"},"value":"1"})"), std::string::npos);
 }
 
+TEST(JsonTest, WhatATerminalObeysIsEscapedAndReadBackTheSame) {
+    const std::string obeyed = "\x1b\x7f\u009b\u202e\u202c\u2028\ufeff\U000e0001 caf\u00e9 \"\\\n";
+    const std::string text = desk::consequencesJson(obeyed, "B", {});
+    EXPECT_NE(
+        text.find("\\u001b\\u007f\\u009b\\u202e\\u202c\\u2028\\ufeff\\udb40\\udc01 caf\u00e9"),
+        std::string::npos)
+        << text;
+    EXPECT_EQ(parsed(text, "diff").at("first"), obeyed);
+}
+
 /// The report of the program itself: one line on standard output, and nothing else.
 json started(const std::vector<std::string>& words, int exitStatus) {
     std::vector<std::string> command = buildCommand(ORVANE_UNIT_BINARY);
