@@ -54,8 +54,7 @@ void requirePlace(std::string_view message, std::string_view input) {
         const std::string_view digits = take(rest, rest.find_first_not_of("0123456789"));
         isPlace = isPlace && !digits.empty() && digits != "0";
     }
-    if (!isPlace || take(rest, 2) != ": " || rest.empty() ||
-        rest.find('\n') != std::string_view::npos) {
+    if (!isPlace || take(rest, 2) != ": " || rest.empty()) {
         fail("a refusal of \"" + std::string(input) + "\"", "unit.toml:LINE:COLUMN: ...", message);
     }
 }
@@ -64,7 +63,7 @@ std::optional<kit::UnitDescription> parse(const std::string& text) {
     try {
         return kit::parseDescription(text, NAME);
     } catch (const kit::KitError& error) {
-        requirePlace(error.what(), text);
+        requirePlace(error.text(), text);
         return {};
     }
 }

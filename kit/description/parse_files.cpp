@@ -78,8 +78,12 @@ Content repeatedContent(const ContentReading& content) {
 
 Content hostContent(const ContentReading& content) {
     const toml::node& path = content.valueOf("path");
-    const std::filesystem::path file =
-        content.reading.folder / textOf(path, content.nameOf("path"));
+    const std::string& name = textOf(path, content.nameOf("path"));
+    if (name.empty() || name.find('\0') != std::string::npos) {
+        failAt(path.source(),
+               content.nameOf("path") + " must have at least one byte, and none that is zero");
+    }
+    const std::filesystem::path file = content.reading.folder / name;
     std::uint64_t& left = content.reading.contentLeft;
     Bytes bytes =
         at(path.source(), content.what, [&file, left] { return readRegularFile(file, left); });

@@ -9,7 +9,6 @@
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 
-#include <algorithm>
 #include <cstdint>
 #include <sstream>
 #include <string>
@@ -19,10 +18,8 @@ namespace orvane::kit {
 
 using Place = toml::source_region;
 
-/// Throws KitError with "name:line:column:" in front, on one line whatever `what` contains.
-[[noreturn]] inline void failAt(const Place& place, std::string what) {
-    std::replace_if(
-        what.begin(), what.end(), [](char c) { return static_cast<unsigned char>(c) < 0x20; }, ' ');
+/// Throws KitError with "name:line:column:" in front.
+[[noreturn]] inline void failAt(const Place& place, const std::string& what) {
     throw KitError((place.path ? *place.path : "") + ":" + std::to_string(place.begin.line) + ":" +
                    std::to_string(place.begin.column) + ": " + what);
 }
@@ -33,7 +30,7 @@ auto at(const Place& place, const Action& action) {
     try {
         return action();
     } catch (const KitError& error) {
-        failAt(place, error.what());
+        failAt(place, error.text());
     }
 }
 
@@ -43,7 +40,7 @@ auto at(const Place& place, const std::string& what, const Action& action) {
     try {
         return action();
     } catch (const KitError& error) {
-        failAt(place, what + ": " + error.what());
+        failAt(place, what + ": " + error.text());
     }
 }
 

@@ -67,9 +67,9 @@ void checkUnitPath(const std::string& path) {
                          path.find('\0') == std::string::npos &&
                          asPath.lexically_normal().string() == path;
     if (!isPlain) {
-        throw KitError(
-            "a path must be absolute and have no \".\", \"..\" or needless \"/\", unlike \"" +
-            path + "\"");
+        throw KitError("a path must be absolute and have no \".\", \"..\" or needless \"/\", and "
+                       "no zero byte, unlike \"" +
+                       path + "\"");
     }
     const std::string mark = std::string("/") + MARKER_NAME;
     if (isAtOrBelow(path, mark)) {

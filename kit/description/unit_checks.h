@@ -26,8 +26,8 @@ void checkAux(const Bytes& bytes);
 /// Tuning block `id` exists and can hold `block`.
 void checkTuning(std::uint32_t id, const TuningDescription& block);
 
-/// `path` is absolute, names something, has no ".", ".." or needless slash, and is not the kit's
-/// own mark (marker.h) nor anything below it.
+/// `path` is absolute, names something, has no ".", "..", needless slash or zero byte, and is not
+/// the kit's own mark (marker.h) nor anything below it.
 void checkUnitPath(const std::string& path);
 
 /// A symbolic link can have this target.

@@ -227,7 +227,7 @@ ParsedKey parseKey(std::string_view text) {
             readPart(form.first, first, key);
             readPart(form.second, second, key);
         } catch (const KitError& error) {
-            return {{form.kind, 0, 0, ""}, error.what()};
+            return {{form.kind, 0, 0, ""}, error.text()};
         }
         return {key, ""};
     }

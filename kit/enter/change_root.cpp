@@ -2,6 +2,7 @@
 #include "kit/enter/change_root.h"
 
 #include "kit/host/descriptor.h"
+#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 
 #include <fcntl.h>
@@ -69,9 +70,7 @@ bool isFolder(const std::filesystem::path& path) {
 } // namespace
 
 void changeRoot(const std::filesystem::path& root) {
-    if (!isFolder(root)) {
-        throw KitError("", root, " is not a folder");
-    }
+    requireFolder(root);
     if (!succeeds([&root] { return ::chroot(root.c_str()); })) {
         const int error = errno;
         throw KitError("cannot make ", root,

@@ -73,6 +73,16 @@ Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file)
     return readAt(descriptor, file, 0, sizeOf(descriptor, file));
 }
 
+void requireFolder(const std::filesystem::path& folder) {
+    struct stat state {};
+    if (::stat(folder.c_str(), &state) != 0) {
+        throw systemError("cannot read ", folder);
+    }
+    if (!S_ISDIR(state.st_mode)) {
+        throw KitError("", folder, " is not a folder");
+    }
+}
+
 bool isRootDirectory(const std::filesystem::path& folder) {
     struct stat own {};
     struct stat other {};

@@ -32,6 +32,9 @@ Bytes readAt(const Descriptor& descriptor, const std::filesystem::path& file, st
 /// All bytes, up to the size that sizeOf tells.
 Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file);
 
+/// Throws when `folder` is not a folder or can't be looked at.
+void requireFolder(const std::filesystem::path& folder);
+
 /// Whether `folder` is this process's "/", under any name. Throws nothing.
 bool isRootDirectory(const std::filesystem::path& folder);
 

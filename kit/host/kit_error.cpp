@@ -8,22 +8,31 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-KitError::KitError(const std::string& what) : KitError(what, "", "") {}
+namespace {
+
+std::string nameOf(const fs::path& path) {
+    return path.empty() ? "\"\"" : path.string();
+}
+
+} // namespace
+
+KitError::KitError(const std::string& what)
+    : std::runtime_error(what), text_(what), before_(what) {}
 
 KitError::KitError(const std::string& before, const fs::path& path, const std::string& after)
-    : std::runtime_error(before + path.string() + after), before_(before), path_(path),
-      after_(after) {}
+    : std::runtime_error(before + nameOf(path) + after), text_(before + nameOf(path) + after),
+      before_(before), path_(path), after_(after) {}
 
 KitError KitError::moved(const fs::path& from, const fs::path& to) const {
     const fs::path below = path_.lexically_relative(from);
-    if (below.empty() || *below.begin() == "..") {
+    if (path_.empty() || below.empty() || *below.begin() == "..") {
         return *this;
     }
     return {before_, below == "." ? to : to / below, after_};
 }
 
 KitError systemError(const std::string& what) {
-    return systemError(what, "");
+    return KitError(what + ": " + std::generic_category().message(errno));
 }
 
 KitError systemError(const std::string& before, const fs::path& path) {

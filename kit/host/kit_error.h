@@ -9,18 +9,24 @@
 
 namespace orvane::kit {
 
-/// Thrown for wrong use, a bad root or a refusal of the system: one clear line without a newline.
+/// Thrown for wrong use, a bad root or a refusal of the system. It is one sentence, whatever bytes
+/// its paths and values have.
 class KitError : public std::runtime_error {
 public:
     explicit KitError(const std::string& what);
-    /// An error about `path`: its text is `before`, the path and `after`.
+    /// An error about `path`: its text is `before`, the path ("" in quotes if it is empty) and
+    /// `after`.
     KitError(const std::string& before, const std::filesystem::path& path,
              const std::string& after);
+
+    /// The whole text. what() ends at the first zero byte.
+    const std::string& text() const { return text_; }
 
     /// The same error with `to` in place of `from`, if its path is at or below that.
     KitError moved(const std::filesystem::path& from, const std::filesystem::path& to) const;
 
 private:
+    std::string text_;
     std::string before_; ///< all of the text where the error is about no path
     std::filesystem::path path_;
     std::string after_;

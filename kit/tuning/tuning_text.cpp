@@ -89,7 +89,7 @@ std::string readValue(std::string_view text, const DpsField& field, DpsBlock& bl
         }
         encodeTuningField(block, field.key,
                           isList ? TuningValue(numbers) : TuningValue(numbers.front()));
-        return error.what();
+        return error.text();
     }
 }
 

@@ -62,7 +62,7 @@ void forEach(const std::vector<Assignment>& assignments, void (*step)(const Assi
         try {
             step(assignment);
         } catch (const KitError& error) {
-            throw KitError(assignment.text + ": " + error.what());
+            throw KitError(assignment.text + ": " + error.text());
         }
     }
 }
@@ -83,7 +83,7 @@ void setAll(const std::vector<Assignment>& assignments) {
         try {
             set(assignments[i]);
         } catch (const KitError& error) {
-            throw KitError(assignments[i].text + ": " + error.what() + "; " + done(assignments, i));
+            throw KitError(assignments[i].text + ": " + error.text() + "; " + done(assignments, i));
         }
     }
 }

@@ -120,7 +120,7 @@ ReadValue readBlock(const ValueKey& key, std::string_view fileName) {
         const DpsBlock block = parseTuningText(text, file, static_cast<std::int32_t>(key.number));
         return {Bytes(block.bytes.begin(), block.bytes.end()), ""};
     } catch (const KitError& error) {
-        return {"", error.what()};
+        return {"", error.text()};
     }
 }
 
@@ -179,7 +179,7 @@ Assignment readAssignment(const std::string& text) {
         }
         value = kind.read(parsed.key, std::string_view(text).substr(equals + 1));
     } catch (const KitError& error) {
-        throw KitError(text + ": " + error.what());
+        throw KitError(text + ": " + error.text());
     }
     if (!value.fileFaults.empty()) {
         throw KitError(value.fileFaults);

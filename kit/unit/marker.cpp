@@ -2,11 +2,9 @@
 #include "kit/unit/marker.h"
 
 #include "kit/description/unit_layout.h"
-#include "kit/host/bytes.h"
+#include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
-
-#include <sys/stat.h>
 
 #include <string>
 #include <system_error>
@@ -15,6 +13,21 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
+namespace {
+
+/// What stands in the place of the mark.
+fs::file_type kindOfMark(const fs::path& root) {
+    const fs::path file = root / MARKER_NAME;
+    std::error_code error;
+    const fs::file_type kind = fs::symlink_status(file, error).type();
+    if (kind == fs::file_type::none) {
+        throw KitError("cannot read ", file, ": " + error.message());
+    }
+    return kind;
+}
+
+} // namespace
+
 void markUnit(const fs::path& root) {
     const fs::path file = root / MARKER_NAME;
     writeAt(makeSparseFile(file, 0), file, 0, MARKER_TEXT);
@@ -22,29 +35,23 @@ void markUnit(const fs::path& root) {
 
 bool isKitUnit(const fs::path& root) {
     const fs::path file = root / MARKER_NAME;
-    struct stat state {};
-    if (::lstat(file.c_str(), &state) != 0 || !S_ISREG(state.st_mode) ||
-        state.st_size != sizeof MARKER_TEXT - 1) {
+    if (kindOfMark(root) != fs::file_type::regular) {
         return false;
     }
-    try {
-        return readWhole(openForReading(file), file) == MARKER_TEXT;
-    } catch (const KitError&) {
-        return false;
-    }
+    const Descriptor mark = openForReading(file);
+    return sizeOf(mark, file) == sizeof MARKER_TEXT - 1 && readWhole(mark, file) == MARKER_TEXT;
 }
 
 void requireKitUnit(const fs::path& root) {
-    std::error_code error;
-    if (!fs::is_directory(root, error)) {
-        throw KitError("", root, " is not a folder");
-    }
+    requireFolder(root);
     if (isRootDirectory(root)) {
         throw KitError("", root, " is the root directory of this system, not a unit");
     }
     if (!isKitUnit(root)) {
-        throw KitError(root.string() + " is not a unit that orvane-unit made: it has no file " +
-                       MARKER_NAME);
+        const bool isThere = kindOfMark(root) != fs::file_type::not_found;
+        throw KitError("", root,
+                       std::string(" is not a unit that orvane-unit made: it has ") +
+                           (isThere ? "another " : "no file ") + MARKER_NAME);
     }
 }
 

@@ -15,6 +15,7 @@ constexpr char MARKER_TEXT[] = "made by orvane-unit, layout 1\n";
 void markUnit(const std::filesystem::path& root);
 
 /// Whether `root` is a folder with the mark: a regular file, not a link, with exactly that text.
+/// Throws KitError when the file can't be read.
 bool isKitUnit(const std::filesystem::path& root);
 
 /// Throws KitError when `root` is not a folder, has no mark, or is "/" itself by whatever name,

@@ -80,15 +80,21 @@ TEST(DescriptionContent, EveryPathMayBeInHex) {
     EXPECT_EQ(unit.sparseFiles.count("/j"), 1U);
 }
 
-TEST(DescriptionContent, ErrorIsOneLineForAnyPath) {
+std::string refusalOfText(const std::string& text) {
     try {
-        parse("[files]\n\"/a\\nb\" = 1\n");
-        ADD_FAILURE() << "accepted";
+        parse(text);
     } catch (const kit::KitError& error) {
-        EXPECT_EQ(std::string(error.what()).rfind("unit.toml:2:11: the content of /a b must", 0),
-                  0U)
-            << error.what();
+        return error.text();
     }
+    return "accepted";
+}
+
+TEST(DescriptionContent, ErrorHasThePathWhole) {
+    EXPECT_EQ(refusalOfText("[files]\n\"/a\\nb\" = 1\n")
+                  .rfind("unit.toml:2:11: the content of /a\nb must", 0),
+              0U);
+    const std::string zero("unlike \"/a\0b\"", 13);
+    EXPECT_NE(refusalOfText("[files]\n\"/a\\u0000b\" = 1\n").find(zero), std::string::npos);
 }
 
 class HostContentTest : public ::testing::Test {

@@ -14,23 +14,25 @@ const DescriptionRefusal REFUSALS[] = {
      "unit.toml:1:11: \"folders\" must be a list of paths, not \"/tmp/x\""},
     {"folders = [1]\n", "unit.toml:1:12: a path in \"folders\" must be a text in quotes, not 1"},
     {"folders = [\"tmp\"]\n", "unit.toml:1:12: a path must be absolute and have no \".\", \"..\" "
-                              "or needless \"/\", unlike \"tmp\""},
-    {"absent = [\"/tmp/../x\"]\n", "unit.toml:1:11: a path must be absolute and have no \".\", "
-                                   "\"..\" or needless \"/\", unlike \"/tmp/../x\""},
+                              "or needless \"/\", and no zero byte, unlike \"tmp\""},
+    {"absent = [\"/tmp/../x\"]\n",
+     "unit.toml:1:11: a path must be absolute and have no \".\", "
+     "\"..\" or needless \"/\", and no zero byte, unlike \"/tmp/../x\""},
     {"folders = [\"hex:2\"]\n",
      "unit.toml:1:12: hex needs two digits a byte: \"2\" has an odd number"},
     {"folders = [\"hex:74\"]\n", "unit.toml:1:12: a path must be absolute and have no \".\", "
-                                 "\"..\" or needless \"/\", unlike \"t\""},
+                                 "\"..\" or needless \"/\", and no zero byte, unlike \"t\""},
     {"folders = [\"/.orvane-unit\"]\n", "unit.toml:1:12: a path must not be /.orvane-unit, which "
                                         "is the kit's own mark: \"/.orvane-unit\""},
     {"absent = [\"/.orvane-unit\"]\n", "unit.toml:1:11: a path must not be /.orvane-unit, which is "
                                        "the kit's own mark: \"/.orvane-unit\""},
     {"folders = [\"/.orvane-unit/x\"]\n", "unit.toml:1:12: a path must not be /.orvane-unit, which "
                                           "is the kit's own mark: \"/.orvane-unit/x\""},
-    {"[files]\n\"relative\" = \"\"\n", "unit.toml:2:1: a path must be absolute and have no \".\", "
-                                       "\"..\" or needless \"/\", unlike \"relative\""},
+    {"[files]\n\"relative\" = \"\"\n",
+     "unit.toml:2:1: a path must be absolute and have no \".\", "
+     "\"..\" or needless \"/\", and no zero byte, unlike \"relative\""},
     {"[files]\n\"/\" = \"\"\n", "unit.toml:2:1: a path must be absolute and have no \".\", \"..\" "
-                                "or needless \"/\", unlike \"/\""},
+                                "or needless \"/\", and no zero byte, unlike \"/\""},
     {"[files]\n\"/x\" = 5\n", "unit.toml:2:8: the content of /x must be a text, or a table of hex, "
                               "or repeat and count, or path, or size and bytes, not 5"},
     {"[files]\n\"/x\" = []\n", "unit.toml:2:8: the content of /x must be a text, or a table of "
@@ -106,7 +108,7 @@ const DescriptionRefusal REFUSALS[] = {
     {"folders = [\"/x/y\"]\n[links]\n\"/x\" = \"y\"\n",
      "unit.toml:1:12: /x/y lies below /x, which is a link, not a folder"},
     {"[links]\n\"x\" = \"y\"\n", "unit.toml:2:1: a path must be absolute and have no \".\", \"..\" "
-                                 "or needless \"/\", unlike \"x\""},
+                                 "or needless \"/\", and no zero byte, unlike \"x\""},
     {"[links]\n\"/x\" = 5\n", "unit.toml:2:8: the target of /x must be a text in quotes, not 5"},
     {"[links]\n\"/x\" = \"\"\n", "unit.toml:2:8: the target of /x: a link's target must have at "
                                  "least one byte, and none that is zero"},
@@ -116,6 +118,11 @@ const DescriptionRefusal REFUSALS[] = {
      "unit.toml:2:8: the target of /x: hex needs two digits a byte: \"0\" has an odd number"},
     {"[links]\n\"/x\" = \"a\\u0000b\"\n", "unit.toml:2:8: the target of /x: a link's target must "
                                           "have at least one byte, and none that is zero"},
+    {"[files]\n\"/x\" = { path = \"a\\u0000b\" }\n",
+     "unit.toml:2:17: path in the content of /x must have at least one byte, and none that is "
+     "zero"},
+    {"[files]\n\"/x\" = { path = \"\" }\n", "unit.toml:2:17: path in the content of /x must have "
+                                            "at least one byte, and none that is zero"},
     {"links = []\n", "unit.toml:1:9: \"links\" must be a table, not a list"},
     {"files = []\n", "unit.toml:1:9: \"files\" must be a table, not a list"},
     {"[files\n", "unit.toml:1:7: Error while parsing table header: expected ']', saw '\\n'"},

@@ -84,7 +84,7 @@ TEST_F(RunInsideTest, StatusOfAnotherProgramOfThisBuildIsPassedOn) {
     const kit::RunResult result = kit::runInside(root(), {ORVANE_UNIT_BINARY, {"run", "/none"}});
     EXPECT_EQ(result.exitStatus, 2);
     EXPECT_EQ(result.standardOutput, "");
-    EXPECT_EQ(result.standardError, "orvane-unit: /none is not a folder\n");
+    EXPECT_EQ(result.standardError, "orvane-unit: cannot read /none: No such file or directory\n");
 }
 
 TEST_F(RunInsideTest, BinaryMayBeNamedRelativeToTheHostsWorkingDirectory) {
@@ -176,14 +176,12 @@ TEST_F(RunInsideTest, TruncatedProgramIsNamed) {
 }
 
 TEST_F(RunInsideTest, RootThatIsNotAFolderIsNamed) {
-    for (const char* name : {"missing", "fs/mp/etc/airplay.conf"}) {
-        const std::string bad = (root() / name).string();
-        try {
-            kit::runInside(bad, {ORVANE_BINARY, {}});
-            ADD_FAILURE() << "ran in " << bad;
-        } catch (const kit::KitError& error) {
-            EXPECT_EQ(error.what(), bad + " is not a folder");
-        }
+    const std::string bad = (root() / "fs/mp/etc/airplay.conf").string();
+    try {
+        kit::runInside(bad, {ORVANE_BINARY, {}});
+        ADD_FAILURE() << "ran in " << bad;
+    } catch (const kit::KitError& error) {
+        EXPECT_EQ(error.text(), bad + " is not a folder");
     }
 }
 

@@ -201,11 +201,13 @@ TEST_F(FinishedFolderTest, FailureLeavesNothingAndNamesTheFinalPath) {
 }
 
 TEST_F(FinishedFolderTest, FailureAboutAnotherPathOrNoneIsReportedAsItIs) {
-    for (const fs::path& path : {fs::path("/proc/none"), above(), fs::path()}) {
+    for (const fs::path& path : {fs::path("/proc/none"), above()}) {
         EXPECT_EQ(
             refusalOf(place(), [&](const fs::path&) { throw kit::KitError("no ", path, " here"); }),
             "no " + path.string() + " here");
     }
+    EXPECT_EQ(refusalOf(place(), [](const fs::path&) { throw kit::KitError("no ", "", " here"); }),
+              "no \"\" here");
     EXPECT_EQ(refusalOf(place(), [](const fs::path&) { throw kit::KitError("no luck"); }),
               "no luck");
 }
@@ -311,7 +313,7 @@ TEST_F(FinishedFolderTest, LongestNameIsAccepted) {
 }
 
 TEST_F(FinishedFolderTest, ImpossiblePathIsRefused) {
-    EXPECT_EQ(refusalOf(""), "cannot make : No such file or directory");
+    EXPECT_EQ(refusalOf(""), "cannot make \"\": No such file or directory");
     EXPECT_EQ(refusalOf("/"), "/ is there already and is not an empty folder");
     writeFile(above() / "file", "");
     EXPECT_EQ(refusalOf(above() / "file/unit"),

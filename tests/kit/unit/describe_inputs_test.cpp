@@ -255,7 +255,7 @@ TEST_F(DescribeInputsTest, SourceThatIsNotAFolderIsRefused) {
         kit::describeInputs(source());
         ADD_FAILURE() << "found";
     } catch (const kit::KitError& error) {
-        EXPECT_EQ(error.what(), source().string() + " is not a folder");
+        EXPECT_EQ(error.text(), "cannot read " + source().string() + ": No such file or directory");
     }
 }
 

@@ -110,7 +110,7 @@ TEST_F(DescribeUnitTest, MarkIsNotPartOfIt) {
 }
 
 TEST_F(DescribeUnitTest, AnythingButAUnitIsRefused) {
-    EXPECT_EQ(refusal(), root().string() + " is not a folder");
+    EXPECT_EQ(refusal(), "cannot read " + root().string() + ": No such file or directory");
     fs::create_directories(root() / "fs");
     EXPECT_EQ(refusal(), root().string() +
                              " is not a unit that orvane-unit made: it has no file .orvane-unit");

@@ -166,7 +166,7 @@ TEST_F(MakeUnitRefusalTest, PathThatIsNotPlainIsNamedAndLeavesNothing) {
           std::string("/tmp/./x"), std::string("//tmp/x"), std::string("/tmp//x"),
           std::string("/tmp/x/"), std::string("/tmp/..\0x", 9)}) {
         const std::string message =
-            "a path must be absolute and have no \".\", \"..\" or needless \"/\", unlike \"" +
+            "a path must be absolute and have no \".\", \"..\" or needless \"/\", and no zero byte, unlike \"" +
             path + "\"";
         kit::UnitDescription unit = wholeUnit();
         unit.files[path] = "x";

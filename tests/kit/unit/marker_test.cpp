@@ -4,6 +4,7 @@
 #include "kit/host/kit_error.h"
 #include "kit/unit/make_unit.h"
 #include "kit/unit/marker.h"
+#include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
@@ -34,10 +35,10 @@ protected:
         return "";
     }
 
-    void expectNoUnit() const {
+    void expectNoUnit(const std::string& has) const {
         EXPECT_FALSE(kit::isKitUnit(root()));
-        EXPECT_EQ(refusalOf(root()), root().string() + " is not a unit that orvane-unit made: it "
-                                                       "has no file .orvane-unit");
+        EXPECT_EQ(refusalOf(root()),
+                  root().string() + " is not a unit that orvane-unit made: it has " + has);
     }
 
 private:
@@ -68,7 +69,7 @@ TEST_F(MarkerTest, UnitIsRecognisedThroughALink) {
 
 TEST_F(MarkerTest, FolderWithoutTheMarkIsNotAUnit) {
     fs::create_directories(root() / "fs");
-    expectNoUnit();
+    expectNoUnit("no file .orvane-unit");
 }
 
 TEST_F(MarkerTest, OtherContentIsNotAMark) {
@@ -78,22 +79,32 @@ TEST_F(MarkerTest, OtherContentIsNotAMark) {
                                     MARK + std::string("\n"), MARK + std::string(1, '\0')}) {
         SCOPED_TRACE(text);
         writeFile(mark(), text);
-        expectNoUnit();
+        expectNoUnit("another .orvane-unit");
     }
 }
 
 TEST_F(MarkerTest, FolderOrLinkIsNotAMark) {
     fs::create_directories(mark());
-    expectNoUnit();
+    expectNoUnit("another .orvane-unit");
     fs::remove(mark());
     writeFile(root() / "text", MARK);
     fs::create_symlink("text", mark());
-    expectNoUnit();
+    expectNoUnit("another .orvane-unit");
+}
+
+TEST_F(MarkerTest, MarkThatCannotBeReadIsNotTakenForNone) {
+    kit::makeUnit({}, root());
+    const EnforcedPermissions enforced;
+    fs::permissions(mark(), fs::perms::none);
+    EXPECT_EQ(refusalOf(root()), "cannot read " + mark().string() + ": Permission denied");
+    fs::permissions(root(), fs::perms::none);
+    EXPECT_EQ(refusalOf(root()), "cannot read " + mark().string() + ": Permission denied");
+    fs::permissions(root(), fs::perms::owner_all);
 }
 
 TEST_F(MarkerTest, AnythingButAFolderIsRefused) {
     EXPECT_FALSE(kit::isKitUnit(root()));
-    EXPECT_EQ(refusalOf(root()), root().string() + " is not a folder");
+    EXPECT_EQ(refusalOf(root()), "cannot read " + root().string() + ": No such file or directory");
     writeFile(root(), MARK);
     EXPECT_FALSE(kit::isKitUnit(root()));
     EXPECT_EQ(refusalOf(root()), root().string() + " is not a folder");
