@@ -34,6 +34,7 @@
 #include "orvane_unit/report/json.h"
 #include "orvane_unit/report/run_text.h"
 #include "orvane_unit/show/decoded_unit.h"
+#include "orvane_unit/standard_streams.h"
 
 #include <CLI/CLI.hpp>
 #include <signal.h>
@@ -45,6 +46,8 @@
 #include <filesystem>
 #include <iostream>
 #include <memory>
+#include <new>
+#include <ostream>
 #include <set>
 #include <sstream>
 #include <stdexcept>
@@ -55,12 +58,9 @@ namespace orvane::desk {
 
 namespace {
 
-/// Prints a complaint, which has a line for each thing that is wrong.
+/// Prints a complaint on one line.
 void complain(const std::string& what) {
-    std::istringstream lines(what);
-    for (std::string line; std::getline(lines, line);) {
-        std::cerr << "orvane-unit: " << kit::printable(line) << '\n';
-    }
+    std::cerr << "orvane-unit: " << kit::printable(what) << '\n';
 }
 
 /// A subcommand. The parser fills its members with the options.
@@ -76,12 +76,15 @@ public:
 
     bool isChosen() const { return parser_->parsed(); }
 
-    /// Prints its report to standard output. Throws kit::KitError for wrong use or bad input.
-    virtual ExitStatus run() const = 0;
+    /// Adds its report to `out`. Throws kit::KitError for wrong use or bad input.
+    virtual ExitStatus run(std::ostream& out) const = 0;
 
 protected:
     void addOption(const char* name, std::string& value, const char* what) {
         parser_->add_option(name, value, what);
+    }
+    CLI::Option* addFlag(const char* name, bool& value, const char* what) {
+        return parser_->add_flag(name, value, what)->disable_flag_override();
     }
     void addNeeded(const char* name, std::string& value, const char* what) {
         parser_->add_option(name, value, what)->required();
@@ -108,7 +111,7 @@ public:
                   "The unit's description in TOML; by default the built-in sample unit");
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& /*out*/) const override {
         kit::makeUnit(description_.empty()
                           ? kit::parseDescription(kit::sampleDescriptionText(), "sample")
                           : kit::readDescription(description_),
@@ -129,8 +132,8 @@ public:
         addNeeded("ROOT", root_, MARKED_ROOT);
     }
 
-    ExitStatus run() const override {
-        std::cout << kit::descriptionText(kit::describeUnit(root_));
+    ExitStatus run(std::ostream& out) const override {
+        out << kit::descriptionText(kit::describeUnit(root_));
         return EXIT_AS_INTENDED;
     }
 
@@ -150,7 +153,7 @@ public:
             ->required();
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& /*out*/) const override {
         kit::setValues(root_, assignments_);
         return EXIT_AS_INTENDED;
     }
@@ -169,15 +172,15 @@ public:
         parser()
             .add_option("--only", only_, "params, records, tuning, versions or files")
             ->check(CLI::IsMember(partNames()));
-        parser().add_flag("--json", isJson_, JSON);
+        addFlag("--json", isJson_, JSON);
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         const DecodedUnit unit = decodeUnit(root_);
         if (isJson_) {
-            std::cout << decodedUnitJson(root_, unit, only_) << '\n';
+            out << decodedUnitJson(root_, unit, only_) << '\n';
         } else {
-            printDecodedUnit(std::cout, unit, only_);
+            printDecodedUnit(out, unit, only_);
         }
         return EXIT_AS_INTENDED;
     }
@@ -216,20 +219,18 @@ public:
                   "orvane-unit explain bench -a") {
         addNeeded("ROOT", root_, ANY_ROOT);
         addLetters(parser());
-        parser().add_flag("--all", showsAll_, "Print orvane's own text as well");
-        CLI::Option* const json = parser().add_flag("--json", isJson_, JSON);
-        parser()
-            .add_flag("--content", hasContent_, "With --json: what each file would hold")
-            ->needs(json);
+        addFlag("--all", showsAll_, "Print orvane's own text as well");
+        CLI::Option* const json = addFlag("--json", isJson_, JSON);
+        addFlag("--content", hasContent_, "With --json: what each file would hold")->needs(json);
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         const std::string letters = givenLetters(parser());
         const Explanation explanation = explainUnit(root_, {"-" + letters});
         if (isJson_) {
-            std::cout << explanationJson(root_, letters, explanation, hasContent_) << '\n';
+            out << explanationJson(root_, letters, explanation, hasContent_) << '\n';
         } else {
-            printExplanation(std::cout, explanation, showsAll_);
+            printExplanation(out, explanation, showsAll_);
         }
         return isIntended(explanation) ? EXIT_AS_INTENDED : EXIT_ANSWER_IS_NO;
     }
@@ -248,23 +249,23 @@ public:
                   "orvane-unit run bench -- -a -i") {
         addNeeded("ROOT", root_, MARKED_ROOT);
         addOption("--orvane", binary_, BINARY);
-        parser().add_flag("--json", isJson_, JSON);
-        parser().add_flag("--brief", isBrief_, "Only name the files that changed");
+        addFlag("--json", isJson_, JSON);
+        addFlag("--brief", isBrief_, "Only name the files that changed");
         parser().add_option("ARGUMENTS", arguments_, "orvane's own options, after --");
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         kit::requireKitUnit(root_);
         const kit::FolderLock lock(root_);
         const TmpTree before = readTmp(root_);
         const kit::RunResult result = kit::runInside(root_, {findOrvane(binary_), arguments_});
         const TmpTree after = readTmp(root_);
         if (isJson_) {
-            std::cout << runJson(root_, result, before, after) << '\n';
+            out << runJson(root_, result, before, after) << '\n';
         } else {
-            std::cout << result.standardOutput;
-            std::cerr << result.standardError;
-            printTmpChanges(std::cout, before, after, isBrief_);
+            out << kit::printableLines(result.standardOutput);
+            std::cerr << kit::printableLines(result.standardError);
+            printTmpChanges(out, before, after, isBrief_);
         }
         if (result.exitStatus != 0) {
             std::cerr << "orvane-unit: orvane ended with exit status " << result.exitStatus << '\n';
@@ -290,10 +291,10 @@ public:
         addNeeded("A", first_, "A unit's folder, or /");
         addNeeded("B", second_, "Another unit's folder, or /");
         addLetters(parser());
-        parser().add_flag("--json", isJson_, JSON);
+        addFlag("--json", isJson_, JSON);
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         const std::string letters = givenLetters(parser());
         const std::vector<kit::ValueChange> changes =
             kit::differingValues(kit::unitValues(kit::describeInputs(first_)),
@@ -302,9 +303,9 @@ public:
             consequences(changes, outputDifferences(explainUnit(first_, {"-" + letters}),
                                                     explainUnit(second_, {"-" + letters})));
         if (isJson_) {
-            std::cout << consequencesJson(first_, second_, found) << '\n';
+            out << consequencesJson(first_, second_, found) << '\n';
         } else {
-            printConsequences(std::cout, found);
+            printConsequences(out, found);
         }
         return found.empty() ? EXIT_AS_INTENDED : EXIT_ANSWER_IS_NO;
     }
@@ -324,10 +325,10 @@ public:
         addNeeded("ROOT", root_, ANY_ROOT);
         parser().add_option("KEY", prefixes_,
                             "Only the inputs whose key begins with this; by default all");
-        parser().add_flag("--json", isJson_, JSON);
+        addFlag("--json", isJson_, JSON);
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         const bool showsProgress = ::isatty(STDERR_FILENO) == 1;
         const std::vector<Impact> impacts =
             findImpacts(root_, prefixes_, [showsProgress](std::size_t done, std::size_t all) {
@@ -336,9 +337,9 @@ public:
                 }
             });
         if (isJson_) {
-            std::cout << impactsJson(root_, impacts) << '\n';
+            out << impactsJson(root_, impacts) << '\n';
         } else {
-            printImpacts(std::cout, impacts);
+            printImpacts(out, impacts);
         }
         return EXIT_AS_INTENDED;
     }
@@ -356,10 +357,10 @@ public:
                   "orvane-unit capture /mnt/field field --redact-serial") {
         addNeeded("SOURCE", source_, "/, or where an image of a unit is mounted");
         addNeeded("ROOT", root_, NEW_ROOT);
-        parser().add_flag("--redact-serial", redactsSerial_, "Replace the serial by X");
+        addFlag("--redact-serial", redactsSerial_, "Replace the serial by X");
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& /*out*/) const override {
         kit::captureUnit(source_, root_, redactsSerial_);
         return EXIT_AS_INTENDED;
     }
@@ -389,16 +390,16 @@ public:
                   "orvane-unit check cases") {
         addNeeded("FOLDER", folder_, "A folder of folders with a unit.toml each");
         addOption("--orvane", binary_, BINARY);
-        parser().add_flag("--update", updates_, "Write what is found as the new expectations");
-        parser().add_flag("--json", isJson_, JSON);
+        addFlag("--update", updates_, "Write what is found as the new expectations");
+        addFlag("--json", isJson_, JSON);
     }
 
-    ExitStatus run() const override {
+    ExitStatus run(std::ostream& out) const override {
         const CheckReport report = checkCases(folder_, findOrvane(binary_), updates_);
         if (isJson_) {
-            std::cout << checkJson(folder_, report) << '\n';
+            out << checkJson(folder_, report) << '\n';
         } else {
-            printCheck(std::cout, report);
+            printCheck(out, report);
         }
         if (complainOfFaults(report)) {
             return EXIT_BAD_INPUT;
@@ -423,49 +424,63 @@ std::vector<std::unique_ptr<Command>> addCommands(CLI::App& app) {
     return commands;
 }
 
-/// The first word must be a command or an option. The parser alone would only say that one is
-/// missing.
-void checkCommand(const CLI::App& app, int argc, const char* const* argv) {
-    const std::string word = argc > 1 ? argv[1] : "";
-    if (word.empty() || word[0] == '-') {
-        return;
+std::string wordsInQuotes(const std::vector<std::string>& words) {
+    std::string text;
+    for (const std::string& word : words) {
+        text += (text.empty() ? "" : ", ") + kit::inQuotes(word);
     }
+    return text;
+}
+
+/// The first word must be a command, or an option that needs none. The parser alone would only say
+/// that a command is missing.
+void checkFirstWord(const CLI::App& app, int argc, const char* const* argv) {
+    const std::string word = argc > 1 ? argv[1] : "";
+    bool isKnown = word == "-h" || word == "--help" || word == "--version";
     std::string names;
     for (const CLI::App* const command :
          app.get_subcommands([](const CLI::App*) { return true; })) {
-        if (command->get_name() == word) {
-            return;
-        }
+        isKnown = isKnown || command->get_name() == word;
         names += (names.empty() ? "" : ", ") + command->get_name();
     }
-    throw kit::KitError("there is no command \"" + word + "\", only " + names);
+    if (!isKnown) {
+        throw kit::KitError("the first word must be one of " + names +
+                            (argc > 1 ? ": not " + kit::inQuotes(word) : ""));
+    }
 }
 
-int chooseAndRun(int argc, const char* const* argv) {
+/// Throws for the words that the chosen command does not take.
+[[noreturn]] void failUnexpected(const CLI::App& app) {
+    const CLI::App& command = *app.get_subcommands().front();
+    throw kit::KitError(command.get_name() + " does not take " +
+                        wordsInQuotes(command.remaining()) +
+                        (command.get_name() == "run" ? "; orvane's own options follow --" : ""));
+}
+
+int chooseAndRun(int argc, const char* const* argv, std::ostream& out) {
     CLI::App app("Makes simulated units (folders that stand for a unit's \"/\"), explains what "
                  "orvane does in them and on real ones, and runs the unmodified orvane.",
                  "orvane-unit");
     app.require_subcommand(1);
     app.set_version_flag("--version", ORVANE_VERSION);
     app.footer("Exit status: 0 all as intended; 1 the answer is no: a fallback or a default stands "
-               "in,\na difference, a failed check; 2 wrong use or bad input.");
+               "in,\na difference, a failed check; 2 wrong use, bad input, or a report "
+               "that can't be written.");
     const std::vector<std::unique_ptr<Command>> commands =
         addCommands<NewCommand, DescribeCommand, SetCommand, ShowCommand, ExplainCommand,
                     RunCommand, DiffCommand, ImpactCommand, CaptureCommand, CheckCommand>(app);
-    checkCommand(app, argc, argv);
+    checkFirstWord(app, argc, argv);
     try {
         app.parse(argc, argv);
     } catch (const CLI::Success& help) {
-        return app.exit(help);
-    } catch (const CLI::ExtrasError& error) {
-        const bool isRun = app.get_subcommand("run")->parsed();
-        throw kit::KitError(std::string(error.what()) +
-                            (isRun ? "; orvane's own options follow --" : ""));
+        return app.exit(help, out, out);
+    } catch (const CLI::ExtrasError&) {
+        failUnexpected(app);
     }
     // There is one: the parser requires it.
     const auto chosen = std::find_if(commands.begin(), commands.end(),
                                      [](const auto& command) { return command->isChosen(); });
-    return (*chosen)->run();
+    return (*chosen)->run(out);
 }
 
 } // namespace
@@ -473,11 +488,22 @@ int chooseAndRun(int argc, const char* const* argv) {
 int runCommandLine(int argc, const char* const* argv) {
     ::signal(SIGXFSZ, SIG_IGN); // a write past the limit for files then fails like any other
     try {
-        return chooseAndRun(argc, argv);
+        prepareStandardStreams();
+        // Whole: a report that ends in an error is not printed.
+        std::ostringstream out;
+        const int status = chooseAndRun(argc, argv, out);
+        writeStandardOutput(out.str());
+        return status;
+    } catch (const kit::KitError& error) {
+        complain(error.text());
+    } catch (const std::filesystem::filesystem_error& error) {
+        complain(kit::KitError("cannot use ", error.path1(), ": " + error.code().message()).text());
+    } catch (const std::bad_alloc&) {
+        std::cerr << "orvane-unit: out of memory\n"; // needs none itself
     } catch (const std::exception& error) {
         complain(error.what());
-        return EXIT_BAD_INPUT;
     }
+    return EXIT_BAD_INPUT;
 }
 
 } // namespace orvane::desk

@@ -7,7 +7,8 @@ namespace orvane::desk {
 enum ExitStatus {
     EXIT_AS_INTENDED = 0,
     EXIT_ANSWER_IS_NO = 1, ///< a fallback or default, a difference, a failed check
-    EXIT_BAD_INPUT = 2,    ///< wrong use or bad input; a line on standard error says what
+    EXIT_BAD_INPUT = 2,    ///< wrong use, bad input, or a report that can't be written; a line on
+                           ///< standard error says what
 };
 
 /// Reads the command line, does what it says, and returns the exit status. Prints on standard error

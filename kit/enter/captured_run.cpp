@@ -108,10 +108,12 @@ void endWithParent(pid_t parent) {
 [[noreturn]] void runChild(const std::function<void()>& becomeProgram, const Outputs& outputs,
                            pid_t parent) {
     std::string reason = "the program was not started";
+    // A program finds the signals as usual, whatever its starter does about them.
+    ::signal(SIGPIPE, SIG_DFL);
+    ::signal(SIGXFSZ, SIG_DFL);
     try {
         endWithParent(parent);
         allowInterruption();
-        ::signal(SIGXFSZ, SIG_DFL); // as a program finds it, whatever its starter does about it
         putDescriptor(Descriptor(::open("/dev/null", O_RDONLY | O_CLOEXEC)), STDIN_FILENO);
         putDescriptor(outputs.standardOutput.descriptor(), STDOUT_FILENO);
         putDescriptor(outputs.standardError.descriptor(), STDERR_FILENO);

@@ -4,6 +4,7 @@
 #include "kit/description/unit_layout.h"
 #include "kit/enter/captured_run.h"
 #include "kit/host/kit_error.h"
+#include "kit/host/text.h"
 #include "kit/unit/marker.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/full_memory.h"
@@ -64,12 +65,17 @@ TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
 }
 
 TEST(OrvaneUnitTest, WrongUseIsRefused) {
-    expectRefused({"wash"}, "there is no command \"wash\", only new, describe, set, show, "
-                            "explain, run, diff, impact, capture, check");
-    expectRefused({"run", "a", "-a"},
-                  "The following argument was not expected: -a; orvane's own options follow --");
+    const std::string commands = "the first word must be one of new, describe, set, show, explain, "
+                                 "run, diff, impact, capture, check";
+    expectRefused({}, commands);
+    for (const std::string word : {"wash", "Explain", "--bogus", "--json", "--", "-v", ""}) {
+        expectRefused({word, "show"},
+                      std::string(commands).append(": not ").append(kit::inQuotes(word)));
+    }
+    expectRefused({"run", "a", "-a"}, "run does not take \"-a\"; orvane's own options follow --");
+    expectRefused({"new", "a", "b", "c", "-x"}, "new does not take \"b\", \"c\", \"-x\"");
     for (const Words& words :
-         {Words{}, Words{"explain", "a", "--content"}, Words{"new"}, Words{"new", "a", "b"},
+         {Words{"explain", "a", "--content"}, Words{"new"}, Words{"show", "a", "--json=no"},
           Words{"diff", "a"}, Words{"show", "a", "--only", "engine"}, Words{"run", "a", "--wrong"},
           Words{"set", "a"}}) {
         const kit::RunResult result = start(words);

@@ -5,8 +5,11 @@
 #include "kit/description/unit_layout.h"
 #include "kit/enter/captured_run.h"
 #include "kit/unit/marker.h"
+#include "orvane_unit/command_line.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/support/failing_memory.h"
 #include "tests/support/host_command.h"
+#include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
@@ -67,9 +70,6 @@ TEST(RefusalTest, UnknownWordsAndOptionsAreNamed) {
     EXPECT_NE(refusalOf({"explain", root, "-ab"}).find("-b"), std::string::npos);
     EXPECT_NE(refusalOf({"impact", root, "engine."}).find("engine."), std::string::npos);
     EXPECT_NE(refusalOf({"show", root, "--wrong"}).find("--wrong"), std::string::npos);
-    refusalOf({"--wrong"});
-    EXPECT_NE(refusalOf({"Explain", root}).find("there is no command \"Explain\""),
-              std::string::npos);
 }
 
 TEST(RefusalTest, RootThatIsAFileIsBadInput) {
@@ -86,6 +86,56 @@ TEST(RefusalTest, RootThatIsAFileIsBadInput) {
 TEST(RefusalTest, ComplaintsEscapeAnythingThatIsNotText) {
     EXPECT_NE(refusalOf({"show", "/proc/none/\x1b[2J\xff"}).find("/proc/none/\\x1b[2J\\xff"),
               std::string::npos);
+}
+
+/// What is wrong, and with what.
+TEST(RefusalTest, ComplaintsNameThePathAndTheSystemsReason) {
+    const std::string missing = "/proc/none/x: No such file or directory\n";
+    for (const Words& words :
+         {Words{"new", "/proc/none/unit", "--from", "/proc/none/x"}, Words{"check", "/proc/none/x"},
+          Words{"explain", "/proc/none/x"}, Words{"run", "/proc/none/x"}}) {
+        EXPECT_EQ(refusalOf(words), "orvane-unit: cannot read " + missing) << words[0];
+    }
+    EXPECT_EQ(refusalOf({"new", ""}), "orvane-unit: cannot make \"\": No such file or directory\n");
+    EXPECT_EQ(refusalOf({"show", ""}),
+              "orvane-unit: cannot read \"\": No such file or directory\n");
+}
+
+TEST(RefusalTest, ComplaintIsOneLineWhateverItNames) {
+    const DescribedUnit described;
+    EXPECT_EQ(refusalOf({"show", "/proc/a\nb"}),
+              "orvane-unit: cannot read /proc/a\\nb: No such file or directory\n");
+    EXPECT_EQ(refusalOf({"set", described.root(), "param.1=1\n2"}),
+              "orvane-unit: param.1=1\\n2: parameter 1 takes a whole number, not \"1\\n2\"\n");
+    EXPECT_EQ(refusalOf({"show", "a", "b\nc"}), "orvane-unit: show does not take \"b\\nc\"\n");
+}
+
+TEST(RefusalTest, ZeroByteDoesNotCutAComplaint) {
+    const TemporaryFolder folder;
+    const std::string description = folder.path() / "unit.toml";
+    writeFile(description, "[files]\n\"/a\\u0000b\" = \"\"\n");
+    EXPECT_EQ(
+        refusalOf({"new", folder.path() / "unit", "--from", description}),
+        "orvane-unit: " + description +
+            ":2:1: a path must be absolute and have no \".\", \"..\" or needless \"/\", and no "
+            "zero byte, unlike \"/a\\x00b\"\n");
+}
+
+/// Allocations fail one after the other, and from each on.
+TEST(RefusalTest, ShortageOfMemoryIsNamed) {
+    const char* const words[] = {"orvane-unit", "show"};
+    for (const Shortage shortage : {Shortage::once, Shortage::forGood}) {
+        for (int first = 1; first <= 500; first += 7) {
+            StandardStreams streams;
+            int status = 0;
+            {
+                const FailingMemory memory(first, shortage);
+                status = desk::runCommandLine(2, words);
+            }
+            EXPECT_EQ(streams.stop(), "orvane-unit: out of memory\n") << first;
+            EXPECT_EQ(status, 2);
+        }
+    }
 }
 
 TEST(RefusalTest, OtherContentIsNotAMark) {
