@@ -62,9 +62,15 @@ bool succeeds(const Action& action) {
     return false;
 }
 
-bool isFolder(const std::filesystem::path& path) {
-    std::error_code error;
-    return std::filesystem::is_directory(path, error);
+/// Lets what this process mounts be seen by no other but its children. False when the system does
+/// not allow it.
+bool keepMountsPrivate() {
+    if (!succeeds([] { return ::unshare(CLONE_NEWNS); })) {
+        return false;
+    }
+    // A "/" that is itself a changed root is not a mount, and the mount below it can't be made
+    // private.
+    return ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 || errno == EINVAL;
 }
 
 } // namespace
@@ -79,15 +85,14 @@ void changeRoot(const std::filesystem::path& root) {
     }
 }
 
+bool mountMemory(const std::filesystem::path& folder) {
+    return keepMountsPrivate() &&
+           ::mount("orvane-unit", folder.c_str(), "tmpfs", 0, "mode=0755") == 0;
+}
+
 bool showProc(const std::filesystem::path& root) {
     const std::filesystem::path target = root / "proc";
-    if (!isFolder(target) || !succeeds([] { return ::unshare(CLONE_NEWNS); })) {
-        return false;
-    }
-    // A "/" that is itself a changed root is not a mount, and the mount below it can't be made
-    // private.
-    const bool isPrivate = ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0;
-    return (isPrivate || errno == EINVAL) &&
+    return keepMountsPrivate() &&
            ::mount("/proc", target.c_str(), nullptr, MS_BIND | MS_REC, nullptr) == 0;
 }
 

@@ -12,10 +12,15 @@ namespace orvane::kit {
 /// Throws KitError when `root` is not a folder or the system allows neither.
 void changeRoot(const std::filesystem::path& root);
 
-/// Lets this process, and no other but its children, see the host's /proc at `root`/proc. False
-/// when that is not a folder or the system does not allow mounts. Only if this process is in a
-/// changed root itself may the mount be visible outside, too; whoever made the folder then removes
-/// it.
+/// Two mounts that this process and its children see, and no others. Only if this process is in a
+/// changed root itself may a mount be visible outside, too; whoever made its folder then unmounts
+/// it. Each is false when the system does not allow mounts, or there is no such folder.
+
+/// Puts an empty file system in memory over `folder`.
+bool mountMemory(const std::filesystem::path& folder);
+
+/// Shows the host's /proc at `root`/proc. That is a way from the unit to the host: only for the
+/// project's own tests.
 bool showProc(const std::filesystem::path& root);
 
 } // namespace orvane::kit

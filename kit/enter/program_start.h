@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// How a program of the host is started when the root directory is no longer the host's: by a
-// descriptor opened before, or by a path relative to a working directory that is still the host's
-// "/".
+// How a program of the host is started when the root directory is no longer the host's: a static
+// one by a descriptor that was opened before, any other through a program that opens files of the
+// host by their paths.
 #pragma once
 
 #include "kit/host/descriptor.h"
@@ -19,23 +19,30 @@ struct Program {
     std::vector<std::string> arguments; ///< without argv[0], which is the binary's file name
 };
 
+/// What is needed to start a program. Paths are relative to the host's "/" and have no symbolic
+/// links.
 struct ProgramStart {
-    Descriptor binary;             ///< open: execute this, from the unit's "/"; closed: use `file`
-    std::string file;              ///< the file to execute, relative to the host's "/"
-    std::vector<std::string> argv; ///< the whole command line
-    bool isDynamic = false;        ///< the program is started by a loader
+    enum class Way { byDescriptor, byLoader, byEmulator };
+
+    Way way = Way::byDescriptor;
+    std::string name; ///< argv[0]
+    std::vector<std::string> arguments;
+    Descriptor binary;                  ///< byDescriptor: the program
+    std::string starter;                ///< else: the loader or the emulator,
+    std::string program;                ///< the program,
+    std::vector<std::string> libraries; ///< and byLoader its libraries
 };
 
 /// Looks at the program and decides. Runs the loader of a dynamic one to find its libraries. Throws
 /// KitError when there is no such program or no way to start it.
 ProgramStart findProgramStart(const Program& program);
 
-/// Makes `root`, an absolute path, the "/" of this process, and sets the working directory from
-/// which the program can be started. Throws KitError when it can't.
-void enterRootFor(const ProgramStart& start, const std::filesystem::path& root);
+/// The files that are opened by their paths when the program starts; none byDescriptor.
+std::vector<std::string> filesOf(const ProgramStart& start);
 
-/// Executes the program once enterRootFor has prepared its process. Opens no file, so the program's
-/// limits can be set in between. Does not return; throws KitError on failure.
-void becomeProgram(const ProgramStart& start);
+/// Executes the program in a process that has entered the unit. `hostRoot` is the folder that
+/// stands for the host's "/" and has the files of filesOf; empty for the working directory. Opens
+/// no file itself. Does not return; throws KitError on failure.
+[[noreturn]] void becomeProgram(const ProgramStart& start, const std::string& hostRoot);
 
 } // namespace orvane::kit

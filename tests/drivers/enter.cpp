@@ -3,10 +3,12 @@
 // orvane-enter [--memory=BYTES] [--files=COUNT] ROOT PROGRAM [ARGUMENT...]: becomes PROGRAM with
 // "/" = ROOT, in this same process, so that a tracer of this process sees only the program.
 // The limits are those of the program (RLIMIT_AS, RLIMIT_NOFILE). Exits with 125 when it can't.
+#include "kit/enter/change_root.h"
 #include "kit/enter/program_start.h"
 #include "kit/host/kit_error.h"
 
 #include <sys/resource.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <iostream>
@@ -16,6 +18,7 @@
 namespace {
 
 using orvane::kit::KitError;
+using orvane::kit::ProgramStart;
 
 struct Limits {
     rlim_t memory = RLIM_INFINITY; ///< bytes of address space
@@ -56,19 +59,35 @@ void limit(__rlimit_resource resource, rlim_t soft) {
     }
 }
 
+/// The program stays in this process, so nobody could remove copies of the files that it opens from
+/// the unit: they are reached through a working directory that is the host's "/".
+void enterUnit(const ProgramStart& start, const std::filesystem::path& root) {
+    const bool needsFiles = !orvane::kit::filesOf(start).empty();
+    if (needsFiles && chdir("/") != 0) {
+        throw orvane::kit::systemError("cannot enter the host's root directory");
+    }
+    if (start.way == ProgramStart::Way::byLoader) {
+        orvane::kit::showProc(root); // it may have sanitizers
+    }
+    orvane::kit::changeRoot(root);
+    if (!needsFiles && chdir("/") != 0) {
+        throw orvane::kit::systemError("cannot enter ", root);
+    }
+}
+
 void enter(std::vector<std::string> words) {
     const Limits limits = takeLimits(words);
     if (words.size() < 2) {
         throw KitError("wants ROOT PROGRAM [ARGUMENT...]");
     }
     const std::filesystem::path root = std::filesystem::absolute(words[0]);
-    const orvane::kit::ProgramStart start =
+    const ProgramStart start =
         orvane::kit::findProgramStart({words[1], {words.begin() + 2, words.end()}});
-    orvane::kit::enterRootFor(start, root);
+    enterUnit(start, root);
     // After entering, because that opens files.
     limit(RLIMIT_AS, limits.memory);
     limit(RLIMIT_NOFILE, limits.files);
-    orvane::kit::becomeProgram(start);
+    orvane::kit::becomeProgram(start, "");
 }
 
 } // namespace
