@@ -9,6 +9,7 @@
 
 #include <cerrno>
 #include <cstddef>
+#include <cstdlib>
 #include <string>
 
 namespace orvane::kit {
@@ -81,6 +82,17 @@ void requireFolder(const std::filesystem::path& folder) {
     if (!S_ISDIR(state.st_mode)) {
         throw KitError("", folder, " is not a folder");
     }
+}
+
+std::filesystem::path temporaryFolder() {
+    const char* const wanted = std::getenv("TMPDIR");
+    std::filesystem::path folder = wanted == nullptr || *wanted == '\0' ? "/tmp" : wanted;
+    try {
+        requireFolder(folder);
+    } catch (const KitError& error) {
+        throw KitError("no folder for temporary files (TMPDIR): " + error.text());
+    }
+    return folder;
 }
 
 bool isRootDirectory(const std::filesystem::path& folder) {

@@ -35,6 +35,10 @@ Bytes readWhole(const Descriptor& descriptor, const std::filesystem::path& file)
 /// Throws when `folder` is not a folder or can't be looked at.
 void requireFolder(const std::filesystem::path& folder);
 
+/// The folder for temporary files: that of the environment variable TMPDIR, else /tmp. Throws when
+/// it is not a folder.
+std::filesystem::path temporaryFolder();
+
 /// Whether `folder` is this process's "/", under any name. Throws nothing.
 bool isRootDirectory(const std::filesystem::path& folder);
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/host/scratch_folder.h"
 
+#include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
 
 #include <string>
@@ -10,7 +11,7 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-ScratchFolder::ScratchFolder() try : folder_(fs::temp_directory_path(), "orvane-unit", 0700) {
+ScratchFolder::ScratchFolder() try : folder_(temporaryFolder(), "orvane-unit", 0700) {
 } catch (const fs::filesystem_error& failure) {
     throw KitError("cannot make ", failure.path1(), ": " + failure.code().message());
 }

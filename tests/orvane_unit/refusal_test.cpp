@@ -101,6 +101,23 @@ TEST(RefusalTest, ComplaintsNameThePathAndTheSystemsReason) {
               "orvane-unit: cannot read \"\": No such file or directory\n");
 }
 
+TEST(RefusalTest, FolderForTemporaryFilesIsNamed) {
+    const DescribedUnit described;
+    const auto refusalWith = [&described](const std::string& folder) {
+        Words command = buildCommand(ORVANE_UNIT_BINARY);
+        command.insert(command.begin(), {"env", "TMPDIR=" + folder});
+        command.insert(command.end(), {"impact", described.root(), "param.22"});
+        const kit::RunResult result = runOnHost(command);
+        EXPECT_EQ(result.exitStatus, 2);
+        return result.standardError;
+    };
+    const std::string begin = "orvane-unit: no folder for temporary files (TMPDIR): ";
+    EXPECT_EQ(refusalWith("/proc/none"),
+              begin + "cannot read /proc/none: No such file or directory\n");
+    const std::string file = described.root() / kit::MARKER_NAME;
+    EXPECT_EQ(refusalWith(file), begin + file + " is not a folder\n");
+}
+
 TEST(RefusalTest, ComplaintIsOneLineWhateverItNames) {
     const DescribedUnit described;
     EXPECT_EQ(refusalOf({"show", "/proc/a\nb"}),
