@@ -6,35 +6,30 @@
 
 #include <sys/mount.h>
 
-#include <cstdlib>
 #include <system_error>
 
 namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-HostFiles::HostFiles(const fs::path& root) {
-    std::string name = root / ".program.unfinished-XXXXXX";
-    if (::mkdtemp(name.data()) == nullptr) {
-        throw systemError("cannot make ", name);
-    }
-    folder_ = name;
+HostFiles::HostFiles(const fs::path& root) try : folder_(root, "program", 0700) {
+} catch (const fs::filesystem_error& failure) {
+    throw KitError("cannot make ", failure.path1(), ": " + failure.code().message());
 }
 
 HostFiles::~HostFiles() {
-    ::umount2(folder_.c_str(), MNT_DETACH); // visible here only in a changed root (change_root.h)
-    std::error_code ignored;
-    fs::remove_all(folder_, ignored);
+    // A mount that is visible here: only in a changed root (change_root.h).
+    ::umount2(folder_.path().c_str(), MNT_DETACH);
 }
 
 std::string HostFiles::pathInUnit() const {
-    return "/" + folder_.filename().string();
+    return "/" + folder_.path().filename().string();
 }
 
 void HostFiles::fill(const std::vector<std::string>& files) const {
-    mountMemory(folder_);
+    mountMemory(folder_.path());
     for (const std::string& file : files) {
-        const fs::path copy = folder_ / file;
+        const fs::path copy = folder_.path() / file;
         std::error_code error;
         fs::create_directories(copy.parent_path(), error);
         fs::copy_file("/" + file, copy, fs::copy_options::overwrite_existing, error);

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "kit/host/unfinished_folder.h"
+
 #include <filesystem>
 #include <string>
 #include <vector>
@@ -27,7 +29,7 @@ public:
     void fill(const std::vector<std::string>& files) const;
 
 private:
-    std::filesystem::path folder_;
+    UnfinishedFolder folder_;
 };
 
 } // namespace orvane::kit

@@ -222,7 +222,7 @@ CaseResult checkCase(const fs::path& folder, const fs::path& binary, bool update
             addAll(differencesFromExpected(folder, run.outcome), result.differences);
         }
     } catch (const kit::KitError& error) {
-        result.fault = error.what();
+        result.fault = error.text();
     }
     return result;
 }

@@ -151,6 +151,7 @@ pid_t startInBackground(CommandLine command) {
 
 TEST_F(NothingLostTest, InterruptionAndKillEndTheProgramThatRuns) {
     const std::string forever = std::to_string(100000000 + getpid());
+    const std::set<std::string> before = folderNames(unit());
     for (const int signal : {SIGTERM, SIGKILL}) {
         SCOPED_TRACE(signal);
         const pid_t started =
@@ -165,7 +166,11 @@ TEST_F(NothingLostTest, InterruptionAndKillEndTheProgramThatRuns) {
         while (signal == SIGKILL && isRunning(forever)) { // the system is about to kill it
         }
         EXPECT_FALSE(isRunning(forever));
+        EXPECT_EQ(folderNames(unit()) == before, signal == SIGTERM);
     }
+    // The program and its libraries were in a folder of the unit.
+    EXPECT_EQ(runOnHost(orvaneUnit({"run", unit(), "--orvane", "/bin/true"})).exitStatus, 0);
+    EXPECT_EQ(folderNames(unit()), before);
 }
 
 TEST_F(NothingLostTracedTest, IgnoredHangUpInterruptsNothing) {

@@ -165,9 +165,9 @@ TEST_F(MakeUnitRefusalTest, PathThatIsNotPlainIsNamedAndLeavesNothing) {
          {std::string(), std::string("/"), std::string("tmp/x"), std::string("/tmp/../../x"),
           std::string("/tmp/./x"), std::string("//tmp/x"), std::string("/tmp//x"),
           std::string("/tmp/x/"), std::string("/tmp/..\0x", 9)}) {
-        const std::string message =
-            "a path must be absolute and have no \".\", \"..\" or needless \"/\", and no zero byte, unlike \"" +
-            path + "\"";
+        const std::string message = "a path must be absolute and have no \".\", \"..\" or needless "
+                                    "\"/\", and no zero byte, unlike \"" +
+                                    path + "\"";
         kit::UnitDescription unit = wholeUnit();
         unit.files[path] = "x";
         EXPECT_EQ(refusalOf(unit, root()), message.substr(0, message.find('\0')));
