@@ -63,6 +63,11 @@ void complain(const std::string& what) {
     std::cerr << "orvane-unit: " << kit::printable(what) << '\n';
 }
 
+/// What is wrong with a value that must not be empty; empty if nothing is.
+std::string emptyFault(const std::string& value) {
+    return value.empty() ? "the value is empty" : "";
+}
+
 /// A subcommand. The parser fills its members with the options.
 class Command {
 public:
@@ -81,7 +86,7 @@ public:
 
 protected:
     void addOption(const char* name, std::string& value, const char* what) {
-        parser_->add_option(name, value, what);
+        parser_->add_option(name, value, what)->check(emptyFault);
     }
     CLI::Option* addFlag(const char* name, bool& value, const char* what) {
         return parser_->add_flag(name, value, what)->disable_flag_override();
@@ -323,8 +328,10 @@ public:
                   "Change every input in a copy of a unit, and say which output lines change",
                   "orvane-unit impact bench param. slot.9") {
         addNeeded("ROOT", root_, ANY_ROOT);
-        parser().add_option("KEY", prefixes_,
-                            "Only the inputs whose key begins with this; by default all");
+        parser()
+            .add_option("KEY", prefixes_,
+                        "Only the inputs whose key begins with this; by default all")
+            ->check(emptyFault);
         addFlag("--json", isJson_, JSON);
     }
 

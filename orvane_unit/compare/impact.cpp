@@ -137,18 +137,30 @@ std::optional<Input> inputOf(const ValueKey& key, const CopiedFile& image, const
                      : otherValues(original)};
 }
 
+bool beginsWith(const ValueKey& key, const std::string& prefix) {
+    return kit::keyText(key).compare(0, prefix.size(), prefix) == 0;
+}
+
 /// The `keys` that begin with one of `prefixes`, or all if there are none.
 std::vector<ValueKey> withPrefixes(std::vector<ValueKey> keys,
                                    const std::vector<std::string>& prefixes) {
     const auto isWanted = [&prefixes](const ValueKey& key) {
-        const std::string text = kit::keyText(key);
         return prefixes.empty() ||
-               std::any_of(prefixes.begin(), prefixes.end(), [&text](const std::string& prefix) {
-                   return text.compare(0, prefix.size(), prefix) == 0;
-               });
+               std::any_of(prefixes.begin(), prefixes.end(),
+                           [&key](const std::string& prefix) { return beginsWith(key, prefix); });
     };
     keys.erase(std::remove_if(keys.begin(), keys.end(), std::not_fn(isWanted)), keys.end());
     return keys;
+}
+
+/// Throws for a prefix with which no input begins.
+void requireInputs(const std::vector<Input>& inputs, const std::vector<std::string>& prefixes) {
+    for (const std::string& prefix : prefixes) {
+        if (std::none_of(inputs.begin(), inputs.end(),
+                         [&prefix](const Input& input) { return beginsWith(input.key, prefix); })) {
+            throw kit::KitError("no input of this unit begins with " + prefix);
+        }
+    }
 }
 
 void addLines(const std::vector<OutputDifference>& differences, Impact& impact) {
@@ -179,9 +191,7 @@ std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::str
             inputs.push_back(std::move(*input));
         }
     }
-    if (inputs.empty() && !prefixes.empty()) {
-        throw kit::KitError("no input of this unit begins with " + prefixes.front());
-    }
+    requireInputs(inputs, prefixes);
 
     const kit::EnteredRoot entered(copy);
     const std::vector<std::string> both = {std::string{'-', AIRPLAY_OPTION, IAP_OPTION}};

@@ -26,7 +26,7 @@ using Progress = std::function<void(std::size_t done, std::size_t all)>;
 
 /// Tries every parameter, slot byte and tuning field of the unit at `root`, which is only read; of
 /// these, if there are `prefixes`, only those whose key as a text begins with one of them. Throws
-/// kit::KitError when the unit can't be read, no copy can be made, or no key has such a prefix.
+/// kit::KitError when the unit can't be read, no copy can be made, or a prefix is that of no key.
 std::vector<Impact> findImpacts(const std::filesystem::path& root,
                                 const std::vector<std::string>& prefixes, const Progress& progress);
 

@@ -72,6 +72,18 @@ TEST(RefusalTest, UnknownWordsAndOptionsAreNamed) {
     EXPECT_NE(refusalOf({"show", root, "--wrong"}).find("--wrong"), std::string::npos);
 }
 
+TEST(RefusalTest, EmptyValueOfAnOptionIsNotItsDefault) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    for (const Words& words :
+         {Words{"new", described.folder() / "new", "--from", ""},
+          Words{"run", root, "--orvane", ""}, Words{"check", described.folder(), "--orvane", ""},
+          Words{"impact", root, ""}}) {
+        EXPECT_NE(refusalOf(words).find("the value is empty"), std::string::npos) << words[0];
+    }
+    EXPECT_FALSE(fs::exists(described.folder() / "new"));
+}
+
 TEST(RefusalTest, RootThatIsAFileIsBadInput) {
     const TemporaryFolder folder;
     const std::string file = folder.path() / "file";

@@ -89,6 +89,7 @@ TEST(ImpactTest, WithoutImageAndDiskNothingIsTried) {
 TEST(ImpactTest, PrefixOfNoKeyIsBadInput) {
     const DescribedUnit described;
     EXPECT_THROW(impactsOf(described.root(), {"param.172"}), kit::KitError);
+    EXPECT_THROW(impactsOf(described.root(), {"param.139", "param.172"}), kit::KitError);
 }
 
 TEST(ImpactTest, MissingRootIsBadInput) {
