@@ -7,7 +7,7 @@ namespace orvane::test {
 
 std::vector<std::string> holeInFullMemory(const std::filesystem::path& root) {
     const std::filesystem::path image(IMAGE_PATH);
-    return {ORVANE_SUPPORT_DIR "/hole_in_full_memory.sh",
+    return {"/bin/sh", ORVANE_SUPPORT_DIR "/hole_in_full_memory.sh",
             root / image.parent_path().relative_path(), image.filename()};
 }
 

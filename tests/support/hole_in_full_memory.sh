@@ -6,7 +6,7 @@
 if [ "$1" != --inside ]; then
     for way in --mount '--mount --propagation unchanged' '--map-root-user --mount'; do
         # shellcheck disable=SC2086  # words
-        unshare $way true 2>/dev/null && exec unshare $way "$0" --inside "$@"
+        unshare $way true 2>/dev/null && exec unshare $way /bin/sh "$0" --inside "$@"
     done
     echo "$0: a mount is not possible here" >&2
     exit 125
