@@ -128,8 +128,8 @@ protected:
 private:
     /// The words before a command that runs after `script` in mounts of its own.
     static Words inMount(const std::string& script, const Words& arguments) {
-        const Words asRoot = ::geteuid() == 0 ? Words{} : Words{"--user", "--map-root-user"};
-        return Words{"unshare", "--mount"} + asRoot +
+        return Words{"unshare", "--mount"} +
+               (::geteuid() == 0 ? Words{} : Words{"--user", "--map-root-user"}) +
                Words{"sh", "-c", script + R"( && shift 2 && exec "$@")", "sh"} + arguments;
     }
 
