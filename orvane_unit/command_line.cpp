@@ -47,11 +47,12 @@
 #include <iostream>
 #include <memory>
 #include <new>
-#include <ostream>
 #include <set>
 #include <sstream>
 #include <stdexcept>
 #include <string>
+#include <system_error>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {

@@ -2,6 +2,7 @@
 #include "kit/unit/marker.h"
 
 #include "kit/description/unit_layout.h"
+#include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"

@@ -6,6 +6,7 @@
 #include "kit/description/value_key.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/lost_pages.h"
+#include "main/options.h"
 #include "orvane_unit/explain/given_options.h"
 #include "orvane_unit/explain/planned_files.h"
 #include "orvane_unit/explain/planned_merge.h"
@@ -18,6 +19,7 @@
 #include "tuning/tuning_file.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
+#include "writers/template_merge.h"
 
 #include <array>
 #include <cstddef>
