@@ -494,7 +494,8 @@ int chooseAndRun(int argc, const char* const* argv, std::ostream& out) {
 } // namespace
 
 int runCommandLine(int argc, const char* const* argv) {
-    ::signal(SIGXFSZ, SIG_IGN); // a write past the limit for files then fails like any other
+    static_cast<void>(
+        ::signal(SIGXFSZ, SIG_IGN)); // a write past the limit for files then fails like any other
     try {
         prepareStandardStreams();
         // Whole: a report that ends in an error is not printed.

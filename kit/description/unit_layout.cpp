@@ -98,9 +98,9 @@ std::string pathAbove(const std::string& path) {
     return path.substr(0, path.rfind('/'));
 }
 
-bool isAtOrBelow(const std::string& path, const std::string& ancestor) {
-    return path.compare(0, ancestor.size(), ancestor) == 0 &&
-           (path.size() == ancestor.size() || path[ancestor.size()] == '/');
+bool isAtOrBelow(const std::string& entry, const std::string& ancestor) {
+    return entry.compare(0, ancestor.size(), ancestor) == 0 &&
+           (entry.size() == ancestor.size() || entry[ancestor.size()] == '/');
 }
 
 bool isStandardFolder(const std::string& path) {

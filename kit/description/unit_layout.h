@@ -33,8 +33,8 @@ void addAbsent(const Layout& layout,
 /// The path without its last name: "/tmp" for "/tmp/x", empty for "/tmp".
 std::string pathAbove(const std::string& path);
 
-/// Whether `path` is `ancestor` or lies below it.
-bool isAtOrBelow(const std::string& path, const std::string& ancestor);
+/// Whether the path `entry` is `ancestor` or lies below it.
+bool isAtOrBelow(const std::string& entry, const std::string& ancestor);
 
 /// Whether every unit has the folder `path`, unless something else takes its place.
 bool isStandardFolder(const std::string& path);

@@ -109,8 +109,8 @@ void endWithParent(pid_t parent) {
                            pid_t parent) {
     std::string reason = "the program was not started";
     // A program finds the signals as usual, whatever its starter does about them.
-    ::signal(SIGPIPE, SIG_DFL);
-    ::signal(SIGXFSZ, SIG_DFL);
+    static_cast<void>(::signal(SIGPIPE, SIG_DFL));
+    static_cast<void>(::signal(SIGXFSZ, SIG_DFL));
     try {
         endWithParent(parent);
         allowInterruption();

@@ -34,9 +34,9 @@ void handle(int signal, siginfo_t* info, void* /*context*/) {
     if (info->si_code == BUS_ADRERR && replaceByZeros(info->si_addr)) {
         isAnyLost = 1;
     } else {
-        ::signal(signal, SIG_DFL);
+        static_cast<void>(::signal(signal, SIG_DFL));
         if (info->si_code <= 0) { // sent by a process: nothing is repeated
-            ::raise(signal);
+            static_cast<void>(::raise(signal));
         }
     }
     errno = error;
@@ -58,6 +58,8 @@ LostPages::~LostPages() {
     ::sigaction(SIGBUS, &former_, nullptr);
 }
 
+// It means nothing without an object.
+// NOLINTNEXTLINE(readability-convert-member-functions-to-static)
 void LostPages::requireNone(const std::filesystem::path& file) const {
     if (isAnyLost != 0) {
         throw KitError("cannot read ", file,

@@ -11,11 +11,11 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr char DIGITS[] = "0123456789abcdef";
+constexpr char HEX_DIGITS[] = "0123456789abcdef";
 
 std::string escaped(char byte) {
     const auto value = static_cast<unsigned char>(byte);
-    return {'\\', 'x', DIGITS[value >> 4U], DIGITS[value & 0xFU]};
+    return {'\\', 'x', HEX_DIGITS[value >> 4U], HEX_DIGITS[value & 0xFU]};
 }
 
 /// Characters from `first` to `last`.
@@ -108,8 +108,8 @@ std::string hexText(std::string_view bytes) {
         if (!text.empty()) {
             text += ' ';
         }
-        text += DIGITS[value >> 4U];
-        text += DIGITS[value & 0xFU];
+        text += HEX_DIGITS[value >> 4U];
+        text += HEX_DIGITS[value & 0xFU];
     }
     return text;
 }

@@ -134,7 +134,7 @@ Bytes redactSerial(UnitInputs& inputs) {
     const std::size_t size = place.mask.size();
     const Bytes slot = disk.substr(begin, size);
     const Bytes serial = slot.substr(0, slot.find('\0'));
-    const Bytes sought = trimSpaces(serial);
+    Bytes sought = trimSpaces(serial);
     const bool isSought = !isRedacted(sought);
     if (isSought && sought.size() < SHORTEST_SOUGHT) {
         throw KitError("a serial of " + counted(sought.size(), "byte") +

@@ -27,7 +27,7 @@ class LostImageTest : public UnitTest {};
 TEST_F(LostImageTest, ImageThatIsCutOffWhileItIsMappedEndsTheProcess) {
     writeFile("/dev/null", ""); // for the child's standard input
     const kit::RunResult result = kit::runCaptured([] {
-        std::signal(SIGBUS, SIG_DFL); // a sanitizer may have its own
+        static_cast<void>(std::signal(SIGBUS, SIG_DFL)); // a sanitizer may have its own
         ConfigStore store;
         std::uint8_t value = 0;
         if (store.open() == STORE_OPENED && ::truncate(IMAGE_PATH, 0) == 0) {

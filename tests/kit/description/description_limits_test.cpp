@@ -81,16 +81,24 @@ TEST(DescriptionLimitsTest, NestedValuesAreRefusedAtTheirPlace) {
     }
 }
 
+/// `text` with more dots for each of its dots than a key may have.
+std::string withManyDots(const std::string& text) {
+    std::string result;
+    for (const char character : text) {
+        result.append(character == '.' ? 40 : 1, character);
+    }
+    return result;
+}
+
 TEST(DescriptionLimitsTest, DotsThatDivideNoKeyDoNotCount) {
-    const std::string dots(40, '.');
-    for (const std::string& text : {
-             "[files]\n\"/" + dots + "x\" = '" + dots + "' # " + dots + "\n",
-             "[files]\n\"/a\" = '''" + dots + "'" + dots + "'''''\n",
-             "[files]\n\"/a\" = \"\"\"\n" + dots + "\"" + dots + "\\\"" + dots + "\"\"\"\"\"\n",
-             "[files]\n\"/a\" = \"\\\\\"\n\"/b\" = \"\\\"" + dots + "\" # \"\n",
-             "[files]\n\"/a\" = \"\" # ''' \"\"\"\n\"/b\" = \"" + dots + "\"\n",
+    for (const char* const text : {
+             "[files]\n\"/.x\" = '.' # .\n",
+             "[files]\n\"/a\" = '''.'.'''''\n",
+             "[files]\n\"/a\" = \"\"\"\n.\".\\\".\"\"\"\"\"\n",
+             "[files]\n\"/a\" = \"\\\\\"\n\"/b\" = \"\\\".\" # \"\n",
+             "[files]\n\"/a\" = \"\" # ''' \"\"\"\n\"/b\" = \".\"\n",
          }) {
-        EXPECT_EQ(complaint(text), "") << text;
+        EXPECT_EQ(complaint(withManyDots(text)), "") << text;
     }
 }
 

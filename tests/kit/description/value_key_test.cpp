@@ -14,7 +14,7 @@ using kit::ValueKey;
 
 struct Spelling {
     ValueKey key;
-    const char* text;
+    const char* text = nullptr;
 };
 
 const Spelling SPELLINGS[] = {

@@ -14,6 +14,7 @@ namespace {
 
 constexpr std::uint64_t DISK_SIZE = 2U << 20U;
 constexpr std::uint64_t BASE = 1U << 20U; ///< offset of the record area on such a disk
+constexpr std::uint64_t BLOCK = 188;      ///< bytes of a tuning block
 
 TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
     struct Row {
@@ -30,9 +31,10 @@ TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
         {kit::slotByteKey(9, 7), BASE + 136, "\xFF", BASE - 129},
         {kit::auxKey(), BASE + 3072, std::string(1024, '\xFF'), BASE - 3072},
         {kit::tuningFieldKey(0, "qwaHFESwitch"), BASE + 4096, "\xC0", BASE - 4096},
-        {kit::tuningFieldKey(3, "qwaNRAtten"), BASE + 4096 + 3 * 188 + 23, "\xFF\xFF", BASE - 4096},
-        {kit::tuningFieldKey(9, "qwaNCParams"), BASE + 4096 + 9 * 188 + 13, std::string(10, '\xFF'),
+        {kit::tuningFieldKey(3, "qwaNRAtten"), BASE + 4096 + 3 * BLOCK + 23, "\xFF\xFF",
          BASE - 4096},
+        {kit::tuningFieldKey(9, "qwaNCParams"), BASE + 4096 + 9 * BLOCK + 13,
+         std::string(10, '\xFF'), BASE - 4096},
     };
     for (const Row& row : ROWS) {
         const kit::ValuePlace place = kit::valuePlace(row.key);
@@ -44,7 +46,7 @@ TEST(ValuePlacesTest, EveryKindOfValueHasItsPlace) {
 
 TEST(ValuePlacesTest, BlockIsAllOfItsFields) {
     const kit::ValuePlace block = kit::valuePlace(kit::tuningBlockKey(3));
-    EXPECT_EQ(block.offsetIn(DISK_SIZE), BASE + 4096 + 3 * 188);
+    EXPECT_EQ(block.offsetIn(DISK_SIZE), BASE + 4096 + 3 * BLOCK);
     std::string mask(188, '\0');
     for (const DpsField& field : DPS_LAYOUT) {
         const kit::ValuePlace place = kit::valuePlace(kit::tuningFieldKey(3, field.key));

@@ -168,7 +168,7 @@ TEST_F(FinishedFolderTest, NothingIsMovedWhenOneEntryCannotBe) {
     std::string refusal;
     {
         const EnforcedPermissions permissions;
-        refusal = refusalOf(place(), [this](const fs::path& folder) {
+        refusal = refusalOf(place(), [](const fs::path& folder) {
             fs::create_directory(folder / "a");
             fs::create_directory(folder / "b");
             // A folder that changes its place changes its "..", so it must be writable itself.

@@ -51,7 +51,7 @@ TEST(FolderLockTest, LockEndsWithAKilledProcess) {
     const TemporaryFolder folder;
     const kit::RunResult result = kit::runCaptured([&folder] {
         const kit::FolderLock lock(folder.path());
-        raise(SIGKILL);
+        static_cast<void>(raise(SIGKILL));
     });
     EXPECT_EQ(result.exitStatus, 128 + SIGKILL);
     EXPECT_EQ(refusalOf(folder.path()), "");

@@ -35,7 +35,7 @@ TEST_P(InterruptionTest, SignalWaitsForTheOutermostOwner) {
         std::optional<kit::DeferredInterruption> outer(std::in_place);
         {
             const kit::DeferredInterruption inner;
-            raise(GetParam());
+            static_cast<void>(raise(GetParam()));
         }
         print("in time");
         outer.reset();
@@ -49,7 +49,7 @@ TEST_P(InterruptionTest, WaitingSignalIsThrownWhenAskedFor) {
     const kit::RunResult result = runChild([] {
         const kit::DeferredInterruption deferred;
         kit::throwIfInterrupted();
-        raise(GetParam());
+        static_cast<void>(raise(GetParam()));
         try {
             kit::throwIfInterrupted();
         } catch (const kit::KitError& error) {
@@ -62,10 +62,10 @@ TEST_P(InterruptionTest, WaitingSignalIsThrownWhenAskedFor) {
 
 TEST_P(InterruptionTest, IgnoredSignalStaysIgnored) {
     const kit::RunResult result = runChild([] {
-        signal(GetParam(), SIG_IGN);
+        static_cast<void>(signal(GetParam(), SIG_IGN));
         {
             const kit::DeferredInterruption deferred;
-            raise(GetParam());
+            static_cast<void>(raise(GetParam()));
             kit::throwIfInterrupted();
         }
         print("still here");
@@ -76,7 +76,7 @@ TEST_P(InterruptionTest, IgnoredSignalStaysIgnored) {
 
 TEST_P(InterruptionTest, ChildThatBecomesAProgramCanBeInterrupted) {
     const kit::DeferredInterruption deferred;
-    const kit::RunResult result = runChild([] { raise(GetParam()); });
+    const kit::RunResult result = runChild([] { static_cast<void>(raise(GetParam())); });
     EXPECT_EQ(result.exitStatus, 128 + GetParam());
 }
 

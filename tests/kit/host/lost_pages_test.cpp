@@ -26,23 +26,24 @@ public:
           file_(::open((folder_.path() / "file").c_str(), O_RDWR | O_CREAT, 0600)) {
         const std::string text(size_, 'p');
         EXPECT_EQ(::write(file_.number(), text.data(), size_), static_cast<ssize_t>(size_));
-        mapped_ = static_cast<const char*>(
-            ::mmap(nullptr, size_, PROT_READ, MAP_PRIVATE, file_.number(), 0));
+        mapped_ = ::mmap(nullptr, size_, PROT_READ, MAP_PRIVATE, file_.number(), 0);
         EXPECT_NE(mapped_, MAP_FAILED);
         EXPECT_EQ(::ftruncate(file_.number(), left), 0);
     }
-    ~CutFile() { ::munmap(const_cast<char*>(mapped_), size_); }
+    ~CutFile() { ::munmap(mapped_, size_); }
     CutFile(const CutFile&) = delete;
     CutFile& operator=(const CutFile&) = delete;
 
-    char first() const { return *static_cast<const volatile char*>(mapped_); }
-    char last() const { return *static_cast<const volatile char*>(mapped_ + size_ - 1); }
+    char first() const { return *bytes(); }
+    char last() const { return bytes()[size_ - 1]; }
 
 private:
+    const volatile char* bytes() const { return static_cast<const volatile char*>(mapped_); }
+
     TemporaryFolder folder_;
     std::size_t size_;
     kit::Descriptor file_;
-    const char* mapped_ = nullptr;
+    void* mapped_ = nullptr;
 };
 
 std::string complaint(const kit::LostPages& lost) {
@@ -84,7 +85,7 @@ TEST(LostPagesTest, LaterOneForgetsEarlierPages) {
 template <class Action>
 int endOf(const Action& action) {
     return kit::runCaptured([&action] {
-               std::signal(SIGBUS, SIG_DFL); // a sanitizer may have its own
+               static_cast<void>(std::signal(SIGBUS, SIG_DFL)); // a sanitizer may have its own
                action();
            })
         .exitStatus;

@@ -32,7 +32,7 @@ protected:
         const kit::RunResult result = kit::runCaptured([&] {
             const kit::UnfinishedFolder left(above(), stem, 0777);
             writeFile(left.path() / "file", "half");
-            raise(SIGKILL);
+            static_cast<void>(raise(SIGKILL));
         });
         EXPECT_EQ(result.exitStatus, 128 + SIGKILL);
     }
