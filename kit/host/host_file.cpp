@@ -8,6 +8,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
 #include <cstdlib>
 #include <string>
 
@@ -85,7 +86,7 @@ void requireFolder(const std::filesystem::path& folder) {
 
 std::filesystem::path temporaryFolder() {
     const char* const wanted = std::getenv("TMPDIR");
-    std::filesystem::path folder = wanted == nullptr || *wanted == '\0' ? "/tmp" : wanted;
+    std::filesystem::path folder = wanted == nullptr || *wanted == '\0' ? P_tmpdir : wanted;
     try {
         requireFolder(folder);
     } catch (const KitError& error) {

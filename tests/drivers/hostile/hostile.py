@@ -147,7 +147,7 @@ class Scene:
         expected = {*os.listdir(self.made)}
         line = [os.fspath(word) for word in words]
         said = self._start(line)
-        wrong = [*faults.end_faults(said.status, said.stdout, said.stderr),
+        wrong = [*faults.end_faults(line[0], said.status, said.stdout, said.stderr),
                  *faults.printed_faults("standard output", said.stdout),
                  *faults.printed_faults("standard error", said.stderr)]
         for folder, state in self.states.items():

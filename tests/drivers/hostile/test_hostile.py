@@ -27,13 +27,16 @@ class Printed(unittest.TestCase):
 class Ends(unittest.TestCase):
     def test_good_ends(self) -> None:
         for end in ((0, b"text\n", b""), (1, b"text\n", b""), (2, b"", b"orvane-unit: a\norvane-unit: b\n")):
-            self.assertEqual(faults.end_faults(*end), [], end)
+            self.assertEqual(faults.end_faults("show", *end), [], end)
+
+    def test_check_reports_other_cases_beside_a_bad_one(self) -> None:
+        self.assertEqual(faults.end_faults("check", 2, b"case  not checked\n", b"orvane-unit: a\n"), [])
 
     def test_bad_ends(self) -> None:
         for end in ((-11, b"", b""), (-99, b"", b""), (3, b"", b"orvane-unit: a\n"), (2, b"", b""),
                     (2, b"", b"a\n"), (2, b"", b"orvane-unit: \n"), (0, b"", b"orvane-unit: a\n"),
                     (2, b"half of a report", b"orvane-unit: a\n")):
-            self.assertEqual(len(faults.end_faults(*end)), 1, end)
+            self.assertEqual(len(faults.end_faults("show", *end)), 1, end)
 
     def test_json(self) -> None:
         self.assertEqual(faults.parsed("show", b'{"format":1,"command":"show"}\n')[1], [])
