@@ -95,13 +95,25 @@ fs::file_type kindIfThere(const fs::path& path) {
     return fs::symlink_status(path, ignored).type();
 }
 
-/// Whoever follows a link may write outside the case.
-void refuseLinks(const fs::path& folder) {
+void refuseLink(const fs::path& path) {
+    if (kindIfThere(path) == fs::file_type::symlink) {
+        throw kit::KitError("cannot update ", path, ": it is a link");
+    }
+}
+
+/// Whoever follows a link may write outside the case. A link in the place of a file below `tmp` is
+/// replaced, and not followed.
+void refuseLinks(const fs::path& folder, const std::map<std::string, std::string>& files) {
     const fs::path expected = folder / EXPECTED;
     for (const fs::path& path :
          {folder, expected, expected / LIST, expected / TMP, expected / STANDARD_ERROR}) {
-        if (kindIfThere(path) == fs::file_type::symlink) {
-            throw kit::KitError("cannot update ", path, ": it is a link");
+        refuseLink(path);
+    }
+    for (const auto& [path, content] : files) {
+        fs::path above = expected;
+        for (const fs::path& name : fs::path(path).parent_path()) {
+            above /= name;
+            refuseLink(above);
         }
     }
 }
@@ -183,10 +195,10 @@ std::vector<std::string> differencesFromExpected(const fs::path& folder,
 }
 
 void replaceExpected(const fs::path& folder, const RunOutcome& outcome) {
-    refuseLinks(folder);
+    const std::map<std::string, std::string> files = tableOf(outcome);
+    refuseLinks(folder, files);
     const fs::path expected = folder / EXPECTED;
     const bool isThere = kindIfThere(expected) != fs::file_type::not_found;
-    const std::map<std::string, std::string> files = tableOf(outcome);
     std::set<std::string> left = presentTable(expected);
     for (const auto& [path, content] : files) {
         left.insert(path);

@@ -11,7 +11,6 @@
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
-
 #include <algorithm>
 
 namespace orvane::test {
@@ -202,6 +201,26 @@ TEST_F(CaseCheckTest, UpdateRefusesLinks) {
         EXPECT_EQ(treeStates(elsewhere.path()), before);
         fs::remove(folder() / path);
         fs::rename(out, folder() / path);
+    }
+}
+
+/// A folder of /tmp that the unit brings along stands deeper in the expectation.
+TEST_F(CaseCheckTest, UpdateWritesThroughNoLinkBelow) {
+    writeFile(folder() / "one/unit.toml", "[files]\n\"/tmp/folder/deep/note\" = \"unit\\n\"\n");
+    const fs::path out = folder() / "out";
+    for (const char* const path : {"tmp/folder", "tmp/folder/deep"}) {
+        fs::remove_all(out);
+        fs::create_directories(out / "deep");
+        writeFile(out / "note", "keep\n");
+        writeFile(out / "deep/note", "keep\n");
+        fs::remove_all(expected() / "tmp");
+        fs::create_directories((expected() / path).parent_path());
+        fs::create_symlink(out, expected() / path);
+        const CaseResult result = updated();
+        EXPECT_EQ(result.update, desk::CaseUpdate::refused) << path;
+        EXPECT_EQ(result.fault, "cannot update " + (expected() / path).string() + ": it is a link");
+        EXPECT_EQ(readFile(out / "note"), "keep\n") << path;
+        EXPECT_EQ(readFile(out / "deep/note"), "keep\n") << path;
     }
 }
 
