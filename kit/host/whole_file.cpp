@@ -13,6 +13,7 @@
 #include <cerrno>
 #include <cstddef>
 #include <string>
+#include <system_error>
 
 namespace orvane::kit {
 
@@ -70,17 +71,6 @@ Bytes readWholeFile(const std::filesystem::path& file, std::uint64_t limit) {
     return readToEnd(descriptor, file, limit);
 }
 
-std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file) {
-    const Descriptor descriptor = openStream(file);
-    if (!descriptor.isOpen() && (errno == ENOENT || errno == ENOTDIR)) {
-        return std::nullopt;
-    }
-    if (!descriptor.isOpen()) {
-        throw readError(file);
-    }
-    return readToEnd(descriptor, file, LONGEST_READ);
-}
-
 void requireShort(const std::filesystem::path& file, std::uint64_t limit) {
     struct stat state {};
     if (::stat(file.c_str(), &state) == 0) {
@@ -96,6 +86,14 @@ Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit) {
     }
     failIfTooLong(state, file, limit);
     return readAt(descriptor, file, 0, static_cast<std::uint64_t>(state.st_size));
+}
+
+std::optional<Bytes> readRegularFileIfThere(const std::filesystem::path& file) {
+    std::error_code error;
+    if (std::filesystem::status(file, error).type() == std::filesystem::file_type::not_found) {
+        return std::nullopt;
+    }
+    return readRegularFile(file, LONGEST_READ);
 }
 
 } // namespace orvane::kit

@@ -18,13 +18,14 @@ constexpr std::uint64_t LONGEST_READ = std::uint64_t{256} << 20U;
 /// All bytes up to the end of `file`, which may be a pipe or a device, of at most `limit` bytes.
 Bytes readWholeFile(const std::filesystem::path& file, std::uint64_t limit = LONGEST_READ);
 
-/// The same with the usual limit; nothing where there is no such file.
-std::optional<Bytes> readWholeFileIfThere(const std::filesystem::path& file);
-
 /// Throws KitError when `file` is a regular one of more than `limit` bytes.
 void requireShort(const std::filesystem::path& file, std::uint64_t limit);
 
-/// All bytes of the regular file `file`, a link to one included, of at most `limit` bytes.
+/// All bytes of the regular file `file`, a link to one included, of at most `limit` bytes. Never
+/// waits at a pipe.
 Bytes readRegularFile(const std::filesystem::path& file, std::uint64_t limit);
+
+/// The same with the usual limit; nothing where there is no such file.
+std::optional<Bytes> readRegularFileIfThere(const std::filesystem::path& file);
 
 } // namespace orvane::kit

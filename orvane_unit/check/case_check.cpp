@@ -55,7 +55,7 @@ std::vector<fs::path> caseFolders(const fs::path& folder) {
 }
 
 std::vector<std::string> argumentsOf(const fs::path& folder) {
-    const std::optional<std::string> text = kit::readWholeFileIfThere(folder / "arguments");
+    const std::optional<std::string> text = kit::readRegularFileIfThere(folder / "arguments");
     if (!text) {
         return {"-a", "-i"};
     }
@@ -167,7 +167,10 @@ struct CaseRun {
 /// Runs the case in a unit that it makes at `root`, and compares with what holds for every run.
 CaseRun runCase(const fs::path& folder, const fs::path& binary, const fs::path& root,
                 CaseResult& result) {
-    kit::makeUnit(kit::readDescription(folder / "unit.toml"), root);
+    const fs::path description = folder / "unit.toml"; // no pipe, unlike that of the command `new`
+    kit::makeUnit(kit::parseDescription(kit::readRegularFile(description, kit::LONGEST_DESCRIPTION),
+                                        description),
+                  root);
     const std::vector<std::string> arguments = argumentsOf(folder);
     const Explanation explanation = explainUnit(root, arguments);
     addReasons(explanation, result.reasons);

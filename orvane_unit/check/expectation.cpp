@@ -84,7 +84,7 @@ std::map<std::string, std::string> tableOf(const RunOutcome& outcome) {
 std::set<std::string> presentTable(const fs::path& expected) {
     std::set<std::string> paths = {LIST, STANDARD_ERROR};
     for (const std::string& name :
-         linesOf(kit::readWholeFileIfThere(expected / LIST).value_or(""))) {
+         linesOf(kit::readRegularFileIfThere(expected / LIST).value_or(""))) {
         paths.insert(std::string(TMP) + "/" + name);
     }
     return paths;
@@ -175,10 +175,10 @@ std::vector<std::string> differencesFromExpected(const fs::path& folder,
     const fs::path expected = folder / EXPECTED;
     std::vector<std::string> differences;
     if (outcome.end.standardError !=
-        kit::readWholeFileIfThere(expected / STANDARD_ERROR).value_or("")) {
+        kit::readRegularFileIfThere(expected / STANDARD_ERROR).value_or("")) {
         differences.emplace_back("standard error differs");
     }
-    const std::optional<std::string> list = kit::readWholeFileIfThere(expected / LIST);
+    const std::optional<std::string> list = kit::readRegularFileIfThere(expected / LIST);
     if (!list) {
         differences.push_back(std::string(EXPECTED) + "/" + LIST + " is missing");
         return differences;
@@ -187,7 +187,7 @@ std::vector<std::string> differencesFromExpected(const fs::path& folder,
     compareEntries(linesOf(listOf(outcome.tmp)), wanted, differences);
     for (const auto& [path, content] : outcome.tmp.entries) {
         if (content && wanted.count(path) != 0 &&
-            *content != kit::readWholeFileIfThere(expected / TMP / path)) {
+            *content != kit::readRegularFileIfThere(expected / TMP / path)) {
             differences.push_back(pathInTmp(path) + " differs");
         }
     }

@@ -11,6 +11,8 @@
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
+
 #include <algorithm>
 
 namespace orvane::test {
@@ -221,6 +223,21 @@ TEST_F(CaseCheckTest, UpdateWritesThroughNoLinkBelow) {
         EXPECT_EQ(result.fault, "cannot update " + (expected() / path).string() + ": it is a link");
         EXPECT_EQ(readFile(out / "note"), "keep\n") << path;
         EXPECT_EQ(readFile(out / "deep/note"), "keep\n") << path;
+    }
+}
+
+/// Nobody writes into the pipes, and a signal would not end the wait.
+TEST_F(CaseCheckTest, PipeInACaseIsRefusedAtOnce) {
+    for (const char* const path : {"unit.toml", "arguments", "expected/tmp.list",
+                                   "expected/tmp/airplay.conf", "expected/stderr"}) {
+        const fs::path file = folder() / "one" / path;
+        const std::string former = fs::exists(file) ? readFile(file) : "";
+        fs::remove(file);
+        ASSERT_EQ(::mkfifo(file.c_str(), 0600), 0);
+        const CaseResult result = check().cases.at(0);
+        EXPECT_EQ(result.fault, file.string() + " is not a regular file");
+        fs::remove(file);
+        writeFile(file, former);
     }
 }
 
