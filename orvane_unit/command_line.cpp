@@ -64,6 +64,12 @@ void complain(const std::string& what) {
     std::cerr << "orvane-unit: " << kit::printable(what) << '\n';
 }
 
+/// What a program has printed, as lines: what follows it begins a new one.
+std::string linesOf(const std::string& printed) {
+    const bool isWithoutEnd = !printed.empty() && printed.back() != '\n';
+    return kit::printableLines(printed) + (isWithoutEnd ? "\n" : "");
+}
+
 /// What is wrong with a value that must not be empty; empty if nothing is.
 std::string emptyFault(const std::string& value) {
     return value.empty() ? "the value is empty" : "";
@@ -269,8 +275,8 @@ public:
         if (isJson_) {
             out << runJson(root_, result, before, after) << '\n';
         } else {
-            out << kit::printableLines(result.standardOutput);
-            std::cerr << kit::printableLines(result.standardError);
+            out << linesOf(result.standardOutput);
+            std::cerr << linesOf(result.standardError);
             printTmpChanges(out, before, after, isBrief_);
         }
         if (result.exitStatus != 0) {

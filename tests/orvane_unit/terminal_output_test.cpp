@@ -104,6 +104,17 @@ TEST_P(TerminalOutputTest, NoReportHasWhatATerminalObeys) {
     }
 }
 
+/// The complaint after a message of the tool that has no line end begins a line, and so does the
+/// list of changes.
+TEST(TerminalOutputLinesTest, WhatFollowsTheToolsOutputBeginsALine) {
+    const DescribedUnit unit;
+    const kit::RunResult result =
+        startOnUnit({"run", unit.root(), "--brief", "--orvane", "/bin/sh", "--", "-c",
+                     "printf out; printf message >&2; >/tmp/made; exit 3"});
+    EXPECT_EQ(result.standardError, "message\norvane-unit: orvane ended with exit status 3\n");
+    EXPECT_EQ(result.standardOutput, "out\nmade /tmp/made, 0 bytes\n");
+}
+
 TEST_P(TerminalOutputTest, NoJsonHasWhatATerminalObeys) {
     const HostileUnit hostile(GetParam());
     const DescribedUnit plain;
