@@ -500,15 +500,16 @@ int chooseAndRun(int argc, const char* const* argv, std::ostream& out) {
 } // namespace
 
 int runCommandLine(int argc, const char* const* argv) {
-    static_cast<void>(
-        ::signal(SIGXFSZ, SIG_IGN)); // a write past the limit for files then fails like any other
+    // A write past the limit for files then fails like any other.
+    static_cast<void>(::signal(SIGXFSZ, SIG_IGN));
     try {
         prepareStandardStreams();
         // Whole: a report that ends in an error is not printed.
         std::ostringstream out;
         const int status = chooseAndRun(argc, argv, out);
         writeStandardOutput(out.str());
-        return status;
+        // What the tool has printed there may be lost, and no line can say so.
+        return std::cerr.good() ? status : EXIT_BAD_INPUT;
     } catch (const kit::KitError& error) {
         complain(error.text());
     } catch (const std::filesystem::filesystem_error& error) {
