@@ -10,7 +10,6 @@
 #include <unistd.h>
 
 #include <array>
-#include <cerrno>
 #include <cstddef>
 #include <string>
 #include <system_error>
