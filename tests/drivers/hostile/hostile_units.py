@@ -107,7 +107,10 @@ def _put_odd(root: Path, place: Path, rng: random.Random, serial: bytes) -> None
 
 
 def _is_file(place: Path) -> bool:
-    return not place.is_symlink() and place.is_file()
+    try:
+        return not place.is_symlink() and place.is_file()
+    except PermissionError:  # a folder above it got such a mode
+        return False
 
 
 def _is_device(place: Path) -> bool:
