@@ -24,25 +24,16 @@ from pathlib import Path
 from drivers import random_units, runner
 from drivers.explain import explanation, reasons, same_tree
 from drivers.random_units import Finding, Question, RandomUnit
+from drivers.unit_tool import MARKER, MARKER_TEXT, Said
 from drivers.units import make_unit
 from model import snapshot
 from model.prediction import parse_options
 from model.tree import Tree
 
-MARKER = ".orvane-unit"
-MARKER_TEXT = b"made by orvane-unit, layout 1\n"
-
 
 @dataclass(frozen=True)
 class Tools(runner.Tools):
     unit_tool: str
-
-
-@dataclass(frozen=True)
-class Said:
-    status: int
-    stdout: bytes
-    stderr: bytes
 
 
 def ask(command: Sequence[str]) -> Said:

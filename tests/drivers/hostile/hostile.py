@@ -30,6 +30,7 @@ from drivers.explain.same_tree import differences as tree_differences
 from drivers.hostile import faults, namespace
 from drivers.hostile.hostile_units import make_hostile_unit, outside_of
 from drivers.random_units import Finding, Question, RandomUnit
+from drivers.unit_tool import Said
 from model import records
 
 # Far longer than any command takes, so that only one that hangs reaches it. In seconds.
@@ -48,13 +49,6 @@ OUTCOMES = (
 class Tools:
     orvane: str
     unit_tool: str
-
-
-@dataclass(frozen=True)
-class Said:
-    status: int
-    stdout: bytes
-    stderr: bytes
 
 
 # A longer file may be a template, of which a run copies every byte.

@@ -11,10 +11,9 @@ from pathlib import Path
 
 from drivers import odd_text
 from drivers.hostile import namespace
+from drivers.unit_tool import MARKER, MARKER_TEXT
 from model import configuration, parts, records
 
-MARKER = ".orvane-unit"
-MARKER_TEXT = b"made by orvane-unit, layout 1\n"
 VERSIONS = "/fs/rwdata/.Version"
 
 # Beside the unit: the working directory of all commands, which none of them may change.

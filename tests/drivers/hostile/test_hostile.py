@@ -9,8 +9,9 @@ import unittest
 from pathlib import Path
 
 from drivers.hostile import faults, hostile
-from drivers.hostile.hostile_units import MARKER, outside_of
+from drivers.hostile.hostile_units import outside_of
 from drivers.random_units import RandomUnit
+from drivers.unit_tool import MARKER
 from model import parts, records
 
 
