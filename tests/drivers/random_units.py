@@ -4,7 +4,6 @@
 from __future__ import annotations
 
 import argparse
-import multiprocessing
 import random
 import tempfile
 from collections import Counter
@@ -136,8 +135,8 @@ def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str)
     indices = [options.only] if single else range(options.units)
     reached: Counter[str] = Counter()
     differing = 0
-    with multiprocessing.Pool(options.jobs) as pool:
-        for report in pool.imap(partial(_check, question, tools, options.seed), indices, CHUNK):
+    with runner.workers(options.jobs) as pool:
+        for report in pool.map(partial(_check, question, tools, options.seed), indices, chunksize=CHUNK):
             if report.broken:
                 print(f"{question.name}: unit {report.index} was not run: {report.broken}")
                 return 2

@@ -4,11 +4,13 @@
 from __future__ import annotations
 
 import argparse
+import contextlib
 import os
 import shlex
 import subprocess
 import sys
-from collections.abc import Mapping, Sequence
+from collections.abc import Iterator, Mapping, Sequence
+from concurrent.futures import ProcessPoolExecutor
 from dataclasses import dataclass
 from pathlib import Path
 
@@ -62,6 +64,20 @@ def again(driver: str, options: argparse.Namespace, *more: object) -> str:
     emulator = ["--emulator", options.emulator] if options.emulator else []
     return shlex.join(["python3", sys.argv[0], driver, "--orvane", options.orvane,
                        "--enter", options.enter, *emulator, *map(str, more)])
+
+
+@contextlib.contextmanager
+def workers(jobs: int) -> Iterator[ProcessPoolExecutor]:
+    """Processes that work side by side. What they have not begun at the end is left out.
+
+    A worker that dies is an error here; multiprocessing.Pool would wait for it for ever. And no signal ends
+    a worker, which a handler of this process, being the worker's too, could make it miss.
+    """
+    executor = ProcessPoolExecutor(jobs)
+    try:
+        yield executor
+    finally:
+        executor.shutdown(cancel_futures=True)
 
 
 @dataclass(frozen=True)

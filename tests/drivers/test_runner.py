@@ -3,6 +3,11 @@
 
 from __future__ import annotations
 
+import os
+import signal
+import time
+import unittest
+from concurrent.futures.process import BrokenProcessPool
 from dataclasses import replace
 
 from drivers import runner
@@ -50,3 +55,22 @@ class Launching(UnitCase):
         for command in (["sh", "-c", "echo why >&2; exit 125"], [str(self.root / "none")]):
             with self.assertRaises(runner.BrokenRun):
                 runner.run(command, self.root)
+
+
+def end_like(number: int) -> None:
+    if number == 1:
+        os.kill(os.getpid(), signal.SIGKILL)
+
+
+class Workers(unittest.TestCase):
+    def test_a_worker_that_dies_is_no_silence(self) -> None:
+        with self.assertRaises(BrokenProcessPool):
+            with runner.workers(2) as pool:
+                list(pool.map(end_like, range(3)))
+
+    def test_what_is_not_begun_is_left_out(self) -> None:
+        with runner.workers(1) as pool:
+            asked = [pool.submit(time.sleep, 0.01) for _ in range(100)]
+            asked[0].result()
+        self.assertTrue(all(each.done() for each in asked))
+        self.assertTrue(asked[-1].cancelled())

@@ -11,7 +11,6 @@ Exit status: 0 all agree, 1 a difference, 2 the tool could not be run.
 from __future__ import annotations
 
 import argparse
-import multiprocessing
 import os
 import shutil
 import subprocess
@@ -163,8 +162,8 @@ def run_all(tools: Tools, jobs: int, every: int) -> int:
         raise SystemExit(f"faults: every {every}th leaves out a kind of fault")
     injected: Counter[tuple[int, str]] = Counter()
     agreed: Counter[tuple[int, str]] = Counter()
-    with multiprocessing.Pool(jobs) as pool:
-        for injection, lines in pool.imap(check, injections, 8):
+    with runner.workers(jobs) as pool:
+        for injection, lines in pool.map(check, injections, chunksize=8):
             key = (injection.scenario, injection.call.name)
             injected[key] += 1
             agreed[key] += not lines
