@@ -108,7 +108,14 @@ def _put_odd(root: Path, place: Path, rng: random.Random, serial: bytes) -> None
 def _is_file(place: Path) -> bool:
     try:
         return not place.is_symlink() and place.is_file()
-    except PermissionError:  # a folder above it got such a mode
+    except OSError:  # nobody gets past a folder above it
+        return False
+
+
+def _is_folder(place: Path) -> bool:
+    try:
+        return not place.is_symlink() and place.is_dir()
+    except OSError:
         return False
 
 
@@ -131,7 +138,7 @@ def _put_ordinary(root: Path, path: str, rng: random.Random, serial: bytes) -> N
 
 def _put_version_files(root: Path, rng: random.Random, serial: bytes) -> None:
     folder = root / VERSIONS[1:]
-    if folder.is_symlink() or not folder.is_dir():
+    if not _is_folder(folder):
         return
     parts.put_version(root, odd_text.version_text(rng), name="0.inf")
     for name in rng.sample([*NAMES, serial.replace(b"\0", b"").replace(b"/", b"") + b".inf"], rng.randrange(5)):
@@ -150,7 +157,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
     serial = _serial(rng)
     for path in FOLDERS:
         place = root / path[1:]
-        if not os.path.lexists(place.parent) or place.parent.is_symlink() or not place.parent.is_dir():
+        if not _is_folder(place.parent):
             continue
         if rng.random() < oddness / 8:
             _put_odd(root, place, rng, serial)
@@ -158,7 +165,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
             place.mkdir()
     for path in FILES:
         place = root / path[1:]
-        if place.parent.is_symlink() or not place.parent.is_dir() or os.path.lexists(place):
+        if not _is_folder(place.parent) or os.path.lexists(place):
             continue
         if rng.random() < oddness:
             _put_odd(root, place, rng, serial)
@@ -168,7 +175,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
     if rng.random() < oddness:
         name = rng.choice(NAMES)
         place = Path(os.fsdecode(os.fsencode(root / rng.choice(("", "tmp"))) + b"/" + name))
-        if place.parent.is_dir() and not os.path.lexists(place):
+        if _is_folder(place.parent) and not os.path.lexists(place):
             _put_odd(root, place, rng, serial)
     if rng.random() < 0.05:
         _put_odd(root, root / MARKER, rng, serial)
