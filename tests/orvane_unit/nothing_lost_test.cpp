@@ -5,9 +5,9 @@
 #include "kit/enter/captured_run.h"
 #include "kit/host/folder_lock.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/folder_names.h"
 #include "tests/support/holder_named.h"
-#include "tests/support/host_command.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
@@ -29,17 +29,6 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-
-using CommandLine = std::vector<std::string>;
-
-CommandLine operator+(CommandLine first, const CommandLine& second) {
-    first.insert(first.end(), second.begin(), second.end());
-    return first;
-}
-
-CommandLine orvaneUnit(const CommandLine& words) {
-    return buildCommand(ORVANE_UNIT_BINARY) + words;
-}
 
 /// A unit, a folder of one case, and a folder for the program's temporary files.
 class NothingLostTest : public ::testing::Test {
@@ -72,17 +61,17 @@ protected:
     }
 
     /// Runs a command under strace, which does `injection` (its option of that name).
-    kit::RunResult injected(const std::string& injection, const CommandLine& words) const {
+    kit::RunResult injected(const std::string& injection, const Words& words) const {
         return runOnHost(
-            CommandLine{"strace", "-qq", "-o", "/dev/null", "-e", "inject=" + injection, "-E",
-                        "ASAN_OPTIONS=detect_leaks=0", // LeakSanitizer would trace the process, too
-                        "-E", "TMPDIR=" + temporary().string()} +
+            Words{"strace", "-qq", "-o", "/dev/null", "-e", "inject=" + injection, "-E",
+                  "ASAN_OPTIONS=detect_leaks=0", // LeakSanitizer would trace the process, too
+                  "-E", "TMPDIR=" + temporary().string()} +
             orvaneUnit(words));
     }
 
     /// Runs the program, and lets the system send it `signal` at its first call of `systemCall`.
     kit::RunResult interrupted(const std::string& systemCall, const std::string& signal,
-                               const CommandLine& words) const {
+                               const Words& words) const {
         return injected(systemCall + ":signal=" + signal + ":when=1", words);
     }
 };
@@ -100,7 +89,7 @@ TEST_F(NothingLostTracedTest, InterruptedCommandsLeaveNothing) {
     const std::string cases = folder() / "cases";
     for (const Interruption& signal : INTERRUPTIONS_TRIED) {
         SCOPED_TRACE(signal.name);
-        const auto expectInterrupted = [&](const char* systemCall, const CommandLine& words) {
+        const auto expectInterrupted = [&](const char* systemCall, const Words& words) {
             SCOPED_TRACE(words[0]);
             const kit::RunResult result = interrupted(systemCall, signal.name, words);
             EXPECT_EQ(result.exitStatus, 128 + signal.number);
@@ -135,7 +124,7 @@ bool isRunning(const std::string& argument) {
     return false;
 }
 
-pid_t startInBackground(CommandLine command) {
+pid_t startInBackground(Words command) {
     const pid_t child = fork();
     if (child == 0) {
         std::vector<char*> argv;
@@ -174,11 +163,10 @@ TEST_F(NothingLostTest, InterruptionAndKillEndTheProgramThatRuns) {
 }
 
 TEST_F(NothingLostTracedTest, IgnoredHangUpInterruptsNothing) {
-    const kit::RunResult result =
-        runOnHost(CommandLine{"sh", "-c", "trap '' HUP; exec \"$@\"", "sh", "strace", "-qq", "-o",
-                              "/dev/null", "-e", "inject=ftruncate:signal=SIGHUP:when=1", "-E",
-                              "ASAN_OPTIONS=detect_leaks=0"} +
-                  orvaneUnit({"new", folder() / "made"}));
+    const kit::RunResult result = runOnHost(
+        Words{"sh", "-c", "trap '' HUP; exec \"$@\"", "sh", "strace", "-qq", "-o", "/dev/null",
+              "-e", "inject=ftruncate:signal=SIGHUP:when=1", "-E", "ASAN_OPTIONS=detect_leaks=0"} +
+        orvaneUnit({"new", folder() / "made"}));
     EXPECT_EQ(result.exitStatus, 0);
     EXPECT_TRUE(exists(folder() / "made/.orvane-unit"));
 }
@@ -201,7 +189,7 @@ TEST_F(NothingLostTracedTest, NextCallRemovesWhatAKillLeaves) {
 
     EXPECT_EQ(interrupted("ftruncate", "SIGKILL", {"check", cases}).exitStatus, 137);
     EXPECT_EQ(folderNames(temporary()).size(), 1U);
-    runOnHost(CommandLine{"env", "TMPDIR=" + temporary().string()} + orvaneUnit({"check", cases}));
+    runOnHost(Words{"env", "TMPDIR=" + temporary().string()} + orvaneUnit({"check", cases}));
     EXPECT_EQ(folderNames(temporary()), std::set<std::string>{});
 }
 
@@ -232,7 +220,7 @@ TEST_F(NothingLostTracedTest, KilledUpdateLeavesTheOldExpectationOrTheNew) {
             EXPECT_EQ(exists(expected / "tmp/older"), isOld);
             EXPECT_EQ(exists(expected / "tmp/airplay.conf"), !isOld);
             EXPECT_EQ(readFile(expected / "notes"), "of a person");
-            runOnHost(CommandLine{"env", "TMPDIR=" + temporary().string()} +
+            runOnHost(Words{"env", "TMPDIR=" + temporary().string()} +
                       orvaneUnit({"check", cases, "--update"}));
             EXPECT_EQ(list(), made);
             EXPECT_EQ(folderNames(one), (std::set<std::string>{"expected", "unit.toml"}));
@@ -299,12 +287,12 @@ dd if=/dev/zero of="$0/rest" bs=4096 2>/dev/null
 echo $?
 "$@" show "$0/unit" --only params | grep '^ *22 '
 )";
-    CommandLine command = {"unshare", "--mount"};
+    Words command = {"unshare", "--mount"};
     if (geteuid() != 0) {
         command.push_back("--map-root-user");
     }
     const kit::RunResult result =
-        runOnHost(command + CommandLine{"sh", "-c", script, mounted, mounted} + orvaneUnit({}));
+        runOnHost(command + Words{"sh", "-c", script, mounted, mounted} + orvaneUnit({}));
     if (result.exitStatus == 77 || result.standardError.find("unshare") == 0) {
         GTEST_SKIP() << "no file system can be mounted: " << result.standardError;
     }
@@ -334,8 +322,8 @@ TEST_F(NothingLostTest, LimitForFilesIsAnErrorLikeAFullDisk) {
 TEST_F(NothingLostTest, UnitThatIsBeingChangedIsLeftAlone) {
     const std::string before = explained();
     const kit::FolderLock lock(unit());
-    for (const CommandLine& words :
-         {CommandLine{"set", unit(), "param.22=0"}, CommandLine{"run", unit(), "--", "-a"}}) {
+    for (const Words& words :
+         {Words{"set", unit(), "param.22=0"}, Words{"run", unit(), "--", "-a"}}) {
         const kit::RunResult result = runOnHost(orvaneUnit(words));
         EXPECT_EQ(result.exitStatus, 2);
         EXPECT_EQ(result.standardOutput, "");
@@ -362,8 +350,8 @@ first=$!
 (complaint=$0.2; again "$@" tuning.3.qwaAGCSwitch=qwaOn) &
 wait $! && wait $first
 )";
-    const kit::RunResult result = runOnHost(
-        CommandLine{"sh", "-c", script, folder() / "complaint"} + orvaneUnit({"set", unit()}));
+    const kit::RunResult result =
+        runOnHost(Words{"sh", "-c", script, folder() / "complaint"} + orvaneUnit({"set", unit()}));
     EXPECT_EQ(result.exitStatus, 0) << result.standardError;
     const std::string shown =
         runOnHost(orvaneUnit({"show", unit(), "--only", "tuning"})).standardOutput;
@@ -373,14 +361,13 @@ wait $! && wait $first
 
 TEST_F(NothingLostTest, NewAndCaptureFillTheWorkingDirectoryOfTheirCaller) {
     const std::string empty = folder() / "empty";
-    for (const CommandLine& words :
-         {CommandLine{"new", "."}, CommandLine{"new", empty + "/."},
-          CommandLine{"capture", unit(), "."}, CommandLine{"capture", unit(), empty}}) {
+    for (const Words& words : {Words{"new", "."}, Words{"new", empty + "/."},
+                               Words{"capture", unit(), "."}, Words{"capture", unit(), empty}}) {
         SCOPED_TRACE(words[0] + " " + words.back());
         fs::create_directory(empty);
         // ls looks into the folder in which it has been started, not into one of the same name.
-        const kit::RunResult result = runOnHost(
-            CommandLine{"sh", "-c", "cd \"$0\" && \"$@\" && ls -A", empty} + orvaneUnit(words));
+        const kit::RunResult result =
+            runOnHost(Words{"sh", "-c", "cd \"$0\" && \"$@\" && ls -A", empty} + orvaneUnit(words));
         EXPECT_EQ(result.exitStatus, 0) << result.standardError;
         EXPECT_EQ(result.standardOutput, ".orvane-unit\ndev\nfs\ntmp\n");
         fs::remove_all(empty);

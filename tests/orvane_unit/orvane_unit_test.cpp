@@ -7,8 +7,8 @@
 #include "kit/host/text.h"
 #include "kit/unit/marker.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/full_memory.h"
-#include "tests/support/host_command.h"
 #include "tests/support/unit_test.h"
 
 #include <linux/capability.h>
@@ -24,18 +24,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-using Words = std::vector<std::string>;
-
-Words commandLine(const Words& words) {
-    Words command = buildCommand(ORVANE_UNIT_BINARY);
-    command.insert(command.end(), words.begin(), words.end());
-    return command;
-}
-
-kit::RunResult start(const Words& words) {
-    return runOnHost(commandLine(words));
-}
-
 void expectRan(const kit::RunResult& result, int status, const std::string& output,
                const std::string& error = "") {
     EXPECT_EQ(result.exitStatus, status);
@@ -44,19 +32,19 @@ void expectRan(const kit::RunResult& result, int status, const std::string& outp
 }
 
 void expectRefused(const Words& words, const std::string& complaint) {
-    expectRan(start(words), 2, "", "orvane-unit: " + complaint + "\n");
+    expectRan(runOrvaneUnit(words), 2, "", "orvane-unit: " + complaint + "\n");
 }
 
 const Words COMMANDS = {"new", "describe", "set",    "show",    "explain",
                         "run", "diff",     "impact", "capture", "check"};
 
 TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
-    const kit::RunResult help = start({"--help"});
+    const kit::RunResult help = runOrvaneUnit({"--help"});
     EXPECT_EQ(help.exitStatus, 0);
     EXPECT_EQ(help.standardError, "");
     for (const std::string& command : COMMANDS) {
         EXPECT_NE(help.standardOutput.find("\n  " + command + " "), std::string::npos) << command;
-        const kit::RunResult result = start({command, "--help"});
+        const kit::RunResult result = runOrvaneUnit({command, "--help"});
         EXPECT_EQ(result.exitStatus, 0) << command;
         EXPECT_NE(result.standardOutput.find("Example:\n  orvane-unit " + command),
                   std::string::npos)
@@ -78,7 +66,7 @@ TEST(OrvaneUnitTest, WrongUseIsRefused) {
          {Words{"explain", "a", "--content"}, Words{"new"}, Words{"show", "a", "--json=no"},
           Words{"diff", "a"}, Words{"show", "a", "--only", "engine"}, Words{"run", "a", "--wrong"},
           Words{"set", "a"}}) {
-        const kit::RunResult result = start(words);
+        const kit::RunResult result = runOrvaneUnit(words);
         EXPECT_EQ(result.exitStatus, 2);
         EXPECT_EQ(result.standardOutput, "");
         EXPECT_EQ(result.standardError.compare(0, 13, "orvane-unit: "), 0) << result.standardError;
@@ -89,9 +77,9 @@ TEST(OrvaneUnitTest, NewMakesTheDescribedOrTheSampleUnit) {
     const TemporaryFolder folder;
     const std::string description = folder.path() / "unit.toml";
     writeFile(description, "[files]\n\"/tmp/old\" = \"text\"\n");
-    expectRan(start({"new", folder.path() / "one", "--from", description}), 0, "");
+    expectRan(runOrvaneUnit({"new", folder.path() / "one", "--from", description}), 0, "");
     EXPECT_EQ(readFile(folder.path() / "one/tmp/old"), "text");
-    expectRan(start({"new", folder.path() / "two"}), 0, "");
+    expectRan(runOrvaneUnit({"new", folder.path() / "two"}), 0, "");
     EXPECT_TRUE(exists(folder.path() / "two/fs/mp/etc/airplay_static.conf"));
 }
 
@@ -107,39 +95,39 @@ TEST(OrvaneUnitTest, NewMakesNothingFromABadDescription) {
 
 TEST(OrvaneUnitTest, DescriptionMakesTheSameUnitAgain) {
     const DescribedUnit described;
-    const kit::RunResult result = start({"describe", described.root()});
+    const kit::RunResult result = runOrvaneUnit({"describe", described.root()});
     EXPECT_EQ(result.exitStatus, 0);
     const std::string description = described.folder() / "unit.toml";
     writeFile(description, result.standardOutput);
     const std::string again = described.folder() / "again";
-    expectRan(start({"new", again, "--from", description}), 0, "");
+    expectRan(runOrvaneUnit({"new", again, "--from", description}), 0, "");
     expectRan(runOnHost({"diff", "-r", described.root(), again}), 0, "");
 }
 
 TEST(OrvaneUnitTest, SetChangesAllOrNothing) {
     const DescribedUnit described;
     const std::string root = described.root();
-    expectRan(start({"set", root, "param.22=0", "serial=SN9"}), 0, "");
+    expectRan(runOrvaneUnit({"set", root, "param.22=0", "serial=SN9"}), 0, "");
     expectRefused({"set", root, "param.22=1", "param.139=300"},
                   "param.139=300: parameter 139 is one byte: 300 does not fit");
-    const kit::RunResult shown = start({"explain", root, "-a", "-i"});
+    const kit::RunResult shown = runOrvaneUnit({"explain", root, "-a", "-i"});
     EXPECT_NE(shown.standardOutput.find("rightHandDrive = 0"), std::string::npos);
     EXPECT_NE(shown.standardOutput.find("serial=SN9"), std::string::npos);
 }
 
 TEST(OrvaneUnitTest, ExplainSaysNoForADefault) {
     const DescribedUnit described;
-    EXPECT_EQ(start({"explain", described.root()}).exitStatus, 0);
-    start({"set", described.root(), "param.139=0"});
-    EXPECT_EQ(start({"explain", described.root(), "-i"}).exitStatus, 1);
-    EXPECT_EQ(start({"explain", described.root(), "-i", "--json"}).exitStatus, 1);
+    EXPECT_EQ(runOrvaneUnit({"explain", described.root()}).exitStatus, 0);
+    runOrvaneUnit({"set", described.root(), "param.139=0"});
+    EXPECT_EQ(runOrvaneUnit({"explain", described.root(), "-i"}).exitStatus, 1);
+    EXPECT_EQ(runOrvaneUnit({"explain", described.root(), "-i", "--json"}).exitStatus, 1);
 }
 
 TEST(OrvaneUnitTest, DiffSaysNoForADifference) {
     const DescribedUnit first;
     const DescribedUnit second([](kit::UnitDescription& unit) { unit.image.params[50] = 1; });
-    expectRan(start({"diff", first.root(), first.root()}), 0, "");
-    expectRan(start({"diff", first.root(), second.root()}), 1,
+    expectRan(runOrvaneUnit({"diff", first.root(), first.root()}), 0, "");
+    expectRan(runOrvaneUnit({"diff", first.root(), second.root()}), 1,
               "param.50: 0 -> 1\n  changes no output\n");
 }
 
@@ -150,18 +138,18 @@ TEST(OrvaneUnitTest, RunShowsADiffOrOnlyNames) {
         unit.files["/tmp/other"] = "not written\n";
     });
     const std::string root = described.root();
-    expectRan(start({"run", root, "--", "-a"}), 0,
+    expectRan(runOrvaneUnit({"run", root, "--", "-a"}), 0,
               "--- /tmp/airplay.conf\n+++ /tmp/airplay.conf\n@@ -1,1 +1,1 @@\n-older\n"
               "+airplay stock\n");
-    expectRan(start({"run", root, "--", "-a"}), 0, ""); // the same again
-    expectRan(start({"run", root, "--brief", "--", "-i"}), 0,
+    expectRan(runOrvaneUnit({"run", root, "--", "-a"}), 0, ""); // the same again
+    expectRan(runOrvaneUnit({"run", root, "--brief", "--", "-i"}), 0,
               "made /tmp/iap1.cfg, 254 bytes\nmade /tmp/iap2.cfg, 239 bytes\n"
               "made /tmp/iap2_device.cfg, 263 bytes\n");
 }
 
 TEST(OrvaneUnitTest, RunPassesOnTheToolsMessages) {
     const DescribedUnit described;
-    const kit::RunResult result = start({"run", described.root(), "--", "-x"});
+    const kit::RunResult result = runOrvaneUnit({"run", described.root(), "--", "-x"});
     EXPECT_EQ(result.exitStatus, 0);
     EXPECT_EQ(result.standardOutput, "");
     EXPECT_NE(result.standardError.find("'x'"), std::string::npos);
@@ -169,14 +157,14 @@ TEST(OrvaneUnitTest, RunPassesOnTheToolsMessages) {
 
 TEST(OrvaneUnitTest, OtherExitStatusOfTheToolIsANo) {
     const DescribedUnit described;
-    expectRan(start({"run", described.root(), "--orvane", "/bin/false"}), 1, "",
+    expectRan(runOrvaneUnit({"run", described.root(), "--orvane", "/bin/false"}), 1, "",
               "orvane-unit: orvane ended with exit status 1\n");
 }
 
 TEST(OrvaneUnitTest, RunNeedsAnExistingTool) {
     const DescribedUnit described;
     const kit::RunResult result =
-        start({"run", described.root(), "--orvane", described.folder() / "none"});
+        runOrvaneUnit({"run", described.root(), "--orvane", described.folder() / "none"});
     EXPECT_EQ(result.exitStatus, 2);
     EXPECT_EQ(result.standardOutput, "");
     EXPECT_NE(result.standardError, "");
@@ -211,7 +199,7 @@ TEST(OrvaneUnitTest, RunNeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
                            kit::runCaptured([] {
                                _exit(unshare(CLONE_NEWUSER) == 0 && chroot("/") == 0 ? 0 : 1);
                            }).exitStatus == 0;
-    Words command = commandLine({"run", described.root(), "--brief", "--", "-a"});
+    Words command = orvaneUnit({"run", described.root(), "--brief", "--", "-a"});
     const kit::RunResult result = kit::runCaptured([&command] {
         std::vector<char*> argv;
         for (std::string& word : command) {
@@ -239,7 +227,7 @@ TEST(OrvaneUnitTest, CommandsThatWriteRefuseFoldersWithoutTheMark) {
     for (const Words& words :
          {Words{"run", root, "--", "-a"}, Words{"set", root, "param.1=1"}, Words{"run", "/"},
           Words{"set", "/", "param.1=1"}, Words{"new", "/"}, Words{"capture", root, "/"}}) {
-        const kit::RunResult result = start(words);
+        const kit::RunResult result = runOrvaneUnit(words);
         EXPECT_EQ(result.exitStatus, 2) << words[0] << ' ' << words[1];
         EXPECT_EQ(result.standardOutput, "");
     }
@@ -249,9 +237,9 @@ TEST(OrvaneUnitTest, CommandsThatWriteRefuseFoldersWithoutTheMark) {
 TEST(OrvaneUnitTest, CaptureReplaysAUnit) {
     const DescribedUnit described;
     const std::string field = described.folder() / "field";
-    expectRan(start({"capture", described.root(), field, "--redact-serial"}), 0, "");
+    expectRan(runOrvaneUnit({"capture", described.root(), field, "--redact-serial"}), 0, "");
     EXPECT_EQ(fs::file_size(field + "/dev/hd0"), MEBIBYTE);
-    expectRan(start({"diff", described.root(), field}), 1,
+    expectRan(runOrvaneUnit({"diff", described.root(), field}), 1,
               "slot.9: SN004217 -> XXXXXXXX\n"
               "  /tmp/iap2_device.cfg\n    -serial=SN004217\n    +serial=XXXXXXXX\n"
               "  /tmp/iap2.cfg\n    -serial=SN004217\n    +serial=XXXXXXXX\n"
@@ -262,10 +250,10 @@ TEST(OrvaneUnitTest, CheckSaysNoWithoutAnExpectation) {
     const TemporaryFolder folder;
     fs::create_directory(folder.path() / "one");
     writeFile(folder.path() / "one/unit.toml", "");
-    EXPECT_EQ(start({"check", folder.path()}).exitStatus, 1);
-    EXPECT_EQ(start({"check", folder.path(), "--update"}).exitStatus, 0);
-    EXPECT_EQ(start({"check", folder.path()}).exitStatus, 0);
-    EXPECT_EQ(start({"check", folder.path() / "one"}).exitStatus, 2);
+    EXPECT_EQ(runOrvaneUnit({"check", folder.path()}).exitStatus, 1);
+    EXPECT_EQ(runOrvaneUnit({"check", folder.path(), "--update"}).exitStatus, 0);
+    EXPECT_EQ(runOrvaneUnit({"check", folder.path()}).exitStatus, 0);
+    EXPECT_EQ(runOrvaneUnit({"check", folder.path() / "one"}).exitStatus, 2);
 }
 
 bool isColoured(const kit::RunResult& result) {
@@ -280,15 +268,13 @@ kit::RunResult startAsOnATerminal(const std::string& noColour, const Words& word
     Words command = {"strace", "-qq", "-o", "/dev/null", "-e", "inject=ioctl:retval=0",
                      // LeakSanitizer would trace the process as well
                      "-E", "ASAN_OPTIONS=detect_leaks=0", "-E", noColour};
-    const Words started = commandLine(words);
-    command.insert(command.end(), started.begin(), started.end());
-    return runOnHost(command);
+    return runOnHost(command + orvaneUnit(words));
 }
 
 TEST(OrvaneUnitTest, OutputIsColouredOnlyOnATerminal) {
     const DescribedUnit described;
     const Words words = {"explain", described.root()};
-    EXPECT_FALSE(isColoured(start(words)));
+    EXPECT_FALSE(isColoured(runOrvaneUnit(words)));
     if (buildCommand(ORVANE_UNIT_BINARY).size() > 1) {
         return; // in a cross build; the native builds test this
     }
@@ -301,7 +287,7 @@ TEST(OrvaneUnitTest, ImageThatIsAHoleInFullMemoryEndsNoCommand) {
     const DescribedUnit described;
     const std::string root = described.root();
     const std::string other = described.folder() / "other";
-    expectRan(start({"new", other}), 0, "");
+    expectRan(runOrvaneUnit({"new", other}), 0, "");
     const std::string image = "/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM";
     const std::string complaint =
         "orvane-unit: cannot read " + image +
@@ -309,7 +295,7 @@ TEST(OrvaneUnitTest, ImageThatIsAHoleInFullMemoryEndsNoCommand) {
         "ended there by SIGBUS\n";
     const auto startInFullMemory = [&root](const Words& words) {
         Words command = holeInFullMemory(root);
-        for (const std::string& word : commandLine(words)) {
+        for (const std::string& word : orvaneUnit(words)) {
             command.push_back(word);
         }
         return runOnHost(command);
@@ -330,7 +316,7 @@ TEST(OrvaneUnitTest, ImageThatIsAHoleInFullMemoryEndsNoCommand) {
 
 TEST(OrvaneUnitTest, ShortSerialIsNotRedacted) {
     const DescribedUnit described;
-    expectRan(start({"set", described.root(), "serial=AB1"}), 0, "");
+    expectRan(runOrvaneUnit({"set", described.root(), "serial=AB1"}), 0, "");
     const std::string field = described.folder() / "field";
     expectRefused({"capture", described.root(), field, "--redact-serial"},
                   "a serial of 3 bytes can't be redacted: so few bytes also stand in other places "

@@ -7,6 +7,7 @@
 #include "kit/unit/marker.h"
 #include "orvane_unit/command_line.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/failing_memory.h"
 #include "tests/support/host_command.h"
 #include "tests/support/standard_streams.h"
@@ -18,19 +19,12 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using Words = std::vector<std::string>;
 
 constexpr char PROGRAM[] = "orvane-unit: ";
 
-kit::RunResult start(const Words& words) {
-    Words command = buildCommand(ORVANE_UNIT_BINARY);
-    command.insert(command.end(), words.begin(), words.end());
-    return runOnHost(command);
-}
-
 /// The program's complaint; requires exit status 2 and no other output.
 std::string refusalOf(const Words& words) {
-    const kit::RunResult result = start(words);
+    const kit::RunResult result = runOrvaneUnit(words);
     EXPECT_EQ(result.exitStatus, 2);
     EXPECT_EQ(result.standardOutput, "");
     EXPECT_EQ(result.standardError.compare(0, sizeof PROGRAM - 1, PROGRAM), 0)
@@ -213,7 +207,8 @@ TEST(RefusalTest, ArgumentsWithoutALimitAreNotReadToTheirEnd) {
     writeFile(cases.path() / "one/unit.toml", "");
     const fs::path arguments = cases.path() / "one/arguments";
     const auto complaint = [&cases] {
-        const kit::RunResult result = start({"check", cases.path(), "--orvane", ORVANE_BINARY});
+        const kit::RunResult result =
+            runOrvaneUnit({"check", cases.path(), "--orvane", ORVANE_BINARY});
         EXPECT_EQ(result.exitStatus, 2);
         return result.standardError;
     };

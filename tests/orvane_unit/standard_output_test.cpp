@@ -3,7 +3,7 @@
 // A report is written whole, or the exit status and a line on standard error say that it is not.
 #include "kit/enter/captured_run.h"
 #include "tests/kit/unit/described_unit.h"
-#include "tests/support/host_command.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
@@ -16,15 +16,9 @@ namespace orvane::test {
 
 namespace {
 
-using Words = std::vector<std::string>;
-
 /// Runs the program through a shell with `redirections`.
 kit::RunResult startWith(const std::string& redirections, const Words& words) {
-    Words command = {"sh", "-c", "\"$@\" " + redirections, "sh"};
-    const Words program = buildCommand(ORVANE_UNIT_BINARY);
-    command.insert(command.end(), program.begin(), program.end());
-    command.insert(command.end(), words.begin(), words.end());
-    return runOnHost(command);
+    return runOnHost(Words{"sh", "-c", "\"$@\" " + redirections, "sh"} + orvaneUnit(words));
 }
 
 /// Every command that prints something, and help.

@@ -5,7 +5,7 @@
 #include "kit/enter/captured_run.h"
 #include "kit/host/text.h"
 #include "tests/kit/unit/described_unit.h"
-#include "tests/support/host_command.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
@@ -21,19 +21,12 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using Words = std::vector<std::string>;
 
 /// Erases the screen by each of two means, then ends lines and reverses what follows.
 const std::string OBEYED =
     "\x1b[2J\u009b2J\x7f\r\b\u200e\u2028\u202e\u202c\u2066\u2069\u061c\ufeff\U000e0001";
 /// The same and a byte that is no text.
 const std::string BYTES = OBEYED + "\xff";
-
-kit::RunResult startOnUnit(const Words& words) {
-    Words command = buildCommand(ORVANE_UNIT_BINARY);
-    command.insert(command.end(), words.begin(), words.end());
-    return runOnHost(command);
-}
 
 void expectPrintable(const std::string& output) {
     ASSERT_TRUE(kit::isUtf8(output));
@@ -97,7 +90,7 @@ TEST_P(TerminalOutputTest, NoReportHasWhatATerminalObeys) {
     };
     for (const Words& words : commands) {
         SCOPED_TRACE(words[0]);
-        const kit::RunResult result = startOnUnit(words);
+        const kit::RunResult result = runOrvaneUnit(words);
         EXPECT_LE(result.exitStatus, 1) << result.standardError;
         expectPrintable(result.standardOutput);
         expectPrintable(result.standardError);
@@ -109,8 +102,8 @@ TEST_P(TerminalOutputTest, NoReportHasWhatATerminalObeys) {
 TEST(TerminalOutputLinesTest, WhatFollowsTheToolsOutputBeginsALine) {
     const DescribedUnit unit;
     const kit::RunResult result =
-        startOnUnit({"run", unit.root(), "--brief", "--orvane", "/bin/sh", "--", "-c",
-                     "printf out; printf message >&2; >/tmp/made; exit 3"});
+        runOrvaneUnit({"run", unit.root(), "--brief", "--orvane", "/bin/sh", "--", "-c",
+                       "printf out; printf message >&2; >/tmp/made; exit 3"});
     EXPECT_EQ(result.standardError, "message\norvane-unit: orvane ended with exit status 3\n");
     EXPECT_EQ(result.standardOutput, "out\nmade /tmp/made, 0 bytes\n");
 }
@@ -130,7 +123,7 @@ TEST_P(TerminalOutputTest, NoJsonHasWhatATerminalObeys) {
     };
     for (const Words& words : commands) {
         SCOPED_TRACE(words[0]);
-        const kit::RunResult result = startOnUnit(words);
+        const kit::RunResult result = runOrvaneUnit(words);
         EXPECT_LE(result.exitStatus, 1) << result.standardError;
         EXPECT_EQ(result.standardError, "");
         expectPrintable(result.standardOutput);
@@ -171,7 +164,7 @@ TEST_P(TerminalOutputTest, NoComplaintHasWhatATerminalObeys) {
     };
     for (const Words& words : commands) {
         SCOPED_TRACE(words[0]);
-        const kit::RunResult result = startOnUnit(words);
+        const kit::RunResult result = runOrvaneUnit(words);
         EXPECT_EQ(result.exitStatus, 2);
         EXPECT_EQ(result.standardOutput, "");
         expectPrintable(result.standardError);
@@ -188,11 +181,12 @@ INSTANTIATE_TEST_SUITE_P(Bytes, TerminalOutputTest, ::testing::Values(OBEYED, BY
 /// The description that is printed makes the same unit.
 TEST(DescribedTerminalOutputTest, EscapesAreReadBack) {
     const HostileUnit hostile(BYTES);
-    const kit::RunResult result = startOnUnit({"describe", hostile.root()});
+    const kit::RunResult result = runOrvaneUnit({"describe", hostile.root()});
     ASSERT_EQ(result.exitStatus, 0) << result.standardError;
     writeFile(hostile.folder() / "unit.toml", result.standardOutput);
     const std::string again = hostile.folder() / "again";
-    EXPECT_EQ(startOnUnit({"new", again, "--from", hostile.folder() / "unit.toml"}).exitStatus, 0);
+    EXPECT_EQ(runOrvaneUnit({"new", again, "--from", hostile.folder() / "unit.toml"}).exitStatus,
+              0);
     EXPECT_EQ(runOnHost({"diff", "-r", "--no-dereference", hostile.root(), again}).exitStatus, 0);
 }
 

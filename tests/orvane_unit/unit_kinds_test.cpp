@@ -7,7 +7,7 @@
 #include "kit/enter/captured_run.h"
 #include "kit/host/kit_error.h"
 #include "tests/kit/unit/described_unit.h"
-#include "tests/support/host_command.h"
+#include "tests/orvane_unit/orvane_unit_command.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
@@ -24,15 +24,9 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using Words = std::vector<std::string>;
 using Json = nlohmann::json;
 
 constexpr char VERSION_FILE[] = "/fs/rwdata/.Version/app.inf";
-
-Words operator+(Words words, const Words& more) {
-    words.insert(words.end(), more.begin(), more.end());
-    return words;
-}
 
 class UnitKindsTest : public ::testing::Test {
 protected:

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/param_access.h"
 #include "config/param_catalogue.h"
+#include "tests/product/config/param_numbers.h"
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
@@ -15,9 +16,6 @@
 namespace orvane::test {
 
 namespace {
-
-constexpr std::array<std::uint16_t, 8> TWO_BYTE_PARAMS = {134, 142, 143, 144, 152, 153, 154, 158};
-const std::vector<std::uint16_t> UNKNOWN_NUMBERS = {0, 172, 173, 256, 257, 32768, 32769, 65535};
 
 bool isTwoBytes(std::uint16_t number) {
     return std::find(TWO_BYTE_PARAMS.begin(), TWO_BYTE_PARAMS.end(), number) !=

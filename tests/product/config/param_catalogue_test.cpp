@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/param_catalogue.h"
 #include "tests/product/config/memory_map.h"
+#include "tests/product/config/param_numbers.h"
 
 #include <gtest/gtest.h>
 
@@ -19,8 +20,6 @@ constexpr std::array<std::uint32_t, 9> TYPE_SIZES = {1, 2, 4, 1, 1, 2, 4, 4, 8};
 
 constexpr ParamDescriptor MARKED_ROW = {901, 902, 903, 904, 905, 906, 907};
 constexpr ParamInfo MARKED_INFO = {901, 902, 903, 904};
-
-const std::vector<std::uint16_t> UNKNOWN_NUMBERS = {0, 172, 173, 256, 257, 32768, 32769, 65535};
 
 } // namespace
 

@@ -22,7 +22,7 @@ namespace {
 constexpr std::uint32_t FAILED = 0xFFFFFFFF;
 
 /// The usual CRC-32, by the polynomial, a bit at a time and with the final complement.
-std::uint32_t usualCrc(const std::string& bytes) {
+std::uint32_t referenceCrc(const std::string& bytes) {
     std::uint32_t crc = 0xFFFFFFFFU;
     for (const char byte : bytes) {
         crc ^= static_cast<std::uint8_t>(byte);
@@ -45,16 +45,16 @@ protected:
 };
 
 TEST_F(RecordAreaCrcTest, ReferenceGivesThePublishedCheckValue) {
-    EXPECT_EQ(0xCBF43926U, usualCrc("123456789"));
+    EXPECT_EQ(0xCBF43926U, referenceCrc("123456789"));
 }
 
 TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForZeros) {
     resetDisk(2 * MEBIBYTE);
-    EXPECT_EQ(~usualCrc(std::string(136, '\0')), recordAreaCrc());
+    EXPECT_EQ(~referenceCrc(std::string(136, '\0')), recordAreaCrc());
 }
 
 TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForSlot15) {
-    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    EXPECT_EQ(~referenceCrc(area().substr(1, 136)), recordAreaCrc());
     expectUntouchedDisk();
 }
 
@@ -114,19 +114,19 @@ TEST_F(RecordAreaCrcTest, DiskTooShortForSlot15IsAllOnes) {
 
 TEST_F(RecordAreaCrcTest, DiskThatStartsAtSlot15HasACrc) {
     writeFile(DISK_PATH, area().substr(1));
-    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    EXPECT_EQ(~referenceCrc(area().substr(1, 136)), recordAreaCrc());
 }
 
 TEST_F(RecordAreaCrcTest, DiskLongerThan4GiBIsReadFromItsEnd) {
     resetDisk(5ULL << 30);
     setDiskFromEnd(BASE_FROM_END, area());
-    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    EXPECT_EQ(~referenceCrc(area().substr(1, 136)), recordAreaCrc());
 }
 
 TEST_F(RecordAreaCrcTest, DiskNeedsNoWritePermission) {
     const EnforcedPermissions hold;
     ASSERT_EQ(0, chmod(DISK_PATH, 0444));
-    EXPECT_EQ(~usualCrc(area().substr(1, 136)), recordAreaCrc());
+    EXPECT_EQ(~referenceCrc(area().substr(1, 136)), recordAreaCrc());
     ASSERT_EQ(0, chmod(DISK_PATH, 0222));
     expectFailure();
 }

@@ -2,6 +2,7 @@
 #include "config/config_store.h"
 #include "identity/model_names.h"
 #include "identity/vehicle_identity.h"
+#include "tests/product/image_offsets.h"
 #include "tests/support/unit_test.h"
 
 #include <fstream>
@@ -10,12 +11,6 @@ namespace orvane::test {
 
 /// The caller's string before: longer than any result, so that a remainder shows.
 constexpr char OLD_TEXT[] = "earlier content, longer than any of the results";
-
-/// Where the four one-byte values lie in the image, in bytes.
-constexpr std::uint32_t DRIVE_SIDE_OFFSET = 21;
-constexpr std::uint32_t BRAND_OFFSET = 35;
-constexpr std::uint32_t FUEL_TYPE_OFFSET = 49;
-constexpr std::uint32_t MODEL_OFFSET = 139;
 
 class VehicleIdentityTest : public UnitTest {
 protected:

@@ -20,7 +20,7 @@ namespace {
 using AirplayFallbackTest = AirplayUnitTest;
 
 /// Runs the writer with room for `count` more descriptors.
-int updateWithDescriptors(int count) {
+int updateAirplayWithDescriptors(int count) {
     const rlim_t room = roomForDescriptors(count);
     const ResourceLimit limit(RLIMIT_NOFILE, room);
     return updateAirplayConfigFile();
@@ -157,17 +157,17 @@ TEST_F(AirplayFallbackTest, NothingIsWrittenThroughADanglingLink) {
 }
 
 TEST_F(AirplayFallbackTest, NeedsTwoDescriptorsToGenerate) {
-    EXPECT_EQ(updateWithDescriptors(2), 0);
+    EXPECT_EQ(updateAirplayWithDescriptors(2), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead() + "static = 1\n");
-    EXPECT_EQ(updateWithDescriptors(1), 0);
+    EXPECT_EQ(updateAirplayWithDescriptors(1), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
 TEST_F(AirplayFallbackTest, FirstOutputStaysOpenBesideTheCopy) {
     remove(AIRPLAY_TEMPLATE);
-    EXPECT_EQ(updateWithDescriptors(3), 0);
+    EXPECT_EQ(updateAirplayWithDescriptors(3), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "stock = 1\n");
-    EXPECT_EQ(updateWithDescriptors(2), 0);
+    EXPECT_EQ(updateAirplayWithDescriptors(2), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 

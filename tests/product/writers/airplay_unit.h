@@ -3,6 +3,7 @@
 // A unit with the product data of the AirPlay file, and the expected content of that file.
 #pragma once
 
+#include "tests/product/image_offsets.h"
 #include "tests/support/unit_test.h"
 
 #include <cstdint>
@@ -14,13 +15,6 @@ namespace orvane::test {
 constexpr char AIRPLAY_OUTPUT[] = "/tmp/airplay.conf";
 constexpr char AIRPLAY_TEMPLATE[] = "/fs/mp/etc/airplay_static.conf";
 constexpr char AIRPLAY_STOCK[] = "/fs/mp/etc/airplay.conf";
-
-// Where the values lie in the configuration image, in bytes.
-constexpr std::uint32_t DRIVE_SIDE_OFFSET = 21;
-constexpr std::uint32_t BRAND_OFFSET = 35;
-constexpr std::uint32_t FUEL_TYPE_OFFSET = 49;
-constexpr std::uint32_t PROFILE_OFFSET = 133; ///< two bytes, the low one first
-constexpr std::uint32_t MODEL_OFFSET = 139;
 
 /// These bytes, as a text.
 inline std::string bytes(std::initializer_list<int> values) {

@@ -21,7 +21,7 @@ namespace {
 using IapFallbackTest = IapUnitTest;
 
 /// Runs the writer with room for `count` more descriptors.
-int updateWithDescriptors(int count) {
+int updateIapWithDescriptors(int count) {
     const rlim_t room = roomForDescriptors(count);
     const ResourceLimit limit(RLIMIT_NOFILE, room);
     return updateIapConfigFiles();
@@ -219,11 +219,11 @@ TEST_F(IapFallbackTest, Iap2StockFileThatCannotBeWrittenWholeLeavesIap1Generated
 
 TEST_F(IapFallbackTest, Iap2OutputStaysOpenUntilTheEnd) {
     remove(IAP2_TEMPLATE);
-    EXPECT_EQ(updateWithDescriptors(3), 0);
+    EXPECT_EQ(updateIapWithDescriptors(3), 0);
     EXPECT_EQ(readFile(IAP2_OUTPUT), "iap2 stock\n");
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
     // With one fewer, the stock file gets no output, the version no file, iap1.cfg no template.
-    EXPECT_EQ(updateWithDescriptors(2), 0);
+    EXPECT_EQ(updateIapWithDescriptors(2), 0);
     EXPECT_EQ(readFile(IAP2_OUTPUT), "");
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head({"VOXA", "SN004217", "000000"}));
 }

@@ -2,6 +2,7 @@
 //
 // The values in the three iAP files.
 #include "identity/model_names.h"
+#include "tests/product/image_offsets.h"
 #include "tests/product/writers/iap_unit.h"
 #include "tests/support/file_event_log.h"
 #include "tests/support/folder_names.h"
@@ -18,10 +19,6 @@ namespace orvane::test {
 namespace {
 
 using namespace std::string_literals;
-
-constexpr std::uint32_t BRAND_OFFSET = 35;
-constexpr std::uint32_t FUEL_TYPE_OFFSET = 49;
-constexpr std::uint32_t MODEL_OFFSET = 139;
 
 class IapValuesTest : public IapUnitTest {
 protected:

@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "tests/product/writers/accessory_paths.h"
 #include "tests/support/file_event_log.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"
@@ -11,11 +12,6 @@
 namespace orvane::test {
 
 namespace {
-
-constexpr char OUTPUT[] = "/tmp/output";
-constexpr char TEMPLATE[] = "/fs/template";
-constexpr char STOCK[] = "/fs/stock";
-constexpr AccessoryFile ACCESSORY_FILE{OUTPUT, TEMPLATE, STOCK};
 
 class StockFileTest : public UnitTest {
 protected:
