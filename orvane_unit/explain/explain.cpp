@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/explain/explain.h"
 
+#include "config/boot_disk.h"
 #include "config/config_store.h"
 #include "identity/vehicle_identity.h"
 #include "kit/description/value_key.h"
@@ -27,6 +28,7 @@
 #include <functional>
 #include <sstream>
 #include <stdexcept>
+#include <string>
 #include <utility>
 #include <variant>
 #include <vector>
@@ -34,6 +36,15 @@
 namespace orvane::desk {
 
 namespace {
+
+/// Requires that no output so far is the file `input`.
+void requireUnwritten(const Explanation& outputs, const std::string& input) {
+    for (const Output& output : outputs) {
+        if (output.outcome != Outcome::kept && output.outcome != Outcome::notAsked) {
+            PlannedFiles::requireTwoFiles(output.path, input);
+        }
+    }
+}
 
 Output tuningNotAsked(const TuningOutput& tuning, std::int32_t profile) {
     Output output;
@@ -141,6 +152,9 @@ void explainIap(PlannedFiles& files, Explanation& outputs) {
                     [&iap2](std::istream& templateFile, std::ostream& output, const IapValues& v) {
                         return generateIap1File(templateFile, output, iap2.output, v);
                     }));
+    for (const VersionFile& file : versions.files) {
+        requireUnwritten(outputs, file.path);
+    }
 }
 
 } // namespace
@@ -157,6 +171,9 @@ Explanation explain(const kit::EnteredRoot& entered, const std::vector<std::stri
         } else {
             throw std::logic_error("error in orvane-unit: a writer that it can't explain");
         }
+    }
+    for (const char* input : {CONFIG_SHM_NAME, BOOT_DISK}) {
+        requireUnwritten(outputs, input);
     }
     // Last, since a later output may be the same file by way of a link.
     for (Output& output : outputs) {

@@ -16,7 +16,7 @@ namespace orvane::desk {
 
 /// Explains a run with the command line `arguments` in the unit `entered`. Throws kit::KitError
 /// where nobody can tell what the run does: at a pipe, at a device in place of a file that it
-/// reads, and at what this process may not read.
+/// reads, at an output that is an input as well, and at what this process may not read.
 Explanation explain(const kit::EnteredRoot& entered, const std::vector<std::string>& arguments);
 
 /// The same for the unit at `root`, "/" for the system itself. Throws kit::KitError also when it

@@ -3,6 +3,7 @@
 
 #include "kit/host/bytes.h"
 #include "kit/host/input_kind.h"
+#include "kit/host/kit_error.h"
 #include "kit/host/output_place.h"
 #include "kit/host/whole_file.h"
 
@@ -50,6 +51,16 @@ void PlannedFiles::write(const std::string& path, const std::string& text) {
 bool PlannedFiles::isDevice(const std::string& path) {
     const std::optional<kit::OutputPlace> place = kit::findOutputPlace(path);
     return place && (place->kind == S_IFCHR || place->kind == S_IFBLK);
+}
+
+void PlannedFiles::requireTwoFiles(const std::string& output, const std::string& input) {
+    const std::optional<kit::OutputPlace> written = kit::findOutputPlace(output);
+    const std::optional<kit::OutputPlace> read = kit::findOutputPlace(input);
+    if (written && read && kit::keepsBytes(*written) &&
+        kit::fileName(*written) == kit::fileName(*read)) {
+        throw kit::KitError(output + " and " + input +
+                            " are one file: only a run can tell what it reads there");
+    }
 }
 
 PathKind PlannedFiles::look(const std::string& path, std::string& content) const {

@@ -2,7 +2,7 @@
 //
 // The files of a unit as a run would change them, without writing. An output can be a link, hard or
 // symbolic, to another output, a template or a stock file, so what is opened later has what the run
-// has written. (A template that is its own output is the exception: the run reads what it writes.)
+// has written.
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
@@ -30,6 +30,11 @@ public:
 
     /// Whether `path` leads to a device, which may refuse what is written.
     static bool isDevice(const std::string& path);
+
+    /// Requires that an output is not the file that is read while it is written, or before it: what
+    /// a run gets then depends on how much its streams read and write at a time. Throws
+    /// kit::KitError.
+    static void requireTwoFiles(const std::string& output, const std::string& input);
 
     /// What is at `path` now, links followed.
     PathKind look(const std::string& path, std::string& content) const;

@@ -46,6 +46,7 @@ public:
         if (needsStockFile(decision)) {
             return installStock(decision);
         }
+        PlannedFiles::requireTwoFiles(file_.output, file_.templateFile);
         // A template is only copied, so a short one shows as well which bytes are whose.
         const std::optional<std::string> brief = briefTemplate();
         const auto render = [&generate](const Values& other,

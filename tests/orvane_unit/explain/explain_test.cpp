@@ -251,6 +251,45 @@ TEST(ExplainTest, OutputsThatAreHardLinksAgreeWithARun) {
     }
 }
 
+TEST(ExplainTest, OutputThatIsItsOwnStockFileIsEmptied) {
+    for (const AccessoryFile& file : {AIRPLAY_FILE, IAP2_FILE}) {
+        const DescribedUnit described([&file](UnitDescription& unit) {
+            unit.files.erase(file.templateFile);
+            unit.links[file.output] = file.stockFile;
+        });
+        SCOPED_TRACE(file.output);
+        const Explanation explanation = desk::explainUnit(described.root(), {"-ai"});
+        EXPECT_EQ(outputOf(explanation, file.output).outcome, desk::Outcome::empty);
+        expectRunLeaves(described, explanation, {"-a", "-i"});
+    }
+}
+
+TEST(ExplainTest, OutputThatIsAlsoReadIsRefused) {
+    struct Link {
+        const char* from;
+        const char* to;
+    };
+    const Link links[] = {
+        {AIRPLAY_FILE.output, AIRPLAY_FILE.templateFile},
+        {IAP1_FILE.output, IAP1_FILE.templateFile},
+        {IAP2_DEVICE_FILE.output, CONFIG_SHM_NAME},
+        {AIRPLAY_FILE.output, BOOT_DISK},
+        {IAP2_FILE.output, "/fs/rwdata/.Version/app.inf"},
+    };
+    for (const Link& link : links) {
+        const DescribedUnit described(
+            [&link](UnitDescription& unit) { unit.links[link.from] = link.to; });
+        SCOPED_TRACE(link.from);
+        try {
+            desk::explainUnit(described.root(), {"-ai"});
+            ADD_FAILURE() << "not refused";
+        } catch (const kit::KitError& error) {
+            EXPECT_EQ(error.text(), std::string(link.from) + " and " + link.to +
+                                        " are one file: only a run can tell what it reads there");
+        }
+    }
+}
+
 TEST(ExplainTest, ChainsOfLinksAgreeWithARun) {
     for (const int length : {20, 41, 60}) { // up to 20 the kernel may count all of them twice
         const DescribedUnit described([length](UnitDescription& unit) {
