@@ -51,7 +51,6 @@
 #include <sstream>
 #include <stdexcept>
 #include <string>
-#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -513,7 +512,7 @@ int runCommandLine(int argc, const char* const* argv) {
     } catch (const kit::KitError& error) {
         complain(error.text());
     } catch (const std::filesystem::filesystem_error& error) {
-        complain(kit::KitError("cannot use ", error.path1(), ": " + error.code().message()).text());
+        complain(kit::systemError("cannot use ", error).text());
     } catch (const std::bad_alloc&) {
         std::cerr << "orvane-unit: out of memory\n"; // needs none itself
     } catch (const std::exception& error) {

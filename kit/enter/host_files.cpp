@@ -12,10 +12,7 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-HostFiles::HostFiles(const fs::path& root) try : folder_(root, "program", 0700) {
-} catch (const fs::filesystem_error& failure) {
-    throw KitError("cannot make ", failure.path1(), ": " + failure.code().message());
-}
+HostFiles::HostFiles(const fs::path& root) : folder_(root, "program", 0700) {}
 
 HostFiles::~HostFiles() {
     // A mount that is visible here: only in a changed root (change_root.h).

@@ -23,32 +23,20 @@ using Fill = std::function<void(const fs::path&)>;
 
 constexpr mode_t ANYBODY = 0777; // less the umask
 
-/// For a failure without a path inside the folder: the system's own text.
 [[noreturn]] void failAtFolder(const fs::path& folder, const std::error_code& error) {
     throw KitError("cannot make ", folder, ": " + error.message());
-}
-
-/// If making a link failed, the second of the two paths is the link.
-KitError errorOf(const fs::filesystem_error& failure) {
-    const fs::path& path = failure.path2().empty() ? failure.path1() : failure.path2();
-    return {"cannot make ", path, ": " + failure.code().message()};
-}
-
-void fillUnfinished(const fs::path& unfinished, const fs::path& folder, const Fill& fill) {
-    try {
-        fill(unfinished);
-    } catch (const fs::filesystem_error& failure) {
-        throw errorOf(failure).moved(unfinished, folder);
-    } catch (const KitError& failure) {
-        throw failure.moved(unfinished, folder);
-    }
 }
 
 /// The place of an absent `folder` in an existing one, without links, ending with a name.
 fs::path finalPlace(const fs::path& folder) {
     const fs::path plain = folder.has_filename() ? folder : folder.parent_path();
     const fs::path above = plain.parent_path();
-    return fs::canonical(above.empty() ? "." : above) / plain.filename();
+    std::error_code error;
+    const fs::path place = fs::canonical(above.empty() ? "." : above, error) / plain.filename();
+    if (error) {
+        failAtFolder(folder, error);
+    }
+    return place;
 }
 
 void makeAbsentFolder(const fs::path& folder, const Fill& fill) {
@@ -59,14 +47,10 @@ void makeAbsentFolder(const fs::path& folder, const Fill& fill) {
     if (fs::is_symlink(fs::symlink_status(folder, error))) {
         failAtFolder(folder, std::make_error_code(std::errc::file_exists));
     }
-    try {
-        const fs::path place = finalPlace(folder);
-        const UnfinishedFolder unfinished(place.parent_path(), place.filename().string(), ANYBODY);
-        fillUnfinished(unfinished.path(), folder, fill);
-        error = renameToFree(unfinished.path(), place);
-    } catch (const fs::filesystem_error& failure) {
-        error = failure.code();
-    }
+    const fs::path place = finalPlace(folder);
+    const UnfinishedFolder unfinished(place.parent_path(), place.filename().string(), ANYBODY);
+    unfinished.fill(folder, fill);
+    error = renameToFree(unfinished.path(), place);
     if (error) {
         failAtFolder(folder, error);
     }
@@ -114,17 +98,11 @@ void fillEmptyFolder(const fs::path& folder, const std::string& last, const Fill
     requireEmpty(folder, isUnfinished);
     const FolderLock lock(folder);
     requireEmpty(folder, isUnfinished); // another process may have filled it
-    std::error_code error;
-    try {
-        const UnfinishedFolder unfinished(folder, "unit", ANYBODY);
-        fillUnfinished(unfinished.path(), folder, fill);
-        requireEmpty(folder,
-                     [&unfinished](const fs::path& entry) { return entry == unfinished.path(); });
-        error = moveUp(unfinished.path(), folder, last);
-    } catch (const fs::filesystem_error& failure) {
-        error = failure.code();
-    }
-    if (error) {
+    const UnfinishedFolder unfinished(folder, "unit", ANYBODY);
+    unfinished.fill(folder, fill);
+    requireEmpty(folder,
+                 [&unfinished](const fs::path& entry) { return entry == unfinished.path(); });
+    if (const std::error_code error = moveUp(unfinished.path(), folder, last)) {
         failAtFolder(folder, error);
     }
 }

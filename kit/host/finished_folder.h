@@ -17,8 +17,7 @@ namespace orvane::kit {
 ///    entries are moved up, `last` after all others: while that is missing, the folder is not
 ///    complete.
 ///
-/// What `fill` throws is thrown on: a failure of the file system as KitError, and a KitError about
-/// a path of the unfinished folder as one about the final path. The unfinished folder is then
+/// What `fill` throws is thrown on as UnfinishedFolder::fill says; the unfinished folder is then
 /// removed and `folder` is as it was. Also throws KitError when `folder` is anything but absent or
 /// empty, or the system refuses.
 void makeFinishedFolder(const std::filesystem::path& folder, const std::string& last,

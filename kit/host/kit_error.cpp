@@ -39,4 +39,9 @@ KitError systemError(const std::string& before, const fs::path& path) {
     return {before, path, ": " + std::generic_category().message(errno)};
 }
 
+KitError systemError(const std::string& before, const fs::filesystem_error& failure) {
+    const fs::path& path = failure.path2().empty() ? failure.path1() : failure.path2();
+    return {before, path, ": " + failure.code().message()};
+}
+
 } // namespace orvane::kit

@@ -38,4 +38,8 @@ KitError systemError(const std::string& what);
 /// The same about `path`: `before`, the path, a colon, and the text of errno.
 KitError systemError(const std::string& before, const std::filesystem::path& path);
 
+/// The same for a failure that the standard library reports. Of two paths it names the second,
+/// which is that of the new entry.
+KitError systemError(const std::string& before, const std::filesystem::filesystem_error& failure);
+
 } // namespace orvane::kit

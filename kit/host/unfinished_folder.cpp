@@ -2,6 +2,7 @@
 #include "kit/host/unfinished_folder.h"
 
 #include "kit/host/folder_lock.h"
+#include "kit/host/kit_error.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -41,9 +42,9 @@ bool isOwn(const Descriptor& descriptor) {
     return ::fstat(descriptor.number(), &state) == 0 && state.st_uid == ::geteuid();
 }
 
-[[noreturn]] void fail(const fs::path& folder) {
-    throw fs::filesystem_error("cannot make a folder", folder,
-                               std::error_code(errno, std::generic_category()));
+/// Where the folder can't be made says more than its name, which nobody has chosen.
+[[noreturn]] void failIn(const fs::path& above) {
+    throw systemError("cannot make a folder in ", above);
 }
 
 /// Locks a folder that has just been made. Until then another process may take it for a leftover:
@@ -54,7 +55,7 @@ Descriptor lockNew(const fs::path& path) {
         const int error = errno;
         ::rmdir(path.c_str());
         errno = error;
-        fail(path);
+        failIn(path.parent_path());
     }
     const bool isKept =
         folder.isOpen() && tryLock(folder) != LockState::heldByAnother && isFolderAt(path, folder);
@@ -101,7 +102,7 @@ UnfinishedFolder::UnfinishedFolder(const fs::path& above, const std::string& ste
         if (::mkdir(path_.c_str(), mode) == 0) {
             lock_ = lockNew(path_);
         } else if (errno != EEXIST) {
-            fail(path_);
+            failIn(above);
         }
     }
 }
@@ -109,6 +110,17 @@ UnfinishedFolder::UnfinishedFolder(const fs::path& above, const std::string& ste
 UnfinishedFolder::~UnfinishedFolder() {
     std::error_code ignored;
     fs::remove_all(path_, ignored);
+}
+
+void UnfinishedFolder::fill(const fs::path& future,
+                            const std::function<void(const fs::path&)>& fillIt) const {
+    try {
+        fillIt(path_);
+    } catch (const fs::filesystem_error& failure) {
+        throw systemError("cannot make ", failure).moved(path_, future);
+    } catch (const KitError& failure) {
+        throw failure.moved(path_, future);
+    }
 }
 
 } // namespace orvane::kit

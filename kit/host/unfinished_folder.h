@@ -7,6 +7,7 @@
 #include <sys/types.h>
 
 #include <filesystem>
+#include <functional>
 #include <string>
 
 namespace orvane::kit {
@@ -18,13 +19,19 @@ namespace orvane::kit {
 class UnfinishedFolder {
 public:
     /// Makes it in the folder `above`, from which it first removes the leftovers, with the access
-    /// rights `mode`, less the umask. Throws std::filesystem::filesystem_error.
+    /// rights `mode`, less the umask. Throws KitError.
     UnfinishedFolder(const std::filesystem::path& above, const std::string& stem, mode_t mode);
     ~UnfinishedFolder();
     UnfinishedFolder(const UnfinishedFolder&) = delete;
     UnfinishedFolder& operator=(const UnfinishedFolder&) = delete;
 
     const std::filesystem::path& path() const { return path_; }
+
+    /// Lets `fillIt` fill it, as the folder that is to become `future`. What that throws is thrown
+    /// on: a failure of the file system as KitError, and a KitError about a path in this folder as
+    /// one about the future path.
+    void fill(const std::filesystem::path& future,
+              const std::function<void(const std::filesystem::path&)>& fillIt) const;
 
 private:
     DeferredInterruption deferred_; ///< first, so that it ends last

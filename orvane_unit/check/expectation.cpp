@@ -203,24 +203,15 @@ void replaceExpected(const fs::path& folder, const RunOutcome& outcome) {
     for (const auto& [path, content] : files) {
         left.insert(path);
     }
-    try {
-        const kit::UnfinishedFolder unfinished(folder, EXPECTED, 0777);
-        try {
-            if (isThere) {
-                keepOthers(expected, unfinished.path(), left);
-                fs::permissions(unfinished.path(), fs::status(expected).permissions());
-            }
-            writeTable(unfinished.path(), files);
-        } catch (const fs::filesystem_error& error) {
-            throw kit::KitError("cannot write ", error.path1(), ": " + error.code().message())
-                .moved(unfinished.path(), expected);
-        } catch (const kit::KitError& error) {
-            throw error.moved(unfinished.path(), expected);
+    const kit::UnfinishedFolder unfinished(folder, EXPECTED, 0777);
+    unfinished.fill(expected, [&](const fs::path& made) {
+        if (isThere) {
+            keepOthers(expected, made, left);
+            fs::permissions(made, fs::status(expected).permissions());
         }
-        putInPlace(unfinished.path(), expected, isThere);
-    } catch (const fs::filesystem_error& error) {
-        throw kit::KitError("cannot write ", expected, ": " + error.code().message());
-    }
+        writeTable(made, files);
+    });
+    putInPlace(unfinished.path(), expected, isThere);
 }
 
 } // namespace orvane::desk

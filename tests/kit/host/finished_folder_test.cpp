@@ -317,7 +317,7 @@ TEST_F(FinishedFolderTest, ImpossiblePathIsRefused) {
     EXPECT_EQ(refusalOf("/"), "/ is there already and is not an empty folder");
     writeFile(above() / "file", "");
     EXPECT_EQ(refusalOf(above() / "file/unit"),
-              "cannot make " + (above() / "file/unit").string() + ": Not a directory");
+              "cannot make a folder in " + (above() / "file").string() + ": Not a directory");
     EXPECT_EQ(refusalOf(above() / "missing/.."),
               "cannot make " + (above() / "missing/..").string() + ": No such file or directory");
 }
@@ -330,7 +330,7 @@ TEST_F(FinishedFolderTest, FolderAboveWithoutPermissionIsRefused) {
         refusal = refusalOf(place());
     }
     fs::permissions(above(), fs::perms::owner_all);
-    EXPECT_EQ(refusal, "cannot make " + place().string() + ": Permission denied");
+    EXPECT_EQ(refusal, "cannot make a folder in " + above().string() + ": Permission denied");
 }
 
 } // namespace

@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/enter/captured_run.h"
+#include "kit/host/host_file.h"
+#include "kit/host/kit_error.h"
 #include "kit/host/scratch_folder.h"
 #include "kit/host/unfinished_folder.h"
 #include "tests/support/folder_names.h"
@@ -11,6 +13,7 @@
 #include <unistd.h>
 
 #include <filesystem>
+#include <functional>
 #include <optional>
 #include <set>
 #include <string>
@@ -26,6 +29,15 @@ using Names = std::set<std::string>;
 class UnfinishedFolderTest : public ::testing::Test {
 protected:
     const fs::path& above() const { return folder_.path(); }
+
+    static std::string refusalOf(const std::function<void()>& act) {
+        try {
+            act();
+        } catch (const kit::KitError& error) {
+            return error.what();
+        }
+        return "";
+    }
 
     /// Runs a child that makes an unfinished folder with a file in it and then is killed.
     void leaveOne(const std::string& stem) const {
@@ -87,6 +99,29 @@ TEST_F(UnfinishedFolderTest, FilesAndLinksWithSuchANameStay) {
     { const kit::UnfinishedFolder folder(above(), "unit", 0777); }
     EXPECT_EQ(folderNames(above()), (Names{".unit.unfinished-1-0", ".unit.unfinished-1-1"}));
     EXPECT_EQ(folderNames(elsewhere.path()), Names{"mine"});
+}
+
+TEST_F(UnfinishedFolderTest, FolderInWhichNoneCanBeMadeIsNamed) {
+    const fs::path missing = above() / "missing";
+    EXPECT_EQ(refusalOf([&] { const kit::UnfinishedFolder folder(missing, "unit", 0777); }),
+              "cannot make a folder in " + missing.string() + ": No such file or directory");
+}
+
+TEST_F(UnfinishedFolderTest, FailureInItNamesTheFuturePath) {
+    const fs::path future = above() / "unit";
+    const kit::UnfinishedFolder folder(above(), "unit", 0777);
+    const auto refusalIn = [&](const std::function<void(const fs::path&)>& fillIt) {
+        return refusalOf([&] { folder.fill(future, fillIt); });
+    };
+    const std::string missing = ": No such file or directory";
+    EXPECT_EQ(refusalIn([](const fs::path& path) { fs::create_directory(path / "a/b"); }),
+              "cannot make " + (future / "a/b").string() + missing);
+    EXPECT_EQ(refusalIn([](const fs::path& path) { fs::create_hard_link(path / "a", path / "b"); }),
+              "cannot make " + (future / "b").string() + missing);
+    EXPECT_EQ(refusalIn([](const fs::path& path) { kit::openForReading(path / "a"); }),
+              "cannot read " + (future / "a").string() + missing);
+    EXPECT_EQ(refusalIn([](const fs::path& /*path*/) { kit::openForReading("/proc/none/a"); }),
+              "cannot read /proc/none/a" + missing);
 }
 
 TEST(ScratchFolderTest, FolderIsForItsUserAlone) {
