@@ -12,7 +12,11 @@ namespace orvane::kit {
 
 namespace fs = std::filesystem;
 
-HostFiles::HostFiles(const fs::path& root) : folder_(root, "program", 0700) {}
+HostFiles::HostFiles(const fs::path& root) try : folder_(root, "program", 0700) {
+} catch (const KitError& failure) {
+    throw KitError("a dynamic or emulated program needs a folder in the unit while it runs: " +
+                   failure.text());
+}
 
 HostFiles::~HostFiles() {
     // A mount that is visible here: only in a changed root (change_root.h).

@@ -2,6 +2,7 @@
 #include "kit/enter/run_inside.h"
 #include "kit/host/kit_error.h"
 #include "tests/kit/host/open_descriptors.h"
+#include "tests/support/permissions.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
 
@@ -179,6 +180,18 @@ TEST_F(RunInsideTest, RootThatIsNotAFolderIsNamed) {
     } catch (const kit::KitError& error) {
         EXPECT_EQ(error.text(), bad + " is not a folder");
     }
+}
+
+TEST_F(RunInsideTest, UnitInWhichADynamicProgramCannotHaveItsFilesIsNamed) {
+    fs::permissions(root(), fs::perms::owner_read | fs::perms::owner_exec);
+    {
+        const EnforcedPermissions permissions;
+        EXPECT_EQ(refusalOf("/bin/sh"),
+                  "a dynamic or emulated program needs a folder in the unit while it runs: cannot "
+                  "make a folder in " +
+                      root().string() + ": Permission denied");
+    }
+    fs::permissions(root(), fs::perms::owner_all);
 }
 
 TEST_F(RunInsideTest, NoRunLeavesADescriptorOrAnotherRoot) {
