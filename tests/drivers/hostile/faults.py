@@ -80,6 +80,17 @@ def state(folder: Path) -> State:
     return entries
 
 
+def has_unreadable(folder: Path) -> bool:
+    """Whether something below `folder` can't be read by an owner to whom permission bits apply."""
+    for here, folders, files in os.walk(folder):
+        for name in (*folders, *files):
+            mode = os.lstat(os.path.join(here, name)).st_mode
+            wanted = stat.S_IRUSR | stat.S_IXUSR if stat.S_ISDIR(mode) else stat.S_IRUSR
+            if not stat.S_ISLNK(mode) and mode & wanted != wanted:
+                return True
+    return False
+
+
 def changes(before: State, after: State) -> list[str]:
     return [f"changes {path!r}" for path in sorted(before.keys() | after.keys())
             if before.get(path) != after.get(path)]

@@ -113,3 +113,22 @@ class Commands(unittest.TestCase):
 
     def test_a_signal(self) -> None:
         self.assertIn("status -9", self.ask("kill -9 $$")[0])
+
+    def test_a_refusal_to_capture_what_can_be_explained(self) -> None:
+        explained = '{"format":1,"command":"explain","outputs":[]}'
+        self.tool.write_text("#!/bin/sh\n"
+                             f"[ $1 != explain ] || {{ echo '{explained}'; exit; }}\n"
+                             "echo 'orvane-unit: cannot read /x: Permission denied' >&2; exit 2\n", encoding="ascii")
+        self.tool.chmod(0o755)
+        parts.put(self.root, "/fs/mp/etc/airplay.conf", b"stock")
+        file = self.root / "fs/mp/etc/airplay.conf"
+        for is_weak, mode, place, faults_found in (
+                (True, 0o644, file, 1), (True, 0o222, file, 0), (False, 0o222, file, 1),
+                (True, 0o444, file.parent, 0), (True, 0o755, file.parent, 1)):
+            place.chmod(mode)
+            self.scene.is_weak, self.scene.lines = is_weak, []
+            self.scene.states = {}
+            self.scene.capture()
+            self.assertEqual(len(self.scene.lines), faults_found, (is_weak, oct(mode), place))
+            file.parent.chmod(0o755)
+            file.chmod(0o644)
