@@ -1,13 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "kit/unit/make_unit.h"
 
-#include "config/record_area.h"
 #include "kit/description/conflicts.h"
 #include "kit/description/unit_checks.h"
 #include "kit/description/unit_description.h"
 #include "kit/description/unit_layout.h"
+#include "kit/description/value_key.h"
 #include "kit/description/value_places.h"
-#include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
 #include "kit/host/descriptor.h"
 #include "kit/host/finished_folder.h"
@@ -20,11 +19,9 @@
 #include "tuning/dps_block.h"
 
 #include <array>
-#include <cstdint>
 #include <map>
 #include <optional>
 #include <string>
-#include <type_traits>
 
 namespace orvane::kit {
 
@@ -43,40 +40,22 @@ void makeImage(const ImageDescription& image, const fs::path& file) {
     }
 }
 
-std::uint32_t lengthOf(const Bytes& bytes) {
-    const std::uint64_t length = bytes.size();
-    return static_cast<std::uint32_t>(length);
-}
-
-void expectWritten(std::int32_t result, const std::string& what) {
-    if (result != 0) {
-        throw KitError("cannot write " + what + " to the unit's disk");
-    }
-}
-
-/// Through the product's own operations, in a process that has entered the unit.
-void writeRecords(const DiskDescription& disk) {
+void makeDisk(const DiskDescription& disk, const fs::path& file) {
+    const Descriptor descriptor = makeSparseFile(file, disk.size);
+    const auto write = [&](const ValueKey& key, Bytes bytes) {
+        const ValuePlace place = valuePlace(key);
+        bytes.resize(place.mask.size()); // padded with zeros
+        writeAt(descriptor, file, place.offsetIn(disk.size), bytes);
+    };
     for (const auto& [slot, bytes] : disk.slots) {
-        expectWritten(writeRecordSlot(slot, bytes.data(), lengthOf(bytes)),
-                      "slot " + std::to_string(slot));
+        write(slotKey(slot), bytes);
     }
     if (disk.aux) {
-        expectWritten(writeAuxArea(disk.aux->data(), lengthOf(*disk.aux)), "the auxiliary area");
+        write(auxKey(), *disk.aux);
     }
-    if (!disk.tuning.empty()) {
-        DpsArea area{};
-        for (const auto& [id, block] : disk.tuning) {
-            area.at(id) = encodeTuningBlock(block);
-        }
-        expectWritten(writeTuningArea(area.data(), DPS_AREA_SIZE), "the tuning area");
-    }
-}
-
-void makeDisk(const DiskDescription& disk, const fs::path& file, const fs::path& root) {
-    const Descriptor descriptor = makeSparseFile(file, disk.size);
-    if (!disk.slots.empty() || disk.aux || !disk.tuning.empty()) {
-        const EnteredRoot entered(root);
-        writeRecords(disk);
+    for (const auto& [id, description] : disk.tuning) {
+        const DpsBlock block = encodeTuningBlock(description);
+        write(tuningBlockKey(id), Bytes(block.bytes.begin(), block.bytes.end()));
     }
     for (const auto& [offset, bytes] : disk.bytes) {
         writeAt(descriptor, file, offset, bytes);
@@ -111,7 +90,7 @@ void makeEntry(const UnitDescription& unit, const std::string& path, EntryKind k
         makeImage(unit.image, place);
         break;
     case EntryKind::disk:
-        makeDisk(unit.disk, place, root);
+        makeDisk(unit.disk, place);
         break;
     }
 }

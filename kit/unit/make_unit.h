@@ -8,10 +8,8 @@
 
 namespace orvane::kit {
 
-/// Makes the unit at `root`, which must be absent or an empty folder. Image and files are written
-/// through the host's file system, disk records with the product's own operations inside the unit.
-/// It becomes a unit in one step, when it is complete (finished_folder.h). Throws KitError; `root`
-/// is then as it was.
+/// Makes the unit at `root`, which must be absent or an empty folder. It becomes a unit in one
+/// step, when it is complete (finished_folder.h). Throws KitError; `root` is then as it was.
 void makeUnit(const UnitDescription& unit, const std::filesystem::path& root);
 
 /// The same, but lets `inspect` look at the complete folder before it replaces `root`. What it

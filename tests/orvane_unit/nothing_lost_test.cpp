@@ -19,6 +19,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <optional>
 #include <regex>
 #include <set>
 #include <string>
@@ -273,32 +274,67 @@ TEST_F(NothingLostTracedTest, FailedWriteNamesItsAssignmentAndWhatHasBeenSet) {
     EXPECT_NE(explained().find("Quarion Velmira"), std::string::npos);
 }
 
-/// The unit lies on a file system of its own that has no room left; its disk is a hole.
-TEST_F(NothingLostTest, SetOnAFullDiskChangesNothing) {
-    const std::string mounted = folder() / "mounted";
-    fs::create_directory(mounted);
+/// A small file system of its own.
+class FullDiskTest : public NothingLostTest {
+protected:
+    fs::path mounted() const { return folder() / "mounted"; }
+    std::string complaint() const { return readFile(folder() / "complaint"); }
+
+    /// Runs `script` where the file system is "$0", its folder above can be written, and "$@" is
+    /// orvane-unit. Nothing where no file system can be mounted.
+    std::optional<kit::RunResult> runThere(const std::string& script) const {
+        fs::create_directory(mounted());
+        const std::string mount = "mount -t tmpfs -o size=64k tmpfs \"$0\" || exit 77\n";
+        Words command = {"unshare", "--mount"};
+        if (geteuid() != 0) {
+            command.push_back("--map-root-user");
+        }
+        const kit::RunResult result =
+            runOnHost(command + Words{"sh", "-c", mount + script, mounted()} + orvaneUnit({}));
+        const bool isMounted = result.exitStatus != 77 && result.standardError.find("unshare") != 0;
+        return isMounted ? std::optional(result) : std::nullopt;
+    }
+};
+
+TEST_F(FullDiskTest, NewNamesTheFileAndTheReason) {
+    writeFile(folder() / "slot.toml", "[disk.slots]\n9 = \"SN\"\n");
+    writeFile(folder() / "both.toml",
+              "[disk.slots]\n9 = \"SN\"\n[disk.tuning.0]\nqwaSendGain = 1\n");
+    const std::optional<kit::RunResult> result = runThere(R"(
+for pages in 0 1; do
+    dd if=/dev/zero of="$0/rest" bs=4096 2>/dev/null
+    truncate --size=-$((pages * 4096)) "$0/rest"
+    case $pages in 0) name=slot ;; 1) name=both ;; esac
+    "$@" new "$0/unit" --from "$0/../$name.toml" 2>>"$0/../complaint"
+    echo $? $(ls -A "$0")
+done
+)");
+    if (!result) {
+        GTEST_SKIP() << "no file system can be mounted";
+    }
+    EXPECT_EQ(result->standardOutput, "2 rest\n2 rest\n") << result->standardError;
+    const std::string line = "orvane-unit: cannot write " + (mounted() / "unit/dev/hd0").string() +
+                             ": No space left on device\n";
+    EXPECT_EQ(complaint(), line + line);
+}
+
+/// The unit's disk is a hole.
+TEST_F(FullDiskTest, SetChangesNothing) {
     writeFile(folder() / "unit.toml", "[image.params]\n22 = 1\n");
-    const std::string script = R"(
-mount -t tmpfs -o size=64k tmpfs "$1" || exit 77
-shift
+    const std::optional<kit::RunResult> done = runThere(R"(
 "$@" new "$0/unit" --from "$0/../unit.toml" || exit 78
 dd if=/dev/zero of="$0/rest" bs=4096 2>/dev/null
 "$@" set "$0/unit" param.22=0 serial=NEW 2>"$0/../complaint"
 echo $?
 "$@" show "$0/unit" --only params | grep '^ *22 '
-)";
-    Words command = {"unshare", "--mount"};
-    if (geteuid() != 0) {
-        command.push_back("--map-root-user");
+)");
+    if (!done) {
+        GTEST_SKIP() << "no file system can be mounted";
     }
-    const kit::RunResult result =
-        runOnHost(command + Words{"sh", "-c", script, mounted, mounted} + orvaneUnit({}));
-    if (result.exitStatus == 77 || result.standardError.find("unshare") == 0) {
-        GTEST_SKIP() << "no file system can be mounted: " << result.standardError;
-    }
+    const kit::RunResult& result = *done;
     EXPECT_EQ(result.standardOutput.substr(0, 2), "2\n") << result.standardError;
     EXPECT_NE(result.standardOutput.find(" 0x01 "), std::string::npos) << result.standardOutput;
-    EXPECT_EQ(readFile(folder() / "complaint"),
+    EXPECT_EQ(complaint(),
               "orvane-unit: serial=NEW: cannot write /dev/hd0: No space left on device\n");
 }
 
