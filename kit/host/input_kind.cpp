@@ -31,6 +31,26 @@ InputKind lookAtInput(const std::string& path) {
     return type == fs::file_type::regular ? InputKind::file : InputKind::folder;
 }
 
+bool canBeMeasured(const Descriptor& device) {
+    return ::lseek(device.number(), 0, SEEK_END) != -1;
+}
+
+/// A device without positions, such as /dev/zero, tells no size and still takes any seek.
+bool hasPositions(const Descriptor& device) {
+    const off_t size = ::lseek(device.number(), 0, SEEK_END);
+    return size > 0 || (size == 0 && ::lseek(device.number(), -1, SEEK_END) == -1);
+}
+
+/// Throws KitError for a device that is not `isUsable`.
+InputKind lookAtSeekableInput(const std::string& path, bool (*isUsable)(const Descriptor&)) {
+    const InputKind kind = lookAtInput(path);
+    if (kind == InputKind::device && !isUsable(openForReading(path))) {
+        throw KitError("", path,
+                       " is a device without positions: only a run can tell what it yields");
+    }
+    return kind;
+}
+
 } // namespace
 
 InputKind lookAtSequentialInput(const std::string& path) {
@@ -41,14 +61,12 @@ InputKind lookAtSequentialInput(const std::string& path) {
     return kind;
 }
 
+InputKind lookAtMappedInput(const std::string& path) {
+    return lookAtSeekableInput(path, canBeMeasured);
+}
+
 InputKind lookAtPositionedInput(const std::string& path) {
-    const InputKind kind = lookAtInput(path);
-    if (kind == InputKind::device &&
-        ::lseek(openForReading(path).number(), 0, SEEK_END) == static_cast<off_t>(-1)) {
-        throw KitError("", path,
-                       " is a device without positions: only a run can tell what it yields");
-    }
-    return kind;
+    return lookAtSeekableInput(path, hasPositions);
 }
 
 } // namespace orvane::kit

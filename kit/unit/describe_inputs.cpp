@@ -18,8 +18,6 @@
 #include "tuning/audio_profile.h"
 #include "writers/template_merge.h"
 
-#include <unistd.h>
-
 #include <algorithm>
 #include <cstdint>
 #include <map>
@@ -63,7 +61,7 @@ public:
 
 private:
     void readImage() {
-        const InputKind kind = lookAtPositionedInput(CONFIG_SHM_NAME);
+        const InputKind kind = lookAtMappedInput(CONFIG_SHM_NAME);
         if (kind == InputKind::folder) {
             unit_.folders.emplace_back(CONFIG_SHM_NAME);
         } else if (kind != InputKind::missing) {
@@ -85,17 +83,7 @@ private:
             const std::uint64_t size = sizeOf(disk, BOOT_DISK);
             const std::uint64_t copied = std::min<std::uint64_t>(size, RECORD_AREA_SIZE);
             inputs_.disk = readAt(disk, BOOT_DISK, size - copied, copied);
-            if (size < RECORD_AREA_SIZE && takesAnySeek(disk)) {
-                inputs_.disk = readAt(disk, BOOT_DISK, 0, RECORD_AREA_SIZE);
-                inputs_.disk->resize(RECORD_AREA_SIZE);
-            }
         }
-    }
-
-    /// Whether a short disk is a device without a size, such as /dev/zero: a run reads the same
-    /// there wherever it seeks, and zeros where it reads nothing.
-    static bool takesAnySeek(const Descriptor& disk) {
-        return ::lseek(disk.number(), -RECORD_AREA_SIZE, SEEK_END) != -1;
     }
 
     void readVersionFiles() {
@@ -183,8 +171,11 @@ private:
 
     /// Whether the source has an entry that every unit has: a folder, the image, or the disk.
     static bool isThere(const std::string& path, EntryKind kind) {
-        return kind == EntryKind::folder ? kindBehind(path) == fs::file_type::directory
-                                         : lookAtPositionedInput(path) != InputKind::missing;
+        if (kind == EntryKind::folder) {
+            return kindBehind(path) == fs::file_type::directory;
+        }
+        const auto look = kind == EntryKind::disk ? lookAtPositionedInput : lookAtMappedInput;
+        return look(path) != InputKind::missing;
     }
 
     bool isRunningSystem_;

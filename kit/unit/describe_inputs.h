@@ -31,11 +31,10 @@ UnitDescription descriptionOf(UnitInputs inputs);
 ///  - templates and stock files. Links are followed inside the source. What is missing there, or
 ///    can't be opened by anybody, is missing in the description, folders included; a version file
 ///    that is listed and can't be opened becomes a link to itself, which can't be either. A folder
-///    in the place of a file is a folder. A disk that tells no size, such as /dev/zero, becomes a
-///    mebibyte of what it yields. Outputs are left out, except that one that a run can't open
-///    becomes a folder, and that templates, stock files and outputs that are one file are links to
-///    one of them if an output is among them. Not kept are links between an output and any other
-///    input, and the order of the version folder's listing, which is the file system's. Never
+///    in the place of a file is a folder. Outputs are left out, except that one that a run can't
+///    open becomes a folder, and that templates, stock files and outputs that are one file are
+///    links to one of them if an output is among them. Not kept are links between an output and any
+///    other input, and the order of the version folder's listing, which is the file system's. Never
 ///    writes. Throws KitError when the source can't be entered, or nobody can tell what a run would
 ///    read in it or where it would wait.
 UnitDescription describeInputs(const std::filesystem::path& source);

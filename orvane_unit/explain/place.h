@@ -29,7 +29,7 @@ struct BehindImage {
 };
 
 struct DiskPlace {
-    std::optional<std::uint64_t> offset; ///< of the first byte; none on a device without a size
+    std::uint64_t offset = 0; ///< of the first byte
     std::string bytes;
     std::optional<unsigned> lowerBit; ///< of a value of two bits
 };

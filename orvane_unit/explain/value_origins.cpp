@@ -27,11 +27,9 @@ namespace orvane::desk {
 
 namespace {
 
-/// Nothing where the disk tells no size and takes any seek, as /dev/zero does.
-std::optional<std::uint64_t> diskOffset(std::int64_t bytesBeforeEnd) {
-    const std::uint64_t size = diskSize();
-    const auto before = static_cast<std::uint64_t>(bytesBeforeEnd);
-    return size < before ? std::nullopt : std::optional<std::uint64_t>(size - before);
+/// Of a place at which the disk can be read.
+std::uint64_t diskOffset(std::int64_t bytesBeforeEnd) {
+    return diskSize() - static_cast<std::uint64_t>(bytesBeforeEnd);
 }
 
 /// The bytes of a value in an image; none when the image ends before them.
@@ -69,7 +67,7 @@ std::uint64_t diskSize() {
 }
 
 Image readImage() {
-    kit::lookAtPositionedInput(CONFIG_SHM_NAME);
+    kit::lookAtMappedInput(CONFIG_SHM_NAME);
     Image image;
     ConfigStore store;
     store.init();
@@ -155,9 +153,7 @@ Origin fieldOrigin(const TuningArea& area, std::int32_t blockId, const DpsField&
     }
     const std::size_t length = dpsElementSize(field.encoding) * field.count;
     DiskPlace place;
-    if (area.offset) {
-        place.offset = *area.offset + id * DPS_BLOCK_SIZE + field.offset;
-    }
+    place.offset = area.offset + id * DPS_BLOCK_SIZE + field.offset;
     place.bytes.assign(block.bytes.begin() + field.offset,
                        block.bytes.begin() + field.offset + static_cast<std::ptrdiff_t>(length));
     if (field.encoding == DpsEncoding::code2) {

@@ -18,7 +18,7 @@ namespace orvane::desk {
 /// tell what a run finds there, as do the other functions that read the image or the disk.
 std::optional<Reason> diskTrouble(std::int64_t bytesBeforeEnd);
 
-/// Size of the disk in bytes, also of a device; 0 when it can't be opened or does not tell it.
+/// Size of the disk in bytes, also of a device; 0 when it can't be opened or measured.
 std::uint64_t diskSize();
 
 /// The configuration image as a run finds it.
@@ -40,7 +40,7 @@ Origin serialOrigin();
 /// All tuning blocks as a run finds them.
 struct TuningArea {
     Reason reason = Reason::fromTuningBlock; ///< or why all is zero
-    std::optional<std::uint64_t> offset;     ///< on the disk, in bytes, as of a DiskPlace
+    std::uint64_t offset = 0;                ///< on the disk, in bytes
     DpsArea blocks{};
 };
 

@@ -89,8 +89,7 @@ std::string repeatedSlots(std::uint32_t slot) {
 constexpr Column SLOT_COLUMNS[] = {{"slot", 4}, {"offset", 7}, {"size", 5}};
 
 void printPart(std::ostream& out, const DecodedRecords& records) {
-    const bool tellsNoSize = records.diskSize == 0 && !records.diskTrouble;
-    out << "disk: " << (tellsNoSize ? "without a size" : kit::counted(records.diskSize, "byte"));
+    out << "disk: " << kit::counted(records.diskSize, "byte");
     if (records.diskTrouble) {
         out << ", " << painted(Colour::bad, reasonInfo(*records.diskTrouble).sentence);
     }

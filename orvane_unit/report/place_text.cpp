@@ -40,9 +40,7 @@ struct PlaceText {
     }
 
     std::string operator()(const DiskPlace& place) const {
-        std::string text = holderText(key);
-        text += place.offset ? bytesText("disk", *place.offset, place.bytes)
-                             : ", a disk without a size: " + kit::hexText(place.bytes);
+        std::string text = holderText(key) + bytesText("disk", place.offset, place.bytes);
         if (place.lowerBit) {
             text += ", bits " + std::to_string(*place.lowerBit) + " and " +
                     std::to_string(*place.lowerBit + 1);

@@ -46,7 +46,7 @@ enum class CrcVerdict {
 };
 
 struct DecodedRecords {
-    std::uint64_t diskSize = 0;        ///< bytes; 0 also of a device that tells none
+    std::uint64_t diskSize = 0;        ///< bytes
     std::optional<Reason> diskTrouble; ///< why the record area can't be read
     std::vector<DecodedSlot> slots;    ///< all of them
     std::optional<std::string> aux;

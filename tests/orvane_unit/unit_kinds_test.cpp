@@ -226,36 +226,6 @@ TEST_F(UnitKindsTest, SocketInPlaceOfAnOutputIsKept) {
     expectRunAgrees();
 }
 
-TEST_F(UnitKindsTest, DiskWithoutASizeHasNoOffsets) {
-    for (const char* device : {"zero", "null"}) {
-        SCOPED_TRACE(device);
-        putDevice(BOOT_DISK, device);
-        const std::string shown = start({"explain", root(), "-i"}).standardOutput;
-        EXPECT_NE(shown.find("record slot 9, a disk without a size: 00 00 00 00 00 00 00 00"),
-                  std::string::npos)
-            << shown;
-        EXPECT_NE(shown.find("serial-blank"), std::string::npos);
-        EXPECT_EQ(start({"show", root(), "--only", "records"})
-                      .standardOutput.find("disk: without a size\n"),
-                  0U);
-        expectRunAgrees();
-        fs::remove_all(captured());
-        EXPECT_EQ(start({"capture", root(), captured()}).exitStatus, 0);
-        EXPECT_EQ(answersFor(captured()), answersFor(root()));
-        const kit::RunResult diff = start({"diff", root(), captured()});
-        EXPECT_EQ(diff.exitStatus, 0) << diff.standardOutput;
-    }
-}
-
-TEST_F(UnitKindsTest, TuningFromADiskWithoutASizeIsExplained) {
-    EXPECT_EQ(start({"set", root(), "param.134=0xffff"}).exitStatus, 0);
-    putDevice(BOOT_DISK, "zero");
-    const std::string shown = start({"explain", root(), "-a", "--json"}).standardOutput;
-    EXPECT_NE(shown.find("block 3, a disk without a size: 00"), std::string::npos) << shown;
-    EXPECT_EQ(shown.find("disk byte"), std::string::npos);
-    expectRunAgrees();
-}
-
 TEST_F(UnitKindsTest, DeviceThatIsNoMemoryIsNoImage) {
     putDevice(CONFIG_SHM_NAME, "zero");
     const std::string shown = start({"explain", root(), "-a"}).standardOutput;
@@ -265,7 +235,29 @@ TEST_F(UnitKindsTest, DeviceThatIsNoMemoryIsNoImage) {
     EXPECT_EQ(answersFor(captured()), answersFor(root()));
 }
 
+/// What such a device yields to who looks, a run need not find there.
 TEST_F(UnitKindsTest, DeviceWithoutPositionsIsNoDisk) {
+    const std::string complaint = std::string(BOOT_DISK) +
+                                  " is a device without positions: only a run can tell what it "
+                                  "yields";
+    const DescribedUnit other;
+    for (const char* device : {"zero", "null", "full", "urandom"}) {
+        SCOPED_TRACE(device);
+        putDevice(BOOT_DISK, device);
+        for (const Words& words :
+             {Words{"explain", root(), "-i"}, Words{"show", root()},
+              Words{"show", root(), "--json"}, Words{"impact", root()},
+              Words{"diff", root(), other.root()}, Words{"diff", other.root(), root()},
+              Words{"capture", root(), captured()}}) {
+            expectRefused(words, complaint);
+        }
+        expectRefused({"describe", root()},
+                      at(BOOT_DISK).string() + " is a device, not a file, a folder or a link");
+        EXPECT_FALSE(exists(captured()));
+    }
+}
+
+TEST_F(UnitKindsTest, DeviceThatTakesNoSeekIsNoDisk) {
     putDevice(BOOT_DISK, "tty");
     const kit::RunResult result = start({"explain", root(), "-i"});
     EXPECT_EQ(result.exitStatus, 2);
