@@ -445,21 +445,44 @@ std::string wordsInQuotes(const std::vector<std::string>& words) {
     return text;
 }
 
-/// The first word must be a command, or an option that needs none. The parser alone would only say
-/// that a command is missing.
-void checkFirstWord(const CLI::App& app, int argc, const char* const* argv) {
+/// The command that the first word names, or `app` for an option that needs none. Throws for any
+/// other word: the parser would only say that a command is missing.
+const CLI::App& namedCommand(const CLI::App& app, int argc, const char* const* argv) {
     const std::string word = argc > 1 ? argv[1] : "";
-    bool isKnown = word == "-h" || word == "--help" || word == "--version";
+    if (word == "-h" || word == "--help" || word == "--version") {
+        return app;
+    }
     std::string names;
     for (const CLI::App* const command :
          app.get_subcommands([](const CLI::App*) { return true; })) {
-        isKnown = isKnown || command->get_name() == word;
+        if (command->get_name() == word) {
+            return *command;
+        }
         names += (names.empty() ? "" : ", ") + command->get_name();
     }
-    if (!isKnown) {
-        throw kit::KitError("the first word must be one of " + names +
-                            (argc > 1 ? ": not " + kit::inQuotes(word) : ""));
+    throw kit::KitError("the first word must be one of " + names +
+                        (argc > 1 ? ": not " + kit::inQuotes(word) : ""));
+}
+
+/// The words of a command, last first, as the parser takes them. An empty value after "=" becomes a
+/// word: the parser would take the next one for it.
+std::vector<std::string> wordsOf(const CLI::App& command, int argc, const char* const* argv) {
+    std::vector<std::string> words;
+    bool isForOrvane = false;
+    for (int i = 1; i < argc; ++i) {
+        const std::string word = argv[i];
+        isForOrvane = isForOrvane || word == "--";
+        const std::string name = word.substr(0, word.find('='));
+        const CLI::Option* const option = command.get_option_no_throw(name);
+        if (!isForOrvane && word == name + "=" && option != nullptr &&
+            option->get_expected() != 0) {
+            words.insert(words.end(), {name, ""});
+        } else {
+            words.push_back(word);
+        }
     }
+    std::reverse(words.begin(), words.end());
+    return words;
 }
 
 /// Throws for the words that the chosen command does not take.
@@ -482,9 +505,8 @@ int chooseAndRun(int argc, const char* const* argv, std::ostream& out) {
     const std::vector<std::unique_ptr<Command>> commands =
         addCommands<NewCommand, DescribeCommand, SetCommand, ShowCommand, ExplainCommand,
                     RunCommand, DiffCommand, ImpactCommand, CaptureCommand, CheckCommand>(app);
-    checkFirstWord(app, argc, argv);
     try {
-        app.parse(argc, argv);
+        app.parse(wordsOf(namedCommand(app, argc, argv), argc, argv));
     } catch (const CLI::Success& help) {
         return app.exit(help, out, out);
     } catch (const CLI::ExtrasError&) {

@@ -78,6 +78,30 @@ TEST(RefusalTest, EmptyValueOfAnOptionIsNotItsDefault) {
     EXPECT_FALSE(fs::exists(described.folder() / "new"));
 }
 
+TEST(RefusalTest, EmptyValueAfterAnEqualsSignIsNotTheNextWord) {
+    const DescribedUnit described;
+    const std::string root = described.root();
+    const std::string empty = "the value is empty\n";
+    EXPECT_EQ(refusalOf({"run", root, "--orvane="}), "orvane-unit: --orvane: " + empty);
+    EXPECT_EQ(refusalOf({"run", "--orvane=", root}), "orvane-unit: --orvane: " + empty);
+    EXPECT_EQ(refusalOf({"run", root, "--orvane=", "--", "-a"}), "orvane-unit: --orvane: " + empty);
+    EXPECT_EQ(refusalOf({"check", root, "--orvane="}), "orvane-unit: --orvane: " + empty);
+    EXPECT_EQ(refusalOf({"new", described.folder() / "new", "--from="}),
+              "orvane-unit: --from: " + empty);
+    EXPECT_EQ(refusalOf({"show", root, "--only="}), refusalOf({"show", root, "--only", ""}));
+    EXPECT_EQ(refusalOf({"show", root, "--orvane="}),
+              "orvane-unit: show does not take \"--orvane=\"\n");
+    EXPECT_FALSE(fs::exists(described.folder() / "new"));
+}
+
+TEST(RefusalTest, WordsBehindTheHyphensAreOrvanesOwn) {
+    const DescribedUnit described;
+    const kit::RunResult result =
+        runOrvaneUnit({"run", described.root(), "--orvane", "/bin/sh", "--", "-c",
+                       "echo \"$0\" \"$1\"", "--orvane=", "next"});
+    EXPECT_EQ(result.standardOutput.substr(0, 15), "--orvane= next\n") << result.standardError;
+}
+
 TEST(RefusalTest, RootThatIsAFileIsBadInput) {
     const TemporaryFolder folder;
     const std::string file = folder.path() / "file";
