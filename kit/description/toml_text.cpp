@@ -11,7 +11,6 @@ namespace orvane::kit {
 namespace {
 
 constexpr std::size_t HEX_LINE = 32; ///< bytes
-constexpr char DIGITS[] = "0123456789abcdef";
 
 /// The character as an escape of a basic string.
 std::string escaped(char32_t character) {
@@ -29,12 +28,7 @@ std::string escaped(char32_t character) {
     default:
         break;
     }
-    const bool isLong = character > 0xFFFFU;
-    std::string text = isLong ? "\\U" : "\\u";
-    for (unsigned shift = isLong ? 32 : 16; shift != 0; shift -= 4) {
-        text += DIGITS[character >> (shift - 4) & 0xFU];
-    }
-    return text;
+    return character <= 0xFFFFU ? unicodeEscape(character) : "\\U" + hexDigits(character, 8);
 }
 
 /// Whether the character stands for itself in a basic string, where nothing is before or after it.

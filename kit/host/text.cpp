@@ -11,11 +11,8 @@ namespace orvane::kit {
 
 namespace {
 
-constexpr char HEX_DIGITS[] = "0123456789abcdef";
-
-std::string escaped(char byte) {
-    const auto value = static_cast<unsigned char>(byte);
-    return {'\\', 'x', HEX_DIGITS[value >> 4U], HEX_DIGITS[value & 0xFU]};
+std::string hexByte(char byte) {
+    return hexDigits(static_cast<unsigned char>(byte), 2);
 }
 
 /// Characters from `first` to `last`.
@@ -68,7 +65,8 @@ void forEachCharacter(std::string_view text,
 std::string printable(std::string_view bytes) {
     std::string text;
     const auto escape = [&text](std::string_view part) {
-        std::for_each(part.begin(), part.end(), [&text](char byte) { text += escaped(byte); });
+        std::for_each(part.begin(), part.end(),
+                      [&text](char byte) { text += "\\x" + hexByte(byte); });
     };
     while (!bytes.empty()) {
         const auto valid = static_cast<std::size_t>(utf8::find_invalid(bytes.begin(), bytes.end()) -
@@ -100,16 +98,26 @@ std::string printableLines(std::string_view bytes) {
     return text;
 }
 
+std::string hexDigits(std::uint32_t number, unsigned count) {
+    std::string text(count, '0');
+    for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4U) {
+        *digit = "0123456789abcdef"[number & 0xFU];
+    }
+    return text;
+}
+
+std::string unicodeEscape(char32_t unit) {
+    return "\\u" + hexDigits(unit, 4);
+}
+
 std::string hexText(std::string_view bytes) {
     std::string text;
     text.reserve(bytes.size() * 3);
     for (const char byte : bytes) {
-        const auto value = static_cast<unsigned char>(byte);
         if (!text.empty()) {
             text += ' ';
         }
-        text += HEX_DIGITS[value >> 4U];
-        text += HEX_DIGITS[value & 0xFU];
+        text += hexByte(byte);
     }
     return text;
 }

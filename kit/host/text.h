@@ -28,6 +28,12 @@ std::string printable(std::string_view bytes);
 /// The same for each line of `bytes`. Line ends and tabs stay.
 std::string printableLines(std::string_view bytes);
 
+/// The last `count` digits of `number` in hex.
+std::string hexDigits(std::uint32_t number, unsigned count);
+
+/// A code unit as \u and four digits, the escape of JSON and TOML.
+std::string unicodeEscape(char32_t unit);
+
 /// `bytes` in hex, two digits each, with blanks between them.
 std::string hexText(std::string_view bytes);
 

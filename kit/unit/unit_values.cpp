@@ -19,10 +19,8 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <iomanip>
 #include <map>
 #include <optional>
-#include <sstream>
 #include <string_view>
 #include <variant>
 
@@ -40,9 +38,7 @@ std::string crcText(const std::string& bytes) {
     for (const char byte : bytes) {
         crc = crc32Step(crc, static_cast<std::uint8_t>(byte));
     }
-    std::ostringstream text;
-    text << std::hex << std::setw(8) << std::setfill('0') << ~crc;
-    return text.str();
+    return hexDigits(~crc, 8);
 }
 
 std::string fileText(const std::string& bytes) {

@@ -21,10 +21,9 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <iomanip>
 #include <map>
 #include <optional>
-#include <sstream>
+#include <ostream>
 #include <utility>
 #include <vector>
 
@@ -32,10 +31,8 @@ namespace orvane::desk {
 
 namespace {
 
-std::string hexNumber(std::uint32_t number, int digits) {
-    std::ostringstream text;
-    text << "0x" << std::hex << std::setw(digits) << std::setfill('0') << number;
-    return text.str();
+std::string hexNumber(std::uint32_t number, unsigned digits) {
+    return "0x" + kit::hexDigits(number, digits);
 }
 
 constexpr Column PARAM_COLUMNS[] = {{"param", 5},   {"group", 6}, {"offset", 7},
@@ -51,7 +48,7 @@ void printPart(std::ostream& out, const DecodedImage& image) {
     printTitles(out, PARAM_COLUMNS);
     out << '\n';
     for (const DecodedParam& param : image.params) {
-        const auto digits = static_cast<int>(param.size) * 2;
+        const auto digits = static_cast<unsigned>(param.size) * 2;
         printCells(out, PARAM_COLUMNS, param.row.number, param.row.group, param.row.offset,
                    param.size, param.raw ? std::to_string(*param.raw) : "-",
                    param.raw ? hexNumber(*param.raw, digits) : "-", param.row.defaultValue,

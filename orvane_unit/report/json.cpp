@@ -21,11 +21,9 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <iomanip>
 #include <map>
 #include <optional>
 #include <set>
-#include <sstream>
 #include <string_view>
 
 namespace orvane::desk {
@@ -36,17 +34,12 @@ using Json = nlohmann::ordered_json;
 
 /// A character in a text of JSON: two escapes if it takes two units of UTF-16.
 std::string escaped(char32_t character) {
-    const auto unit = [](char32_t value) {
-        std::ostringstream text;
-        text << "\\u" << std::hex << std::setw(4) << std::setfill('0')
-             << static_cast<std::uint32_t>(value);
-        return text.str();
-    };
     if (character <= 0xFFFFU) {
-        return unit(character);
+        return kit::unicodeEscape(character);
     }
     const char32_t above = character - 0x10000U;
-    return unit(0xD800U + (above >> 10U)) + unit(0xDC00U + (above & 0x3FFU));
+    return kit::unicodeEscape(0xD800U + (above >> 10U)) +
+           kit::unicodeEscape(0xDC00U + (above & 0x3FFU));
 }
 
 /// `json` on one line. Outside its texts everything is printable, so escapes stand only in them.

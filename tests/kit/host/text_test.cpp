@@ -77,6 +77,10 @@ TEST(TextTest, CountedUsesSingularAndPlural) {
 }
 
 TEST(TextTest, HexTextHasBlanksBetweenBytes) {
+    EXPECT_EQ(kit::hexDigits(0, 2), "00");
+    EXPECT_EQ(kit::hexDigits(0xFEDCBA98U, 8), "fedcba98");
+    EXPECT_EQ(kit::hexDigits(0x76543210U, 4), "3210");
+    EXPECT_EQ(kit::unicodeEscape(U'\x1b'), "\\u001b");
     EXPECT_EQ(kit::hexText(""), "");
     EXPECT_EQ(kit::hexText(std::string("\0\xff\x5A", 3)), "00 ff 5a");
 }
