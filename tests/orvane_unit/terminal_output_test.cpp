@@ -6,6 +6,7 @@
 #include "kit/host/text.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/orvane_unit/orvane_unit_command.h"
+#include "tests/support/unicode.h"
 #include "tests/support/unit_test.h"
 
 #include <gtest/gtest.h>
@@ -31,7 +32,7 @@ const std::string BYTES = OBEYED + "\xff";
 void expectPrintable(const std::string& output) {
     ASSERT_TRUE(kit::isUtf8(output));
     kit::forEachCharacter(output, [](char32_t character, std::string_view bytes) {
-        EXPECT_TRUE(kit::isPrintable(character) || character == U'\n' || character == U'\t')
+        EXPECT_TRUE(!isControlOrFormat(character) || character == U'\n' || character == U'\t')
             << kit::hexText(bytes);
     });
 }

@@ -5,8 +5,9 @@ from __future__ import annotations
 
 import json
 import os
-import re
 import stat
+import sys
+import unicodedata
 from collections.abc import Iterator, Mapping
 from pathlib import Path
 from typing import Any
@@ -18,9 +19,10 @@ SHOWN = 160
 
 PROGRAM = "orvane-unit: "
 
-# What a terminal obeys instead of showing it: controls but for the ends of lines and tabs, and the characters
-# that change the order of what follows.
-OBEYED = re.compile("[\0-\x08\x0b-\x1f\x7f-\x9f\u061c\u200e\u200f\u202a-\u202e\u2066-\u2069]")
+# What a terminal obeys or hides instead of showing it: control and format characters but for the ends of lines
+# and tabs, and the separators of lines and paragraphs.
+UNSEEN = frozenset(character for character in map(chr, range(sys.maxunicode + 1))
+                   if unicodedata.category(character) in ("Cc", "Cf", "Zl", "Zp") and character not in "\n\t")
 
 State = Mapping[bytes, tuple[object, ...]]
 
@@ -30,10 +32,8 @@ def printed_faults(what: str, output: bytes) -> list[str]:
         text = output.decode()
     except UnicodeDecodeError as error:
         return [f"{what} is not UTF-8: {output[max(0, error.start - 20):error.start + 20]!r}"]
-    found = OBEYED.search(text)
-    if found is None:
-        return []
-    return [f"{what} has {found[0]!r}: {text[max(0, found.start() - 40):found.end() + 20]!r}"]
+    return [f"{what} has {character!r}: {text[max(0, place - 40):place + 20]!r}"
+            for character in sorted(UNSEEN & set(text)) for place in [text.index(character)]]
 
 
 def end_faults(command: str, status: int, stdout: bytes, stderr: bytes) -> list[str]:

@@ -21,7 +21,8 @@ class Printed(unittest.TestCase):
             self.assertEqual(faults.printed_faults("it", text.encode()), [], text)
 
     def test_what_a_terminal_obeys(self) -> None:
-        for output in (b"\x1b[1m", b"\r", b"\0", b"\x7f", b"\xc2\x9b", b"\xe2\x80\xae", b"\xe2\x81\xa6", b"\xff"):
+        for output in (b"\x1b[1m", b"\r", b"\0", b"\x7f", b"\xc2\x9b", b"\xe2\x80\xae", b"\xe2\x81\xa6", b"\xff",
+                       b"\xe2\x80\xa8", b"\xc2\xad"):
             self.assertEqual(len(faults.printed_faults("it", b"text " + output)), 1, output)
 
 
@@ -121,14 +122,14 @@ class Commands(unittest.TestCase):
                              "echo 'orvane-unit: cannot read /x: Permission denied' >&2; exit 2\n", encoding="ascii")
         self.tool.chmod(0o755)
         parts.put(self.root, "/fs/mp/etc/airplay.conf", b"stock")
-        file = self.root / "fs/mp/etc/airplay.conf"
+        file, folder = self.root / "fs/mp/etc/airplay.conf", self.root / "empty"
+        folder.mkdir()
         for is_weak, mode, place, faults_found in (
                 (True, 0o644, file, 1), (True, 0o222, file, 0), (False, 0o222, file, 1),
-                (True, 0o444, file.parent, 0), (True, 0o755, file.parent, 1)):
+                (True, 0o444, folder, 0), (True, 0o555, folder, 1)):
             place.chmod(mode)
             self.scene.is_weak, self.scene.lines = is_weak, []
             self.scene.states = {}
             self.scene.capture()
             self.assertEqual(len(self.scene.lines), faults_found, (is_weak, oct(mode), place))
-            file.parent.chmod(0o755)
-            file.chmod(0o644)
+            place.chmod(0o755)
