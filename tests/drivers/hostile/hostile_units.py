@@ -81,7 +81,8 @@ def _put_odd(root: Path, place: Path, rng: random.Random, serial: bytes) -> None
         os.truncate(place, rng.choice(SIZES))
 
     def hard_link() -> None:
-        others = [root / path[1:] for path in FILES if _is_file(root / path[1:])]
+        places = [root / path[1:] for path in FILES]
+        others = [other for other in places if is_own_folder(root, other.parent) and _is_file(other)]
         if others:
             os.link(rng.choice(others), place)
 
@@ -106,16 +107,15 @@ def _put_odd(root: Path, place: Path, rng: random.Random, serial: bytes) -> None
 
 
 def _is_file(place: Path) -> bool:
+    return not place.is_symlink() and place.is_file()
+
+
+def is_own_folder(root: Path, place: Path) -> bool:
+    """Whether it is a folder in the unit, and no link leads there: what is put in it stays in the unit."""
+    own = Path(os.path.realpath(root)) / place.relative_to(root)
     try:
-        return not place.is_symlink() and place.is_file()
+        return Path(os.path.realpath(place)) == own and place.is_dir()
     except OSError:  # nobody gets past a folder above it
-        return False
-
-
-def _is_folder(place: Path) -> bool:
-    try:
-        return not place.is_symlink() and place.is_dir()
-    except OSError:
         return False
 
 
@@ -138,7 +138,7 @@ def _put_ordinary(root: Path, path: str, rng: random.Random, serial: bytes) -> N
 
 def _put_version_files(root: Path, rng: random.Random, serial: bytes) -> None:
     folder = root / VERSIONS[1:]
-    if not _is_folder(folder):
+    if not is_own_folder(root, folder):
         return
     parts.put_version(root, odd_text.version_text(rng), name="0.inf")
     for name in rng.sample([*NAMES, serial.replace(b"\0", b"").replace(b"/", b"") + b".inf"], rng.randrange(5)):
@@ -157,7 +157,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
     serial = _serial(rng)
     for path in FOLDERS:
         place = root / path[1:]
-        if not _is_folder(place.parent):
+        if not is_own_folder(root, place.parent) or os.path.lexists(place):
             continue
         if rng.random() < oddness / 8:
             _put_odd(root, place, rng, serial)
@@ -165,7 +165,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
             place.mkdir()
     for path in FILES:
         place = root / path[1:]
-        if not _is_folder(place.parent) or os.path.lexists(place):
+        if not is_own_folder(root, place.parent) or os.path.lexists(place):
             continue
         if rng.random() < oddness:
             _put_odd(root, place, rng, serial)
@@ -175,7 +175,7 @@ def make_hostile_unit(root: Path, rng: random.Random) -> list[str]:
     if rng.random() < oddness:
         name = rng.choice(NAMES)
         place = Path(os.fsdecode(os.fsencode(root / rng.choice(("", "tmp"))) + b"/" + name))
-        if _is_folder(place.parent) and not os.path.lexists(place):
+        if is_own_folder(root, place.parent) and not os.path.lexists(place):
             _put_odd(root, place, rng, serial)
     if rng.random() < 0.05:
         _put_odd(root, root / MARKER, rng, serial)

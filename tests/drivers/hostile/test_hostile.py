@@ -9,7 +9,7 @@ import unittest
 from pathlib import Path
 
 from drivers.hostile import faults, hostile
-from drivers.hostile.hostile_units import outside_of
+from drivers.hostile.hostile_units import is_own_folder, outside_of
 from drivers.random_units import RandomUnit
 from drivers.unit_tool import MARKER
 from model import parts, records
@@ -45,6 +45,21 @@ class Ends(unittest.TestCase):
         for output in (b"", b"{", b"[]", b'{"format":1}', b'{"format":2,"command":"show"}',
                        b'{"format":1,"command":"diff"}'):
             self.assertEqual(len(faults.parsed("show", output)[1]), 1, output)
+
+
+class OwnFolders(unittest.TestCase):
+    def test_only_folders_of_the_unit_are_filled(self) -> None:
+        with tempfile.TemporaryDirectory() as name:
+            root, outside = Path(name) / "unit", Path(name) / "outside"
+            (root / "own/below").mkdir(parents=True)
+            (outside / "below").mkdir(parents=True)
+            (root / "file").touch()
+            (root / "link").symlink_to(outside)
+            (root / "loop").symlink_to("loop")
+            for place in ("", "own", "own/below"):
+                self.assertTrue(is_own_folder(root, root / place), place)
+            for place in ("file", "none", "link", "link/below", "loop", "loop/below", "file/below"):
+                self.assertFalse(is_own_folder(root, root / place), place)
 
 
 class Redacted(unittest.TestCase):
