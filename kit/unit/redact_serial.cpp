@@ -54,11 +54,9 @@ void redact(const Bytes& serial, Bytes& bytes) {
 }
 
 /// `path` with the serial covered in its last name.
-std::string withoutSerial(const Bytes& serial, const std::string& path) {
+std::string pathWithoutSerial(const Bytes& serial, const std::string& path) {
     const std::string folder = pathAbove(path);
-    std::string name = path.substr(folder.size());
-    redact(serial, name);
-    return folder + name;
+    return folder + withoutSerial(serial, path.substr(folder.size()));
 }
 
 bool isVersionPath(const std::string& path) {
@@ -73,7 +71,7 @@ void redactNames(const Bytes& serial, Files& files) {
         paths.push_back(path);
     }
     for (const std::string& path : paths) {
-        const std::string redacted = withoutSerial(serial, path);
+        const std::string redacted = pathWithoutSerial(serial, path);
         if (isVersionPath(path) && isVersionPath(redacted) && files.count(redacted) == 0) {
             auto file = files.extract(path);
             file.key() = redacted;
@@ -98,8 +96,8 @@ void redactFiles(const Bytes& serial, UnitDescription& unit) {
     redactNames(serial, unit.sparseFiles);
     redactNames(serial, unit.links);
     for (std::string& path : unit.folders) {
-        if (isVersionPath(path) && isVersionPath(withoutSerial(serial, path))) {
-            path = withoutSerial(serial, path);
+        if (isVersionPath(path) && isVersionPath(pathWithoutSerial(serial, path))) {
+            path = pathWithoutSerial(serial, path);
         }
     }
 }
@@ -123,6 +121,13 @@ bool holds(const Bytes& serial, const fs::path& file) {
 }
 
 } // namespace
+
+std::string withoutSerial(const Bytes& serial, std::string text) {
+    if (!serial.empty()) {
+        redact(serial, text);
+    }
+    return text;
+}
 
 Bytes redactSerial(UnitInputs& inputs) {
     const ValuePlace place = valuePlace(slotKey(SERIAL_RECORD_SLOT));

@@ -5,6 +5,7 @@
 #include "kit/unit/describe_inputs.h"
 
 #include <filesystem>
+#include <string>
 
 namespace orvane::kit {
 
@@ -15,6 +16,9 @@ namespace orvane::kit {
 /// requireNowhere finds those. Returns the bytes that must not stand anywhere; nothing when there
 /// is no serial, or only blanks or "X". Throws KitError for a serial of less than four bytes.
 Bytes redactSerial(UnitInputs& inputs);
+
+/// `text` with `serial`, as redactSerial returns it, covered wherever it stands.
+std::string withoutSerial(const Bytes& serial, std::string text);
 
 /// Throws KitError, with the path, when the bytes stand below `folder`: in a name, a link's target
 /// or a file. They may not be empty or contain a zero.
