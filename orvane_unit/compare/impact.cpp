@@ -29,6 +29,7 @@
 #include <functional>
 #include <optional>
 #include <system_error>
+#include <tuple>
 #include <utility>
 
 namespace orvane::desk {
@@ -166,17 +167,21 @@ void requireInputs(const std::vector<Input>& inputs, const std::vector<std::stri
 void addLines(const std::vector<OutputDifference>& differences, Impact& impact) {
     for (const OutputDifference& output : differences) {
         if (output.before != output.after) {
-            impact.lines.insert(output.path);
+            impact.lines.insert({output.path, 0});
             continue;
         }
         for (const DifferingLine& line : output.lines) {
             const std::size_t number = line.line.before != 0 ? line.line.before : line.line.after;
-            impact.lines.insert(output.path + ":" + std::to_string(number));
+            impact.lines.insert({output.path, number});
         }
     }
 }
 
 } // namespace
+
+bool operator<(const OutputLine& one, const OutputLine& other) {
+    return std::tie(one.path, one.number) < std::tie(other.path, other.number);
+}
 
 std::vector<Impact> findImpacts(const fs::path& root, const std::vector<std::string>& prefixes,
                                 const Progress& progress) {

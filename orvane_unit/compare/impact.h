@@ -14,11 +14,20 @@
 
 namespace orvane::desk {
 
+/// A line of an output.
+struct OutputLine {
+    std::string path;
+    std::size_t number = 0; ///< from 1; 0 for the whole output
+};
+
+/// Ordered by path, then number.
+bool operator<(const OutputLine& one, const OutputLine& other);
+
 struct Impact {
-    kit::ValueKey key;           ///< of a parameter, a byte of a slot or a tuning field
-    std::size_t tried = 0;       ///< other values that were tried
-    std::size_t changing = 0;    ///< of these, how many changed a line
-    std::set<std::string> lines; ///< "/tmp/airplay.conf:5"; "/tmp/airplay.conf" for a whole output
+    kit::ValueKey key;        ///< of a parameter, a byte of a slot or a tuning field
+    std::size_t tried = 0;    ///< other values that were tried
+    std::size_t changing = 0; ///< of these, how many changed a line
+    std::set<OutputLine> lines;
 };
 
 /// Called with the number of inputs that are done, and of all.

@@ -6,6 +6,7 @@
 #include "kit/unit/unit_values.h"
 #include "orvane_unit/compare/text_diff.h"
 #include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
 #include "orvane_unit/report/terminal.h"
 #include "orvane_unit/report/unified_diff.h"
 #include "tuning/dps_block.h"
@@ -122,8 +123,8 @@ void printImpacts(std::ostream& out, const std::vector<Impact>& impacts) {
         out << painted(Colour::place, keyText(impact.key)) << ": " << impact.changing << " of "
             << kit::counted(impact.tried, "value")
             << (impact.changing == 1 ? " changes" : " change") << " the output\n";
-        for (const std::string& line : impact.lines) {
-            out << "  " << line << '\n';
+        for (const OutputLine& line : impact.lines) {
+            out << "  " << lineText(line) << '\n';
         }
     }
     out << kit::counted(inert.size(), "input") << (inert.size() == 1 ? " changes" : " change")

@@ -4,8 +4,6 @@
 #include "config/param_catalogue.h"
 #include "config/record_slots.h"
 #include "identity/inf_file.h"
-#include "identity/software_version.h"
-#include "kit/description/value_places.h"
 #include "kit/host/bytes.h"
 #include "kit/host/sparse_content.h"
 #include "kit/host/text.h"
@@ -14,6 +12,7 @@
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
 #include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
 #include "orvane_unit/report/table.h"
 #include "orvane_unit/report/terminal.h"
 #include "tuning/dps_block.h"
@@ -30,10 +29,6 @@
 namespace orvane::desk {
 
 namespace {
-
-std::string hexNumber(std::uint32_t number, unsigned digits) {
-    return "0x" + kit::hexDigits(number, digits);
-}
 
 constexpr Column PARAM_COLUMNS[] = {{"param", 5},   {"group", 6}, {"offset", 7},
                                     {"size", 5},    {"raw", 7},   {"hex", 7},
@@ -75,14 +70,6 @@ std::string contentText(const std::optional<std::string>& bytes) {
                : quoted + "  " + painted(Colour::faint, kit::hexText(text));
 }
 
-/// "slots 1 to 9": what `slot` repeats; empty for a slot that repeats none.
-std::string repeatedSlots(std::uint32_t slot) {
-    const std::vector<std::uint32_t> slots = kit::slotsWithin(slot);
-    return slots.empty()
-               ? ""
-               : "slots " + std::to_string(slots.front()) + " to " + std::to_string(slots.back());
-}
-
 constexpr Column SLOT_COLUMNS[] = {{"slot", 4}, {"offset", 7}, {"size", 5}};
 
 void printPart(std::ostream& out, const DecodedRecords& records) {
@@ -118,12 +105,6 @@ void printField(std::ostream& out, const DpsBlock& block, const DpsField& field)
     out << '\n';
 }
 
-const char* purposeOf(std::int32_t blockId) {
-    return blockId == DPS_BLOCK_TELEPHONY   ? ", telephony"
-           : blockId == DPS_BLOCK_SPEECHREC ? ", speech recognition"
-                                            : "";
-}
-
 void printPart(std::ostream& out, const TuningArea& tuning) {
     if (tuning.reason != Reason::fromTuningBlock) {
         out << "tuning blocks: " << painted(Colour::bad, reasonInfo(tuning.reason).sentence)
@@ -132,7 +113,8 @@ void printPart(std::ostream& out, const TuningArea& tuning) {
     }
     for (std::int32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
         const DpsBlock& block = tuning.blocks.at(static_cast<std::size_t>(id));
-        out << "tuning block " << id << purposeOf(id);
+        const std::string purpose = purposeOf(id);
+        out << "tuning block " << id << (purpose.empty() ? "" : ", ") << purpose;
         const std::string bytes(block.bytes.begin(), block.bytes.end());
         if (kit::withoutTrailingZeros(bytes).empty()) {
             out << ": " << painted(Colour::faint, "zeros") << '\n';
@@ -149,15 +131,8 @@ void printPart(std::ostream& out, const DecodedVersions& versions) {
     for (std::size_t i = 0; i < versions.found.files.size(); ++i) {
         const VersionFile& file = versions.found.files[i];
         out << kit::printable(file.path) << ": ";
-        if (versions.found.chosen == i) {
-            out << painted(Colour::good,
-                           "chosen: the first application in the order of the listing");
-        } else if (file.isApplication) {
-            out << "not chosen: an application, but not the first one";
-        } else {
-            out << "not chosen: its type does not contain \"" << APPLICATION_TYPE << '"';
-        }
-        out << '\n';
+        const std::string choice = choiceText(versions.found, i);
+        out << (versions.found.chosen == i ? painted(Colour::good, choice) : choice) << '\n';
         for (const auto& [key, value] : file.record) {
             out << "  " << kit::printable(key) << " = " << kit::printable(value) << '\n';
         }

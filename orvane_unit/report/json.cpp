@@ -12,6 +12,7 @@
 #include "orvane_unit/explain/value_origins.h"
 #include "orvane_unit/explain/version_choice.h"
 #include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
 #include "orvane_unit/report/place_text.h"
 #include "tuning/dps_block.h"
 
@@ -277,10 +278,14 @@ std::string impactsJson(const std::string& root, const std::vector<Impact>& impa
     json["root"] = bytesJson(root);
     json["inputs"] = Json::array();
     for (const Impact& impact : impacts) {
+        Json lines = Json::array();
+        for (const OutputLine& line : impact.lines) {
+            lines.push_back(lineText(line));
+        }
         json["inputs"].push_back({{"key", keyText(impact.key)},
                                   {"tried", impact.tried},
                                   {"moving", impact.changing},
-                                  {"lines", impact.lines}});
+                                  {"lines", lines}});
     }
     return lineOf(json);
 }

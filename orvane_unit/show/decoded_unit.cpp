@@ -48,25 +48,30 @@ std::string profileMeaning(std::int32_t profile) {
     return meaning;
 }
 
-/// What the tool makes of parameter `number` of this unit.
-std::string meaningOf(std::uint16_t number) {
+DecodedIdentity decodeIdentity() {
+    return {textBy(getModelName),  textBy(getBrandName), textBy(getFuelType),
+            textBy(getUnitSerial), getRightHandDrive(),  readAudioProfile()};
+}
+
+/// What the tool makes of parameter `number`.
+std::string meaningOf(std::uint16_t number, const DecodedIdentity& identity) {
     switch (number) {
     case RIGHT_HAND_DRIVE_PARAM:
-        return "right-hand drive " + std::to_string(getRightHandDrive());
+        return "right-hand drive " + std::to_string(identity.rightHandDrive);
     case BRAND_PARAM:
-        return "brand " + textBy(getBrandName);
+        return "brand " + identity.brand;
     case FUEL_TYPE_PARAM:
-        return "fuel type " + textBy(getFuelType) + ", which is not written";
+        return "fuel type " + identity.fuelType + ", which is not written";
     case AUDIO_PROFILE_PARAM:
-        return profileMeaning(readAudioProfile());
+        return profileMeaning(identity.audioProfile);
     case MODEL_PARAM:
-        return "model " + textBy(getModelName);
+        return "model " + identity.model;
     default:
         return "";
     }
 }
 
-std::vector<DecodedParam> decodeParams(const Image& image) {
+std::vector<DecodedParam> decodeParams(const Image& image, const DecodedIdentity& identity) {
     ConfigStore store;
     store.init();
     const bool isOpen = store.open() == 0;
@@ -81,7 +86,7 @@ std::vector<DecodedParam> decodeParams(const Image& image) {
             getParam(store, number, &value) == PARAM_OK) {
             param.raw = value;
         }
-        param.meaning = meaningOf(number);
+        param.meaning = meaningOf(number, identity);
         params.push_back(std::move(param));
     }
     return params;
@@ -166,8 +171,9 @@ DecodedUnit decodeUnit(const std::filesystem::path& root) {
     const kit::LostPages lost;
     DecodedUnit unit;
     unit.image.found = readImage();
-    unit.image.params = decodeParams(unit.image.found);
     unit.records = decodeRecords();
+    unit.identity = decodeIdentity(); // after these looks: the tool would wait at a pipe
+    unit.image.params = decodeParams(unit.image.found, unit.identity);
     unit.tuning = readUnitTuning();
     unit.versions = {readVersionFiles(), findApplicationVersion(), softwareVersion()};
     unit.files = lookAtFiles();

@@ -60,6 +60,16 @@ struct DecodedVersions {
     std::string digits;  ///< as the iAP1 file carries it
 };
 
+/// What the unit and its vehicle are called, as the tool reads them.
+struct DecodedIdentity {
+    std::string model;
+    std::string brand;
+    std::string fuelType;
+    std::string serial;
+    unsigned rightHandDrive = 0;
+    std::int32_t audioProfile = 0; ///< as of readAudioProfile
+};
+
 /// A path that a run opens, and what is there.
 struct UnitFile {
     std::string path;
@@ -69,6 +79,7 @@ struct UnitFile {
 };
 
 struct DecodedUnit {
+    DecodedIdentity identity;
     DecodedImage image;
     DecodedRecords records;
     TuningArea tuning;

@@ -5,6 +5,7 @@
 #include "kit/unit/describe_unit.h"
 #include "kit/unit/make_unit.h"
 #include "orvane_unit/compare/impact.h"
+#include "orvane_unit/report/phrases.h"
 #include "tests/kit/description/description_equality.h"
 #include "tests/kit/unit/described_unit.h"
 #include "tests/support/temporary_folder.h"
@@ -18,7 +19,16 @@ namespace orvane::test {
 namespace {
 
 using desk::Impact;
-using Lines = std::set<std::string>;
+using Lines = std::vector<std::string>;
+
+/// The lines as text, in their order.
+Lines linesOf(const Impact& impact) {
+    Lines lines;
+    for (const desk::OutputLine& line : impact.lines) {
+        lines.push_back(lineText(line));
+    }
+    return lines;
+}
 
 std::map<std::string, Impact> impactsOf(const std::filesystem::path& root,
                                         const std::vector<std::string>& prefixes = {}) {
@@ -58,12 +68,12 @@ TEST(ImpactTest, FourParametersTheSerialAndTwoBlocksChangeTheSample) {
                             key.compare(0, 9, "tuning.3.") == 0;
         EXPECT_EQ(!impact.lines.empty(), isRead) << key;
     }
-    EXPECT_EQ(impacts.at("param.22").lines, Lines{"/tmp/airplay.conf:23"});
-    EXPECT_EQ(impacts.at("slot.9.0").lines,
+    EXPECT_EQ(linesOf(impacts.at("param.22")), Lines{"/tmp/airplay.conf:23"});
+    EXPECT_EQ(linesOf(impacts.at("slot.9.0")),
               (Lines{"/tmp/iap1.cfg:6", "/tmp/iap2.cfg:6", "/tmp/iap2_device.cfg:6"}));
-    EXPECT_EQ(impacts.at("tuning.3.qwaMEQEnable").lines, Lines{"/tmp/telephony_FFFF.txt:45"});
+    EXPECT_EQ(linesOf(impacts.at("tuning.3.qwaMEQEnable")), Lines{"/tmp/telephony_FFFF.txt:45"});
     EXPECT_EQ(
-        impacts.at("param.134").lines,
+        linesOf(impacts.at("param.134")),
         (Lines{"/tmp/airplay.conf:20", "/tmp/speechrec_FFFF.txt", "/tmp/telephony_FFFF.txt"}));
     EXPECT_EQ(kit::describeUnit(root), before);
 }

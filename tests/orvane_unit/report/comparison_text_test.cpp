@@ -44,19 +44,20 @@ TEST(ComparisonTextTest, ConsequencesFollowTheirValues) {
 }
 
 TEST(ComparisonTextTest, InputsThatChangeNothingAreGroupedInRanges) {
-    EXPECT_EQ(printed(std::vector<Impact>{{kit::paramKey(1), 3, 0, {}},
-                                          {kit::paramKey(2), 3, 0, {}},
-                                          {kit::paramKey(3), 13, 12, {"/tmp/x:1", "/tmp/y"}},
-                                          {kit::paramKey(4), 1, 1, {"/tmp/x:2"}},
-                                          {kit::paramKey(5), 3, 0, {}},
-                                          {kit::slotByteKey(0, 0), 3, 0, {}},
-                                          {kit::slotByteKey(1, 0), 3, 0, {}},
-                                          {kit::slotByteKey(1, 1), 3, 0, {}},
-                                          {kit::tuningFieldKey(1, "qwaA"), 3, 0, {}}}),
-              "param.3: 12 of 13 values change the output\n  /tmp/x:1\n  /tmp/y\n"
-              "param.4: 1 of 1 value changes the output\n  /tmp/x:2\n"
-              "7 inputs change nothing:\n"
-              "  param.1-2\n  param.5\n  slot.0.0\n  slot.1.0-1\n  tuning.1.qwaA\n");
+    EXPECT_EQ(
+        printed(std::vector<Impact>{{kit::paramKey(1), 3, 0, {}},
+                                    {kit::paramKey(2), 3, 0, {}},
+                                    {kit::paramKey(3), 13, 12, {{"/tmp/x", 1}, {"/tmp/y", 0}}},
+                                    {kit::paramKey(4), 1, 1, {{"/tmp/x", 2}}},
+                                    {kit::paramKey(5), 3, 0, {}},
+                                    {kit::slotByteKey(0, 0), 3, 0, {}},
+                                    {kit::slotByteKey(1, 0), 3, 0, {}},
+                                    {kit::slotByteKey(1, 1), 3, 0, {}},
+                                    {kit::tuningFieldKey(1, "qwaA"), 3, 0, {}}}),
+        "param.3: 12 of 13 values change the output\n  /tmp/x:1\n  /tmp/y\n"
+        "param.4: 1 of 1 value changes the output\n  /tmp/x:2\n"
+        "7 inputs change nothing:\n"
+        "  param.1-2\n  param.5\n  slot.0.0\n  slot.1.0-1\n  tuning.1.qwaA\n");
 }
 
 TEST(ComparisonTextTest, WholeTuningBlocksAreOneWord) {

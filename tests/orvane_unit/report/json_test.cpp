@@ -112,8 +112,9 @@ TEST(JsonTest, DifferencesNameValueOutputAndLine) {
 }
 
 TEST(JsonTest, ImpactsAndChecksHaveTheirFields) {
-    const json impacts = parsed(
-        desk::impactsJson("R", {{kit::paramKey(22), 13, 12, {"/tmp/airplay.conf:23"}}}), "impact");
+    const json impacts =
+        parsed(desk::impactsJson("R", {{kit::paramKey(22), 13, 12, {{"/tmp/airplay.conf", 23}}}}),
+               "impact");
     EXPECT_EQ(impacts.at("inputs"), (json::array({{{"key", "param.22"},
                                                    {"tried", 13},
                                                    {"moving", 12},
