@@ -2,7 +2,7 @@
 # Completion of orvane-unit for bash: source this file.
 
 _orvane_unit() {
-    local commands='new describe set show explain run diff impact capture check'
+    local commands='new describe set show explain run diff impact report capture check'
     local word=${COMP_WORDS[COMP_CWORD]} before=${COMP_WORDS[COMP_CWORD - 1]}
     local command=${COMP_WORDS[1]}
     COMPREPLY=()
@@ -11,7 +11,7 @@ _orvane_unit() {
         return
     fi
     case $before in
-    --from | --orvane)
+    --from | --orvane | -o)
         mapfile -t COMPREPLY < <(compgen -f -- "$word")
         compopt -o filenames 2>/dev/null
         return
@@ -29,6 +29,7 @@ _orvane_unit() {
     run) options+=' --orvane --brief --json' ;;
     diff) options+=' -a -i --json' ;;
     impact) options+=' --json' ;;
+    report) options+=' -o -a -i --redact-serial --impact' ;;
     capture) options+=' --redact-serial' ;;
     check) options+=' --orvane --update --json' ;;
     esac

@@ -12,6 +12,7 @@
 #include "kit/host/folder_lock.h"
 #include "kit/host/kit_error.h"
 #include "kit/host/text.h"
+#include "kit/host/unfinished_file.h"
 #include "kit/unit/capture_unit.h"
 #include "kit/unit/describe_inputs.h"
 #include "kit/unit/describe_unit.h"
@@ -27,6 +28,8 @@
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/find_orvane.h"
+#include "orvane_unit/page/page.h"
+#include "orvane_unit/page/page_units.h"
 #include "orvane_unit/report/check_text.h"
 #include "orvane_unit/report/comparison_text.h"
 #include "orvane_unit/report/decoded_unit_text.h"
@@ -327,6 +330,14 @@ private:
     bool isJson_ = false;
 };
 
+/// Draws a bar on standard error, if that is a terminal.
+Progress terminalProgress() {
+    if (::isatty(STDERR_FILENO) != 1) {
+        return [](std::size_t /*done*/, std::size_t /*all*/) {};
+    }
+    return [](std::size_t done, std::size_t all) { printProgress(std::cerr, done, all); };
+}
+
 class ImpactCommand : public Command {
 public:
     explicit ImpactCommand(CLI::App& app)
@@ -342,13 +353,7 @@ public:
     }
 
     ExitStatus run(std::ostream& out) const override {
-        const bool showsProgress = ::isatty(STDERR_FILENO) == 1;
-        const std::vector<Impact> impacts =
-            findImpacts(root_, prefixes_, [showsProgress](std::size_t done, std::size_t all) {
-                if (showsProgress) {
-                    printProgress(std::cerr, done, all);
-                }
-            });
+        const std::vector<Impact> impacts = findImpacts(root_, prefixes_, terminalProgress());
         if (isJson_) {
             out << impactsJson(root_, impacts) << '\n';
         } else {
@@ -361,6 +366,40 @@ private:
     std::string root_;
     std::vector<std::string> prefixes_;
     bool isJson_ = false;
+};
+
+class ReportCommand : public Command {
+public:
+    explicit ReportCommand(CLI::App& app)
+        : Command(app, "report", "Write a page about units, for a browser",
+                  "orvane-unit report bench -o bench.html") {
+        parser()
+            .add_option("ROOT", request_.roots,
+                        "A unit's folder, /, a unit's description, or a folder of units or "
+                        "descriptions")
+            ->required()
+            ->check(emptyFault);
+        parser().add_option("-o", file_, "The page to write")->required()->check(emptyFault);
+        addLetters(parser());
+        addFlag("--redact-serial", request_.redactsSerial, "Replace the serials by X");
+        addFlag("--impact", request_.hasImpacts, "Say also which inputs change which lines");
+    }
+
+    ExitStatus run(std::ostream& /*out*/) const override {
+        const kit::UnfinishedFile file(file_);
+        PageRequest request = request_;
+        request.letters = givenLetters(parser());
+        const std::vector<PageUnit> units = readPageUnits(request, terminalProgress());
+        file.finish(pageText(units, request.letters));
+        return std::all_of(units.begin(), units.end(),
+                           [](const PageUnit& unit) { return isIntended(unit.explanation); })
+                   ? EXIT_AS_INTENDED
+                   : EXIT_ANSWER_IS_NO;
+    }
+
+private:
+    PageRequest request_;
+    std::string file_;
 };
 
 class CaptureCommand : public Command {
@@ -504,7 +543,8 @@ int chooseAndRun(int argc, const char* const* argv, std::ostream& out) {
                "that can't be written.");
     const std::vector<std::unique_ptr<Command>> commands =
         addCommands<NewCommand, DescribeCommand, SetCommand, ShowCommand, ExplainCommand,
-                    RunCommand, DiffCommand, ImpactCommand, CaptureCommand, CheckCommand>(app);
+                    RunCommand, DiffCommand, ImpactCommand, ReportCommand, CaptureCommand,
+                    CheckCommand>(app);
     try {
         app.parse(wordsOf(namedCommand(app, argc, argv), argc, argv));
     } catch (const CLI::Success& help) {

@@ -12,7 +12,7 @@ from shipped import PROJECT
 
 ROOMS = ("kit/host", "kit/enter", "kit/tuning", "kit/description", "kit/unit",
          "orvane_unit/explain", "orvane_unit/show", "orvane_unit/compare", "orvane_unit/check", "orvane_unit/report",
-         "orvane_unit")
+         "orvane_unit/page", "orvane_unit")
 
 INCLUDE = re.compile(r'^[ \t]*#[ \t]*include[ \t]*"([^"]+)"', re.MULTILINE)
 

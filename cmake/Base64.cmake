@@ -1,0 +1,20 @@
+# SPDX-License-Identifier: Apache-2.0
+# orvane_base64_of_hash(RESULT FILE): the SHA-256 of FILE as a Content-Security-Policy has it.
+function(orvane_base64_of_hash result file)
+  set(digits ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/)
+  file(SHA256 ${file} hex)
+  # 64 digits are 42 characters of six bits and four bits more: two zero bits, and one "=", complete them.
+  string(APPEND hex 00)
+  set(text "")
+  foreach(at RANGE 0 63 3)
+    string(SUBSTRING ${hex} ${at} 3 three)
+    math(EXPR first "0x${three} >> 6")
+    math(EXPR second "0x${three} & 63")
+    foreach(index IN ITEMS ${first} ${second})
+      string(SUBSTRING ${digits} ${index} 1 digit)
+      string(APPEND text ${digit})
+    endforeach()
+  endforeach()
+  string(SUBSTRING ${text} 0 43 text)
+  set(${result} ${text}= PARENT_SCOPE)
+endfunction()

@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/outputs_section.h"
+
+#include "kit/description/value_key.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/page/output_rows.h"
+#include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/page/unit_id.h"
+#include "orvane_unit/report/names.h"
+
+#include <cstddef>
+#include <vector>
+
+namespace orvane::desk {
+
+namespace {
+
+/// Codes with blanks between them.
+std::string codesText(const std::vector<Reason>& reasons) {
+    std::string text;
+    for (const Reason reason : reasons) {
+        text += (text.empty() ? "" : " ") + std::string(reasonInfo(reason).code);
+    }
+    return text;
+}
+
+/// The cells of a line: its number and its text.
+void addLine(Markup& page, const OutputRow& row) {
+    page.add("th", {{"scope", "row"}}, row.isLeftOut ? "" : std::to_string(row.number));
+    const Element cell(page, "td");
+    if (row.isLeftOut) {
+        page.add("small", {{"class", "sign"}}, "(left out)");
+        return;
+    }
+    page.add("code", row.text);
+    if (!row.hasEnd) {
+        page.add("small", {{"class", "sign"}}, "(no line end)");
+    }
+}
+
+void addLines(Markup& page, const std::vector<Line>& lines) {
+    const Element table(page, "table", {{"class", "lines"}});
+    addTitles(page, {"line", "text", "origin"});
+    const Element body(page, "tbody");
+    for (const OutputRow& row : outputRows(lines)) {
+        const bool isGood = isIntended(row.origin->reasons);
+        const Element line(page, "tr",
+                           {{"class", isGood ? "line" : "line fallback"},
+                            {"data-reasons", codesText(row.origin->reasons)},
+                            {"data-key", keyText(row.origin->key)},
+                            {"tabindex", "0"}});
+        addLine(page, row);
+        page.add("td", originText(*row.origin));
+    }
+}
+
+/// What is at the output's path after the run, if the output's own lines don't say it.
+void addWhatIsLeft(Markup& page, const Output& output) {
+    std::string written;
+    for (const Line& line : output.lines) {
+        written += line.text;
+    }
+    if (output.kindAfter != PathKind::file) {
+        page.add("p", {{"class", "left"}},
+                 std::string("There after the run: ") + wordOf(output.kindAfter) + ".");
+        return;
+    }
+    if (written == output.contentAfter && !written.empty()) {
+        return;
+    }
+    page.add("p", {{"class", "left"}},
+             output.contentAfter.empty() ? "There after the run: an empty file."
+                                         : "There after the run, and not from this output:");
+    if (!output.contentAfter.empty()) {
+        const Element table(page, "table", {{"class", "lines left"}});
+        addTitles(page, {"line", "text"});
+        const Element body(page, "tbody");
+        for (const OutputRow& row : outputRows({{output.contentAfter, {}}})) {
+            const Element line(page, "tr", {{"class", "line"}});
+            addLine(page, row);
+        }
+    }
+}
+
+} // namespace
+
+void addOutputs(Markup& page, const Explanation& explanation, const std::string& id) {
+    const Element section(page, "section", {{"class", "outputs"}, {"id", id + "-outputs"}});
+    page.add("h3", "Outputs");
+    for (std::size_t i = 0; i < explanation.size(); ++i) {
+        const Output& output = explanation[i];
+        const std::string outcome = nameOf(output.outcome);
+        const Element whole(page, "section",
+                            {{"class", "output state-" + outcome},
+                             {"id", outputId(id, i)},
+                             {"data-path", output.path}});
+        page.add("h4", output.path);
+        page.add("p", {{"class", "state"}}, outcome);
+        if (!output.lines.empty()) {
+            addLines(page, output.lines);
+        }
+        addWhatIsLeft(page, output);
+    }
+}
+
+} // namespace orvane::desk

@@ -1,0 +1,87 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/page.h"
+
+#include "kit/host/text.h"
+#include "orvane_unit/page/files_section.h"
+#include "orvane_unit/page/fleet_section.h"
+#include "orvane_unit/page/image_section.h"
+#include "orvane_unit/page/impact_section.h"
+#include "orvane_unit/page/markup.h"
+#include "orvane_unit/page/outputs_section.h"
+#include "orvane_unit/page/own_files.h"
+#include "orvane_unit/page/records_section.h"
+#include "orvane_unit/page/tuning_section.h"
+#include "orvane_unit/page/unit_id.h"
+#include "orvane_unit/page/verdict_section.h"
+#include "orvane_unit/page/versions_section.h"
+
+#include <cstddef>
+
+namespace orvane::desk {
+
+namespace {
+
+std::string policy() {
+    return std::string("default-src 'none'; script-src 'sha256-") + PAGE_SCRIPT.hash +
+           "'; style-src 'sha256-" + PAGE_STYLE.hash + "'; base-uri 'none'; form-action 'none'";
+}
+
+void addHead(Markup& page, const std::string& title) {
+    const Element head(page, "head");
+    page.addVoid("meta", {{"charset", "utf-8"}});
+    page.addVoid("meta", {{"http-equiv", "Content-Security-Policy"}, {"content", policy()}});
+    page.addVoid("meta", {{"name", "viewport"}, {"content", "width=device-width"}});
+    page.addVoid("meta", {{"name", "color-scheme"}, {"content", "light dark"}});
+    page.addVoid("meta", {{"name", "generator"}, {"content", "orvane-unit " ORVANE_VERSION}});
+    page.add("title", title);
+    page.addOwn("style", PAGE_STYLE.content);
+}
+
+void addUnit(Markup& page, const PageUnit& unit, const std::string& id) {
+    const Element article(page, "article", {{"class", "unit"}, {"id", id}});
+    page.add("h2", unit.name);
+    addVerdict(page, unit.explanation, id);
+    addOutputs(page, unit.explanation, id);
+    addImage(page, unit.decoded.image, id);
+    addRecords(page, unit.decoded.records, id);
+    addTuning(page, unit.decoded.tuning, id);
+    addVersions(page, unit.decoded.versions, id);
+    addFiles(page, unit.decoded.files, id);
+    if (unit.impacts) {
+        addImpacts(page, *unit.impacts, unit.explanation, id);
+    }
+}
+
+void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::string& letters) {
+    const bool isFleet = units.size() > 1;
+    const std::string title = isFleet ? kit::counted(units.size(), "unit") : units.front().name;
+    const Element html(page, "html", {{"lang", "en"}});
+    addHead(page, title + " - orvane-unit report");
+    const Element body(page, "body");
+    {
+        const Element header(page, "header");
+        page.add("h1", title);
+        page.add("p", "What orvane leaves with the options -" + letters + ", and why.");
+    }
+    {
+        const Element main(page, "main");
+        if (isFleet) {
+            addFleet(page, units);
+        }
+        for (std::size_t i = 0; i < units.size(); ++i) {
+            addUnit(page, units[i], unitId(i));
+        }
+    }
+    page.add("footer", "Made by orvane-unit " ORVANE_VERSION ".");
+    page.addOwn("script", PAGE_SCRIPT.content);
+}
+
+} // namespace
+
+std::string pageText(const std::vector<PageUnit>& units, const std::string& letters) {
+    Markup page;
+    addDocument(page, units, letters);
+    return page.document();
+}
+
+} // namespace orvane::desk

@@ -1,0 +1,188 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/page_units.h"
+
+#include "kit/description/parse_description.h"
+#include "kit/host/bytes.h"
+#include "kit/host/host_file.h"
+#include "kit/host/interruption.h"
+#include "kit/host/kit_error.h"
+#include "kit/host/scratch_folder.h"
+#include "kit/host/tree_entries.h"
+#include "kit/unit/describe_inputs.h"
+#include "kit/unit/make_unit.h"
+#include "kit/unit/marker.h"
+#include "kit/unit/redact_serial.h"
+#include "orvane_unit/explain/explain.h"
+#include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/explain/version_choice.h"
+#include "orvane_unit/show/decoded_unit.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <filesystem>
+#include <optional>
+#include <utility>
+
+namespace orvane::desk {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+bool isFolder(const fs::path& path) {
+    std::error_code ignored; // what can't be looked at is refused when it is read
+    return fs::is_directory(path, ignored);
+}
+
+bool isDescription(const fs::path& path) {
+    return path.extension() == ".toml" && !isFolder(path);
+}
+
+/// The units and descriptions that the folder `root` holds, if it is no unit itself.
+std::vector<fs::path> unitsIn(const fs::path& root) {
+    std::vector<fs::path> units;
+    if (kit::isRootDirectory(root) || kit::isKitUnit(root)) {
+        return units;
+    }
+    for (const fs::path& entry : kit::listFolder(root)) {
+        if (isFolder(entry) ? kit::isKitUnit(entry) : isDescription(entry)) {
+            units.push_back(entry);
+        }
+    }
+    std::sort(units.begin(), units.end());
+    return units;
+}
+
+std::vector<fs::path> sourcesOf(const std::vector<std::string>& roots) {
+    std::vector<fs::path> sources;
+    for (const std::string& root : roots) {
+        const std::vector<fs::path> units =
+            isFolder(root) ? unitsIn(root) : std::vector<fs::path>();
+        sources.insert(sources.end(), units.begin(), units.end());
+        if (units.empty()) {
+            sources.emplace_back(root);
+        }
+    }
+    return sources;
+}
+
+/// Throws for a folder in which nothing is that a run opens, unless the kit made it.
+void requireUnit(const fs::path& root, const DecodedUnit& unit) {
+    const bool isBare = std::all_of(unit.files.begin(), unit.files.end(), [](const UnitFile& file) {
+        return file.kind == PathKind::nothing;
+    });
+    if (isBare && !kit::isKitUnit(root)) {
+        throw kit::KitError("", root, " is not a unit: nothing that orvane opens is in it");
+    }
+}
+
+/// Makes a copy of the unit at `root` without its serial. Returns the serial, as redactSerial does.
+kit::Bytes copyWithoutSerial(const fs::path& root, const fs::path& copy) {
+    kit::UnitInputs inputs = kit::readInputs(root);
+    kit::Bytes serial = kit::redactSerial(inputs);
+    kit::makeUnit(kit::descriptionOf(std::move(inputs)), copy, [&serial](const fs::path& made) {
+        if (!serial.empty()) {
+            kit::requireNowhere(serial, made);
+        }
+    });
+    return serial;
+}
+
+std::optional<std::string> chosenFile(const DecodedUnit& unit) {
+    const VersionFiles& versions = unit.versions.found;
+    return versions.chosen ? std::optional<std::string>(versions.files[*versions.chosen].path)
+                           : std::nullopt;
+}
+
+/// The order of a folder's listing is the file system's, and decides between two applications.
+void requireSameChoice(const DecodedUnit& original, const DecodedUnit& copy,
+                       const kit::Bytes& serial) {
+    const std::optional<std::string> chosen = chosenFile(original);
+    if (chosen && kit::withoutSerial(serial, *chosen) != chosenFile(copy)) {
+        throw kit::KitError("the serial can't be redacted: in a copy of the unit, another "
+                            "application's version file comes first than " +
+                            *chosen);
+    }
+}
+
+/// Reads units, and remembers what must not stand on the page.
+class UnitReader {
+public:
+    UnitReader(const PageRequest& request, Progress progress)
+        : request_(request), progress_(std::move(progress)) {}
+
+    PageUnit read(const fs::path& source) {
+        if (isFolder(source)) {
+            return readRoot(source.string(), source);
+        }
+        const kit::ScratchFolder scratch;
+        const fs::path root = scratch.path() / "unit";
+        kit::makeUnit(kit::readDescription(source), root);
+        try {
+            return readRoot(source.string(), root);
+        } catch (const kit::KitError& error) {
+            throw error.moved(root, source);
+        }
+    }
+
+    std::string redacted(std::string name) const {
+        for (const kit::Bytes& serial : serials_) {
+            name = kit::withoutSerial(serial, name);
+        }
+        return name;
+    }
+
+private:
+    PageUnit readRoot(const std::string& name, const fs::path& root) {
+        DecodedUnit decoded = decodeUnit(root);
+        requireUnit(root, decoded);
+        if (!request_.redactsSerial) {
+            return readInputs(name, root, std::move(decoded));
+        }
+        const kit::ScratchFolder scratch;
+        const fs::path copy = scratch.path() / "unit";
+        serials_.push_back(copyWithoutSerial(root, copy));
+        try {
+            DecodedUnit decodedCopy = decodeUnit(copy);
+            requireSameChoice(decoded, decodedCopy, serials_.back());
+            return readInputs(name, copy, std::move(decodedCopy));
+        } catch (const kit::KitError& error) {
+            throw error.moved(copy, root);
+        }
+    }
+
+    PageUnit readInputs(const std::string& name, const fs::path& root, DecodedUnit decoded) const {
+        PageUnit unit{name, explainUnit(root, {"-" + request_.letters}), std::move(decoded), {}};
+        if (request_.hasImpacts) {
+            unit.impacts = findImpacts(root, {}, progress_);
+        }
+        return unit;
+    }
+
+    const PageRequest& request_;
+    Progress progress_;
+    std::vector<kit::Bytes> serials_;
+};
+
+} // namespace
+
+std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& progress) {
+    const std::vector<fs::path> sources = sourcesOf(request.roots);
+    const bool isOne = sources.size() == 1;
+    UnitReader reader(
+        request, isOne ? progress : [](std::size_t /*done*/, std::size_t /*all*/) {});
+    std::vector<PageUnit> units;
+    for (const fs::path& source : sources) {
+        kit::throwIfInterrupted();
+        units.push_back(reader.read(source));
+        if (!isOne) {
+            progress(units.size(), sources.size());
+        }
+    }
+    for (PageUnit& unit : units) {
+        unit.name = reader.redacted(unit.name);
+    }
+    return units;
+}
+
+} // namespace orvane::desk

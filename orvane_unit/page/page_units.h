@@ -1,0 +1,28 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// From what stands on the command line to the units of a page.
+#pragma once
+
+#include "orvane_unit/compare/impact.h"
+#include "orvane_unit/page/page.h"
+
+#include <string>
+#include <vector>
+
+namespace orvane::desk {
+
+struct PageRequest {
+    std::vector<std::string> roots; ///< units, descriptions, or folders of these
+    std::string letters;            ///< the tool's options
+    bool redactsSerial = false;
+    bool hasImpacts = false;
+};
+
+/// Reads all units that `request` names: a folder with units that the kit made, or descriptions
+/// (*.toml), in it stands for all of these, in the order of their names. Units are only read;
+/// descriptions are made, and serials replaced as by kit::captureUnit, in temporary folders.
+/// `progress` counts units, or the inputs of a single one. Throws kit::KitError, also for a root in
+/// which nothing is that the tool opens.
+std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& progress);
+
+} // namespace orvane::desk

@@ -1,0 +1,111 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/records_section.h"
+
+#include "config/record_slots.h"
+#include "kit/description/value_key.h"
+#include "kit/description/value_places.h"
+#include "kit/host/sparse_content.h"
+#include "kit/host/text.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/page/record_drawing.h"
+#include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
+
+#include <cstdint>
+#include <optional>
+
+namespace orvane::desk {
+
+namespace {
+
+std::string summaryOf(const DecodedRecords& records) {
+    if (records.diskTrouble) {
+        return "Boot disk of " + kit::counted(records.diskSize, "byte") + ": " +
+               reasonInfo(*records.diskTrouble).sentence + ".";
+    }
+    if (records.diskSize == 0) {
+        return "A boot disk without a size.";
+    }
+    const std::uint64_t base = records.diskSize - static_cast<std::uint64_t>(RECORD_AREA_SIZE);
+    return "Boot disk of " + kit::counted(records.diskSize, "byte") +
+           "; its record area begins at byte " + std::to_string(base) + ". Offsets are from there.";
+}
+
+/// The cells of some bytes, in hex and as text, without the zeros at their end.
+void addContent(Markup& page, const std::optional<std::string>& bytes) {
+    if (!bytes) {
+        page.add("td", "can't be read");
+        page.add("td", "");
+        return;
+    }
+    const std::string content = kit::withoutTrailingZeros(*bytes);
+    if (content.empty()) {
+        page.add("td", "zeros");
+        page.add("td", "");
+        return;
+    }
+    for (const std::string& text : {kit::hexText(content), content}) {
+        const Element cell(page, "td");
+        page.add("code", text);
+    }
+}
+
+void addRow(Markup& page, const kit::ValueKey& key, const std::string& name, std::uint64_t offset,
+            std::uint64_t size, const std::optional<std::string>& bytes) {
+    const Element row(page, "tr",
+                      {{"class", "place"}, {"data-key", keyText(key)}, {"tabindex", "0"}});
+    page.add("th", {{"scope", "row"}}, name);
+    page.add("td", std::to_string(offset));
+    page.add("td", std::to_string(size));
+    addContent(page, bytes);
+}
+
+void addSlots(Markup& page, const DecodedRecords& records) {
+    const Element table(page, "table", {{"class", "slots"}});
+    addTitles(page, {"place", "offset", "bytes", "content", "as text"});
+    const Element body(page, "tbody");
+    for (const DecodedSlot& slot : records.slots) {
+        const std::string repeated = repeatedSlots(slot.number);
+        addRow(page, kit::slotKey(slot.number),
+               "slot " + std::to_string(slot.number) +
+                   (repeated.empty() ? "" : ", which repeats " + repeated),
+               slot.offset, slot.size, slot.bytes);
+    }
+    addRow(page, kit::auxKey(), "auxiliary area", kit::valuePlace(kit::auxKey()).offset,
+           AUX_AREA_SIZE, records.aux);
+}
+
+const char* sentenceOf(CrcVerdict verdict) {
+    switch (verdict) {
+    case CrcVerdict::computed:
+        return "the disk has none to compare it with";
+    case CrcVerdict::blank:
+        return "the records are all zero";
+    case CrcVerdict::ambiguous:
+        return "all ones, which is also the value of a failure";
+    case CrcVerdict::unreadable:
+        return "the disk can't be read";
+    }
+    return "";
+}
+
+} // namespace
+
+void addRecords(Markup& page, const DecodedRecords& records, const std::string& id) {
+    const Element section(page, "section", {{"class", "records"}, {"id", id + "-records"}});
+    page.add("h3", "Record area of the boot disk");
+    page.add("p", summaryOf(records));
+    drawRecords(page, records);
+    addSlots(page, records);
+    const Element crc(page, "p",
+                      {{"class", std::string("crc crc-") + nameOf(records.crcVerdict)},
+                       {"data-key", keyText(kit::slotKey(CRC_RECORD_SLOT))}});
+    page.addText("CRC over " + repeatedSlots(CRC_RECORD_SLOT) + ": ");
+    page.add("code", hexNumber(records.crc, 8));
+    page.addText(", ");
+    page.add("strong", {{"class", "state"}}, nameOf(records.crcVerdict));
+    page.addText(std::string(": ") + sentenceOf(records.crcVerdict) + ".");
+}
+
+} // namespace orvane::desk

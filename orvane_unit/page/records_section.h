@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "orvane_unit/page/markup.h"
+#include "orvane_unit/show/decoded_unit.h"
+
+#include <string>
+
+namespace orvane::desk {
+
+/// Adds the record area: a drawing to scale, its slots as a table, and the CRC. `id` is the unit's.
+void addRecords(Markup& page, const DecodedRecords& records, const std::string& id);
+
+} // namespace orvane::desk

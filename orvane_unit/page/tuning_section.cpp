@@ -1,0 +1,168 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/tuning_section.h"
+
+#include "kit/description/value_key.h"
+#include "kit/host/sparse_content.h"
+#include "kit/host/text.h"
+#include "kit/tuning/tuning_encode.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/page/bar_plot.h"
+#include "orvane_unit/report/phrases.h"
+#include "tuning/audio_profile.h"
+#include "tuning/dps_block.h"
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <iterator>
+#include <vector>
+
+namespace orvane::desk {
+
+namespace {
+
+const DpsBlock& blockOf(const TuningArea& tuning, std::int32_t id) {
+    return tuning.blocks.at(static_cast<std::size_t>(id));
+}
+
+std::vector<std::int32_t> valuesOf(const DpsBlock& block, const DpsField& field) {
+    std::vector<std::int32_t> values;
+    for (std::size_t element = 0; element < field.count; ++element) {
+        values.push_back(decodeField(block, field, element));
+    }
+    return values;
+}
+
+std::string listText(const std::vector<std::int32_t>& values) {
+    std::string text;
+    for (const std::int32_t value : values) {
+        text += (text.empty() ? "" : ", ") + std::to_string(value);
+    }
+    return text;
+}
+
+void addWord(Markup& page, const DpsField& field, std::int32_t code) {
+    const std::string word = fieldWord(field, code);
+    if (word.empty()) {
+        page.add("span", {{"class", "word no-word sign"}}, "no word");
+    } else {
+        page.add("span", {{"class", "word code-" + std::to_string(code)}}, word);
+    }
+}
+
+/// A field in each of the blocks that the tool reads.
+struct FieldValues {
+    const DpsField& field;
+    std::vector<std::vector<std::int32_t>> values; ///< in the order of TUNING_OUTPUTS
+
+    bool isSame() const {
+        return std::adjacent_find(values.begin(), values.end(), std::not_equal_to<>()) ==
+               values.end();
+    }
+};
+
+FieldValues fieldValues(const TuningArea& tuning, const DpsField& field) {
+    FieldValues all{field, {}};
+    for (const TuningOutput& output : TUNING_OUTPUTS) {
+        all.values.push_back(valuesOf(blockOf(tuning, output.blockId), field));
+    }
+    return all;
+}
+
+void addValue(Markup& page, const FieldValues& all, std::size_t index) {
+    const std::vector<std::int32_t>& values = all.values[index];
+    const auto block = static_cast<std::uint64_t>(TUNING_OUTPUTS[index].blockId);
+    const Element cell(page, "td",
+                       {{"data-key", keyText(kit::tuningFieldKey(block, all.field.key))}});
+    const bool isWord =
+        all.field.kind == DpsKind::switchWord || all.field.kind == DpsKind::modeWord;
+    if (isWord) {
+        addWord(page, all.field, values.front());
+    } else if (all.field.kind == DpsKind::list) {
+        drawBars(page, all.values, index);
+    }
+    page.add("span", {{"class", "numbers"}}, listText(values));
+}
+
+void addField(Markup& page, const FieldValues& all) {
+    const Element row(page, "tr",
+                      {{"class", all.isSame() ? "field" : "field differs"}, {"tabindex", "0"}});
+    page.add("th", {{"scope", "row"}}, all.field.key);
+    for (std::size_t i = 0; i < all.values.size(); ++i) {
+        addValue(page, all, i);
+    }
+    page.add("td", {{"class", "sign"}}, all.isSame() ? "same" : "\u2260 differs");
+}
+
+void addFields(Markup& page, const TuningArea& tuning) {
+    const Element table(page, "table", {{"class", "fields"}});
+    {
+        const Element head(page, "thead");
+        const Element row(page, "tr");
+        page.add("th", {{"scope", "col"}}, "field");
+        for (const TuningOutput& output : TUNING_OUTPUTS) {
+            page.add("th", {{"scope", "col"}},
+                     "block " + std::to_string(output.blockId) + ", " + purposeOf(output.blockId));
+        }
+        page.add("th", {{"scope", "col"}}, "the two");
+    }
+    const Element body(page, "tbody");
+    for (const DpsField& field : DPS_LAYOUT) {
+        addField(page, fieldValues(tuning, field));
+    }
+}
+
+/// Adds the bits that no field reads and that somebody wrote all the same.
+void addUnread(Markup& page, const TuningArea& tuning, std::int32_t id) {
+    const DpsBlock unread = kit::withoutFields(blockOf(tuning, id));
+    for (std::size_t at = 0; at < unread.bytes.size(); ++at) {
+        if (unread.bytes.at(at) != 0) {
+            const Element item(
+                page, "li",
+                {{"data-key", keyText(kit::tuningRawKey(static_cast<std::uint64_t>(id)))}});
+            page.addText("block " + std::to_string(id) + ", byte " + std::to_string(at) +
+                         ": no field reads ");
+            page.add("code", hexNumber(unread.bytes.at(at), 2));
+        }
+    }
+}
+
+bool isRead(std::int32_t id) {
+    return std::any_of(std::begin(TUNING_OUTPUTS), std::end(TUNING_OUTPUTS),
+                       [id](const TuningOutput& output) { return output.blockId == id; });
+}
+
+bool isZero(const DpsBlock& block) {
+    return kit::withoutTrailingZeros({block.bytes.begin(), block.bytes.end()}).empty();
+}
+
+void addOtherBlocks(Markup& page, const TuningArea& tuning) {
+    for (std::int32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
+        if (!isRead(id)) {
+            page.add("li",
+                     {{"data-key", keyText(kit::tuningBlockKey(static_cast<std::uint64_t>(id)))}},
+                     "block " + std::to_string(id) + ", which no run reads: " +
+                         (isZero(blockOf(tuning, id)) ? "zeros" : "not all zeros"));
+        }
+    }
+}
+
+} // namespace
+
+void addTuning(Markup& page, const TuningArea& tuning, const std::string& id) {
+    const Element section(page, "section", {{"class", "tuning"}, {"id", id + "-tuning"}});
+    page.add("h3", "Tuning blocks");
+    if (tuning.reason != Reason::fromTuningBlock) {
+        page.add("p", {{"class", "fallback"}}, reasonInfo(tuning.reason).sentence + ".");
+        return;
+    }
+    addFields(page, tuning);
+    const Element rest(page, "ul", {{"class", "rest"}});
+    for (const TuningOutput& output : TUNING_OUTPUTS) {
+        addUnread(page, tuning, output.blockId);
+    }
+    addOtherBlocks(page, tuning);
+}
+
+} // namespace orvane::desk

@@ -1,0 +1,124 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/verdict_section.h"
+
+#include "kit/description/value_key.h"
+#include "kit/host/text.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/page/output_rows.h"
+#include "orvane_unit/page/unit_id.h"
+#include "orvane_unit/report/names.h"
+#include "orvane_unit/report/place_text.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <vector>
+
+namespace orvane::desk {
+
+namespace {
+
+void addReason(Markup& page, Reason reason) {
+    page.addText(reasonInfo(reason).sentence);
+    page.addText(" ");
+    page.add("code", {{"class", "code"}}, reasonInfo(reason).code);
+}
+
+/// Lines, one after the other or not, that are not as intended for one and the same cause.
+struct Trouble {
+    const Origin* origin = nullptr;
+    std::size_t first = 0; ///< number of the first line
+    std::size_t count = 0;
+};
+
+std::vector<Trouble> troublesOf(const Output& output) {
+    std::vector<Trouble> troubles;
+    for (const OutputRow& row : outputRows(output.lines)) {
+        if (isIntended(row.origin->reasons)) {
+            continue;
+        }
+        const auto same =
+            std::find_if(troubles.begin(), troubles.end(), [&row](const Trouble& other) {
+                return other.origin->reasons == row.origin->reasons &&
+                       placeText(*other.origin) == placeText(*row.origin);
+            });
+        if (same == troubles.end()) {
+            troubles.push_back({row.origin, row.number, 1});
+        } else {
+            ++same->count;
+        }
+    }
+    return troubles;
+}
+
+void addTrouble(Markup& page, const Trouble& trouble) {
+    const Element item(page, "li",
+                       {{"class", "trouble"}, {"data-key", keyText(trouble.origin->key)}});
+    page.addText(trouble.count == 1 ? "line " + std::to_string(trouble.first) + ": "
+                                    : kit::counted(trouble.count, "line") + " from line " +
+                                          std::to_string(trouble.first) + " on: ");
+    for (const Reason reason : trouble.origin->reasons) {
+        addReason(page, reason);
+        page.addText("; ");
+    }
+    page.addText("look at ");
+    page.add("code", keyText(trouble.origin->key));
+    const std::string place = placeText(*trouble.origin);
+    if (!place.empty()) {
+        page.addText(" (" + place + ")");
+    }
+}
+
+/// Why the output is what it is, and the values that decided it if that was not intended.
+void addOutcomeReasons(Markup& page, const Output& output) {
+    for (const Reason reason : output.reasons) {
+        const Element item(page, "li", {{"class", "reason"}});
+        addReason(page, reason);
+    }
+    if (isIntended(output.reasons)) {
+        return;
+    }
+    for (const kit::ValueKey& key : output.keys) {
+        const Element item(page, "li", {{"class", "look"}, {"data-key", keyText(key)}});
+        page.addText("look at ");
+        page.add("code", keyText(key));
+    }
+}
+
+void addTile(Markup& page, const Output& output, const std::string& outputId) {
+    const bool isGood = isIntended(output);
+    const std::string outcome = nameOf(output.outcome);
+    const Element tile(page, "li",
+                       {{"class", "tile state-" + outcome + (isGood ? "" : " fallback")}});
+    page.add("a", {{"href", "#" + outputId}}, output.path);
+    page.add("strong", {{"class", "state"}}, outcome);
+    page.add("span", {{"class", "sign"}}, isGood ? "as intended" : "not as intended");
+    const Element reasons(page, "ul", {{"class", "reasons"}});
+    addOutcomeReasons(page, output);
+    for (const Trouble& trouble : troublesOf(output)) {
+        addTrouble(page, trouble);
+    }
+}
+
+std::string summaryOf(const Explanation& explanation) {
+    const auto good = static_cast<std::size_t>(
+        std::count_if(explanation.begin(), explanation.end(),
+                      [](const Output& output) { return isIntended(output); }));
+    return good == explanation.size()
+               ? "All outputs are as intended."
+               : std::to_string(explanation.size() - good) + " of " +
+                     kit::counted(explanation.size(), "output") + " not as intended.";
+}
+
+} // namespace
+
+void addVerdict(Markup& page, const Explanation& explanation, const std::string& id) {
+    const Element section(page, "section", {{"class", "verdict"}, {"id", id + "-verdict"}});
+    page.add("h3", "Verdict");
+    page.add("p", {{"class", "summary"}}, summaryOf(explanation));
+    const Element tiles(page, "ul", {{"class", "tiles"}});
+    for (std::size_t i = 0; i < explanation.size(); ++i) {
+        addTile(page, explanation[i], outputId(id, i));
+    }
+}
+
+} // namespace orvane::desk

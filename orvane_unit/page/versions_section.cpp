@@ -1,0 +1,99 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "orvane_unit/page/versions_section.h"
+
+#include "identity/inf_file.h"
+#include "identity/software_version.h"
+#include "kit/description/value_key.h"
+#include "kit/host/text.h"
+#include "orvane_unit/explain/reasons.h"
+#include "orvane_unit/explain/version_choice.h"
+#include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/report/phrases.h"
+
+#include <array>
+#include <cstddef>
+#include <map>
+#include <optional>
+#include <vector>
+
+namespace orvane::desk {
+
+namespace {
+
+void addFile(Markup& page, const VersionFiles& versions, std::size_t index) {
+    const VersionFile& file = versions.files[index];
+    const bool isChosen = versions.chosen == index;
+    const std::string key = keyText(kit::fileKey(file.path));
+    const Element item(page, "li", {{"class", isChosen ? "version chosen" : "version"}});
+    page.add("h4", {{"data-key", key}}, file.path);
+    page.add("p", {{"class", "sign"}}, choiceText(versions, index));
+    const Element table(page, "table");
+    addTitles(page, {"key", "value"});
+    const Element body(page, "tbody");
+    for (const auto& [name, value] : file.record) {
+        const Element row(page, "tr", {{"data-key", name == VERSION_KEY ? key : ""}});
+        page.add("th", {{"scope", "row"}}, name);
+        const Element cell(page, "td");
+        page.add("code", value);
+    }
+}
+
+void addStep(Markup& page, const std::string& what, const std::string& result) {
+    const Element step(page, "li");
+    page.addText(what + ": ");
+    page.add("code", result);
+}
+
+/// How the six digits come about, step by step.
+void addSteps(Markup& page, const VersionFiles& versions) {
+    const Element steps(page, "ol", {{"class", "steps"}});
+    if (!versions.chosen) {
+        addStep(page, "no file is chosen, so the digits are those for no version",
+                DEFAULT_SOFTWARE_VERSION);
+        return;
+    }
+    const Inf_Data& record = versions.files[*versions.chosen].record;
+    const std::string text = versionText(record);
+    addStep(page, std::string("the value of \"") + VERSION_KEY + "\"",
+            infValue(record, VERSION_KEY));
+    addStep(page, "without its prefix", text);
+    if (text.empty() || text == NO_VERSION) {
+        addStep(page, "no version, so the digits are those for none", formatVersion(text));
+        return;
+    }
+    for (const std::string& component : versionComponents(text)) {
+        addStep(page,
+                "component " + kit::inQuotes(component) + ", the number " +
+                    std::to_string(componentNumber(component)) + ", in hexadecimal",
+                formatVersionByte(component));
+    }
+    addStep(page, "one after the other", formatVersion(text));
+}
+
+} // namespace
+
+void addVersions(Markup& page, const DecodedVersions& versions, const std::string& id) {
+    const Element section(page, "section", {{"class", "versions"}, {"id", id + "-versions"}});
+    page.add("h3", "Software version");
+    {
+        const Element summary(page, "p", {{"class", "summary"}});
+        page.addText("Version ");
+        page.add("code", {{"class", "version-text"}}, versions.version);
+        page.addText(", as digits ");
+        page.add("code", {{"class", "version-digits"}}, versions.digits);
+    }
+    if (!versions.found.hasFolder) {
+        page.add("p", {{"class", "fallback"}},
+                 reasonInfo(Reason::versionFolderMissing).sentence + ".");
+    } else if (versions.found.files.empty()) {
+        page.add("p", "There is no version description file.");
+    } else {
+        const Element files(page, "ol", {{"class", "version-files"}});
+        for (std::size_t i = 0; i < versions.found.files.size(); ++i) {
+            addFile(page, versions.found, i);
+        }
+    }
+    addSteps(page, versions.found);
+}
+
+} // namespace orvane::desk
