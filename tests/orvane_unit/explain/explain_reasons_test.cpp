@@ -11,6 +11,7 @@
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/report/place_text.h"
 #include "tests/kit/unit/described_unit.h"
+#include "tests/orvane_unit/explain/reason_units.h"
 #include "tests/support/unit_test.h"
 #include "writers/airplay_writer.h"
 #include "writers/iap_writer.h"
@@ -30,119 +31,6 @@ using desk::Outcome;
 using desk::Reason;
 using kit::UnitDescription;
 
-constexpr char VERSION_FILE[] = "/fs/rwdata/.Version/app.inf";
-
-struct Row {
-    Reason reason;
-    const char* output; ///< where the reason is expected
-    Outcome outcome;
-    std::function<void(UnitDescription&)> change;
-};
-
-std::function<void(UnitDescription&)> without(const std::string& path) {
-    return [path](UnitDescription& unit) {
-        unit.files.erase(path);
-        unit.absent.push_back(path);
-    };
-}
-
-std::function<void(UnitDescription&)> empty(const std::string& path) {
-    return [path](UnitDescription& unit) { unit.files[path].clear(); };
-}
-
-std::function<void(UnitDescription&)> folder(const std::string& path) {
-    return [path](UnitDescription& unit) {
-        unit.files.erase(path);
-        unit.folders.push_back(path);
-    };
-}
-
-std::function<void(UnitDescription&)> version(const std::string& text) {
-    return [text](UnitDescription& unit) {
-        unit.files[VERSION_FILE] = "Type=Application\nVersion Number=" + text + "\n";
-    };
-}
-
-std::function<void(UnitDescription&)> both(const std::function<void(UnitDescription&)>& first,
-                                           const std::function<void(UnitDescription&)>& second) {
-    return [first, second](UnitDescription& unit) {
-        first(unit);
-        second(unit);
-    };
-}
-
-void plain(UnitDescription& /*unit*/) {}
-
-void generatedProfile(UnitDescription& unit) {
-    unit.image.params[134] = 0xFFFF;
-    unit.disk.tuning[3].fields["qwaAECSwitch"] = std::string("qwaOn");
-}
-
-const std::vector<Row>& rows() {
-    constexpr const char* AIRPLAY_OUT = AIRPLAY_FILE.output;
-    constexpr const char* DEVICE_OUT = IAP2_DEVICE_FILE.output;
-    constexpr const char* IAP1_OUT = IAP1_FILE.output;
-    static const std::vector<Row> ROWS = {
-        {Reason::generated, AIRPLAY_OUT, Outcome::generated, plain},
-        {Reason::profileNotGenerated, TELEPHONY_TUNING_FILE, Outcome::notAsked, plain},
-        {Reason::profileUnknown, SPEECHREC_TUNING_FILE, Outcome::notAsked,
-         without(CONFIG_SHM_NAME)},
-        {Reason::outputNotOpenable, DEVICE_OUT, Outcome::kept, folder(DEVICE_OUT)},
-        {Reason::templateMissing, AIRPLAY_OUT, Outcome::stock, without(AIRPLAY_FILE.templateFile)},
-        {Reason::templateMissing, IAP1_OUT, Outcome::generated, without(IAP1_FILE.templateFile)},
-        {Reason::templateEmpty, DEVICE_OUT, Outcome::generated,
-         empty(IAP2_DEVICE_FILE.templateFile)},
-        {Reason::templateEmpty, DEVICE_OUT, Outcome::generated,
-         folder(IAP2_DEVICE_FILE.templateFile)},
-        {Reason::iap2NotOpened, IAP1_OUT, Outcome::stock, folder(IAP2_FILE.output)},
-        {Reason::iap2TemplateEmpty, IAP1_OUT, Outcome::stock, empty(IAP2_FILE.templateFile)},
-        {Reason::stockMissing, AIRPLAY_OUT, Outcome::empty,
-         both(without(AIRPLAY_FILE.templateFile), without(AIRPLAY_FILE.stockFile))},
-        {Reason::stockEmpty, AIRPLAY_OUT, Outcome::empty,
-         both(without(AIRPLAY_FILE.templateFile), empty(AIRPLAY_FILE.stockFile))},
-        {Reason::fixedText, AIRPLAY_OUT, Outcome::generated, plain},
-        {Reason::fromTemplate, AIRPLAY_OUT, Outcome::generated, plain},
-        {Reason::fromStock, AIRPLAY_OUT, Outcome::stock, without(AIRPLAY_FILE.templateFile)},
-        {Reason::fromImage, AIRPLAY_OUT, Outcome::generated, plain},
-        {Reason::imageMissing, AIRPLAY_OUT, Outcome::generated, without(CONFIG_SHM_NAME)},
-        {Reason::imageNotMappable, AIRPLAY_OUT, Outcome::generated, folder(CONFIG_SHM_NAME)},
-        {Reason::imageNotMappable, AIRPLAY_OUT, Outcome::generated,
-         [](UnitDescription& unit) {
-             unit.image = {};
-             unit.image.size = 0;
-         }},
-        {Reason::imageTooShort, AIRPLAY_OUT, Outcome::generated,
-         [](UnitDescription& unit) {
-             unit.image = {};
-             unit.image.size = 134; // half of the audio profile
-         }},
-        {Reason::modelUnknown, DEVICE_OUT, Outcome::generated,
-         [](UnitDescription& unit) { unit.image.params[139] = 48; }},
-        {Reason::fromRecord, DEVICE_OUT, Outcome::generated, plain},
-        {Reason::serialBlank, DEVICE_OUT, Outcome::generated,
-         [](UnitDescription& unit) { unit.disk.slots.clear(); }},
-        {Reason::diskMissing, DEVICE_OUT, Outcome::generated, without(BOOT_DISK)},
-        {Reason::diskTooShort, DEVICE_OUT, Outcome::generated,
-         [](UnitDescription& unit) {
-             unit.disk = {};
-             unit.disk.size = 5000;
-         }},
-        {Reason::diskUnreadable, DEVICE_OUT, Outcome::generated, folder(BOOT_DISK)},
-        {Reason::fromVersionFile, DEVICE_OUT, Outcome::generated, plain},
-        {Reason::versionFolderMissing, DEVICE_OUT, Outcome::generated,
-         both(without(VERSION_FILE), without("/fs/rwdata/.Version"))},
-        {Reason::versionNoApplication, DEVICE_OUT, Outcome::generated, without(VERSION_FILE)},
-        {Reason::versionNumberMissing, IAP1_OUT, Outcome::generated, version("ABC_")},
-        {Reason::versionNotAvailable, IAP1_OUT, Outcome::generated, version("N/A")},
-        {Reason::versionIncomplete, IAP1_OUT, Outcome::generated, version("1.2")},
-        {Reason::versionNotNumeric, IAP1_OUT, Outcome::generated, version("1.b.3")},
-        {Reason::versionOutOfRange, IAP1_OUT, Outcome::generated, version("1.256.3")},
-        {Reason::fromTuningBlock, TELEPHONY_TUNING_FILE, Outcome::generated, generatedProfile},
-        {Reason::wordUnknown, TELEPHONY_TUNING_FILE, Outcome::generated, generatedProfile},
-    };
-    return ROWS;
-}
-
 bool has(const desk::Output& output, Reason reason) {
     const auto holds = [reason](const std::vector<Reason>& reasons) {
         return std::find(reasons.begin(), reasons.end(), reason) != reasons.end();
@@ -154,7 +42,7 @@ bool has(const desk::Output& output, Reason reason) {
 
 class ExplainReasonsTest : public ::testing::TestWithParam<std::size_t> {
 protected:
-    static const Row& row() { return rows().at(GetParam()); }
+    static const ReasonUnit& row() { return reasonUnits().at(GetParam()); }
 };
 
 TEST_P(ExplainReasonsTest, FaultGivesItsReasonAtItsOutput) {
@@ -312,17 +200,17 @@ TEST(CapturedReasonsTest, HardLinksStayOneFile) {
 }
 
 std::string rowName(const ::testing::TestParamInfo<std::size_t>& row) {
-    std::string name = reasonInfo(rows()[row.param].reason).code;
+    std::string name = reasonInfo(reasonUnits()[row.param].reason).code;
     std::replace(name.begin(), name.end(), '-', '_');
     return name + "_" + std::to_string(row.param);
 }
 
-INSTANTIATE_TEST_SUITE_P(Rows, ExplainReasonsTest, ::testing::Range<std::size_t>(0, rows().size()),
-                         rowName);
+INSTANTIATE_TEST_SUITE_P(Rows, ExplainReasonsTest,
+                         ::testing::Range<std::size_t>(0, reasonUnits().size()), rowName);
 
 TEST(ReasonsTest, EveryReasonHasARow) {
     std::set<Reason> laid;
-    for (const Row& row : rows()) {
+    for (const ReasonUnit& row : reasonUnits()) {
         laid.insert(row.reason);
     }
     for (const desk::ReasonInfo& info : desk::reasons()) {
