@@ -52,16 +52,25 @@ void addUnit(Markup& page, const PageUnit& unit, const std::string& id) {
     }
 }
 
+/// "-a -i" for "ai".
+std::string optionsText(const std::string& letters) {
+    std::string text;
+    for (const char letter : letters) {
+        text += std::string(text.empty() ? "" : " ") + "-" + letter;
+    }
+    return text;
+}
+
 void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::string& letters) {
     const bool isFleet = units.size() > 1;
-    const std::string title = isFleet ? kit::counted(units.size(), "unit") : units.front().name;
+    const std::string name = isFleet ? kit::counted(units.size(), "unit") : units.front().name;
     const Element html(page, "html", {{"lang", "en"}});
-    addHead(page, title + " - orvane-unit report");
+    addHead(page, name + " - orvane-unit report");
     const Element body(page, "body");
     {
         const Element header(page, "header");
-        page.add("h1", title);
-        page.add("p", "What orvane leaves with the options -" + letters + ", and why.");
+        page.add("h1", "What orvane " + optionsText(letters) + " leaves, and why");
+        page.add("p", "Before a run; nothing was written.");
     }
     {
         const Element main(page, "main");

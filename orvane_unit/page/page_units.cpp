@@ -53,14 +53,23 @@ std::vector<fs::path> unitsIn(const fs::path& root) {
     return units;
 }
 
-std::vector<fs::path> sourcesOf(const std::vector<std::string>& roots) {
-    std::vector<fs::path> sources;
+/// A unit or a description, and what the page calls it.
+struct Source {
+    std::string name;
+    fs::path path;
+};
+
+std::vector<Source> sourcesOf(const std::vector<std::string>& roots) {
+    std::vector<Source> sources;
     for (const std::string& root : roots) {
         const std::vector<fs::path> units =
             isFolder(root) ? unitsIn(root) : std::vector<fs::path>();
-        sources.insert(sources.end(), units.begin(), units.end());
+        for (const fs::path& unit : units) {
+            // Their folder says nothing that tells them apart.
+            sources.push_back({roots.size() == 1 ? unit.filename() : unit, unit});
+        }
         if (units.empty()) {
-            sources.emplace_back(root);
+            sources.push_back({root, root});
         }
     }
     return sources;
@@ -111,17 +120,17 @@ public:
     UnitReader(const PageRequest& request, Progress progress)
         : request_(request), progress_(std::move(progress)) {}
 
-    PageUnit read(const fs::path& source) {
-        if (isFolder(source)) {
-            return readRoot(source.string(), source);
+    PageUnit read(const Source& source) {
+        if (isFolder(source.path)) {
+            return readRoot(source.name, source.path);
         }
         const kit::ScratchFolder scratch;
         const fs::path root = scratch.path() / "unit";
-        kit::makeUnit(kit::readDescription(source), root);
+        kit::makeUnit(kit::readDescription(source.path), root);
         try {
-            return readRoot(source.string(), root);
+            return readRoot(source.name, root);
         } catch (const kit::KitError& error) {
-            throw error.moved(root, source);
+            throw error.moved(root, source.path);
         }
     }
 
@@ -167,12 +176,12 @@ private:
 } // namespace
 
 std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& progress) {
-    const std::vector<fs::path> sources = sourcesOf(request.roots);
+    const std::vector<Source> sources = sourcesOf(request.roots);
     const bool isOne = sources.size() == 1;
     UnitReader reader(
         request, isOne ? progress : [](std::size_t /*done*/, std::size_t /*all*/) {});
     std::vector<PageUnit> units;
-    for (const fs::path& source : sources) {
+    for (const Source& source : sources) {
         kit::throwIfInterrupted();
         units.push_back(reader.read(source));
         if (!isOne) {

@@ -76,7 +76,7 @@ std::vector<Part> allParts(const DecodedRecords& records) {
 constexpr std::uint64_t WIDTH = 10000;
 constexpr std::uint64_t STRIP = 300;
 constexpr std::uint64_t GAP = 400;
-constexpr std::uint64_t LETTER = 90; ///< about the width of one
+constexpr std::uint64_t LETTER = 75; ///< about the width of one
 
 /// A rectangle that shows the bytes from `begin` to before `end`.
 struct Strip {
@@ -111,7 +111,7 @@ void drawPart(Markup& page, const Strip& strip, const Part& part) {
              "");
     for (const std::string& label : {part.name, part.label}) {
         if (!label.empty() && label.size() * LETTER < width) {
-            page.add("text", {{"x", number(left + width / 2)}, {"y", number(strip.y + 200)}},
+            page.add("text", {{"x", number(left + width / 2)}, {"y", number(strip.y + 195)}},
                      label);
             break;
         }

@@ -51,14 +51,11 @@ void addContent(Markup& page, const std::optional<std::string>& bytes) {
     }
 }
 
-void addRow(Markup& page, const kit::ValueKey& key, const std::string& name, std::uint64_t offset,
-            std::uint64_t size, const std::optional<std::string>& bytes) {
-    const Element row(page, "tr",
-                      {{"class", "place"}, {"data-key", keyText(key)}, {"tabindex", "0"}});
+/// A row of the table, still without its content.
+void addPlace(Markup& page, const std::string& name, std::uint64_t offset, std::uint64_t size) {
     page.add("th", {{"scope", "row"}}, name);
     page.add("td", std::to_string(offset));
     page.add("td", std::to_string(size));
-    addContent(page, bytes);
 }
 
 void addSlots(Markup& page, const DecodedRecords& records) {
@@ -66,14 +63,19 @@ void addSlots(Markup& page, const DecodedRecords& records) {
     addTitles(page, {"place", "offset", "bytes", "content", "as text"});
     const Element body(page, "tbody");
     for (const DecodedSlot& slot : records.slots) {
+        const Element row(page, "tr",
+                          {{"data-key", keyText(kit::slotKey(slot.number))}, {"tabindex", "0"}});
+        addPlace(page, "slot " + std::to_string(slot.number), slot.offset, slot.size);
         const std::string repeated = repeatedSlots(slot.number);
-        addRow(page, kit::slotKey(slot.number),
-               "slot " + std::to_string(slot.number) +
-                   (repeated.empty() ? "" : ", which repeats " + repeated),
-               slot.offset, slot.size, slot.bytes);
+        if (repeated.empty()) {
+            addContent(page, slot.bytes);
+        } else {
+            page.add("td", {{"colspan", "2"}}, "repeats " + repeated);
+        }
     }
-    addRow(page, kit::auxKey(), "auxiliary area", kit::valuePlace(kit::auxKey()).offset,
-           AUX_AREA_SIZE, records.aux);
+    const Element row(page, "tr", {{"data-key", keyText(kit::auxKey())}, {"tabindex", "0"}});
+    addPlace(page, "auxiliary area", kit::valuePlace(kit::auxKey()).offset, AUX_AREA_SIZE);
+    addContent(page, records.aux);
 }
 
 const char* sentenceOf(CrcVerdict verdict) {

@@ -35,8 +35,8 @@ void expectRefused(const Words& words, const std::string& complaint) {
     expectRan(runOrvaneUnit(words), 2, "", "orvane-unit: " + complaint + "\n");
 }
 
-const Words COMMANDS = {"new", "describe", "set",    "show",    "explain",
-                        "run", "diff",     "impact", "capture", "check"};
+const Words COMMANDS = {"new",  "describe", "set",    "show",    "explain", "run",
+                        "diff", "impact",   "report", "capture", "check"};
 
 TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
     const kit::RunResult help = runOrvaneUnit({"--help"});
@@ -54,7 +54,7 @@ TEST(OrvaneUnitTest, HelpOfEveryCommandHasAnExample) {
 
 TEST(OrvaneUnitTest, WrongUseIsRefused) {
     const std::string commands = "the first word must be one of new, describe, set, show, explain, "
-                                 "run, diff, impact, capture, check";
+                                 "run, diff, impact, report, capture, check";
     expectRefused({}, commands);
     for (const std::string word : {"wash", "Explain", "--bogus", "--json", "--", "-v", ""}) {
         expectRefused({word, "show"},

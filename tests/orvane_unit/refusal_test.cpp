@@ -48,6 +48,7 @@ INSTANTIATE_TEST_SUITE_P(
         Words{"explain", "/proc/none/unit"}, Words{"explain", "/proc/none/unit", "--json"},
         Words{"run", "/proc/none/unit"}, Words{"diff", "/proc/none/unit", "/proc/none/unit"},
         Words{"impact", "/proc/none/unit"}, Words{"capture", "/proc/none/unit", "/proc/none/new"},
+        Words{"report", "/proc/none/unit", "-o", "/proc/none/page.html"},
         Words{"check", "/proc/none/cases"}, Words{"new", "/proc/none/at/all"},
         Words{"new", "/proc/none/unit", "--from", "/proc/none/unit.toml"}),
     [](const ::testing::TestParamInfo<Words>& words) {

@@ -1,0 +1,361 @@
+// SPDX-License-Identifier: Apache-2.0
+//
+// What a page says about units with known values.
+#include "kit/description/parse_description.h"
+#include "kit/description/sample.h"
+#include "kit/unit/make_unit.h"
+#include "orvane_unit/explain/explain.h"
+#include "orvane_unit/page/markup.h"
+#include "orvane_unit/page/page.h"
+#include "orvane_unit/report/names.h"
+#include "orvane_unit/show/decoded_unit.h"
+#include "tests/kit/unit/described_unit.h"
+#include "tests/orvane_unit/explain/reason_units.h"
+#include "tests/support/temporary_folder.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace orvane::test {
+
+namespace {
+
+using desk::PageUnit;
+
+PageUnit unitAt(const std::filesystem::path& root) {
+    return {"bench", desk::explainUnit(root, {"-ai"}), desk::decodeUnit(root), {}};
+}
+
+std::string pageOf(const std::function<void(kit::UnitDescription&)>& change) {
+    const DescribedUnit described(change);
+    return desk::pageText({unitAt(described.root())}, "ai");
+}
+
+void unchanged(kit::UnitDescription& /*unit*/) {}
+
+/// The part of `page` from `begin` to before the next `end`.
+std::string partOf(const std::string& page, const std::string& begin, const std::string& end) {
+    const std::size_t from = page.find(begin);
+    EXPECT_NE(from, std::string::npos) << begin;
+    return from == std::string::npos ? "" : page.substr(from, page.find(end, from) - from);
+}
+
+std::string sectionOf(const std::string& page, const std::string& name) {
+    return partOf(page, "<section class=\"" + name + "\"", "</section>");
+}
+
+/// The row or item with a key in a part of a page.
+std::string itemOf(const std::string& part, const std::string& element, const std::string& key) {
+    const std::size_t at = part.find("data-key=\"" + key + "\"");
+    EXPECT_NE(at, std::string::npos) << key;
+    const std::size_t from = part.rfind("<" + element, at);
+    const std::size_t to = part.find("</" + element + ">", at);
+    return at == std::string::npos ? "" : part.substr(from, to - from);
+}
+
+std::size_t countOf(const std::string& text, const std::string& what) {
+    std::size_t count = 0;
+    for (std::size_t at = text.find(what); at != std::string::npos;
+         at = text.find(what, at + what.size())) {
+        ++count;
+    }
+    return count;
+}
+
+bool holds(const std::string& text, const std::string& what) {
+    return text.find(what) != std::string::npos;
+}
+
+std::string escaped(const std::string& text) {
+    desk::Markup page;
+    const std::size_t begin = page.document().size();
+    page.addText(text);
+    return page.document().substr(begin);
+}
+
+TEST(PageTest, SampleIsSmallAndItsPolicyAdmitsOnlyItsOwnStyleAndScript) {
+    const TemporaryFolder folder;
+    const std::filesystem::path root = folder.path() / "unit";
+    kit::makeUnit(kit::parseDescription(kit::sampleDescriptionText(), "sample"), root);
+    const std::string page = desk::pageText({unitAt(root)}, "ai");
+    EXPECT_LT(page.size(), 300U * 1024);
+    EXPECT_TRUE(holds(page, "content=\"default-src &#39;none&#39;; script-src &#39;sha256-"));
+    EXPECT_TRUE(holds(page, "=&#39;; base-uri &#39;none&#39;; form-action &#39;none&#39;\">"));
+    EXPECT_EQ(countOf(page, "<script"), 1U);
+    EXPECT_EQ(countOf(page, "<style"), 1U);
+    EXPECT_EQ(countOf(page, " style="), 0U);
+    EXPECT_EQ(countOf(page, "http://") + countOf(page, "https://"), 0U);
+    EXPECT_EQ(countOf(page, "<title>"), 1U + countOf(page, "<g class=\"part "));
+}
+
+TEST(PageTest, EveryReasonIsInTheTileOrAtTheLineOfItsOutput) {
+    for (const ReasonUnit& unit : reasonUnits()) {
+        const desk::ReasonInfo& info = reasonInfo(unit.reason);
+        SCOPED_TRACE(info.code);
+        const std::string page = pageOf(unit.change);
+        const std::string verdict = sectionOf(page, "verdict");
+        const std::string tile =
+            partOf(verdict, ">" + std::string(unit.output) + "</a>", "</ul></li>");
+        const std::string output =
+            partOf(page, "data-path=\"" + std::string(unit.output) + "\"", "</section>");
+        const std::string sentence = escaped(info.sentence);
+        EXPECT_TRUE(holds(tile, sentence) || holds(output, sentence));
+        EXPECT_TRUE(holds(tile, std::string("class=\"state\">") + nameOf(unit.outcome) + "<"));
+        EXPECT_TRUE(holds(output, std::string("class=\"state\">") + nameOf(unit.outcome) + "<"));
+        if (!info.isIntended) {
+            EXPECT_TRUE(holds(tile, sentence));
+            EXPECT_TRUE(holds(tile, "not as intended"));
+            EXPECT_TRUE(holds(tile, "look at"));
+        }
+    }
+}
+
+TEST(PageTest, AllAsIntendedIsSaidAndNothingElse) {
+    const std::string verdict = sectionOf(pageOf(unchanged), "verdict");
+    EXPECT_TRUE(holds(verdict, "All outputs are as intended."));
+    EXPECT_FALSE(holds(verdict, "fallback"));
+    EXPECT_FALSE(holds(verdict, "look at"));
+}
+
+TEST(PageTest, LineHasItsNumberItsTextAndItsOrigin) {
+    const std::string page = pageOf(unchanged);
+    const std::string output = partOf(page, "data-path=\"/tmp/iap2_device.cfg\"", "</section>");
+    const std::string serial = itemOf(output, "tr", "slot.9");
+    EXPECT_TRUE(holds(serial, "data-reasons=\"from-record\""));
+    EXPECT_TRUE(holds(serial, "tabindex=\"0\""));
+    EXPECT_TRUE(holds(serial, "<th scope=\"row\">6</th>"));
+    EXPECT_TRUE(holds(serial, "<code>serial=SN004217</code>"));
+    EXPECT_TRUE(holds(serial, "a record slot of the boot disk: record slot 9, disk bytes from "
+                              "1048705: 53 4e 30 30 34 32 31 37"));
+    const std::string copied = itemOf(output, "tr", "file./fs/mp/etc/iap2_device_static.cfg");
+    EXPECT_TRUE(holds(copied, "<code>device template</code>"));
+}
+
+TEST(PageTest, LineWithoutAnEndAndLineLeftOutAreMarked) {
+    const std::string page = pageOf([](kit::UnitDescription& unit) {
+        unit.files[AIRPLAY_FILE.templateFile] = "a\n\nb";
+        unit.absent = {CONFIG_SHM_NAME};
+    });
+    const std::string output = partOf(page, "data-path=\"/tmp/airplay.conf\"", "</section>");
+    EXPECT_EQ(countOf(output, "(no line end)"), 1U);
+    EXPECT_TRUE(holds(output, "<code>b</code>\n<small class=\"sign\">(no line end)</small>"));
+    EXPECT_EQ(countOf(output, "(left out)"), 1U);
+    EXPECT_TRUE(holds(itemOf(output, "tr", "param.134"), "(left out)"));
+}
+
+TEST(PageTest, WhatIsLeftByAnEarlierRunIsShown) {
+    const std::string page = pageOf([](kit::UnitDescription& unit) {
+        unit.files[TELEPHONY_TUNING_FILE] = "of an earlier run\n";
+    });
+    const std::string output =
+        partOf(page, "data-path=\"" + std::string(TELEPHONY_TUNING_FILE) + "\"", "</section>");
+    EXPECT_TRUE(holds(output, "There after the run, and not from this output:"));
+    EXPECT_TRUE(holds(output, "<code>of an earlier run</code>"));
+    const std::string other =
+        partOf(page, "data-path=\"" + std::string(SPEECHREC_TUNING_FILE) + "\"", "</section>");
+    EXPECT_TRUE(holds(other, "There after the run: missing."));
+}
+
+TEST(PageTest, ImageHasACellForEachByte) {
+    const std::string image = sectionOf(pageOf(unchanged), "image");
+    EXPECT_EQ(countOf(image, "<li class=\"cell "), 179U);
+    EXPECT_EQ(countOf(image, ">read</span>"), 6U); // five parameters, one of two bytes
+    EXPECT_EQ(countOf(image, "past the end</span>"), 0U);
+    const std::string model = itemOf(image, "li", "param.139");
+    EXPECT_TRUE(holds(model, "class=\"cell group-3 read\""));
+    EXPECT_TRUE(holds(model, "<b>139</b>\n<code>1a</code>"));
+    EXPECT_TRUE(holds(model, "byte 139, group 3, 1 byte, raw 26, default 0, mask 0x7ffffffe, code "
+                             "49: model Quarion Velmira"));
+    EXPECT_TRUE(holds(image, "byte 134, the upper one of parameter 134"));
+}
+
+TEST(PageTest, CellsPastTheEndOfAShortImageAreMarked) {
+    const std::string image = sectionOf(pageOf([](kit::UnitDescription& unit) {
+                                            unit.image = {};
+                                            unit.image.size = 134;
+                                        }),
+                                        "image");
+    EXPECT_TRUE(holds(image, "134 bytes of 179."));
+    EXPECT_EQ(countOf(image, "past the end</span>"), 179U - 134);
+    EXPECT_EQ(countOf(image, "<code>--</code>"), 179U - 134);
+    const std::string none = sectionOf(
+        pageOf([](kit::UnitDescription& unit) { unit.absent = {CONFIG_SHM_NAME}; }), "image");
+    EXPECT_TRUE(holds(none, "0 bytes: the configuration image can&#39;t be opened."));
+    EXPECT_EQ(countOf(none, "past the end</span>"), 179U);
+}
+
+TEST(PageTest, RecordAreaIsDrawnAndListed) {
+    const std::string records = sectionOf(
+        pageOf([](kit::UnitDescription& unit) { unit.disk.slots[16] = "<line> 7"; }), "records");
+    EXPECT_TRUE(holds(records, "<svg class=\"drawing\" role=\"img\""));
+    EXPECT_TRUE(holds(records, "<title>slot 9: 8 bytes at 129</title>"));
+    EXPECT_TRUE(holds(records, "<title>auxiliary area: 1024 bytes at 3072</title>"));
+    EXPECT_TRUE(holds(records, "<title>tuning block 9: 188 bytes at 5788</title>"));
+    EXPECT_TRUE(holds(records, "<title>belongs to nothing: 2048 bytes at 137</title>"));
+    EXPECT_TRUE(holds(records, "<title>belongs to nothing: 1040384 bytes at 8192</title>"));
+    const std::string table = partOf(records, "<table class=\"slots\"", "</table>");
+    EXPECT_TRUE(holds(itemOf(table, "tr", "slot.9"), "<code>53 4e 30 30 34 32 31 37</code>"));
+    EXPECT_TRUE(holds(itemOf(table, "tr", "slot.16"), "<code>&lt;line&gt; 7</code>"));
+    EXPECT_TRUE(holds(itemOf(table, "tr", "slot.15"), "repeats slots 1 to 9"));
+    EXPECT_TRUE(holds(itemOf(table, "tr", "slot.0"), "zeros"));
+    EXPECT_TRUE(holds(itemOf(table, "tr", "aux"), "<td>3072</td>\n<td>1024</td>\n<td>zeros</td>"));
+    EXPECT_TRUE(holds(records, "<strong class=\"state\">computed</strong>"));
+}
+
+TEST(PageTest, DiskThatCannotBeReadIsSaid) {
+    const std::string page = pageOf([](kit::UnitDescription& unit) { unit.absent = {BOOT_DISK}; });
+    const std::string records = sectionOf(page, "records");
+    EXPECT_TRUE(holds(records, "the boot disk can&#39;t be opened"));
+    EXPECT_EQ(countOf(records, "can&#39;t be read</td>"), 18U); // 17 slots, and the auxiliary area
+    EXPECT_TRUE(holds(records, "<strong class=\"state\">unreadable</strong>"));
+    EXPECT_TRUE(holds(sectionOf(page, "tuning"), "the boot disk can&#39;t be opened."));
+}
+
+TEST(PageTest, TuningBlocksAreSideBySide) {
+    const std::string tuning =
+        sectionOf(pageOf([](kit::UnitDescription& unit) {
+                      kit::TuningDescription& third = unit.disk.tuning[3];
+                      third.raw = std::string("\0\xC0", 2);
+                      third.fields["qwaAECSwitch"] = std::string("qwaOn");
+                      third.fields["qwaNRAtten"] = std::int64_t{-40};
+                      third.fields["qwaRecvAGCAmpTgts"] = std::vector<std::int64_t>{-7, 0};
+                      unit.disk.tuning[7].raw = "x";
+                  }),
+                  "tuning");
+    EXPECT_EQ(countOf(tuning, "<tr class=\"field"), 44U);
+    EXPECT_EQ(countOf(tuning, "<tr class=\"field differs\""), 3U);
+    EXPECT_TRUE(
+        holds(itemOf(tuning, "td", "tuning.3.qwaAECSwitch"),
+              "<span class=\"word code-2\">qwaOn</span>\n<span class=\"numbers\">2</span>"));
+    EXPECT_TRUE(holds(itemOf(tuning, "td", "tuning.2.qwaAECSwitch"), "no word"));
+    EXPECT_TRUE(holds(itemOf(tuning, "tr", "tuning.3.qwaNRAtten"), "\u2260 differs"));
+    EXPECT_TRUE(holds(itemOf(tuning, "td", "tuning.3.qwaNRAtten"), ">-40</span>"));
+    const std::string list = itemOf(tuning, "td", "tuning.3.qwaRecvAGCAmpTgts");
+    EXPECT_TRUE(holds(list, ">-7, 0</span>"));
+    EXPECT_TRUE(holds(list, "<path class=\"bar differs\" d=\"M0 0h5v24h-5z\">"));
+    EXPECT_TRUE(holds(list, "<path class=\"bar\" d=\"M7 0h5v1h-5z\">"));
+    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.3.raw"), "byte 1: no field reads"));
+    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.3.raw"), "<code>0xc0</code>"));
+    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.7"), "not all zeros"));
+    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.0"), ": zeros"));
+}
+
+TEST(PageTest, VersionBecomesDigitsStepByStep) {
+    const std::string versions = sectionOf(pageOf([](kit::UnitDescription& unit) {
+                                               unit.files["/fs/rwdata/.Version/other.inf"] =
+                                                   "Type=Boot\nVersion Number=9.9.9\n";
+                                           }),
+                                           "versions");
+    EXPECT_EQ(countOf(versions, "<li class=\"version"), 2U);
+    EXPECT_EQ(countOf(versions, "<li class=\"version chosen\""), 1U);
+    EXPECT_TRUE(holds(versions, "<code class=\"version-text\">3.10.2_rc</code>"));
+    EXPECT_TRUE(holds(versions, "<code class=\"version-digits\">030a02</code>"));
+    const std::string steps = partOf(versions, "<ol class=\"steps\"", "</ol>");
+    EXPECT_TRUE(holds(steps, "<code>ABC_3.10.2_rc</code>"));
+    EXPECT_TRUE(holds(steps, "component &quot;10&quot;, the number 10, in hexadecimal: "
+                             "\n<code>0a</code>"));
+    EXPECT_EQ(countOf(steps, "<li>"), 6U);
+}
+
+TEST(PageTest, WithoutAVersionTheDigitsAreThoseForNone) {
+    const std::string none = sectionOf(
+        pageOf([](kit::UnitDescription& unit) { unit.files.erase("/fs/rwdata/.Version/app.inf"); }),
+        "versions");
+    EXPECT_TRUE(holds(none, "There is no version description file."));
+    EXPECT_TRUE(holds(none, "no file is chosen, so the digits are those for no version: "
+                            "\n<code>000000</code>"));
+    const std::string na = sectionOf(pageOf([](kit::UnitDescription& unit) {
+                                         unit.files["/fs/rwdata/.Version/app.inf"] =
+                                             "Type=Application\nVersion Number=N/A\n";
+                                     }),
+                                     "versions");
+    EXPECT_TRUE(holds(na, "those for none: \n<code>000000</code>"));
+}
+
+TEST(PageTest, FilesHaveTheirKeys) {
+    const std::string files = sectionOf(pageOf(unchanged), "files");
+    EXPECT_TRUE(holds(itemOf(files, "tr", "file./fs/mp/etc/airplay_static.conf"),
+                      "<td>template</td>\n<td>17 bytes</td>"));
+    EXPECT_TRUE(holds(itemOf(files, "tr", "file./tmp/iap1.cfg"), "<td>missing</td>"));
+}
+
+TEST(PageTest, BytesOfAHostileUnitStayText) {
+    const std::string attack = "\"'></script><script>alert(1)</script><img src=x onerror=y>";
+    const std::string page = pageOf([&attack](kit::UnitDescription& unit) {
+        unit.disk.slots[9] = "</td><b>";
+        unit.disk.slots[16] = "\"onclick=\"x";
+        unit.disk.aux = attack + "\xE2\x80\xAE\xFF";
+        unit.files[AIRPLAY_FILE.templateFile] = attack + "\n\x1B[31m\n";
+        unit.files["/fs/rwdata/.Version/\" onfocus=\"x'><i>.inf"] =
+            "Type=Boot\n" + attack + "=" + attack + "\n";
+    });
+    EXPECT_EQ(countOf(page, "<script"), 1U);
+    for (const char* const begin : {"<img", "<b>", "<i>", "\" on", "' on"}) {
+        const std::size_t own = std::string(begin) == "<b>" ? 179 : 0;
+        EXPECT_EQ(countOf(page, begin), own) << begin;
+    }
+    EXPECT_TRUE(holds(page, "\\xe2\\x80\\xae\\xff"));
+    EXPECT_TRUE(holds(page, "\\x1b[31m"));
+    EXPECT_TRUE(std::all_of(page.begin(), page.end(), [](char byte) {
+        return byte == '\n' || static_cast<unsigned char>(byte) >= ' ';
+    }));
+}
+
+PageUnit fleetUnit(const std::string& name, const std::string& model, const std::string& serial) {
+    static const DescribedUnit DESCRIBED;
+    PageUnit unit = unitAt(DESCRIBED.root());
+    unit.name = name;
+    unit.decoded.identity.model = model;
+    unit.decoded.identity.serial = serial;
+    return unit;
+}
+
+TEST(PageTest, FleetHasARowForEachUnitAndMarksRareValues) {
+    std::vector<PageUnit> units = {fleetUnit("a", "M", "1"), fleetUnit("b", "M", "2"),
+                                   fleetUnit("c<", "N", "3")};
+    units[1].explanation[2].outcome = desk::Outcome::stock;
+    units[1].explanation[2].reasons = {desk::Reason::templateMissing};
+    const std::string page = desk::pageText(units, "ai");
+    EXPECT_TRUE(holds(page, "<title>3 units - orvane-unit report</title>"));
+    const std::string fleet = partOf(page, "<section id=\"fleet\"", "</section>");
+    EXPECT_TRUE(holds(fleet, "3 units, 2 of them all as intended."));
+    EXPECT_TRUE(holds(fleet, "<a href=\"#unit-3\">c&lt;</a>"));
+    EXPECT_TRUE(holds(page, "<article class=\"unit\" id=\"unit-3\">"));
+    EXPECT_EQ(countOf(fleet, " rare\""), 2U); // the model N, and the stock file; no serial
+    EXPECT_TRUE(holds(fleet, "<td class=\"value rare\">N"));
+    EXPECT_TRUE(holds(fleet, "<td class=\"tile state-stock fallback rare\">stock"));
+    EXPECT_TRUE(holds(fleet, "<td>2 generated, 1 stock</td>"));
+    EXPECT_TRUE(holds(fleet, "<td>3 not-asked</td>"));
+}
+
+TEST(PageTest, NothingIsRareAmongHalves) {
+    const std::string page =
+        desk::pageText({fleetUnit("a", "M", "1"), fleetUnit("b", "N", "2")}, "ai");
+    EXPECT_FALSE(holds(page, " rare\""));
+}
+
+TEST(PageTest, ImpactsAreAMatrix) {
+    PageUnit unit = fleetUnit("a", "M", "1");
+    unit.impacts = {{kit::paramKey(139),
+                     17,
+                     16,
+                     {{"/tmp/airplay.conf", 5}, {"/tmp/airplay.conf", 12}, {"/tmp/iap1.cfg", 0}}},
+                    {kit::paramKey(1), 3, 0, {}}};
+    const std::string page = desk::pageText({unit}, "ai");
+    const std::string impacts = sectionOf(page, "impacts");
+    EXPECT_EQ(countOf(impacts, "<th scope=\"col\">"), 4U);
+    EXPECT_TRUE(holds(itemOf(impacts, "tr", "param.139"),
+                      "<td>16 of 17</td>\n<td class=\"changed\">5, 12</td>"
+                      "\n<td class=\"changed\">all</td>"));
+    EXPECT_TRUE(holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing."));
+    EXPECT_FALSE(holds(desk::pageText({fleetUnit("a", "M", "1")}, "ai"), "class=\"impacts\""));
+}
+
+} // namespace
+
+} // namespace orvane::test
