@@ -11,6 +11,13 @@ if(ORVANE_KIT_BUILT)
   install(TARGETS orvane-unit RUNTIME COMPONENT programs)
   install(FILES completion/orvane-unit.bash COMPONENT host
     DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions RENAME orvane-unit)
+  install(FILES completion/orvane-unit.fish COMPONENT host
+    DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d)
+  # Debian's zsh looks for packages' completions in a folder of its own.
+  foreach(folder site-functions vendor-completions)
+    install(FILES completion/_orvane-unit COMPONENT host
+      DESTINATION ${CMAKE_INSTALL_DATADIR}/zsh/${folder})
+  endforeach()
 endif()
 
 find_program(ORVANE_GZIP gzip)

@@ -23,7 +23,9 @@ PATH = f"{os.environ['PATH']}:/usr/local/sbin:/usr/sbin:/sbin"
 
 IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
     "share/man/man1/orvane.1.gz", "share/man/man1/orvane-unit.1.gz",
-    "share/bash-completion/completions/orvane-unit", "share/doc/orvane/changelog.gz",
+    "share/bash-completion/completions/orvane-unit", "share/fish/vendor_completions.d/orvane-unit.fish",
+    "share/zsh/site-functions/_orvane-unit", "share/zsh/vendor-completions/_orvane-unit",
+    "share/doc/orvane/changelog.gz",
     "share/doc/orvane/README.md"} | {f"share/doc/orvane/{name}" for name in DOCUMENTS}}
 
 

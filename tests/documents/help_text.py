@@ -14,18 +14,19 @@ def help_of(*words: str) -> str:
                           capture_output=True, text=True).stdout
 
 
-def commands() -> list[str]:
+def commands() -> dict[str, str]:
+    """What each command is said to do."""
     listed = help_of().split("Subcommands:\n", 1)[1].split("\n\n", 1)[0]
-    found = re.findall(r"^  (\w+) ", listed, re.MULTILINE)
+    found = dict(re.findall(r"^  (\w+) +(.+)$", listed, re.MULTILINE))
     if len(found) < 2:
         raise AssertionError(f"no commands in the help: {listed!r}")
     return found
 
 
-def options(*words: str) -> set[str]:
-    """The options as they are typed, without -h, which is --help."""
-    found = set()
-    for line in help_of(*words).splitlines():
-        if head := re.match(r"^  (-[-\w,]+)", line):
-            found.update(head[1].split(","))
-    return found - {"-h"}
+def options(*words: str) -> dict[str, str]:
+    """What each option is said to do, as it is typed, without -h, which is --help."""
+    listed = help_of(*words).split("Options:\n", 1)[1].split("\n\n", 1)[0]
+    found = {}
+    for names, what in re.findall(r"^  (-[-\w,]+)[^\n]*?\s{2,}(\S.*)$", listed, re.MULTILINE):
+        found.update({name: what for name in names.split(",") if name != "-h"})
+    return found
