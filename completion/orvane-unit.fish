@@ -35,6 +35,8 @@ complete -c orvane-unit -n __orvane_unit_lacks_command -a diff \
     -d 'Print the values that differ between two units, and the lines they change'
 complete -c orvane-unit -n __orvane_unit_lacks_command -a impact \
     -d 'Change every input in a copy of a unit, and say which output lines change'
+complete -c orvane-unit -n __orvane_unit_lacks_command -a report \
+    -d 'Write a page about units, for a browser'
 complete -c orvane-unit -n __orvane_unit_lacks_command -a capture \
     -d 'Copy the inputs of a real unit into a new one'
 complete -c orvane-unit -n __orvane_unit_lacks_command -a check \
@@ -51,9 +53,9 @@ complete -c orvane-unit -n '__orvane_unit_command new' -l from -rF \
     -d "The unit's description in TOML; by default the built-in sample unit"
 complete -c orvane-unit -n '__orvane_unit_command show' -l only -x \
     -a 'params records tuning versions files' -d 'params, records, tuning, versions or files'
-complete -c orvane-unit -n '__orvane_unit_command explain diff' -s a \
+complete -c orvane-unit -n '__orvane_unit_command explain diff report' -s a \
     -d "orvane's option -a; by default -a -i"
-complete -c orvane-unit -n '__orvane_unit_command explain diff' -s i -d "orvane's option -i"
+complete -c orvane-unit -n '__orvane_unit_command explain diff report' -s i -d "orvane's option -i"
 complete -c orvane-unit -n '__orvane_unit_command explain' -l all -d "Print orvane's own text as well"
 complete -c orvane-unit -n '__orvane_unit_command explain' -l content \
     -d 'With --json: what each file would hold'
@@ -62,6 +64,11 @@ complete -c orvane-unit -n '__orvane_unit_command show explain run diff impact c
 complete -c orvane-unit -n '__orvane_unit_command run check' -l orvane -rF \
     -d 'The binary to run; by default the one beside this program, else on PATH'
 complete -c orvane-unit -n '__orvane_unit_command run' -l brief -d 'Only name the files that changed'
+complete -c orvane-unit -n '__orvane_unit_command report' -F
+complete -c orvane-unit -n '__orvane_unit_command report' -s o -rF -d 'The page to write'
+complete -c orvane-unit -n '__orvane_unit_command report' -l redact-serial -d 'Replace the serials by X'
+complete -c orvane-unit -n '__orvane_unit_command report' -l impact \
+    -d 'Say also which inputs change which lines'
 complete -c orvane-unit -n '__orvane_unit_command capture' -l redact-serial -d 'Replace the serial by X'
 complete -c orvane-unit -n '__orvane_unit_command check' -l update \
     -d 'Write what is found as the new expectations'

@@ -55,9 +55,9 @@ class ZshCompletionTest(unittest.TestCase):
         self.assertTrue(any(line.endswith(":part:(params records tuning versions files)")
                             for line in said("argument", "show")))
 
-    def test_each_command_takes_a_folder_and_set_takes_keys(self) -> None:
+    def test_each_command_takes_paths_and_set_takes_keys(self) -> None:
         for command in help_text.commands():
-            self.assertTrue(any(re.fullmatch(r"[1*]:[\w ]+:_files -/", line)
+            self.assertTrue(any(re.fullmatch(r"[1*]:[\w, ]+:_files( -/)?", line)
                                 for line in said("argument", command)), command)
         self.assertIn("*:assignment:compadd -S '' - param. serial= slot. aux= tuning.",
                       said("argument", "set"))
