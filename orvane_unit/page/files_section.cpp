@@ -5,6 +5,7 @@
 #include "kit/host/text.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
 
 namespace orvane::desk {
@@ -12,7 +13,7 @@ namespace orvane::desk {
 void addFiles(Markup& page, const std::vector<UnitFile>& files, const std::string& id) {
     const Element section(page, "section", {{"class", "files"}, {"id", id + "-files"}});
     page.add("h3", "Files before a run");
-    const Element table(page, "table");
+    const WideTable table(page, "paths");
     addTitles(page, {"path", "what it is for", "what is there"});
     const Element body(page, "tbody");
     for (const UnitFile& file : files) {

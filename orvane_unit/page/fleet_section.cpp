@@ -4,6 +4,7 @@
 #include "kit/host/text.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/page/unit_id.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/phrases.h"
 
@@ -134,7 +135,7 @@ void addFleet(Markup& page, const std::vector<PageUnit>& units) {
     const Element section(page, "section", {{"id", "fleet"}});
     page.add("h2", "All units");
     page.add("p", {{"class", "summary"}}, summaryOf(units));
-    const Element table(page, "table", {{"class", "fleet"}});
+    const WideTable table(page, "fleet");
     {
         const Element head(page, "thead");
         const Element row(page, "tr");

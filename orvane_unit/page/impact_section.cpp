@@ -3,6 +3,7 @@
 
 #include "kit/description/value_key.h"
 #include "kit/host/text.h"
+#include "orvane_unit/page/wide_table.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -43,7 +44,7 @@ std::string linesText(const Impact& impact, const std::string& path) {
 }
 
 void addRow(Markup& page, const Impact& impact, const std::vector<std::string>& paths) {
-    const Element row(page, "tr", {{"data-key", keyText(impact.key)}, {"tabindex", "0"}});
+    const Element row(page, "tr", {{"data-key", keyText(impact.key)}});
     page.add("th", {{"scope", "row"}}, keyText(impact.key));
     page.add("td", std::to_string(impact.changing) + " of " + std::to_string(impact.tried));
     for (const std::string& path : paths) {
@@ -65,7 +66,7 @@ void addImpacts(Markup& page, const std::vector<Impact>& impacts, const Explanat
                       " changed lines, with these numbers; " + std::to_string(inert) +
                       " changed nothing.");
     const std::vector<std::string> paths = changedPaths(impacts, explanation);
-    const Element table(page, "table", {{"class", "matrix"}});
+    const WideTable table(page, "matrix");
     {
         const Element head(page, "thead");
         const Element row(page, "tr");

@@ -6,6 +6,7 @@
 #include "orvane_unit/page/output_rows.h"
 #include "orvane_unit/page/table_titles.h"
 #include "orvane_unit/page/unit_id.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
 
 #include <cstddef>
@@ -39,7 +40,7 @@ void addLine(Markup& page, const OutputRow& row) {
 }
 
 void addLines(Markup& page, const std::vector<Line>& lines) {
-    const Element table(page, "table", {{"class", "lines"}});
+    const WideTable table(page, "lines");
     addTitles(page, {"line", "text", "origin"});
     const Element body(page, "tbody");
     for (const OutputRow& row : outputRows(lines)) {
@@ -47,8 +48,7 @@ void addLines(Markup& page, const std::vector<Line>& lines) {
         const Element line(page, "tr",
                            {{"class", isGood ? "line" : "line fallback"},
                             {"data-reasons", codesText(row.origin->reasons)},
-                            {"data-key", keyText(row.origin->key)},
-                            {"tabindex", "0"}});
+                            {"data-key", keyText(row.origin->key)}});
         addLine(page, row);
         page.add("td", originText(*row.origin));
     }
@@ -72,7 +72,7 @@ void addWhatIsLeft(Markup& page, const Output& output) {
              output.contentAfter.empty() ? "There after the run: an empty file."
                                          : "There after the run, and not from this output:");
     if (!output.contentAfter.empty()) {
-        const Element table(page, "table", {{"class", "lines left"}});
+        const WideTable table(page, "lines left");
         addTitles(page, {"line", "text"});
         const Element body(page, "tbody");
         for (const OutputRow& row : outputRows({{output.contentAfter, {}}})) {

@@ -9,6 +9,7 @@
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/record_drawing.h"
 #include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/phrases.h"
 
@@ -59,12 +60,11 @@ void addPlace(Markup& page, const std::string& name, std::uint64_t offset, std::
 }
 
 void addSlots(Markup& page, const DecodedRecords& records) {
-    const Element table(page, "table", {{"class", "slots"}});
+    const WideTable table(page, "slots");
     addTitles(page, {"place", "offset", "bytes", "content", "as text"});
     const Element body(page, "tbody");
     for (const DecodedSlot& slot : records.slots) {
-        const Element row(page, "tr",
-                          {{"data-key", keyText(kit::slotKey(slot.number))}, {"tabindex", "0"}});
+        const Element row(page, "tr", {{"data-key", keyText(kit::slotKey(slot.number))}});
         addPlace(page, "slot " + std::to_string(slot.number), slot.offset, slot.size);
         const std::string repeated = repeatedSlots(slot.number);
         if (repeated.empty()) {
@@ -73,7 +73,7 @@ void addSlots(Markup& page, const DecodedRecords& records) {
             page.add("td", {{"colspan", "2"}}, "repeats " + repeated);
         }
     }
-    const Element row(page, "tr", {{"data-key", keyText(kit::auxKey())}, {"tabindex", "0"}});
+    const Element row(page, "tr", {{"data-key", keyText(kit::auxKey())}});
     addPlace(page, "auxiliary area", kit::valuePlace(kit::auxKey()).offset, AUX_AREA_SIZE);
     addContent(page, records.aux);
 }

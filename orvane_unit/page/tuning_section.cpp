@@ -7,6 +7,7 @@
 #include "kit/tuning/tuning_encode.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/bar_plot.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/phrases.h"
 #include "tuning/audio_profile.h"
 #include "tuning/dps_block.h"
@@ -86,8 +87,7 @@ void addValue(Markup& page, const FieldValues& all, std::size_t index) {
 }
 
 void addField(Markup& page, const FieldValues& all) {
-    const Element row(page, "tr",
-                      {{"class", all.isSame() ? "field" : "field differs"}, {"tabindex", "0"}});
+    const Element row(page, "tr", {{"class", all.isSame() ? "field" : "field differs"}});
     page.add("th", {{"scope", "row"}}, all.field.key);
     for (std::size_t i = 0; i < all.values.size(); ++i) {
         addValue(page, all, i);
@@ -96,7 +96,7 @@ void addField(Markup& page, const FieldValues& all) {
 }
 
 void addFields(Markup& page, const TuningArea& tuning) {
-    const Element table(page, "table", {{"class", "fields"}});
+    const WideTable table(page, "fields");
     {
         const Element head(page, "thead");
         const Element row(page, "tr");

@@ -8,6 +8,7 @@
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/version_choice.h"
 #include "orvane_unit/page/table_titles.h"
+#include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/phrases.h"
 
 #include <array>
@@ -27,7 +28,7 @@ void addFile(Markup& page, const VersionFiles& versions, std::size_t index) {
     const Element item(page, "li", {{"class", isChosen ? "version chosen" : "version"}});
     page.add("h4", {{"data-key", key}}, file.path);
     page.add("p", {{"class", "sign"}}, choiceText(versions, index));
-    const Element table(page, "table");
+    const WideTable table(page, "record");
     addTitles(page, {"key", "value"});
     const Element body(page, "tbody");
     for (const auto& [name, value] : file.record) {

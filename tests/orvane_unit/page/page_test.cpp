@@ -127,7 +127,6 @@ TEST(PageTest, LineHasItsNumberItsTextAndItsOrigin) {
     const std::string output = partOf(page, "data-path=\"/tmp/iap2_device.cfg\"", "</section>");
     const std::string serial = itemOf(output, "tr", "slot.9");
     EXPECT_TRUE(holds(serial, "data-reasons=\"from-record\""));
-    EXPECT_TRUE(holds(serial, "tabindex=\"0\""));
     EXPECT_TRUE(holds(serial, "<th scope=\"row\">6</th>"));
     EXPECT_TRUE(holds(serial, "<code>serial=SN004217</code>"));
     EXPECT_TRUE(holds(serial, "a record slot of the boot disk: record slot 9, disk bytes from "
