@@ -1,0 +1,260 @@
+# SPDX-License-Identifier: Apache-2.0
+"""A page about one unit, in a real browser."""
+
+from __future__ import annotations
+
+import tempfile
+from pathlib import Path
+
+import units
+from browser import NARROW, BrowserTestCase
+from selenium.webdriver.common.keys import Keys
+from selenium.webdriver.remote.webelement import WebElement
+
+MODEL = "param.139"
+LIT = "return [...document.querySelectorAll('.unit .lit[data-key]')].map(each => each.dataset.key)"
+ALL_OF = "return document.querySelectorAll(`[data-key=\"${CSS.escape(arguments[0])}\"]`).length"
+
+
+class OneUnitTest(BrowserTestCase):
+    """The sample unit, with what its inputs change."""
+
+    page: Path
+
+    @classmethod
+    def setUpClass(cls) -> None:
+        super().setUpClass()
+        folder = tempfile.TemporaryDirectory(prefix="orvane page-")
+        cls.addClassCleanup(folder.cleanup)
+        root = units.make(Path(folder.name) / "sample")
+        cls.page = units.report(Path(folder.name) / "a page.html", root, options=("--impact",))
+
+    def setUp(self) -> None:
+        super().setUp()
+        self.browser.open(self.page)
+
+    def tearDown(self) -> None:
+        self.check_no_trouble()
+
+    def line(self, key: str) -> WebElement:
+        return next(line for line in self.browser.all(f".line[data-key='{key}']") if line.is_displayed())
+
+    def check_lit(self, key: str) -> None:
+        """Everything with the key is lit, and nothing with another one."""
+        lit = self.browser.run(LIT)
+        self.assertEqual(set(lit), {key})
+        self.assertEqual(len(lit), self.browser.run(ALL_OF, key))
+
+    def open_output(self, name: str) -> None:
+        next(tab for tab in self.browser.all("[role=tab]") if tab.text.startswith(name)).click()
+
+    def shown_outputs(self) -> list[str]:
+        return [panel.get_attribute("data-path") for panel in self.browser.all(".output")
+                if panel.is_displayed()]
+
+    # --- Tabs
+
+    def test_one_output_is_shown_at_a_time(self) -> None:
+        self.assertEqual(len(self.browser.all("[role=tab]")), 6)
+        self.assertEqual(self.shown_outputs(), ["/tmp/telephony_FFFF.txt"])
+        self.open_output("iap2.cfg")
+        self.assertEqual(self.shown_outputs(), ["/tmp/iap2.cfg"])
+
+    def test_arrow_keys_move_among_tabs(self) -> None:
+        self.browser.one("[role=tab][aria-selected=true]").click()
+        for keys, shown in (((Keys.ARROW_RIGHT, Keys.ARROW_RIGHT), "/tmp/airplay.conf"),
+                            ((Keys.END,), "/tmp/iap1.cfg"), ((Keys.ARROW_RIGHT,), "/tmp/iap1.cfg"),
+                            ((Keys.ARROW_LEFT,), "/tmp/iap2.cfg"), ((Keys.HOME,), "/tmp/telephony_FFFF.txt")):
+            self.browser.press(*keys)
+            self.assertEqual(self.shown_outputs(), [shown])
+            self.assertEqual(self.browser.focused().get_attribute("aria-selected"), "true")
+
+    def test_a_tile_leads_to_its_output(self) -> None:
+        self.browser.one(".tile a[href='#unit-1-output-5']").click()
+        self.assertEqual(self.shown_outputs(), ["/tmp/iap2.cfg"])
+
+    def test_the_address_may_name_an_output(self) -> None:
+        self.browser.open(self.page, "#unit-1-output-4")
+        self.assertEqual(self.shown_outputs(), ["/tmp/iap2_device.cfg"])
+
+    # --- Lighting up
+
+    def test_a_line_at_the_pointer_lights_up_its_source(self) -> None:
+        self.open_output("airplay.conf")
+        self.browser.point_at(self.line(MODEL))
+        self.check_lit(MODEL)
+        self.assertIn("lit", self.browser.one(f".cell[data-key='{MODEL}']").get_attribute("class"))
+
+    def test_a_byte_at_the_pointer_lights_up_its_lines(self) -> None:
+        self.browser.point_at(self.browser.one(f".cell[data-key='{MODEL}']"))
+        self.check_lit(MODEL)
+        tabs = [tab.text.split()[0] for tab in self.browser.all("[role=tab].lit")]
+        self.assertEqual(tabs, ["airplay.conf", "iap2_device.cfg", "iap2.cfg", "iap1.cfg"])
+
+    def test_each_kind_of_source_lights_up_with_its_lines(self) -> None:
+        for selector in (".slots [data-key='slot.9']",
+                         ".fields [data-key='tuning.2.qwaAECSwitch']",
+                         ".files [data-key='file./fs/mp/etc/airplay_static.conf']",
+                         ".impacts [data-key='param.36']"):
+            with self.subTest(selector):
+                element = self.browser.one(selector)
+                self.browser.point_at(element)
+                self.assertIn(element.get_attribute("data-key"), self.browser.run(LIT))
+                self.assertTrue(self.browser.all(".line.lit"))
+                self.assertTrue(self.browser.all("[role=tab].lit"))
+
+    def test_a_line_of_a_version_lights_up_its_file(self) -> None:
+        self.open_output("iap1.cfg")
+        self.browser.point_at(next(line for line in self.browser.all(".line")
+                                   if line.is_displayed() and "firmware_version" in line.text))
+        self.assertTrue(self.browser.all(".versions .chosen .lit"))
+
+    def test_a_field_lights_up_its_block_in_the_drawing(self) -> None:
+        self.browser.point_at(self.line("tuning.3.qwaAECSwitch"))
+        self.assertEqual(set(self.browser.run(LIT)), {"tuning.3.qwaAECSwitch", "tuning.3"})
+
+    def test_nothing_stays_lit_when_the_pointer_leaves(self) -> None:
+        self.browser.point_at(self.browser.one(f".cell[data-key='{MODEL}']"))
+        self.assertTrue(self.browser.run(LIT))
+        self.browser.point_at(self.browser.one("h1"))
+        self.assertEqual(self.browser.run(LIT), [])
+
+    def tab_to(self, selector: str) -> WebElement:
+        for _ in range(60):
+            self.browser.press(Keys.TAB)
+            if (element := self.browser.focused()).get_dom_attribute("data-key") and \
+                    self.browser.run("return arguments[0].matches(arguments[1])", element, selector):
+                return element
+        raise AssertionError(f"60 stops of the Tab key, and none is {selector}")
+
+    def test_keys_lead_from_a_line_to_its_source(self) -> None:
+        self.open_output("airplay.conf")
+        line = self.tab_to(".line")
+        self.assertEqual(line.get_attribute("data-key"), MODEL)
+        self.check_lit(MODEL)
+        self.browser.press(Keys.ARROW_DOWN)
+        self.check_lit("param.36")
+        self.browser.press(Keys.ARROW_UP)
+        self.check_lit(MODEL)
+        self.browser.press(Keys.ENTER)
+        box = self.browser.one(f".cell[data-key='{MODEL}']")
+        self.assertTrue(self.browser.run(
+            "const box = arguments[0].getBoundingClientRect(); return box.top >= 0 && box.bottom <= innerHeight",
+            box))
+
+    def test_keys_lead_from_a_byte_to_its_lines(self) -> None:
+        self.tab_to(".cell")
+        self.browser.press(Keys.END, *[Keys.ARROW_LEFT] * 38)
+        self.check_lit("param.140")
+        self.browser.press(Keys.ARROW_LEFT)
+        self.check_lit(MODEL)
+        self.assertEqual(self.shown_outputs(), ["/tmp/telephony_FFFF.txt"])
+        self.browser.press(Keys.ENTER)
+        self.assertEqual(self.shown_outputs(), ["/tmp/airplay.conf"])
+        self.browser.press(Keys.ESCAPE)
+        self.assertEqual(self.browser.run(LIT), [])
+
+    def test_arrows_move_up_and_down_in_the_image(self) -> None:
+        first = self.tab_to(".cell")
+        self.browser.press(Keys.ARROW_DOWN)
+        below = self.browser.focused()
+        self.assertEqual(below.rect["x"], first.rect["x"])
+        self.assertGreater(below.rect["y"], first.rect["y"])
+        self.browser.press(Keys.ARROW_UP)
+        self.assertEqual(self.browser.focused(), first)
+        self.browser.press(Keys.END)
+        self.assertEqual(self.browser.focused().get_attribute("data-key"), "param.171")
+
+    def test_a_table_is_one_stop_of_the_tab_key(self) -> None:
+        self.tab_to(".cell")
+        stops = []
+        for _ in range(3):
+            self.browser.press(Keys.TAB)
+            stops.append(self.browser.run("return document.activeElement.closest('section').className"))
+        self.assertEqual(stops, ["records", "tuning", "versions"])
+
+    # --- Details
+
+    def test_details_follow_the_pointer_and_the_focus(self) -> None:
+        place = self.browser.one(".image .details")
+        self.browser.point_at(self.browser.one(f".cell[data-key='{MODEL}']"))
+        for part in ("Parameter 139", "byte 139", "raw 26", "0x7ffffffe", "Quarion Velmira"):
+            self.assertIn(part, place.text)
+        self.tab_to(".cell")
+        self.assertIn("Parameter 1,", place.text)
+
+    def test_a_part_of_the_drawing_shows_its_content(self) -> None:
+        self.browser.point_at(self.browser.all(".part[data-key='slot.9']")[-1])
+        self.assertTrue(self.browser.all(".line.lit"))
+        details = self.browser.one(".records .details").text
+        for part in ("slot 9", "8 bytes at 129", "53 4e 30", "SN004217"):
+            self.assertIn(part, details)
+
+    # --- For everybody
+
+    def test_everything_that_can_be_used_has_a_role_and_a_name(self) -> None:
+        found = self.browser.usable()
+        roles = {role for role, _ in found}
+        self.assertLessEqual({"tab", "row", "button", "link", "gridcell"}, roles)
+        for role, name in found:
+            self.assertNotIn(role, ("", "none", "generic"), name)
+            self.assertNotEqual(name, "", role)
+
+    def test_texts_have_contrast_in_both_schemes_and_when_lit(self) -> None:
+        for scheme in ("light", "dark"):
+            self.browser.prefer(scheme)
+            self.browser.open(self.page)
+            self.assertEqual(self.browser.poor_contrasts(), [], scheme)
+            for selector in (f".cell[data-key='{MODEL}']", ".fields [data-key='tuning.3.qwaAECSwitch']",
+                             ".slots [data-key='slot.9']"):
+                self.browser.point_at(self.browser.one(selector))
+                self.assertEqual(self.browser.poor_contrasts(), [], f"{scheme}, lit by {selector}")
+
+    def test_a_narrow_page_does_not_scroll_sideways(self) -> None:
+        self.browser.resize(*NARROW)
+        self.browser.open(self.page)
+        for number in range(6):
+            self.browser.all("[role=tab]")[number].click()
+            self.assertEqual(self.browser.run("return document.documentElement.scrollWidth"), NARROW[0])
+
+    def test_paper_has_every_output(self) -> None:
+        self.browser.prefer("light", media="print")
+        self.assertEqual(len(self.shown_outputs()), 6)
+        self.assertFalse(any(tab.is_displayed() for tab in self.browser.all("[role=tab]")))
+
+
+class WithoutScriptTest(BrowserTestCase):
+    """What a server shows that forbids scripts and styles."""
+
+    def test_verdict_outputs_values_and_origins_are_there(self) -> None:
+        with tempfile.TemporaryDirectory(prefix="orvane page-") as folder:
+            page = units.report(Path(folder) / "page.html", units.make(Path(folder) / "sample"))
+            self.browser.command("Emulation.setScriptExecutionDisabled", value=True)
+            try:
+                self.browser.open(page)
+            finally:
+                self.browser.command("Emulation.setScriptExecutionDisabled", value=False)
+            self.assertFalse(self.browser.all("[role=tab]"))
+            self.assertTrue(all(panel.is_displayed() for panel in self.browser.all(".output")))
+            text = self.browser.one("body").text
+            for part in ("All outputs are as intended.", "model = Quarion Velmira",
+                         "parameter 139, image byte 139: 1a", "SN004217", "qwaAECSwitch"):
+                self.assertIn(part, text)
+
+
+class ContrastTest(BrowserTestCase):
+    """The measure itself."""
+
+    def test_it_finds_what_is_hard_to_read(self) -> None:
+        with tempfile.TemporaryDirectory(prefix="orvane page-") as folder:
+            page = Path(folder) / "page.html"
+            page.write_text(
+                "<!DOCTYPE html><title>x</title><body style='background: #fff; color: #000'>"
+                "<p>good</p><p style='color: #777'>grey</p><p style='color: #767676'>enough</p>"
+                "<div style='background: rgba(0, 0, 0, 0.6)'><p>behind</p></div>"
+                "<p style='background: repeating-linear-gradient(#fff 0 1px, #555 1px 2px)'>pattern</p>"
+                "<p hidden style='color: #fff'>not shown</p><p style='color: #0008'>glass</p>",
+                encoding="utf-8")
+            self.browser.open(page)
+            poor = [each.split("'")[1] for each in self.browser.poor_contrasts()]
+        self.assertEqual(poor, ["grey", "behind", "pattern", "glass"])
