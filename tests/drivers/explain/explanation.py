@@ -44,7 +44,7 @@ class Explanation:
     outputs: tuple[Output, ...]
 
 
-def _bytes(value: Any) -> bytes:
+def to_bytes(value: Any) -> bytes:
     """Bytes that are not UTF-8 are in hex; no others may be."""
     if isinstance(value, str):
         return value.encode()
@@ -59,15 +59,15 @@ def _bytes(value: Any) -> bytes:
 
 
 def _line(line: Any) -> Line:
-    key = b"" if line["key"] is None else _bytes(line["key"])
-    return Line(_bytes(line["text"]), tuple(line["reasons"]), key)
+    key = b"" if line["key"] is None else to_bytes(line["key"])
+    return Line(to_bytes(line["text"]), tuple(line["reasons"]), key)
 
 
 def _output(output: Any) -> Output:
     content = output["content"]
     return Output(output["path"], output["outcome"], output["isIntended"],
                   tuple(output["reasons"]), tuple(map(_line, output["lines"])), output["left"],
-                  None if content is None else _bytes(content))
+                  None if content is None else to_bytes(content))
 
 
 def parse(text: bytes) -> Explanation:
@@ -75,7 +75,7 @@ def parse(text: bytes) -> Explanation:
     document = json.loads(text)
     if (document["format"], document["command"]) != (FORMAT, "explain"):
         raise ValueError(f"format {document['format']}, command {document['command']}")
-    return Explanation(_bytes(document["root"]), document["letters"], document["isIntended"],
+    return Explanation(to_bytes(document["root"]), document["letters"], document["isIntended"],
                        tuple(map(_output, document["outputs"])))
 
 

@@ -13,6 +13,7 @@ from pathlib import Path
 from typing import Any
 
 from drivers.explain.same_tree import data_parts
+from drivers.page import markup
 
 # Characters of an output in a report.
 SHOWN = 160
@@ -34,6 +35,15 @@ def printed_faults(what: str, output: bytes) -> list[str]:
         return [f"{what} is not UTF-8: {output[max(0, error.start - 20):error.start + 20]!r}"]
     return [f"{what} has {character!r}: {text[max(0, place - 40):place + 20]!r}"
             for character in sorted(UNSEEN & set(text)) for place in [text.index(character)]]
+
+
+def page_faults(page: bytes) -> list[str]:
+    """What is wrong with a page: markup that its writer does not write, or what no reader should obey."""
+    try:
+        scripts = len(list(markup.parse(page).all("script")))
+    except ValueError as error:
+        return [f"the page is not well-formed: {error}"]
+    return [*printed_faults("the page", page), *([] if scripts == 1 else [f"the page has {scripts} scripts"])]
 
 
 def end_faults(command: str, status: int, stdout: bytes, stderr: bytes) -> list[str]:

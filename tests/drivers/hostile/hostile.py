@@ -39,7 +39,7 @@ TIME_LIMIT = 20
 # The statuses of each command that some unit must reach.
 OUTCOMES = (
     "explain 0", "explain 1", "explain 2", "show 0", "show 2", "describe 0", "describe 2", "new 0", "new 2",
-    "diff 0", "diff 1", "diff 2", "impact 0", "impact 2", "capture 0", "capture 2", "set 0", "set 2", "run 0",
+    "diff 0", "diff 1", "diff 2", "impact 0", "impact 2", "report 0", "report 1", "report 2", "capture 0", "capture 2", "set 0", "set 2", "run 0",
     "run 2", "check 0", "check 1", "check 2",
     "captured unit explained as the unit", "serial redacted",
 )
@@ -125,7 +125,7 @@ class Scene:
             wrong += faults.changes(state, now) if folder != changes else []
             self.states[folder] = now
         wrong += [f"leaves {name!r} for temporary files" for name in os.listdir(self.temporary)]
-        if makes and said.status == 0:
+        if makes and said.status in (0, 1):
             expected.add(makes)
         wrong += [f"makes {name!r}" for name in {*os.listdir(self.made)} - expected]
         self.lines += [f"{' '.join(line)!r}: {fault}" for fault in wrong]
@@ -152,6 +152,16 @@ class Scene:
         self.ask("diff", self.root, self.outside)
         if self.rng.random() < 0.3:
             self.ask_json("impact", self.root, self.rng.choice(("param.22", "param.36", "slot.9.0")))
+
+    def report(self) -> None:
+        page = self.made / "page.html"
+        for words in ((), ("--redact-serial",)):
+            said = self.ask("report", self.root, "-o", page, *words, makes="page.html")
+            if said.status == 2:
+                self.lines += ["report: a page in spite of an error"] if page.exists() else []
+                continue
+            self.lines += [f"report: {fault}" for fault in faults.page_faults(page.read_bytes())]
+            page.unlink()
 
     def describe(self) -> None:
         said = self.ask("describe", self.root)
@@ -228,7 +238,7 @@ def check(unit: RandomUnit, tools: Tools) -> Finding:
     try:
         scene = Scene(unit, tools)
         with contextlib.suppress(OutOfTime):
-            for step in (scene.look, scene.describe, scene.capture, scene.change):
+            for step in (scene.look, scene.report, scene.describe, scene.capture, scene.change):
                 step()
         return Finding(scene.lines, frozenset(scene.reached))
     finally:

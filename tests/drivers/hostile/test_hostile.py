@@ -26,6 +26,16 @@ class Printed(unittest.TestCase):
             self.assertEqual(len(faults.printed_faults("it", b"text " + output)), 1, output)
 
 
+class Page(unittest.TestCase):
+    def test_good_page(self) -> None:
+        self.assertEqual(faults.page_faults(b"<p>text</p><script>a < b</script>"), [])
+
+    def test_bad_pages(self) -> None:
+        for page in (b"<p>text</p>", b"<p><script></script>", b"<p onclick=x></p><script></script>",
+                     b"<script></script><script></script>", b"<p>\xe2\x80\xae</p><script></script>", b"\xff"):
+            self.assertEqual(len(faults.page_faults(page)), 1, page)
+
+
 class Ends(unittest.TestCase):
     def test_good_ends(self) -> None:
         for end in ((0, b"text\n", b""), (1, b"text\n", b""), (2, b"", b"orvane-unit: a\norvane-unit: b\n")):

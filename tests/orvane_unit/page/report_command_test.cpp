@@ -187,6 +187,24 @@ TEST_F(ReportCommandTest, BadInputLeavesNoPage) {
     EXPECT_EQ(folderNames(folder()), (Names{"bad.toml", "bare", "good", "waits"}));
 }
 
+TEST_F(ReportCommandTest, WhatIsTooLongForAPageIsRefused) {
+    const std::string tooLong = " has more than 1048576 bytes, too many for a page\n";
+    EXPECT_EQ(report({makeUnit("template",
+                               [](kit::UnitDescription& unit) {
+                                   unit.files["/fs/mp/etc/airplay_static.conf"] =
+                                       std::string(MEBIBYTE, 'x');
+                               })},
+                     2),
+              "orvane-unit: /tmp/airplay.conf" + tooLong);
+    EXPECT_EQ(report({makeUnit("versions",
+                               [](kit::UnitDescription& unit) {
+                                   unit.files["/fs/rwdata/.Version/a.inf"] =
+                                       "key=" + std::string(MEBIBYTE, 'x');
+                               })},
+                     2),
+              "orvane-unit: /fs/rwdata/.Version/a.inf" + tooLong);
+}
+
 TEST_F(ReportCommandTest, PageThatCannotBeWrittenIsAnError) {
     const std::string root = makeUnit("bench");
     fs::create_directory(page());

@@ -1,0 +1,78 @@
+# SPDX-License-Identifier: Apache-2.0
+"""Reads pages of random units back, and compares them with explain --json, show --json and runs of orvane.
+
+Exit status: 0 all agree, 1 a difference or a state that never came up, 2 a tool could
+not be run.
+"""
+
+from __future__ import annotations
+
+import argparse
+import json
+from collections.abc import Sequence
+from typing import Any
+
+from drivers import random_units, runner
+from drivers.explain import explanation
+from drivers.explain.explain import Tools, ask, ask_explain, letters_of, make_marked_unit
+from drivers.page import markup, reading
+from drivers.random_units import Finding, Question, RandomUnit
+from model.tree import Tree
+
+
+def page_faults(unit: markup.Element, explained: explanation.Explanation, held: dict[str, Any]) -> list[str]:
+    """Where the page says something else than explain and show."""
+    outputs = [{"path": output.path, "outcome": output.outcome, "isIntended": output.is_intended,
+                "reasons": output.reasons, "lines": reading.merged(output.lines), "left": output.left,
+                "content": output.content} for output in explained.outputs]
+    shown = [{"path": output.path, "outcome": output.outcome, "isIntended": output.is_intended,
+              "reasons": output.reasons, "lines": output.lines, "left": output.left,
+              "content": output.content} for output in reading.outputs(unit)]
+    slots = [slot for slot in held["records"]["slots"] if slot["number"] != 15]
+    records = {"slots": slots, **{name: held["records"][name] for name in ("aux", "crc", "crcVerdict")}}
+    tuning = ([held["tuning"]["blocks"][block] for block in reading.BLOCKS]
+              if held["tuning"]["disk"] == "from-tuning-block" else None)
+    return [*reading.differences("outputs", shown, outputs),
+            *reading.differences("params", reading.params(unit), held["params"]["rows"]),
+            *reading.differences("records", reading.records(unit), records),
+            *reading.differences("tuning", reading.tuning(unit), tuning),
+            *reading.differences("versions", reading.versions(unit),
+                                 reading.expected_versions(held["versions"], explanation.to_bytes)),
+            *reading.differences("files", reading.files(unit), held["files"])]
+
+
+def check(unit: RandomUnit, tools: Tools) -> Finding:
+    root, options = unit.root, unit.arguments
+    explained, status, lines = ask_explain(tools.unit_tool, root, options)
+    held = ask([tools.unit_tool, "show", str(root), "--json"])
+    file = root.parent / "page.html"
+    said = ask([tools.unit_tool, "report", str(root), "-o", str(file), *options])
+    if explained is None or held.status != 0:
+        return Finding([*lines, f"show: {held.stderr!r}"], frozenset())
+    if (said.status, said.stdout, said.stderr) != (status, b"", b""):
+        return Finding([f"report: status {said.status}, said {said.stdout!r} {said.stderr!r}"], frozenset())
+    try:
+        article = markup.parse(file.read_bytes()).one("article", "unit")
+        lines = page_faults(article, explained, json.loads(held.stdout))
+        outputs = reading.outputs(article)
+    except (ValueError, KeyError) as error:
+        return Finding([f"report: {error!r}"], frozenset())
+    result = runner.run(tools.command(root, options), root)
+    if (result.status, result.stdout, result.stderr) != (0, b"", b""):
+        lines.append(f"orvane: status {result.status}, said {result.stdout!r} {result.stderr!r}")
+    left = explanation.Explanation(explained.root, letters_of(options), explained.is_intended, outputs)
+    lines += [f"after the run: {line}" for line in explanation.left_faults(left, Tree(root))]
+    return Finding(lines, frozenset(output.outcome for output in outputs))
+
+
+QUESTION = Question("page", make_marked_unit, check, reading.STATES, enough_units=200)
+
+
+def main(arguments: Sequence[str]) -> int:
+    parser = argparse.ArgumentParser(QUESTION.name, description=__doc__)
+    random_units.add_arguments(parser, units=1000)
+    parser.add_argument("--unit-tool", required=True, help="orvane-unit")
+    options = parser.parse_args(arguments)
+    common = runner.tools(options)
+    tools = Tools(common.orvane, common.enter, common.names, options.unit_tool)
+    return random_units.ask(QUESTION, tools, options, "--unit-tool", options.unit_tool)

@@ -1,0 +1,108 @@
+# SPDX-License-Identifier: Apache-2.0
+"""The page's driver: what it reads in a page written by hand, and every difference is found."""
+
+from __future__ import annotations
+
+import unittest
+
+from drivers.explain.value_reasons import Line
+from drivers.page import markup, reading
+from drivers.page.markup import BadMarkup, parse, shown
+
+TILE = ('<li class="tile state-generated fallback"><a href="#o1">/tmp/a</a><strong>generated</strong>'
+        '<ul><li class="reason">why <code>template-empty</code></li></ul></li>')
+SECTION = ('<section class="output state-generated" id="o1" data-path="/tmp/a">{}</section>')
+LINES = ('<table><tbody>'
+         '<tr data-reasons="fixed-text"><th>1</th><td><code>a\\\\b\\x09\\xff</code></td><td></td></tr>'
+         '<tr data-reasons="from-record" data-key="slot.9"><th></th><td><small class="sign">(left out)</small></td></tr>'
+         '<tr data-reasons="from-template" data-key="file./t"><th>2</th><td><code>&lt;b&gt;</code></td></tr>'
+         '<tr data-reasons="from-template" data-key="file./t"><th>3</th><td><code>c</code>'
+         '<small class="sign">(no line end)</small></td></tr></tbody></table>')
+UNIT = ('<article><section class="verdict"><ul>{}</ul></section>'
+        '<section class="outputs">{}</section></article>')
+
+
+def unit(lines: str = LINES, more: str = "", tile: str = TILE) -> markup.Element:
+    return parse(UNIT.format(tile, SECTION.format(lines + more)).encode())
+
+
+class Markup(unittest.TestCase):
+    def test_escapes_are_undone(self) -> None:
+        self.assertEqual(shown("a\\\\x41\\n\\x00\\xff\u20ac"), b"a\\x41\n\0\xff\xe2\x82\xac")
+
+    def test_careless_markup_is_refused(self) -> None:
+        for page in ("<p>", "<p></b></p>", "</p>", "<p onclick=x></p>", '<p style="color:red"></p>',
+                     '<p class="a" class="b"></p>', "<!-- x -->"):
+            with self.subTest(page), self.assertRaises(BadMarkup):
+                parse(page.encode())
+
+    def test_elements_are_found_by_name_and_class(self) -> None:
+        page = parse(b'<p class="a b"><b>x</b>y</p><p class="b"></p>')
+        self.assertEqual(len(list(page.all("p", "b"))), 2)
+        self.assertEqual(page.one("p", "a").text(), "xy")
+        self.assertIsNone(page.first("i"))
+        with self.assertRaises(BadMarkup):
+            page.one("p")
+
+
+class Reading(unittest.TestCase):
+    def test_outputs(self) -> None:
+        output, = reading.outputs(unit())
+        self.assertEqual((output.path, output.outcome, output.is_intended, output.reasons),
+                         ("/tmp/a", "generated", False, ("template-empty",)))
+        self.assertEqual(output.lines, (Line(b"a\\b\t\xff\n", ("fixed-text",), b""),
+                                        Line(b"", ("from-record",), b"slot.9"),
+                                        Line(b"<b>\nc", ("from-template",), b"file./t")))
+        self.assertEqual((output.left, output.content), ("file", b"a\\b\t\xff\n<b>\nc"))
+
+    def test_what_is_left(self) -> None:
+        for said, left, content in (
+                ("There after the run: missing.", "nothing", None),
+                ("There after the run: a folder.", None, None),
+                ("There after the run: folder.", "folder", None),
+                ("There after the run: device.", "other", None),
+                ("There after the run: an empty file.", "file", b"")):
+            with self.subTest(said):
+                more = f'<p class="left">{said}</p>'
+                if left is None:
+                    with self.assertRaises(KeyError):
+                        reading.outputs(unit("", more))
+                    continue
+                output, = reading.outputs(unit("", more))
+                self.assertEqual((output.left, output.content), (left, content))
+
+    def test_content_of_another_output(self) -> None:
+        more = ('<p class="left">There after the run, and not from this output:</p><table class="left"><tbody>'
+                '<tr><td><code>old</code></td></tr></tbody></table>')
+        output, = reading.outputs(unit(LINES, more))
+        self.assertEqual(output.content, b"old\n")
+        self.assertEqual(len(output.lines), 3)
+
+    def test_tile_that_says_something_else_is_refused(self) -> None:
+        for old, new in (("#o1", "#o2"), (">/tmp/a<", ">/tmp/b<"), ("<strong>generated", "<strong>stock"),
+                         ("state-generated", "state-kept")):
+            with self.subTest(new), self.assertRaises(BadMarkup):
+                reading.outputs(unit(tile=TILE.replace(old, new)))
+
+    def test_cell(self) -> None:
+        cells = ('<section class="image"><ol>{}<li class="cell group-3" data-key="param.134"><b>134</b>'
+                 '<small>byte 134, the upper one of parameter 134</small></li></ol></section>')
+        first = ('<li class="cell group-3" data-key="param.134"><b>134</b><small>byte 133, group 3, 2 bytes, raw 7, '
+                 'default -1, mask 0xffffffff, code 46: audio profile 7</small></li>')
+        self.assertEqual(reading.params(parse(cells.format(first).encode())),
+                         [{"number": 134, "group": 3, "offset": 133, "size": 2, "raw": 7, "default": -1,
+                           "mask": 0xffffffff, "code": 46, "meaning": "audio profile 7"}])
+        for wrong in ("", first.replace("group-3", "group-2"), first.replace("param.134", "param.13")):
+            with self.subTest(wrong), self.assertRaises(BadMarkup):
+                reading.params(parse(cells.format(wrong).encode()))
+
+    def test_differences_are_named(self) -> None:
+        self.assertEqual(reading.differences("x", {"a": [1, {"b": 2}]}, {"a": [1, {"b": 2}]}), [])
+        self.assertEqual(reading.differences("x", {"a": [1, {"b": 2}]}, {"a": [1, {"b": 3}]}),
+                         ["x.a.1.b: the page has 2, not 3"])
+        for one, other in (({"a": 1}, {"b": 1}), ([1], [1, 2]), (None, [1]), ({"a": 1}, [1])):
+            self.assertEqual(len(reading.differences("x", one, other)), 1)
+
+
+if __name__ == "__main__":
+    unittest.main()
