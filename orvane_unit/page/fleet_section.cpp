@@ -7,11 +7,13 @@
 #include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/phrases.h"
+#include "orvane_unit/show/decoded_unit.h"
 
 #include <algorithm>
 #include <cstddef>
 #include <map>
 #include <string>
+#include <utility>
 
 namespace orvane::desk {
 
@@ -30,8 +32,8 @@ struct FleetColumn {
 };
 
 template <class ValueOf>
-FleetColumn column(const std::string& title, const std::vector<PageUnit>& units,
-                   const ValueOf& valueOf) {
+FleetColumn valueColumn(const std::string& title, const std::vector<PageUnit>& units,
+                        const ValueOf& valueOf) {
     FleetColumn whole{title, {}};
     for (const PageUnit& unit : units) {
         whole.values.push_back({valueOf(unit.decoded), false, true});
@@ -51,17 +53,19 @@ FleetColumn outputColumn(const std::vector<PageUnit>& units, std::size_t index) 
 
 std::vector<FleetColumn> columnsOf(const std::vector<PageUnit>& units) {
     std::vector<FleetColumn> columns = {
-        column("model", units, [](const DecodedUnit& unit) { return unit.identity.model; }),
-        column("brand", units, [](const DecodedUnit& unit) { return unit.identity.brand; }),
-        column(
+        valueColumn("model", units, [](const DecodedUnit& unit) { return unit.identity.model; }),
+        valueColumn("brand", units, [](const DecodedUnit& unit) { return unit.identity.brand; }),
+        valueColumn(
             "right-hand drive", units,
             [](const DecodedUnit& unit) { return std::to_string(unit.identity.rightHandDrive); }),
-        column("audio profile", units,
-               [](const DecodedUnit& unit) { return std::to_string(unit.identity.audioProfile); }),
-        column("serial", units, [](const DecodedUnit& unit) { return unit.identity.serial; }),
-        column("version", units, [](const DecodedUnit& unit) { return unit.versions.version; }),
-        column("CRC", units,
-               [](const DecodedUnit& unit) { return hexNumber(unit.records.crc, 8); }),
+        valueColumn(
+            "audio profile", units,
+            [](const DecodedUnit& unit) { return std::to_string(unit.identity.audioProfile); }),
+        valueColumn("serial", units, [](const DecodedUnit& unit) { return unit.identity.serial; }),
+        valueColumn("version", units,
+                    [](const DecodedUnit& unit) { return unit.versions.version; }),
+        valueColumn("CRC", units,
+                    [](const DecodedUnit& unit) { return hexNumber(unit.records.crc, 8); }),
     };
     for (std::size_t i = 0; i < units.front().explanation.size(); ++i) {
         columns.push_back(outputColumn(units, i));

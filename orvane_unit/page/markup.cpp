@@ -38,21 +38,21 @@ void Markup::addText(std::string_view bytes) {
     appendEscaped(document_, bytes);
 }
 
-void Markup::add(MarkupName element, Attributes attributes, std::string_view text) {
+void Markup::add(const MarkupName& element, Attributes attributes, std::string_view text) {
     const Element whole(*this, element, attributes);
     addText(text);
 }
 
-void Markup::addVoid(MarkupName element, Attributes attributes) {
+void Markup::addVoid(const MarkupName& element, Attributes attributes) {
     begin(element, attributes);
 }
 
-void Markup::addOwn(MarkupName element, const char* content) {
+void Markup::addOwn(const MarkupName& element, const char* content) {
     const Element whole(*this, element);
     document_ += content;
 }
 
-void Markup::begin(MarkupName element, Attributes attributes) {
+void Markup::begin(const MarkupName& element, Attributes attributes) {
     document_ += "\n<";
     document_ += element.text();
     for (const Attribute& attribute : attributes) {
@@ -68,7 +68,7 @@ void Markup::begin(MarkupName element, Attributes attributes) {
     document_ += '>';
 }
 
-void Markup::end(MarkupName element) {
+void Markup::end(const MarkupName& element) {
     document_ += "</";
     document_ += element.text();
     document_ += '>';

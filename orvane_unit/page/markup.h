@@ -5,7 +5,6 @@
 #pragma once
 
 #include <cstddef>
-#include <initializer_list>
 #include <string>
 #include <string_view>
 
@@ -41,19 +40,19 @@ public:
     void addText(std::string_view bytes);
 
     /// An element that has only `text`.
-    void add(MarkupName element, Attributes attributes, std::string_view text);
-    void add(MarkupName element, std::string_view text) { add(element, {}, text); }
+    void add(const MarkupName& element, Attributes attributes, std::string_view text);
+    void add(const MarkupName& element, std::string_view text) { add(element, {}, text); }
 
     /// An element that can have no content, such as `br`: it has no end.
-    void addVoid(MarkupName element, Attributes attributes);
+    void addVoid(const MarkupName& element, Attributes attributes);
 
     /// A `style` or `script` of this program's own, whose content is not escaped.
-    void addOwn(MarkupName element, const char* content);
+    void addOwn(const MarkupName& element, const char* content);
 
 private:
     friend class Element;
-    void begin(MarkupName element, Attributes attributes);
-    void end(MarkupName element);
+    void begin(const MarkupName& element, Attributes attributes);
+    void end(const MarkupName& element);
 
     std::string document_;
 };
@@ -61,7 +60,7 @@ private:
 /// An element that is open while this exists: what is added meanwhile is its content.
 class Element {
 public:
-    Element(Markup& markup, MarkupName name, Attributes attributes = {})
+    Element(Markup& markup, const MarkupName& name, Attributes attributes = {})
         : markup_(markup), name_(name) {
         markup_.begin(name_, attributes);
     }

@@ -4,8 +4,6 @@
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/place_text.h"
 
-#include <algorithm>
-
 namespace orvane::desk {
 
 std::vector<OutputRow> outputRows(const std::vector<Line>& lines) {

@@ -10,6 +10,7 @@
 #include "orvane_unit/report/names.h"
 
 #include <cstddef>
+#include <variant>
 #include <vector>
 
 namespace orvane::desk {

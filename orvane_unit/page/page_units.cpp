@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/page_units.h"
 
+#include "identity/inf_file.h"
 #include "kit/description/parse_description.h"
 #include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
@@ -20,7 +21,9 @@
 #include <algorithm>
 #include <cstddef>
 #include <filesystem>
+#include <map>
 #include <optional>
+#include <system_error>
 #include <utility>
 
 namespace orvane::desk {

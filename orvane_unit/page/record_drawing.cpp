@@ -33,8 +33,8 @@ std::vector<Part> namedParts(const DecodedRecords& records) {
     std::vector<Part> parts;
     for (const DecodedSlot& slot : records.slots) {
         if (kit::slotsWithin(slot.number).empty()) {
-            const std::string number = std::to_string(slot.number);
-            parts.push_back({slot.offset, slot.offset + slot.size, "slot", "slot " + number, number,
+            const std::string name = std::to_string(slot.number);
+            parts.push_back({slot.offset, slot.offset + slot.size, "slot", "slot " + name, name,
                              kit::slotKey(slot.number)});
         }
     }

@@ -15,6 +15,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <vector>
 
 namespace orvane::desk {
 

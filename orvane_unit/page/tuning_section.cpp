@@ -2,8 +2,8 @@
 #include "orvane_unit/page/tuning_section.h"
 
 #include "kit/description/value_key.h"
+#include "kit/host/bytes.h"
 #include "kit/host/sparse_content.h"
-#include "kit/host/text.h"
 #include "kit/tuning/tuning_encode.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/bar_plot.h"
@@ -16,6 +16,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <iterator>
 #include <vector>
 

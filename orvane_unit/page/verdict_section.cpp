@@ -92,7 +92,7 @@ void addTile(Markup& page, const Output& output, const std::string& outputId) {
     page.add("a", {{"href", "#" + outputId}}, output.path);
     page.add("strong", {{"class", "state"}}, outcome);
     page.add("span", {{"class", "sign"}}, isGood ? "as intended" : "not as intended");
-    const Element reasons(page, "ul", {{"class", "reasons"}});
+    const Element list(page, "ul", {{"class", "reasons"}});
     addOutcomeReasons(page, output);
     for (const Trouble& trouble : troublesOf(output)) {
         addTrouble(page, trouble);

@@ -15,6 +15,7 @@
 #include <cstddef>
 #include <map>
 #include <optional>
+#include <utility>
 #include <vector>
 
 namespace orvane::desk {

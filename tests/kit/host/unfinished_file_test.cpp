@@ -11,8 +11,10 @@
 #include <sys/stat.h>
 
 #include <filesystem>
+#include <optional>
 #include <set>
 #include <string>
+#include <utility>
 
 namespace orvane::test {
 
@@ -50,7 +52,8 @@ TEST_F(UnfinishedFileTest, FileIsWholeOrNotThere) {
         EXPECT_EQ(readFile(file()), "new");
     }
     EXPECT_EQ(names(), std::set<std::string>{"page.html"});
-    { const kit::UnfinishedFile unfinished(folder() / "other"); }
+    std::optional<kit::UnfinishedFile> given(std::in_place, folder() / "other");
+    given.reset();
     EXPECT_EQ(names(), std::set<std::string>{"page.html"});
 }
 

@@ -79,8 +79,8 @@ std::string escaped(const std::string& text) {
 }
 
 TEST(PageTest, SampleIsSmallAndItsPolicyAdmitsOnlyItsOwnStyleAndScript) {
-    const TemporaryFolder folder;
-    const std::filesystem::path root = folder.path() / "unit";
+    const TemporaryFolder temporary;
+    const std::filesystem::path root = temporary.path() / "unit";
     kit::makeUnit(kit::parseDescription(kit::sampleDescriptionText(), "sample"), root);
     const std::string page = desk::pageText({unitAt(root)}, "ai");
     EXPECT_LT(page.size(), 300U * 1024);
