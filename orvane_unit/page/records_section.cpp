@@ -13,13 +13,20 @@
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/phrases.h"
 
+#include <cstddef>
 #include <cstdint>
+#include <map>
 #include <optional>
 #include <vector>
 
 namespace orvane::desk {
 
 namespace {
+
+/// Where the record area begins on a disk that holds it whole.
+std::uint64_t baseOf(const DecodedRecords& records) {
+    return records.diskSize - static_cast<std::uint64_t>(RECORD_AREA_SIZE);
+}
 
 std::string summaryOf(const DecodedRecords& records) {
     if (records.diskTrouble) {
@@ -29,9 +36,9 @@ std::string summaryOf(const DecodedRecords& records) {
     if (records.diskSize == 0) {
         return "A boot disk without a size.";
     }
-    const std::uint64_t base = records.diskSize - static_cast<std::uint64_t>(RECORD_AREA_SIZE);
     return "Boot disk of " + kit::counted(records.diskSize, "byte") +
-           "; its record area begins at byte " + std::to_string(base) + ". Offsets are from there.";
+           "; its record area begins at byte " + std::to_string(baseOf(records)) +
+           ". Offsets are from there.";
 }
 
 /// The cells of some bytes, in hex and as text, without the zeros at their end.
@@ -79,6 +86,29 @@ void addSlots(Markup& page, const DecodedRecords& records) {
     addContent(page, records.aux);
 }
 
+/// Adds what somebody wrote where nothing reads it; of much, only the begin.
+void addRest(Markup& page, const DecodedRecords& records) {
+    constexpr std::size_t MOST_RUNS = 16;
+    constexpr std::size_t MOST_BYTES = 32;
+    if (records.rest.empty()) {
+        return;
+    }
+    page.add("p", "Not zero, and belonging to nothing:");
+    const Element list(page, "ul", {{"class", "rest"}});
+    std::size_t done = 0;
+    for (const auto& [offset, bytes] : records.rest) {
+        if (done++ == MOST_RUNS) {
+            page.add("li", kit::counted(records.rest.size() - MOST_RUNS, "more place"));
+            return;
+        }
+        const Element item(page, "li",
+                           {{"data-key", keyText(kit::diskBytesKey(baseOf(records) + offset))}});
+        page.addText(kit::counted(bytes.size(), "byte") + " at " + std::to_string(offset) + ": ");
+        page.add("code", kit::hexText(bytes.substr(0, MOST_BYTES)));
+        page.addText(bytes.size() > MOST_BYTES ? " ..." : "");
+    }
+}
+
 const char* sentenceOf(CrcVerdict verdict) {
     switch (verdict) {
     case CrcVerdict::computed:
@@ -101,6 +131,7 @@ void addRecords(Markup& page, const DecodedRecords& records, const std::string& 
     page.add("p", summaryOf(records));
     drawRecords(page, records);
     addSlots(page, records);
+    addRest(page, records);
     const Element crc(page, "p",
                       {{"class", std::string("crc crc-") + nameOf(records.crcVerdict)},
                        {"data-key", keyText(kit::slotKey(CRC_RECORD_SLOT))}});

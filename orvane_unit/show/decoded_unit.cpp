@@ -11,9 +11,11 @@
 #include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"
+#include "kit/host/host_file.h"
 #include "kit/host/lost_pages.h"
 #include "kit/host/sparse_content.h"
 #include "kit/host/tree_entries.h"
+#include "kit/unit/describe_unit.h"
 #include "main/unit_files.h"
 #include "tuning/audio_profile.h"
 #include "writers/template_merge.h"
@@ -105,6 +107,17 @@ CrcVerdict verdictOn(const DecodedRecords& records) {
                                                               : CrcVerdict::computed;
 }
 
+/// What the record area holds besides its slots, the auxiliary area and the tuning blocks.
+kit::SparseContent restOfRecords(std::uint64_t diskSize) {
+    constexpr std::uint64_t AREA = RECORD_AREA_SIZE;
+    if (diskSize < AREA || diskTrouble(RECORD_AREA_SIZE)) {
+        return {};
+    }
+    const kit::Bytes area =
+        kit::readAt(kit::openForReading(BOOT_DISK), BOOT_DISK, diskSize - AREA, AREA);
+    return kit::describeDisk(area).bytes;
+}
+
 DecodedRecords decodeRecords() {
     DecodedRecords records;
     records.diskTrouble = diskTrouble(RECORD_AREA_SIZE);
@@ -122,6 +135,7 @@ DecodedRecords decodeRecords() {
     if (readAuxArea(aux.data(), AUX_AREA_SIZE) == 0) {
         records.aux = aux;
     }
+    records.rest = restOfRecords(records.diskSize);
     records.crc = recordAreaCrc();
     records.crcVerdict = verdictOn(records);
     return records;

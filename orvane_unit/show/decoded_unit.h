@@ -4,6 +4,7 @@
 #pragma once
 
 #include "config/param_catalogue.h"
+#include "kit/host/sparse_content.h"
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/value_origins.h"
@@ -50,6 +51,7 @@ struct DecodedRecords {
     std::optional<Reason> diskTrouble; ///< why the record area can't be read
     std::vector<DecodedSlot> slots;    ///< all of them
     std::optional<std::string> aux;
+    kit::SparseContent rest; ///< by offset as of a slot, what belongs to nothing and is not zero
     std::uint32_t crc = 0;
     CrcVerdict crcVerdict = CrcVerdict::unreadable;
 };

@@ -16,6 +16,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <filesystem>
 #include <functional>
 #include <string>
@@ -204,6 +205,25 @@ TEST(PageTest, RecordAreaIsDrawnAndListed) {
     EXPECT_TRUE(holds(itemOf(table, "tr", "slot.0"), "zeros"));
     EXPECT_TRUE(holds(itemOf(table, "tr", "aux"), "<td>3072</td>\n<td>1024</td>\n<td>zeros</td>"));
     EXPECT_TRUE(holds(records, "<strong class=\"state\">computed</strong>"));
+}
+
+TEST(PageTest, BytesThatBelongToNothingAreShown) {
+    constexpr std::uint64_t BASE = 1U << 20U; // of the record area on a disk of two mebibytes
+    const std::string records = sectionOf(pageOf([](kit::UnitDescription& unit) {
+                                              unit.disk.bytes[200] = "before the area";
+                                              unit.disk.bytes[BASE + 200] = "note";
+                                              for (std::uint64_t i = 0; i < 20; ++i) {
+                                                  unit.disk.bytes[BASE + 9000 + 100 * i] =
+                                                      std::string(40, 'x');
+                                              }
+                                          }),
+                                          "records");
+    EXPECT_TRUE(holds(records, "Not zero, and belonging to nothing:"));
+    EXPECT_TRUE(holds(itemOf(records, "li", "disk.bytes.1048776"),
+                      "4 bytes at 200: \n<code>6e 6f 74 65</code>"));
+    EXPECT_TRUE(holds(itemOf(records, "li", "disk.bytes.1057576"), "78</code> ..."));
+    EXPECT_TRUE(holds(records, "<li>5 more places</li>"));
+    EXPECT_FALSE(holds(sectionOf(pageOf(unchanged), "records"), "belonging to nothing"));
 }
 
 TEST(PageTest, DiskThatCannotBeReadIsSaid) {
