@@ -27,7 +27,6 @@ namespace orvane::test {
 namespace {
 
 namespace fs = std::filesystem;
-using desk::Outcome;
 using desk::Reason;
 using kit::UnitDescription;
 

@@ -69,8 +69,10 @@ TEST(MarkupTest, AttributeWithoutAValueIsLeftOut) {
 TEST(MarkupTest, WhatIsNotPrintableIsAnEscape) {
     EXPECT_EQ(textOf(std::string("\0\t\r\n\x1b[31m\x7f\\", 11)),
               "\\x00\\x09\\x0d\\n\\x1b[31m\\x7f\\\\");
-    EXPECT_EQ(textOf("abc\u202Edef"), "abc\\xe2\\x80\\xaedef");            // reverses what follows
-    EXPECT_EQ(textOf("\u2066a\u200b"), "\\xe2\\x81\\xa6a\\xe2\\x80\\x8b"); // isolates; no width
+    EXPECT_EQ(textOf("abc\u202Edef\u202C"),
+              "abc\\xe2\\x80\\xaedef\\xe2\\x80\\xac"); // reverses what follows
+    EXPECT_EQ(textOf("\u2066a\u2069\u200b"),
+              "\\xe2\\x81\\xa6a\\xe2\\x81\\xa9\\xe2\\x80\\x8b"); // isolates; no width
     EXPECT_EQ(textOf("\xff\xc3("), "\\xff\\xc3(");
     EXPECT_EQ(textOf("\xc0\xbcscript\xc0\xbe"), "\\xc0\\xbcscript\\xc0\\xbe"); // overlong < and >
     EXPECT_EQ(textOf("\xe2\x82"), "\\xe2\\x82");

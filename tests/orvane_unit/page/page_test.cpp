@@ -308,7 +308,7 @@ TEST(PageTest, BytesOfAHostileUnitStayText) {
     const std::string page = pageOf([&attack](kit::UnitDescription& unit) {
         unit.disk.slots[9] = "</td><b>";
         unit.disk.slots[16] = "\"onclick=\"x";
-        unit.disk.aux = attack + "\xE2\x80\xAE\xFF";
+        unit.disk.aux = attack + "\u202E\u202C\xFF";
         unit.files[AIRPLAY_FILE.templateFile] = attack + "\n\x1B[31m\n";
         unit.files["/fs/rwdata/.Version/\" onfocus=\"x'><i>.inf"] =
             "Type=Boot\n" + attack + "=" + attack + "\n";
@@ -318,7 +318,7 @@ TEST(PageTest, BytesOfAHostileUnitStayText) {
         const std::size_t own = std::string(begin) == "<b>" ? 179 : 0;
         EXPECT_EQ(countOf(page, begin), own) << begin;
     }
-    EXPECT_TRUE(holds(page, "\\xe2\\x80\\xae\\xff"));
+    EXPECT_TRUE(holds(page, "\\xe2\\x80\\xae\\xe2\\x80\\xac\\xff"));
     EXPECT_TRUE(holds(page, "\\x1b[31m"));
     EXPECT_TRUE(std::all_of(page.begin(), page.end(), [](char byte) {
         return byte == '\n' || static_cast<unsigned char>(byte) >= ' ';
