@@ -28,7 +28,7 @@ std::string codesText(const std::vector<Reason>& reasons) {
 
 /// The cells of a line: its number and its text.
 void addLine(Markup& page, const OutputRow& row) {
-    page.add("th", {{"scope", "row"}}, row.isLeftOut ? "" : std::to_string(row.number));
+    page.add("th", {{"scope", "row"}}, row.isLeftOut ? "-" : std::to_string(row.number));
     const Element cell(page, "td");
     if (row.isLeftOut) {
         page.add("small", {{"class", "sign"}}, "(left out)");

@@ -238,6 +238,11 @@ function movedAcross(key, item, items) {
     return nearest[0] === Infinity ? item : nearest[1];
 }
 
+/** What the section of an element is about. */
+function headingOf(element) {
+    return element.closest("section").querySelector("h2, h3, h4").textContent;
+}
+
 /** Lets the Tab key stop at one item of a group, and arrow keys move to the others. */
 function makeGroup(group, items) {
     const moveTo = item => {
@@ -270,19 +275,30 @@ function makeGroups(unit) {
         const items = [...table.querySelectorAll("[data-key]:not([data-key=''])")];
         if (items.length > 0) {
             table.setAttribute("role", "grid");
-            table.setAttribute("aria-label", table.closest("section").querySelector("h3, h4").textContent);
+            table.setAttribute("aria-label", headingOf(table));
             makeGroup(table, items);
         }
     }
     const cells = unit.querySelector(".cells");
     const items = [...cells?.children ?? []];
     if (items.length > 0) {
-        cells.setAttribute("role", "group");
+        cells.setAttribute("role", "listbox");
         cells.setAttribute("aria-label", "Bytes of the image");
         for (const cell of items) {
-            cell.setAttribute("role", "button");
+            cell.setAttribute("role", "option");
         }
         makeGroup(cells, items);
+    }
+}
+
+/** A box that scrolls and in which nothing takes the focus takes it itself. */
+function makeScrollable(part) {
+    for (const box of part.querySelectorAll(".scroll")) {
+        if (!box.querySelector("[tabindex], a, button")) {
+            box.tabIndex = 0;
+            box.setAttribute("role", "group");
+            box.setAttribute("aria-label", headingOf(box));
+        }
     }
 }
 
@@ -311,6 +327,7 @@ function complete(unit) {
     makeDetails(unit);
     makeKeyButtons(unit);
     makeGroups(unit);
+    makeScrollable(unit);
 }
 
 /** Shows what the address leads to, which may be in a panel that is not shown. */
@@ -363,11 +380,17 @@ function sortBy(table, column) {
     body.append(...rows.map(each => each.row));
 }
 
+/** The text, which may go on in another line after each "_". */
+function breakable(text) {
+    return text.split(/(?<=_)/).flatMap(part => [part, make("wbr")]);
+}
+
 function makeSortable(table) {
     [...table.tHead.rows[0].cells].forEach((head, column) => {
-        const button = make("button", {type: "button"}, ...head.childNodes);
+        const title = make("span", {}, ...breakable(head.textContent.trim()));
+        const button = make("button", {type: "button"}, title);
         button.addEventListener("click", () => sortBy(table, column));
-        head.append(button);
+        head.replaceChildren(button);
     });
 }
 
