@@ -43,7 +43,8 @@ FleetColumn valueColumn(const std::string& title, const std::vector<PageUnit>& u
 
 /// The output with an index; all units have the same outputs, since the options are the same.
 FleetColumn outputColumn(const std::vector<PageUnit>& units, std::size_t index) {
-    FleetColumn whole{units.front().explanation[index].path, {}};
+    const std::string& path = units.front().explanation[index].path;
+    FleetColumn whole{path.substr(path.rfind('/') + 1), {}};
     for (const PageUnit& unit : units) {
         const Output& output = unit.explanation[index];
         whole.values.push_back({nameOf(output.outcome), true, isIntended(output)});
