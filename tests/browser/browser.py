@@ -7,6 +7,7 @@ import atexit
 import functools
 import json
 import tempfile
+import time
 import unittest
 from pathlib import Path
 from typing import Any
@@ -75,6 +76,16 @@ class Browser:
             self.driver.get_log(kind)
         self.page = path.resolve().as_uri()
         self.driver.get(self.page + fragment)
+
+    def see_all_units(self) -> None:
+        """Scrolls through the page: its script completes a unit when it is about to be seen."""
+        for unit in self.all(".unit"):
+            self.run("arguments[0].scrollIntoView()", unit)
+            limit = time.monotonic() + PATIENCE
+            while not unit.find_elements("css selector", "[role=tablist]"):
+                if time.monotonic() > limit:
+                    raise AssertionError(f"{unit.get_attribute('id')} is not completed")
+        self.run("scrollTo(0, 0)")
 
     def run(self, script: str, *arguments: Any) -> Any:
         return self.driver.execute_script(script, *arguments)

@@ -4,7 +4,6 @@
 from __future__ import annotations
 
 import tempfile
-import time
 from pathlib import Path
 from typing import Any
 
@@ -111,16 +110,9 @@ class ReasonsTest(PagesTestCase):
                     f"unit-{number}", code)
                 self.assertTrue(found)
         self.check_outputs(list(roots.values()))
-        for number in range(1, len(roots) + 1):
-            self.browser.run("document.getElementById(arguments[0]).scrollIntoView()", f"unit-{number}")
-        self.wait_for("return document.querySelectorAll('[role=tablist]').length === 33")
+        self.browser.see_all_units()
         self.check_looks()
         self.check_no_trouble()
-
-    def wait_for(self, condition: str) -> None:
-        limit = time.monotonic() + 60
-        while not self.browser.run(condition):
-            self.assertLess(time.monotonic(), limit, condition)
 
 
 class FleetTest(PagesTestCase):

@@ -80,8 +80,8 @@ Version Number = <i>_1"><script>1</script>.2.'3
 '''
 
 
-def call(*words: str | Path, statuses: tuple[int, ...] = (0,)) -> bytes:
-    said = subprocess.run([UNIT_TOOL, *words], check=False, capture_output=True)
+def call(*words: str | Path, statuses: tuple[int, ...] = (0,), folder: Path | None = None) -> bytes:
+    said = subprocess.run([UNIT_TOOL, *words], check=False, capture_output=True, cwd=folder)
     if said.returncode not in statuses:
         raise AssertionError(f"{words}: {said.returncode}\n{said.stderr.decode(errors='replace')}")
     return said.stdout
