@@ -13,7 +13,7 @@ from pathlib import Path
 
 from shipped import EVERYWHERE, IN_TARBALL, PROJECT, VERSION
 
-DOCUMENTS = {f"docs/{path.name}" for path in (PROJECT / "docs").iterdir()}
+DOCUMENTS = {str(path.relative_to(PROJECT)) for path in (PROJECT / "docs").rglob("*") if path.is_file()}
 GZIP_TIME = slice(4, 8)  # bytes of a gzip header
 # Changing the root and the owners of files needs the privilege, or a user namespace.
 AS_ROOT = [] if os.geteuid() == 0 else ["unshare", "--map-root-user"]
