@@ -39,10 +39,11 @@ std::string detailOf(const Cell& cell) {
     if (cell.index > 0) {
         return place + ", the upper one of parameter " + std::to_string(param.row.number);
     }
-    std::string text = place + ", " + groupName(param.row.group) + ", " +
-                       kit::counted(param.size, "byte") + ", raw " + rawText(param) + ", default " +
-                       std::to_string(param.row.defaultValue) + ", mask " +
-                       hexNumber(param.row.mask, 8) + ", code " + std::to_string(param.code);
+    const std::string size = param.size == 1 ? "" : kit::counted(param.size, "byte") + ", ";
+    const std::string text = place + ", " + size + groupName(param.row.group) + ", raw " +
+                             rawText(param) + ", default " +
+                             std::to_string(param.row.defaultValue) + ", mask " +
+                             hexNumber(param.row.mask, 8);
     return param.meaning.empty() ? text : text + ": " + param.meaning;
 }
 

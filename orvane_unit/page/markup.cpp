@@ -35,6 +35,7 @@ void appendEscaped(std::string& document, std::string_view bytes) {
 } // namespace
 
 void Markup::addText(std::string_view bytes) {
+    isInBegin_ = false;
     appendEscaped(document_, bytes);
 }
 
@@ -45,6 +46,7 @@ void Markup::add(const MarkupName& element, Attributes attributes, std::string_v
 
 void Markup::addVoid(const MarkupName& element, Attributes attributes) {
     begin(element, attributes);
+    isInBegin_ = false;
 }
 
 void Markup::addOwn(const MarkupName& element, const char* content) {
@@ -53,7 +55,8 @@ void Markup::addOwn(const MarkupName& element, const char* content) {
 }
 
 void Markup::begin(const MarkupName& element, Attributes attributes) {
-    document_ += "\n<";
+    document_ += isInBegin_ ? "<" : "\n<";
+    isInBegin_ = true;
     document_ += element.text();
     for (const Attribute& attribute : attributes) {
         if (attribute.value.empty()) {
@@ -69,6 +72,7 @@ void Markup::begin(const MarkupName& element, Attributes attributes) {
 }
 
 void Markup::end(const MarkupName& element) {
+    isInBegin_ = false;
     document_ += "</";
     document_ += element.text();
     document_ += '>';

@@ -30,7 +30,8 @@ struct Attribute {
 
 using Attributes = std::initializer_list<Attribute>;
 
-/// A document, from its begin to its end. Each element begins on a new line.
+/// A document, from its begin to its end. An element begins on a new line, unless it is the first
+/// thing in another one.
 class Markup {
 public:
     Markup() : document_("<!DOCTYPE html>") {}
@@ -55,6 +56,7 @@ private:
     void end(const MarkupName& element);
 
     std::string document_;
+    bool isInBegin_ = false; ///< whether an element has just begun, and has nothing yet
 };
 
 /// An element that is open while this exists: what is added meanwhile is its content.

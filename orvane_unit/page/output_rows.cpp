@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/output_rows.h"
 
-#include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/place_text.h"
 
 namespace orvane::desk {
@@ -24,13 +23,16 @@ std::vector<OutputRow> outputRows(const std::vector<Line>& lines) {
     return rows;
 }
 
-std::string originText(const Origin& origin) {
+std::string originText(const Origin& origin, std::set<Reason>& said) {
+    const std::string place = placeText(origin);
     std::string text;
     for (const Reason reason : origin.reasons) {
-        text += (text.empty() ? "" : "; ") + reasonInfo(reason).sentence;
+        const bool isNew = said.insert(reason).second;
+        if (isNew || place.empty() || !reasonInfo(reason).isIntended) {
+            text += (text.empty() ? "" : "; ") + reasonInfo(reason).sentence;
+        }
     }
-    const std::string place = placeText(origin);
-    return place.empty() ? text : text + ": " + place;
+    return text + (text.empty() || place.empty() ? "" : ": ") + place;
 }
 
 } // namespace orvane::desk

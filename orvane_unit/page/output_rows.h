@@ -4,8 +4,10 @@
 #pragma once
 
 #include "orvane_unit/explain/explanation.h"
+#include "orvane_unit/explain/reasons.h"
 
 #include <cstddef>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -24,7 +26,8 @@ struct OutputRow {
 /// content of the output.
 std::vector<OutputRow> outputRows(const std::vector<Line>& lines);
 
-/// Why a piece is what it is, in words, and where its value lies.
-std::string originText(const Origin& origin);
+/// Why a piece is what it is, in words, and where its value lies. What is intended and has a place
+/// is said in words only once: `said` holds the reasons that were.
+std::string originText(const Origin& origin, std::set<Reason>& said);
 
 } // namespace orvane::desk

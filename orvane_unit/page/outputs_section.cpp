@@ -10,6 +10,7 @@
 #include "orvane_unit/report/names.h"
 
 #include <cstddef>
+#include <set>
 #include <variant>
 #include <vector>
 
@@ -44,14 +45,15 @@ void addLines(Markup& page, const std::vector<Line>& lines) {
     const WideTable table(page, "lines");
     addTitles(page, {"line", "text", "origin"});
     const Element body(page, "tbody");
+    std::set<Reason> said;
     for (const OutputRow& row : outputRows(lines)) {
         const bool isGood = isIntended(row.origin->reasons);
         const Element line(page, "tr",
-                           {{"class", isGood ? "line" : "line fallback"},
+                           {{"class", isGood ? "" : "fallback"},
                             {"data-reasons", codesText(row.origin->reasons)},
                             {"data-key", keyText(row.origin->key)}});
         addLine(page, row);
-        page.add("td", originText(*row.origin));
+        page.add("td", originText(*row.origin, said));
     }
 }
 
@@ -77,7 +79,7 @@ void addWhatIsLeft(Markup& page, const Output& output) {
         addTitles(page, {"line", "text"});
         const Element body(page, "tbody");
         for (const OutputRow& row : outputRows({{output.contentAfter, {}}})) {
-            const Element line(page, "tr", {{"class", "line"}});
+            const Element line(page, "tr");
             addLine(page, row);
         }
     }

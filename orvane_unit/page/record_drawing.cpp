@@ -98,7 +98,10 @@ std::string number(std::uint64_t value) {
 void drawPart(Markup& page, const Strip& strip, const Part& part) {
     constexpr std::uint64_t LEAST = 20; // so that it can be seen and pointed at
     const std::uint64_t left = strip.at(part.begin);
-    const std::uint64_t width = std::max(strip.at(part.end) - left, LEAST);
+    const std::uint64_t width = strip.at(part.end) - left;
+    if (width < LEAST) {
+        return; // magnified in another strip
+    }
     const Element group(
         page, "g", {{"class", std::string("part ") + part.kind}, {"data-key", keyText(part.key)}});
     page.add("title", part.name + ": " + kit::counted(part.end - part.begin, "byte") + " at " +
@@ -126,8 +129,16 @@ void drawStrip(Markup& page, const Strip& strip, const std::vector<Part>& parts)
     }
 }
 
-/// Lines from a piece of `from` to the ends of `to`, which shows that piece magnified.
+/// Marks a piece of `from`, and draws lines from there to the ends of `to`, which shows it
+/// magnified.
 void drawMagnifier(Markup& page, const Strip& from, const Strip& to) {
+    page.add("rect",
+             {{"class", "magnified"},
+              {"x", number(from.at(to.begin))},
+              {"y", number(from.y)},
+              {"width", number(from.at(to.end) - from.at(to.begin))},
+              {"height", number(STRIP)}},
+             "");
     page.add(
         "path",
         {{"class", "magnifier"},

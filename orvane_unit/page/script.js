@@ -83,7 +83,7 @@ function makeTabs(unit) {
             tabs[next].focus();
         }
     });
-    const first = panels.findIndex(panel => panel.querySelector(".line"));
+    const first = panels.findIndex(panel => panel.querySelector(".lines"));
     selectTab(tabs[Math.max(first, 0)]);
 }
 
@@ -156,7 +156,7 @@ function keyed(event) {
 /** Brings the partners of the element into view: the first line, and the first other one. */
 function reveal(element) {
     const others = partners(element).filter(other => other !== element && !other.contains(element));
-    const isLine = other => other.matches(".line");
+    const isLine = other => other.matches(".lines tr");
     const isListed = other => other.matches("tr, td, .cell");
     const chosen = isLine(element) ? [] : [others.find(isLine)];
     chosen.push(others.find(other => !isLine(other) && isListed(other)));

@@ -77,18 +77,20 @@ void addValue(Markup& page, const FieldValues& all, std::size_t index) {
     const auto block = static_cast<std::uint64_t>(TUNING_OUTPUTS[index].blockId);
     const Element cell(page, "td",
                        {{"data-key", keyText(kit::tuningFieldKey(block, all.field.key))}});
-    const bool isWord =
-        all.field.kind == DpsKind::switchWord || all.field.kind == DpsKind::modeWord;
-    if (isWord) {
-        addWord(page, all.field, values.front());
-    } else if (all.field.kind == DpsKind::list) {
+    if (all.field.kind == DpsKind::list) {
         drawBars(page, all.values, index);
+        page.add("span", {{"class", "numbers"}}, listText(values));
+        return;
     }
-    page.add("span", {{"class", "numbers"}}, listText(values));
+    if (all.field.kind != DpsKind::number) {
+        addWord(page, all.field, values.front());
+        page.addText(" ");
+    }
+    page.addText(std::to_string(values.front()));
 }
 
 void addField(Markup& page, const FieldValues& all) {
-    const Element row(page, "tr", {{"class", all.isSame() ? "field" : "field differs"}});
+    const Element row(page, "tr", {{"class", all.isSame() ? "" : "differs"}});
     page.add("th", {{"scope", "row"}}, all.field.key);
     for (std::size_t i = 0; i < all.values.size(); ++i) {
         addValue(page, all, i);

@@ -30,10 +30,11 @@ def page_faults(unit: markup.Element, explained: explanation.Explanation, held: 
               "content": output.content} for output in reading.outputs(unit)]
     slots = [slot for slot in held["records"]["slots"] if slot["number"] != 15]
     records = {"slots": slots, **{name: held["records"][name] for name in ("aux", "crc", "crcVerdict")}}
+    params = [{name: value for name, value in row.items() if name != "code"} for row in held["params"]["rows"]]
     tuning = ([held["tuning"]["blocks"][block] for block in reading.BLOCKS]
               if held["tuning"]["disk"] == "from-tuning-block" else None)
     return [*reading.differences("outputs", shown, outputs),
-            *reading.differences("params", reading.params(unit), held["params"]["rows"]),
+            *reading.differences("params", reading.params(unit), params),
             *reading.differences("records", reading.records(unit), records),
             *reading.differences("tuning", reading.tuning(unit), tuning),
             *reading.differences("versions", reading.versions(unit),

@@ -14,8 +14,8 @@ from drivers.page.markup import BadMarkup, Element, shown
 STATES = ("generated", "stock", "empty", "kept", "not-asked")
 THERE = re.compile(r"There after the run(?:: (.+)\.|, and not from this output:)")
 KINDS = {"missing": "nothing", "folder": "folder", "device": "other", "an empty file": "file"}
-DETAIL = re.compile(r"byte (\d+), group (\d), (\d) bytes?, raw (\d+|none), default (-?\d+), "
-                    r"mask (0x[0-9a-f]{8}), code (\d+)(?:: (.*))?")
+DETAIL = re.compile(r"byte (\d+), (?:(\d) bytes, )?group (\d), raw (\d+|none), default (-?\d+), "
+                    r"mask (0x[0-9a-f]{8})(?:: (.*))?")
 
 # The blocks that the page shows field by field.
 BLOCKS = (2, 3)
@@ -97,11 +97,11 @@ def params(unit: Element) -> list[dict[str, Any]]:
         if match is None:
             continue
         number = int(cell.one("b").text())
-        if cell.attributes["data-key"] != f"param.{number}" or f"group-{match[2]}" not in cell.classes():
+        if cell.attributes["data-key"] != f"param.{number}" or f"group-{match[3]}" not in cell.classes():
             raise BadMarkup(f"cell {number}: {cell.attributes}")
-        found.append({"number": number, "group": int(match[2]), "offset": int(match[1]), "size": int(match[3]),
+        found.append({"number": number, "group": int(match[3]), "offset": int(match[1]), "size": int(match[2] or 1),
                       "raw": None if match[4] == "none" else int(match[4]), "default": int(match[5]),
-                      "mask": int(match[6], 16), "code": int(match[7]), "meaning": match[8]})
+                      "mask": int(match[6], 16), "meaning": match[7]})
     if sum(row["size"] for row in found) != len(cells):
         raise BadMarkup(f"{len(cells)} cells")
     return found
@@ -131,13 +131,12 @@ def records(unit: Element) -> dict[str, Any]:
 
 
 def _field(cell: Element) -> Any:
-    numbers = [int(number) for number in cell.one("span", "numbers").text().split(", ")]
-    if cell.first("svg") is not None:
-        return numbers
+    numbers = cell.first("span", "numbers")
+    if numbers is not None:
+        return [int(number) for number in numbers.text().split(", ")]
+    code = int("".join(child for child in cell.children if isinstance(child, str)))
     word = cell.first("span", "word")
-    if word is None:
-        return numbers[0]
-    return {"code": numbers[0], "word": "" if "no-word" in word.classes() else word.text()}
+    return code if word is None else {"code": code, "word": "" if "no-word" in word.classes() else word.text()}
 
 
 def tuning(unit: Element) -> list[dict[str, Any]] | None:

@@ -37,9 +37,9 @@ TEST(MarkupTest, ElementsEndInTheOrderInWhichTheyMust) {
         }
         page.addVoid("br", {});
     }
-    EXPECT_EQ(page.document(), std::string(DOCTYPE) + "\n<table class=\"a\" id=\"b\">\n<tr>"
-                                                      "\n<td>one</td>\n<td class=\"c\">two</td>"
-                                                      "</tr>\n<br></table>");
+    EXPECT_EQ(page.document(), std::string(DOCTYPE) +
+                                   "\n<table class=\"a\" id=\"b\"><tr><td>one</td>"
+                                   "\n<td class=\"c\">two</td></tr>\n<br></table>");
 }
 
 TEST(MarkupTest, OwnContentStaysAsItIs) {
