@@ -99,7 +99,7 @@ class OneUnitTest(BrowserTestCase):
                 element = self.browser.one(selector)
                 self.browser.point_at(element)
                 self.assertIn(element.get_attribute("data-key"), self.browser.run(LIT))
-                self.assertTrue(self.browser.all(".line.lit"))
+                self.assertTrue(self.browser.all(".lines tr.lit"))
                 self.assertTrue(self.browser.all("[role=tab].lit"))
 
     def test_a_line_of_a_version_lights_up_its_file(self) -> None:
@@ -128,7 +128,7 @@ class OneUnitTest(BrowserTestCase):
 
     def test_keys_lead_from_a_line_to_its_source(self) -> None:
         self.open_output("airplay.conf")
-        line = self.tab_to(".line")
+        line = self.tab_to(".lines tr")
         self.assertEqual(line.get_attribute("data-key"), MODEL)
         self.check_lit(MODEL)
         self.browser.press(Keys.ARROW_DOWN)
@@ -184,7 +184,7 @@ class OneUnitTest(BrowserTestCase):
 
     def test_a_part_of_the_drawing_shows_its_content(self) -> None:
         self.browser.point_at(self.browser.all(".part[data-key='slot.9']")[-1])
-        self.assertTrue(self.browser.all(".line.lit"))
+        self.assertTrue(self.browser.all(".lines tr.lit"))
         details = self.browser.one(".records .details").text
         for part in ("slot 9", "8 bytes at 129", "53 4e 30", "SN004217"):
             self.assertIn(part, details)
