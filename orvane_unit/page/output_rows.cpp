@@ -3,6 +3,8 @@
 
 #include "orvane_unit/report/place_text.h"
 
+#include <utility>
+
 namespace orvane::desk {
 
 std::vector<OutputRow> outputRows(const std::vector<Line>& lines) {
