@@ -37,7 +37,7 @@ class OneUnitTest(BrowserTestCase):
         self.check_no_trouble()
 
     def line(self, key: str) -> WebElement:
-        return self.browser.one(f".output:not([hidden]) .line[data-key='{key}']")
+        return self.browser.one(f".output:not([hidden]) .lines [data-key='{key}']")
 
     def check_lit(self, key: str) -> None:
         """Everything with the key is lit, and nothing with another one."""
