@@ -37,8 +37,8 @@ fs::path folderOf(const fs::path& file) {
 UnfinishedFolder folderNextTo(const fs::path& file) {
     try {
         return UnfinishedFolder(folderOf(file), file.filename().string(), 0700);
-    } catch (const fs::filesystem_error& error) {
-        throw KitError("cannot write ", file, ": " + error.code().message());
+    } catch (const KitError& error) {
+        throw KitError("cannot write ", file, ": " + error.text());
     }
 }
 

@@ -8,7 +8,7 @@
 
 namespace orvane::kit {
 
-/// A file that comes to be whole, in one step, or not at all. Until then, what is at its path stays
+/// A file that is written whole, in one step, or not at all. Until then, what is at its path stays
 /// as it is.
 class UnfinishedFile {
 public:

@@ -97,17 +97,18 @@ TEST_F(UnfinishedFileTest, AnythingButAFileStays) {
 }
 
 TEST_F(UnfinishedFileTest, FolderThatCannotBeWrittenIsAnError) {
-    EXPECT_EQ(errorAt(folder() / "none/page.html"), "cannot write " +
-                                                        (folder() / "none/page.html").string() +
-                                                        ": No such file or directory");
+    const auto complaint = [this](const std::string& name, const std::string& reason) {
+        const std::string above = (folder() / name).string();
+        return "cannot write " + above + "/page.html: cannot make a folder in " + above + ": " +
+               reason;
+    };
+    EXPECT_EQ(errorAt(folder() / "none/page.html"), complaint("none", "No such file or directory"));
     writeFile(folder() / "file", "");
-    EXPECT_EQ(errorAt(folder() / "file/page.html"),
-              "cannot write " + (folder() / "file/page.html").string() + ": Not a directory");
+    EXPECT_EQ(errorAt(folder() / "file/page.html"), complaint("file", "Not a directory"));
     fs::create_directory(folder() / "closed");
     fs::permissions(folder() / "closed", fs::perms::owner_read | fs::perms::owner_exec);
     const EnforcedPermissions enforced;
-    EXPECT_EQ(errorAt(folder() / "closed/page.html"),
-              "cannot write " + (folder() / "closed/page.html").string() + ": Permission denied");
+    EXPECT_EQ(errorAt(folder() / "closed/page.html"), complaint("closed", "Permission denied"));
 }
 
 TEST_F(UnfinishedFileTest, FullDiskLeavesWhatWasThere) {
