@@ -26,9 +26,20 @@ void addReason(Markup& page, Reason reason) {
 /// Lines, one after the other or not, that are not as intended for one and the same cause.
 struct Trouble {
     const Origin* origin = nullptr;
-    std::size_t first = 0; ///< number of the first line
+    bool isLeftOut = false;
+    std::size_t first = 0; ///< number of the first line, if it is not left out
     std::size_t count = 0;
 };
+
+std::string linesOf(const Trouble& trouble) {
+    if (trouble.isLeftOut) {
+        return "left out: ";
+    }
+    const std::string first = "line " + std::to_string(trouble.first);
+    return trouble.count == 1
+               ? first + ": "
+               : kit::counted(trouble.count, "line") + ", the first is " + first + ": ";
+}
 
 std::vector<Trouble> troublesOf(const Output& output) {
     std::vector<Trouble> troubles;
@@ -38,11 +49,12 @@ std::vector<Trouble> troublesOf(const Output& output) {
         }
         const auto same =
             std::find_if(troubles.begin(), troubles.end(), [&row](const Trouble& other) {
-                return other.origin->reasons == row.origin->reasons &&
+                return other.isLeftOut == row.isLeftOut &&
+                       other.origin->reasons == row.origin->reasons &&
                        placeText(*other.origin) == placeText(*row.origin);
             });
         if (same == troubles.end()) {
-            troubles.push_back({row.origin, row.number, 1});
+            troubles.push_back({row.origin, row.isLeftOut, row.number, 1});
         } else {
             ++same->count;
         }
@@ -53,9 +65,7 @@ std::vector<Trouble> troublesOf(const Output& output) {
 void addTrouble(Markup& page, const Trouble& trouble) {
     const Element item(page, "li",
                        {{"class", "trouble"}, {"data-key", keyText(trouble.origin->key)}});
-    page.addText(trouble.count == 1 ? "line " + std::to_string(trouble.first) + ": "
-                                    : kit::counted(trouble.count, "line") + " from line " +
-                                          std::to_string(trouble.first) + " on: ");
+    page.addText(linesOf(trouble));
     for (const Reason reason : trouble.origin->reasons) {
         addReason(page, reason);
         page.addText("; ");
