@@ -60,13 +60,19 @@ void addImpacts(Markup& page, const std::vector<Impact>& impacts, const Explanat
                 const std::string& id) {
     const Element section(page, "section", {{"class", "impacts"}, {"id", id + "-impacts"}});
     page.add("h3", "What changes which lines");
-    const auto inert = static_cast<std::size_t>(std::count_if(
-        impacts.begin(), impacts.end(), [](const Impact& impact) { return impact.lines.empty(); }));
-    page.add("p", "Every input was changed in a copy of the unit. " +
-                      kit::counted(impacts.size() - inert, "input") +
-                      " changed lines, with these numbers; " + std::to_string(inert) +
-                      " changed nothing.");
     const std::vector<std::string> paths = changedPaths(impacts, explanation);
+    // A run with fewer options has fewer outputs than the impacts tell of.
+    const auto isShown = [&paths](const Impact& impact) {
+        return std::any_of(paths.begin(), paths.end(), [&impact](const std::string& path) {
+            return !linesText(impact, path).empty();
+        });
+    };
+    const auto shown =
+        static_cast<std::size_t>(std::count_if(impacts.begin(), impacts.end(), isShown));
+    page.add("p", "Each parameter, each byte of a slot that is read, and each tuning field was "
+                  "changed in a copy of the unit. " +
+                      kit::counted(shown, "input") + " changed lines, with these numbers; " +
+                      std::to_string(impacts.size() - shown) + " changed nothing here.");
     const WideTable table(page, "matrix");
     {
         const Element head(page, "thead");
@@ -79,7 +85,7 @@ void addImpacts(Markup& page, const std::vector<Impact>& impacts, const Explanat
     }
     const Element body(page, "tbody");
     for (const Impact& impact : impacts) {
-        if (!impact.lines.empty()) {
+        if (isShown(impact)) {
             addRow(page, impact, paths);
         }
     }
