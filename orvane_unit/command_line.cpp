@@ -386,11 +386,12 @@ public:
     }
 
     ExitStatus run(std::ostream& /*out*/) const override {
+        requireReplaceable(file_);
         const kit::UnfinishedFile file(file_);
         PageRequest request = request_;
         request.letters = givenLetters(parser());
         const std::vector<PageUnit> units = readPageUnits(request, terminalProgress());
-        file.finish(pageText(units, request.letters));
+        file.finish(pageText(units, request.letters, request.redactsSerial));
         return std::all_of(units.begin(), units.end(),
                            [](const PageUnit& unit) { return isIntended(unit.explanation); })
                    ? EXIT_AS_INTENDED

@@ -34,7 +34,10 @@ using Attributes = std::initializer_list<Attribute>;
 /// thing in another one.
 class Markup {
 public:
-    Markup() : document_("<!DOCTYPE html>") {}
+    /// How every document begins.
+    static constexpr char BEGIN[] = "<!DOCTYPE html>";
+
+    Markup() : document_(BEGIN) {}
 
     const std::string& document() const { return document_; }
 

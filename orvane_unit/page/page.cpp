@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/page.h"
 
+#include "kit/host/kit_error.h"
 #include "kit/host/text.h"
 #include "orvane_unit/page/files_section.h"
 #include "orvane_unit/page/fleet_section.h"
@@ -16,6 +17,9 @@
 #include "orvane_unit/page/versions_section.h"
 
 #include <cstddef>
+#include <filesystem>
+#include <fstream>
+#include <system_error>
 
 namespace orvane::desk {
 
@@ -61,7 +65,8 @@ std::string optionsText(const std::string& letters) {
     return text;
 }
 
-void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::string& letters) {
+void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::string& letters,
+                 bool isRedacted) {
     const bool isFleet = units.size() > 1;
     const std::string name = isFleet ? kit::counted(units.size(), "unit") : units.front().name;
     const Element html(page, "html", {{"lang", "en"}});
@@ -71,6 +76,13 @@ void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::st
         const Element header(page, "header");
         page.add("h1", "What orvane " + optionsText(letters) + " leaves, and why");
         page.add("p", "Before a run; nothing was written.");
+        if (isRedacted) {
+            page.add(
+                "p", {{"class", "redacted"}},
+                "Serials are replaced by X. The CRC, the size of the disk and places on it are "
+                "those of the copy without the serial, and what stood at the outputs is left "
+                "out.");
+        }
     }
     {
         const Element main(page, "main");
@@ -87,9 +99,24 @@ void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::st
 
 } // namespace
 
-std::string pageText(const std::vector<PageUnit>& units, const std::string& letters) {
+void requireReplaceable(const std::filesystem::path& file) {
+    std::error_code ignored; // what can't be looked at can't be replaced either
+    if (!std::filesystem::is_regular_file(file, ignored)) {
+        return;
+    }
+    const std::string begin = Markup::BEGIN;
+    std::ifstream stream(file, std::ios::binary);
+    std::string there(begin.size(), '\0');
+    stream.read(&there[0], static_cast<std::streamsize>(there.size()));
+    if (there != begin) {
+        throw kit::KitError("", file, " is there and not a page: remove it first");
+    }
+}
+
+std::string pageText(const std::vector<PageUnit>& units, const std::string& letters,
+                     bool isRedacted) {
     Markup page;
-    addDocument(page, units, letters);
+    addDocument(page, units, letters, isRedacted);
     return page.document();
 }
 

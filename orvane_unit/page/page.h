@@ -9,6 +9,7 @@
 #include "orvane_unit/explain/explanation.h"
 #include "orvane_unit/show/decoded_unit.h"
 
+#include <filesystem>
 #include <optional>
 #include <string>
 #include <vector>
@@ -23,7 +24,13 @@ struct PageUnit {
     std::optional<std::vector<Impact>> impacts; ///< none if nobody asked for them
 };
 
-/// The page about `units`, of which there must be one, after a run with the options `letters`.
-std::string pageText(const std::vector<PageUnit>& units, const std::string& letters);
+/// Requires that nothing but an earlier page, or nothing at all, is at `file`: a wrong word after
+/// -o must not cost a unit or a description. Throws kit::KitError.
+void requireReplaceable(const std::filesystem::path& file);
+
+/// The page about `units`, of which there must be one, after a run with the options `letters`. It
+/// says so if the units are copies without serials.
+std::string pageText(const std::vector<PageUnit>& units, const std::string& letters,
+                     bool isRedacted = false);
 
 } // namespace orvane::desk

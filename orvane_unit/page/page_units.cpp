@@ -3,6 +3,7 @@
 
 #include "identity/inf_file.h"
 #include "kit/description/parse_description.h"
+#include "kit/description/unit_description.h"
 #include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
 #include "kit/host/interruption.h"
@@ -23,6 +24,7 @@
 #include <filesystem>
 #include <map>
 #include <optional>
+#include <set>
 #include <system_error>
 #include <utility>
 
@@ -41,14 +43,25 @@ bool isDescription(const fs::path& path) {
     return path.extension() == ".toml" && !isFolder(path);
 }
 
+/// Whether nothing is there that a run opens.
+bool isBare(const DecodedUnit& unit) {
+    return std::all_of(unit.files.begin(), unit.files.end(),
+                       [](const UnitFile& file) { return file.kind == PathKind::nothing; });
+}
+
+/// Whether the folder is a unit, made by the kit or not.
+bool isUnit(const fs::path& root) {
+    return kit::isRootDirectory(root) || kit::isKitUnit(root) || !isBare(decodeUnit(root));
+}
+
 /// The units and descriptions that the folder `root` holds, if it is no unit itself.
 std::vector<fs::path> unitsIn(const fs::path& root) {
     std::vector<fs::path> units;
-    if (kit::isRootDirectory(root) || kit::isKitUnit(root)) {
+    if (isUnit(root)) {
         return units;
     }
     for (const fs::path& entry : kit::listFolder(root)) {
-        if (isFolder(entry) ? kit::isKitUnit(entry) : isDescription(entry)) {
+        if (isFolder(entry) ? isUnit(entry) : isDescription(entry)) {
             units.push_back(entry);
         }
     }
@@ -80,10 +93,7 @@ std::vector<Source> sourcesOf(const std::vector<std::string>& roots) {
 
 /// Throws for a folder in which nothing is that a run opens, unless the kit made it.
 void requireUnit(const fs::path& root, const DecodedUnit& unit) {
-    const bool isBare = std::all_of(unit.files.begin(), unit.files.end(), [](const UnitFile& file) {
-        return file.kind == PathKind::nothing;
-    });
-    if (isBare && !kit::isKitUnit(root)) {
+    if (isBare(unit) && !kit::isKitUnit(root)) {
         throw kit::KitError("", root, " is not a unit: nothing that orvane opens is in it");
     }
 }
@@ -117,16 +127,18 @@ void requireShowable(const PageUnit& unit) {
     }
 }
 
-/// Makes a copy of the unit at `root` without its serial. Returns the serial, as redactSerial does.
-kit::Bytes copyWithoutSerial(const fs::path& root, const fs::path& copy) {
+/// Makes a copy of the unit at `root` without its serial, which it returns as redactSerial does.
+/// None of `serials`, those of all units, may stand in the copy.
+kit::Bytes copyWithoutSerial(const fs::path& root, const fs::path& copy,
+                             const std::set<kit::Bytes>& serials) {
     kit::UnitInputs inputs = kit::readInputs(root);
-    kit::Bytes serial = kit::redactSerial(inputs);
-    kit::makeUnit(kit::descriptionOf(std::move(inputs)), copy, [&serial](const fs::path& made) {
-        if (!serial.empty()) {
+    kit::Bytes own = kit::redactSerial(inputs);
+    kit::makeUnit(kit::descriptionOf(std::move(inputs)), copy, [&serials](const fs::path& made) {
+        for (const kit::Bytes& serial : serials) {
             kit::requireNowhere(serial, made);
         }
     });
-    return serial;
+    return own;
 }
 
 std::optional<std::string> chosenFile(const DecodedUnit& unit) {
@@ -140,9 +152,29 @@ void requireSameChoice(const DecodedUnit& original, const DecodedUnit& copy,
                        const kit::Bytes& serial) {
     const std::optional<std::string> chosen = chosenFile(original);
     if (chosen && kit::withoutSerial(serial, *chosen) != chosenFile(copy)) {
-        throw kit::KitError("the serial can't be redacted: in a copy of the unit, another "
-                            "application's version file comes first than " +
+        throw kit::KitError("the serial can't be redacted: a copy of the unit lists the version "
+                            "file of another application before " +
                             *chosen);
+    }
+}
+
+/// Calls `use` with the root of the unit; that of a description is made for it.
+template <class Use>
+auto inRoot(const Source& source, const Use& use) {
+    if (isFolder(source.path)) {
+        return use(source.path);
+    }
+    if (!fs::is_regular_file(source.path) && fs::exists(source.path)) {
+        throw kit::KitError("", source.path, " is neither a unit nor a description");
+    }
+    const kit::UnitDescription description = kit::readDescription(source.path);
+    const kit::ScratchFolder scratch;
+    const fs::path root = scratch.path() / "unit";
+    kit::makeUnit(description, root);
+    try {
+        return use(root);
+    } catch (const kit::KitError& error) {
+        throw error.moved(root, source.path);
     }
 }
 
@@ -153,17 +185,20 @@ public:
         : request_(request), progress_(std::move(progress)) {}
 
     PageUnit read(const Source& source) {
-        if (isFolder(source.path)) {
-            return readRoot(source.name, source.path);
-        }
-        const kit::ScratchFolder scratch;
-        const fs::path root = scratch.path() / "unit";
-        kit::makeUnit(kit::readDescription(source.path), root);
-        try {
-            return readRoot(source.name, root);
-        } catch (const kit::KitError& error) {
-            throw error.moved(root, source.path);
-        }
+        return inRoot(
+            source, [this, &source](const fs::path& root) { return readRoot(source.name, root); });
+    }
+
+    /// Remembers the serial of the unit, of which no unit may show anything.
+    void rememberSerial(const Source& source) {
+        inRoot(source, [this](const fs::path& root) {
+            kit::UnitInputs inputs = kit::readInputs(root);
+            const kit::Bytes serial = kit::redactSerial(inputs);
+            if (!serial.empty()) {
+                serials_.insert(serial);
+            }
+            return true;
+        });
     }
 
     std::string redacted(std::string name) const {
@@ -182,10 +217,10 @@ private:
         }
         const kit::ScratchFolder scratch;
         const fs::path copy = scratch.path() / "unit";
-        serials_.push_back(copyWithoutSerial(root, copy));
+        const kit::Bytes serial = copyWithoutSerial(root, copy, serials_);
         try {
             DecodedUnit decodedCopy = decodeUnit(copy);
-            requireSameChoice(decoded, decodedCopy, serials_.back());
+            requireSameChoice(decoded, decodedCopy, serial);
             return readInputs(name, copy, std::move(decodedCopy));
         } catch (const kit::KitError& error) {
             throw error.moved(copy, root);
@@ -203,7 +238,7 @@ private:
 
     const PageRequest& request_;
     Progress progress_;
-    std::vector<kit::Bytes> serials_;
+    std::set<kit::Bytes> serials_; ///< of all units
 };
 
 } // namespace
@@ -213,6 +248,12 @@ std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& 
     const bool isOne = sources.size() == 1;
     UnitReader reader(
         request, isOne ? progress : [](std::size_t /*done*/, std::size_t /*all*/) {});
+    for (const Source& source : sources) {
+        kit::throwIfInterrupted();
+        if (request.redactsSerial) {
+            reader.rememberSerial(source);
+        }
+    }
     std::vector<PageUnit> units;
     for (const Source& source : sources) {
         kit::throwIfInterrupted();

@@ -216,6 +216,70 @@ TEST_F(ReportCommandTest, PageThatCannotBeWrittenIsAnError) {
     EXPECT_EQ(folderNames(folder()), (Names{"bench", "page.html"}));
 }
 
+TEST_F(ReportCommandTest, OnlyAPageIsReplaced) {
+    const fs::path root = makeUnit("bench");
+    writeFile(folder() / "unit.toml", "");
+    for (const fs::path& input :
+         {folder() / "unit.toml", root / "dev/hd0", root / "fs/mp/etc/airplay_static.conf"}) {
+        const std::string before = readFile(input);
+        const kit::RunResult result = runOrvaneUnit({"report", root, "-o", input});
+        EXPECT_EQ(result.exitStatus, 2);
+        EXPECT_EQ(result.standardError,
+                  "orvane-unit: " + input.string() + " is there and not a page: remove it first\n");
+        EXPECT_EQ(readFile(input), before);
+    }
+    report({root}, 0);
+    report({root}, 0);
+}
+
+TEST_F(ReportCommandTest, RootThatIsNeitherAUnitNorADescriptionIsRefused) {
+    const std::string pipe = folder() / "pipe.toml";
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0666), 0);
+    for (const std::string& root : {pipe, std::string("/dev/null"), folder().string()}) {
+        EXPECT_NE(report({root}, 2).find(" is neither a unit nor a description\n"),
+                  std::string::npos)
+            << root;
+    }
+}
+
+TEST_F(ReportCommandTest, UnmarkedUnitsOfAFolderCount) {
+    fs::create_directory(folder() / "fleet");
+    makeUnit("fleet/first");
+    fs::remove(makeUnit("fleet/second") / ".orvane-unit");
+    writeFile(folder() / "fleet/second/notes.toml", "");
+    fs::create_directory(folder() / "fleet/notes");
+    EXPECT_EQ(found({folder() / "fleet"}), (std::vector<std::string>{"first", "second"}));
+    EXPECT_EQ(found({folder() / "fleet/second"}),
+              (std::vector<std::string>{folder() / "fleet/second"}));
+}
+
+TEST_F(ReportCommandTest, SerialOfAnotherUnitIsAnError) {
+    const fs::path first = makeUnit("first", [](kit::UnitDescription& unit) {
+        unit.files["/fs/mp/etc/airplay_static.conf"] = "# from SN000002\n";
+    });
+    const fs::path second =
+        makeUnit("second", [](kit::UnitDescription& unit) { unit.disk.slots[9] = "SN000002"; });
+    EXPECT_NE(report({first, second, "--redact-serial"}, 2).find("airplay_static.conf"),
+              std::string::npos);
+}
+
+TEST_F(ReportCommandTest, RedactedPageSaysSo) {
+    const fs::path root = makeUnit("bench");
+    report({root}, 0);
+    EXPECT_FALSE(hasText("Serials are replaced by X"));
+    report({root, "--redact-serial"}, 0);
+    EXPECT_TRUE(hasText("Serials are replaced by X"));
+}
+
+TEST_F(ReportCommandTest, ImpactsAreThoseOnTheOutputsOfTheRun) {
+    const fs::path root = makeUnit("bench");
+    report({root, "-a", "--impact"}, 0);
+    EXPECT_TRUE(hasText("<th scope=\"row\">param.36</th>"));
+    EXPECT_FALSE(hasText("<th scope=\"row\">slot.9.0</th>"));
+    report({root, "--impact"}, 0);
+    EXPECT_TRUE(hasText("<th scope=\"row\">slot.9.0</th>"));
+}
+
 } // namespace
 
 } // namespace orvane::test
