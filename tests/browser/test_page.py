@@ -241,19 +241,38 @@ class WithoutScriptTest(BrowserTestCase):
                 self.assertIn(part, text)
 
 
-class ContrastTest(BrowserTestCase):
-    """The measure itself."""
+class MeasuresTest(BrowserTestCase):
+    """What the other tests rely on."""
 
-    def test_it_finds_what_is_hard_to_read(self) -> None:
+    def open_text(self, text: str) -> None:
         with tempfile.TemporaryDirectory(prefix="orvane page-") as folder:
             page = Path(folder) / "page.html"
-            page.write_text(
-                "<!DOCTYPE html><title>x</title><body style='background: #fff; color: #000'>"
-                "<p>good</p><p style='color: #777'>grey</p><p style='color: #767676'>enough</p>"
-                "<div style='background: rgba(0, 0, 0, 0.6)'><p>behind</p></div>"
-                "<p style='background: repeating-linear-gradient(#fff 0 1px, #555 1px 2px)'>pattern</p>"
-                "<p hidden style='color: #fff'>not shown</p><p style='color: #0008'>glass</p>",
-                encoding="utf-8")
+            page.write_text(f"<!DOCTYPE html><title>x</title>{text}", encoding="utf-8")
             self.browser.open(page)
-            poor = [each.split("'")[1] for each in self.browser.poor_contrasts()]
+
+    def test_contrasts_that_are_too_low_are_found(self) -> None:
+        self.open_text(
+            "<body style='background: #fff; color: #000'>"
+            "<p>good</p><p style='color: #777'>grey</p><p style='color: #767676'>enough</p>"
+            "<div style='background: rgba(0, 0, 0, 0.6)'><p>behind</p></div>"
+            "<p style='background: repeating-linear-gradient(#fff 0 1px, #555 1px 2px)'>pattern</p>"
+            "<p hidden style='color: #fff'>not shown</p><p style='color: #0008'>glass</p>")
+        poor = [each.split("'")[1] for each in self.browser.poor_contrasts()]
         self.assertEqual(poor, ["grey", "behind", "pattern", "glass"])
+
+    def test_messages_requests_and_violations_are_found(self) -> None:
+        policy = "<meta http-equiv='Content-Security-Policy' content=\"{}\">"
+        for text in ("<script>console.log('message')</script>", "<script>throw new Error('thrown')</script>",
+                     "<img src='absent.png'>", "<link rel='stylesheet' href='absent.css'>",
+                     policy.format("style-src 'none'") + "<p style='color: red'>",
+                     policy.format("script-src 'none'") + "<p onclick='x()'>"):
+            with self.subTest(text):
+                self.open_text(text)
+                self.assertNotEqual(self.browser.troubles(), [])
+        self.open_text("<p>nothing wrong</p>")
+        self.check_no_trouble()
+
+    def test_what_has_no_name_is_found(self) -> None:
+        self.open_text("<button>good</button><button></button><input><p tabindex='0'>text</p>")
+        self.assertEqual(self.browser.usable(), [
+            ("button", "good"), ("button", ""), ("textbox", ""), ("paragraph", "")])
