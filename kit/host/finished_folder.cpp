@@ -32,7 +32,7 @@ fs::path finalPlace(const fs::path& folder) {
     const fs::path plain = folder.has_filename() ? folder : folder.parent_path();
     const fs::path above = plain.parent_path();
     std::error_code error;
-    const fs::path place = fs::canonical(above.empty() ? "." : above, error) / plain.filename();
+    fs::path place = fs::canonical(above.empty() ? "." : above, error) / plain.filename();
     if (error) {
         failAtFolder(folder, error);
     }

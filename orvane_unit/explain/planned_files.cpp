@@ -54,10 +54,10 @@ bool PlannedFiles::isDevice(const std::string& path) {
 }
 
 void PlannedFiles::requireTwoFiles(const std::string& output, const std::string& input) {
-    const std::optional<kit::OutputPlace> written = kit::findOutputPlace(output);
-    const std::optional<kit::OutputPlace> read = kit::findOutputPlace(input);
-    if (written && read && kit::keepsBytes(*written) &&
-        kit::fileName(*written) == kit::fileName(*read)) {
+    const std::optional<kit::OutputPlace> place = kit::findOutputPlace(output);
+    const std::optional<kit::OutputPlace> source = kit::findOutputPlace(input);
+    if (place && source && kit::keepsBytes(*place) &&
+        kit::fileName(*place) == kit::fileName(*source)) {
         throw kit::KitError(output + " and " + input +
                             " are one file: only a run can tell what it reads there");
     }

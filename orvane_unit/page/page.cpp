@@ -107,7 +107,7 @@ void requireReplaceable(const std::filesystem::path& file) {
     const std::string begin = Markup::BEGIN;
     std::ifstream stream(file, std::ios::binary);
     std::string there(begin.size(), '\0');
-    stream.read(&there[0], static_cast<std::streamsize>(there.size()));
+    stream.read(there.data(), static_cast<std::streamsize>(there.size()));
     if (there != begin) {
         throw kit::KitError("", file, " is there and not a page: remove it first");
     }

@@ -22,7 +22,6 @@
 #include <algorithm>
 #include <cstddef>
 #include <filesystem>
-#include <map>
 #include <optional>
 #include <set>
 #include <system_error>

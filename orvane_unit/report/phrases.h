@@ -5,7 +5,6 @@
 
 #include "orvane_unit/compare/impact.h"
 #include "orvane_unit/explain/version_choice.h"
-#include "orvane_unit/show/decoded_unit.h"
 
 #include <cstddef>
 #include <cstdint>

@@ -8,6 +8,7 @@
 #include "config/record_slots.h"
 #include "identity/software_version.h"
 #include "identity/vehicle_identity.h"
+#include "kit/description/unit_description.h"
 #include "kit/description/value_places.h"
 #include "kit/enter/entered_root.h"
 #include "kit/host/bytes.h"

@@ -370,7 +370,8 @@ TEST(PageTest, ImpactsAreAMatrix) {
     EXPECT_TRUE(holds(itemOf(impacts, "tr", "param.139"),
                       "<td>16 of 17</td>\n<td class=\"changed\">5, 12</td>"
                       "\n<td class=\"changed\">all</td>"));
-    EXPECT_TRUE(holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing here."));
+    EXPECT_TRUE(
+        holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing here."));
     EXPECT_FALSE(holds(desk::pageText({fleetUnit("a", "M", "1")}, "ai"), "class=\"impacts\""));
 }
 
