@@ -357,6 +357,17 @@ TEST(PageTest, NothingIsRareAmongHalves) {
     EXPECT_FALSE(holds(page, " rare\""));
 }
 
+TEST(PageTest, ImpactsOnOtherOutputsThanTheRunsAreLeftOut) {
+    PageUnit unit = fleetUnit("a", "M", "1");
+    unit.impacts = {{kit::paramKey(139), 17, 16, {{"/tmp/airplay.conf", 5}}},
+                    {kit::paramKey(36), 17, 17, {{"/tmp/no-output-of-the-run", 2}}}};
+    const std::string impacts = sectionOf(desk::pageText({unit}, "a"), "impacts");
+    EXPECT_TRUE(holds(impacts, "param.139"));
+    EXPECT_FALSE(holds(impacts, "param.36"));
+    EXPECT_TRUE(
+        holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing here."));
+}
+
 TEST(PageTest, ImpactsAreAMatrix) {
     PageUnit unit = fleetUnit("a", "M", "1");
     unit.impacts = {{kit::paramKey(139),

@@ -271,15 +271,6 @@ TEST_F(ReportCommandTest, RedactedPageSaysSo) {
     EXPECT_TRUE(hasText("Serials are replaced by X"));
 }
 
-TEST_F(ReportCommandTest, ImpactsAreThoseOnTheOutputsOfTheRun) {
-    const fs::path root = makeUnit("bench");
-    report({root, "-a", "--impact"}, 0);
-    EXPECT_TRUE(hasText("<th scope=\"row\">param.36</th>"));
-    EXPECT_FALSE(hasText("<th scope=\"row\">slot.9.0</th>"));
-    report({root, "--impact"}, 0);
-    EXPECT_TRUE(hasText("<th scope=\"row\">slot.9.0</th>"));
-}
-
 } // namespace
 
 } // namespace orvane::test
