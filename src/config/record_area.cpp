@@ -23,11 +23,8 @@ struct SlotPlace {
     std::uint64_t offset = NO_SLOT_OFFSET;
 
     explicit SlotPlace(std::uint32_t slot) { recordSlotLayout(slot, size, offset); }
-    bool isKnown() const {
-        // No row has one without the other. GCOVR_EXCL_BR_START
-        return size != 0 && offset != NO_SLOT_OFFSET;
-        // GCOVR_EXCL_BR_STOP
-    }
+    /// No slot has a size without an offset.
+    bool isKnown() const { return size != 0; }
     std::int64_t bytesBeforeEnd() const {
         return RECORD_AREA_SIZE - static_cast<std::int64_t>(offset);
     }

@@ -7,21 +7,6 @@
 
 namespace orvane {
 
-namespace {
-
-/// Runs one writer. It throws only if memory runs out where no default can be used: it then ends,
-/// as silently as after any other failure, and the next option runs.
-void run(Writer writer) {
-    try {
-        writer();
-    } catch (...) { // NOLINT(bugprone-empty-catch) GCOVR_EXCL_LINE
-        // Nothing is reported, on purpose. The causes are streams that need memory before they are
-        // opened (libc++), and strings that need it even when short (GCC before 5).
-    }
-}
-
-} // namespace
-
 Writer nextWriter(int argc, char* const argv[]) {
     constexpr int END_OF_OPTIONS = -1;
     int letter = END_OF_OPTIONS;
@@ -36,9 +21,18 @@ Writer nextWriter(int argc, char* const argv[]) {
     return nullptr;
 }
 
+void runWriter(Writer writer) {
+    try {
+        writer();
+    } catch (...) { // NOLINT(bugprone-empty-catch)
+        // Nothing is reported, on purpose. The causes are streams that need memory before they are
+        // opened (libc++), and strings that need it even when short (GCC before 5).
+    }
+}
+
 int runOptions(int argc, char* const argv[]) {
     while (const Writer writer = nextWriter(argc, argv)) {
-        run(writer);
+        runWriter(writer);
     }
     return 0;
 }

@@ -14,6 +14,10 @@ using Writer = int (*)();
 /// are left to the C library's own diagnostic.
 Writer nextWriter(int argc, char* const argv[]);
 
+/// Runs one writer. It throws only if memory runs out where no default can be used: it then ends,
+/// as silently as after any other failure, and the next option can run.
+void runWriter(Writer writer);
+
 /// Runs the writer of every option. Always returns 0, whatever the writers do.
 int runOptions(int argc, char* const argv[]);
 

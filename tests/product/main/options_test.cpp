@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <new>
 #include <set>
 #include <string>
 #include <vector>
@@ -205,6 +206,12 @@ TEST_F(OptionsTest, FailureOfTheWritersIsNotAFailureOfTheProgram) {
     }
     EXPECT_EQ(run({"-ai"}), "");
     EXPECT_TRUE(std::filesystem::is_empty("/"));
+}
+
+TEST_F(OptionsTest, WriterThatThrowsEndsSilently) {
+    StandardStreams streams;
+    EXPECT_NO_THROW(runWriter([]() -> int { throw std::bad_alloc(); }));
+    EXPECT_EQ(streams.stop(), "");
 }
 
 TEST_F(OptionsTest, StockFilesAreInstalledSilently) {
