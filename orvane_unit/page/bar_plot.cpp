@@ -65,10 +65,10 @@ void drawBars(Markup& page, const std::vector<std::vector<std::int32_t>>& lists,
                         {"height", std::to_string(HEIGHT + 1)},
                         {"viewBox", "0 0 " + width + " " + std::to_string(HEIGHT + 1)}});
     if (!same.empty()) {
-        page.add("path", {{"class", "bar"}, {"d", same}}, "");
+        page.addShape("path", {{"class", "bar"}, {"d", same}});
     }
     if (!differing.empty()) {
-        page.add("path", {{"class", "bar differs"}, {"d", differing}}, "");
+        page.addShape("path", {{"class", "bar differs"}, {"d", differing}});
     }
 }
 

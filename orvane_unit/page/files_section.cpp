@@ -20,7 +20,7 @@ void addFiles(Markup& page, const std::vector<UnitFile>& files, const std::strin
         const Element row(page, "tr",
                           {{"class", std::string("kind-") + nameOf(file.kind)},
                            {"data-key", keyText(kit::fileKey(file.path))}});
-        page.add("th", {{"scope", "row"}}, file.path);
+        page.add("th", file.path);
         page.add("td", file.role);
         page.add("td",
                  file.kind == PathKind::file ? kit::counted(file.size, "byte") : wordOf(file.kind));

@@ -63,7 +63,7 @@ void addCell(Markup& page, const Cell& cell, const std::string& bytes) {
     if (cell.isBehindEnd) {
         page.add("span", {{"class", "sign"}}, "past the end");
     }
-    page.add("small", {{"class", "detail"}}, detailOf(cell));
+    page.add("small", detailOf(cell));
 }
 
 void addLegend(Markup& page) {

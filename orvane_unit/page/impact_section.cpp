@@ -46,7 +46,7 @@ std::string linesText(const Impact& impact, const std::string& path) {
 
 void addRow(Markup& page, const Impact& impact, const std::vector<std::string>& paths) {
     const Element row(page, "tr", {{"data-key", keyText(impact.key)}});
-    page.add("th", {{"scope", "row"}}, keyText(impact.key));
+    page.add("th", keyText(impact.key));
     page.add("td", std::to_string(impact.changing) + " of " + std::to_string(impact.tried));
     for (const std::string& path : paths) {
         const std::string text = linesText(impact, path);
@@ -77,10 +77,10 @@ void addImpacts(Markup& page, const std::vector<Impact>& impacts, const Explanat
     {
         const Element head(page, "thead");
         const Element row(page, "tr");
-        page.add("th", {{"scope", "col"}}, "input");
-        page.add("th", {{"scope", "col"}}, "values that change a line");
+        page.add("th", "input");
+        page.add("th", "values that change a line");
         for (const std::string& path : paths) {
-            page.add("th", {{"scope", "col"}}, path);
+            page.add("th", path);
         }
     }
     const Element body(page, "tbody");

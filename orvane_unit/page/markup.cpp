@@ -49,12 +49,17 @@ void Markup::addVoid(const MarkupName& element, Attributes attributes) {
     isInBegin_ = false;
 }
 
+void Markup::addShape(const MarkupName& element, Attributes attributes) {
+    begin(element, attributes, "/>");
+    isInBegin_ = false;
+}
+
 void Markup::addOwn(const MarkupName& element, const char* content) {
     const Element whole(*this, element);
     document_ += content;
 }
 
-void Markup::begin(const MarkupName& element, Attributes attributes) {
+void Markup::begin(const MarkupName& element, Attributes attributes, std::string_view close) {
     document_ += isInBegin_ ? "<" : "\n<";
     isInBegin_ = true;
     document_ += element.text();
@@ -68,7 +73,7 @@ void Markup::begin(const MarkupName& element, Attributes attributes) {
         appendEscaped(document_, attribute.value);
         document_ += '"';
     }
-    document_ += '>';
+    document_ += close;
 }
 
 void Markup::end(const MarkupName& element) {

@@ -50,12 +50,15 @@ public:
     /// An element that can have no content, such as `br`: it has no end.
     void addVoid(const MarkupName& element, Attributes attributes);
 
+    /// A shape of a drawing, which has no content.
+    void addShape(const MarkupName& element, Attributes attributes);
+
     /// A `style` or `script` of this program's own, whose content is not escaped.
     void addOwn(const MarkupName& element, const char* content);
 
 private:
     friend class Element;
-    void begin(const MarkupName& element, Attributes attributes);
+    void begin(const MarkupName& element, Attributes attributes, std::string_view close = ">");
     void end(const MarkupName& element);
 
     std::string document_;

@@ -10,6 +10,7 @@
 #include "orvane_unit/report/names.h"
 
 #include <cstddef>
+#include <optional>
 #include <set>
 #include <variant>
 #include <vector>
@@ -29,7 +30,7 @@ std::string codesText(const std::vector<Reason>& reasons) {
 
 /// The cells of a line: its number and its text.
 void addLine(Markup& page, const OutputRow& row) {
-    page.add("th", {{"scope", "row"}}, row.isLeftOut ? "-" : std::to_string(row.number));
+    page.add("th", row.isLeftOut ? "-" : std::to_string(row.number));
     const Element cell(page, "td");
     if (row.isLeftOut) {
         page.add("small", {{"class", "sign"}}, "(left out)");
@@ -44,13 +45,16 @@ void addLine(Markup& page, const OutputRow& row) {
 void addLines(Markup& page, const std::vector<Line>& lines) {
     const WideTable table(page, "lines");
     addTitles(page, {"line", "text", "origin"});
-    const Element body(page, "tbody");
+    std::optional<Element> body; // of neighbours with the same reasons, which are given once
+    const std::vector<Reason>* reasons = nullptr;
     std::set<Reason> said;
     for (const OutputRow& row : outputRows(lines)) {
-        const bool isGood = isIntended(row.origin->reasons);
+        if (reasons == nullptr || *reasons != row.origin->reasons) {
+            reasons = &row.origin->reasons;
+            body.emplace(page, "tbody", Attributes{{"data-reasons", codesText(*reasons)}});
+        }
         const Element line(page, "tr",
-                           {{"class", isGood ? "" : "fallback"},
-                            {"data-reasons", codesText(row.origin->reasons)},
+                           {{"class", isIntended(*reasons) ? "" : "fallback"},
                             {"data-key", keyText(row.origin->key)}});
         addLine(page, row);
         page.add("td", originText(*row.origin, said));

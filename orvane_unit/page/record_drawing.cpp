@@ -106,12 +106,10 @@ void drawPart(Markup& page, const Strip& strip, const Part& part) {
         page, "g", {{"class", std::string("part ") + part.kind}, {"data-key", keyText(part.key)}});
     page.add("title", part.name + ": " + kit::counted(part.end - part.begin, "byte") + " at " +
                           number(part.begin));
-    page.add("rect",
-             {{"x", number(left)},
-              {"y", number(strip.y)},
-              {"width", number(width)},
-              {"height", number(STRIP)}},
-             "");
+    page.addShape("rect", {{"x", number(left)},
+                           {"y", number(strip.y)},
+                           {"width", number(width)},
+                           {"height", number(STRIP)}});
     for (const std::string& label : {part.name, part.label}) {
         if (!label.empty() && label.size() * LETTER < width) {
             page.add("text", {{"x", number(left + width / 2)}, {"y", number(strip.y + 195)}},
@@ -132,20 +130,16 @@ void drawStrip(Markup& page, const Strip& strip, const std::vector<Part>& parts)
 /// Marks a piece of `from`, and draws lines from there to the ends of `to`, which shows it
 /// magnified.
 void drawMagnifier(Markup& page, const Strip& from, const Strip& to) {
-    page.add("rect",
-             {{"class", "magnified"},
-              {"x", number(from.at(to.begin))},
-              {"y", number(from.y)},
-              {"width", number(from.at(to.end) - from.at(to.begin))},
-              {"height", number(STRIP)}},
-             "");
-    page.add(
-        "path",
-        {{"class", "magnifier"},
-         {"d", "M" + number(from.at(to.begin)) + " " + number(from.y + STRIP) + "L" + number(to.x) +
-                   " " + number(to.y) + "M" + number(from.at(to.end)) + " " +
-                   number(from.y + STRIP) + "L" + number(to.x + to.width) + " " + number(to.y)}},
-        "");
+    page.addShape("rect", {{"class", "magnified"},
+                           {"x", number(from.at(to.begin))},
+                           {"y", number(from.y)},
+                           {"width", number(from.at(to.end) - from.at(to.begin))},
+                           {"height", number(STRIP)}});
+    page.addShape("path", {{"class", "magnifier"},
+                           {"d", "M" + number(from.at(to.begin)) + " " + number(from.y + STRIP) +
+                                     "L" + number(to.x) + " " + number(to.y) + "M" +
+                                     number(from.at(to.end)) + " " + number(from.y + STRIP) + "L" +
+                                     number(to.x + to.width) + " " + number(to.y)}});
 }
 
 /// The runs of slots with nothing between them, side by side.

@@ -63,7 +63,7 @@ void addContent(Markup& page, const std::optional<std::string>& bytes) {
 
 /// A row of the table, still without its content.
 void addPlace(Markup& page, const std::string& name, std::uint64_t offset, std::uint64_t size) {
-    page.add("th", {{"scope", "row"}}, name);
+    page.add("th", name);
     page.add("td", std::to_string(offset));
     page.add("td", std::to_string(size));
 }

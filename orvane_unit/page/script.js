@@ -197,7 +197,7 @@ function followPointerAndFocus() {
 /** What a cell of the image or a part of the drawing stands for, in words. */
 function detailText(element) {
     if (element.matches(".cell")) {
-        return `Parameter ${element.querySelector("b").textContent}, ${element.querySelector(".detail").textContent}`;
+        return `Parameter ${element.querySelector("b").textContent}, ${element.querySelector("small").textContent}`;
     }
     const row = partners(element).find(other => other.matches(".slots tr"));
     const content = row && [...row.cells].slice(3).map(cell => cell.textContent.trim()).filter(Boolean).join(", as text ");

@@ -13,7 +13,7 @@ inline void addTitles(Markup& page, std::initializer_list<std::string> titles) {
     const Element head(page, "thead");
     const Element row(page, "tr");
     for (const std::string& title : titles) {
-        page.add("th", {{"scope", "col"}}, title);
+        page.add("th", title);
     }
 }
 

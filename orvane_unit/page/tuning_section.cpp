@@ -91,7 +91,7 @@ void addValue(Markup& page, const FieldValues& all, std::size_t index) {
 
 void addField(Markup& page, const FieldValues& all) {
     const Element row(page, "tr", {{"class", all.isSame() ? "" : "differs"}});
-    page.add("th", {{"scope", "row"}}, all.field.key);
+    page.add("th", all.field.key);
     for (std::size_t i = 0; i < all.values.size(); ++i) {
         addValue(page, all, i);
     }
@@ -103,12 +103,12 @@ void addFields(Markup& page, const TuningArea& tuning) {
     {
         const Element head(page, "thead");
         const Element row(page, "tr");
-        page.add("th", {{"scope", "col"}}, "field");
+        page.add("th", "field");
         for (const TuningOutput& output : TUNING_OUTPUTS) {
-            page.add("th", {{"scope", "col"}},
+            page.add("th",
                      "block " + std::to_string(output.blockId) + ", " + purposeOf(output.blockId));
         }
-        page.add("th", {{"scope", "col"}}, "the two");
+        page.add("th", "the two");
     }
     const Element body(page, "tbody");
     for (const DpsField& field : DPS_LAYOUT) {

@@ -34,7 +34,7 @@ void addFile(Markup& page, const VersionFiles& versions, std::size_t index) {
     const Element body(page, "tbody");
     for (const auto& [name, value] : file.record) {
         const Element row(page, "tr", {{"data-key", name == VERSION_KEY ? key : ""}});
-        page.add("th", {{"scope", "row"}}, name);
+        page.add("th", name);
         const Element cell(page, "td");
         page.add("code", value);
     }

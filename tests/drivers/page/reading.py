@@ -36,16 +36,17 @@ def _rows(table: Element) -> list[Element]:
     return list(table.one("tbody").all("tr"))
 
 
+def _lines(table: Element) -> list[Line]:
+    """The lines of an output: their reasons are those of the group in which they stand."""
+    return [Line(_text(row), tuple(group.attributes["data-reasons"].split()), shown(row.attributes.get("data-key", "")))
+            for group in table.all("tbody") for row in group.all("tr")]
+
+
 def _text(row: Element) -> bytes:
     sign = row.first("small", "sign")
     if sign is not None and sign.text() == "(left out)":
         return b""
     return shown(row.one("code").text()) + (b"" if sign is not None else b"\n")
-
-
-def _line(row: Element) -> Line:
-    return Line(_text(row), tuple(row.attributes["data-reasons"].split()),
-                shown(row.attributes.get("data-key", "")))
 
 
 def _left(section: Element, written: bytes) -> tuple[str, bytes | None]:
@@ -80,7 +81,7 @@ def outputs(unit: Element) -> tuple[Output, ...]:
         if told != (path, "#" + section.attributes["id"], state, state):
             raise BadMarkup(f"{path}: the tile says {told}")
         tables = [table for table in section.all("table") if "left" not in table.classes()]
-        lines = [_line(row) for table in tables for row in _rows(table)]
+        lines = [line for table in tables for line in _lines(table)]
         left, content = _left(section, b"".join(line.text for line in lines))
         found.append(Output(path, state, "fallback" not in tile.classes(),
                             tuple(item.one("code").text() for item in tile.all("li", "reason")),

@@ -12,11 +12,10 @@ from drivers.page.markup import BadMarkup, parse, shown
 TILE = ('<li class="tile state-generated fallback"><a href="#o1">/tmp/a</a><strong>generated</strong>'
         '<ul><li class="reason">why <code>template-empty</code></li></ul></li>')
 SECTION = ('<section class="output state-generated" id="o1" data-path="/tmp/a">{}</section>')
-LINES = ('<table><tbody>'
-         '<tr data-reasons="fixed-text"><th>1</th><td><code>a\\\\b\\x09\\xff</code></td><td></td></tr>'
-         '<tr data-reasons="from-record" data-key="slot.9"><th></th><td><small class="sign">(left out)</small></td></tr>'
-         '<tr data-reasons="from-template" data-key="file./t"><th>2</th><td><code>&lt;b&gt;</code></td></tr>'
-         '<tr data-reasons="from-template" data-key="file./t"><th>3</th><td><code>c</code>'
+LINES = ('<table><tbody data-reasons="fixed-text"><tr><th>1</th><td><code>a\\\\b\\x09\\xff</code></td><td></td></tr></tbody>'
+         '<tbody data-reasons="from-record"><tr data-key="slot.9"><th></th><td><small class="sign">(left out)</small></td></tr></tbody>'
+         '<tbody data-reasons="from-template"><tr data-key="file./t"><th>2</th><td><code>&lt;b&gt;</code></td></tr>'
+         '<tr data-key="file./t"><th>3</th><td><code>c</code>'
          '<small class="sign">(no line end)</small></td></tr></tbody></table>')
 UNIT = ('<article><section class="verdict"><ul>{}</ul></section>'
         '<section class="outputs">{}</section></article>')

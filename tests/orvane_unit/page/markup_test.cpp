@@ -42,6 +42,16 @@ TEST(MarkupTest, ElementsEndInTheOrderInWhichTheyMust) {
                                    "\n<td class=\"c\">two</td></tr>\n<br></table>");
 }
 
+TEST(MarkupTest, ShapeEndsItself) {
+    Markup page;
+    {
+        const Element group(page, "g");
+        page.addShape("rect", {{"width", "1"}});
+        page.addShape("path", {});
+    }
+    EXPECT_EQ(page.document(), std::string(DOCTYPE) + "\n<g><rect width=\"1\"/>\n<path/></g>");
+}
+
 TEST(MarkupTest, OwnContentStaysAsItIs) {
     Markup page;
     page.addOwn("style", "a > b { content: \"&\" }\n");
