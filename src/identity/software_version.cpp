@@ -81,6 +81,10 @@ std::string versionText(const Inf_Data& record) {
     return after(infValue(record, VERSION_KEY), AFFIX_SEPARATOR);
 }
 
+bool isNoVersion(const std::string& text) {
+    return text.empty() || text == NO_VERSION;
+}
+
 std::string softwareVersion() {
     try {
         return formatVersion(findApplicationVersion());
@@ -101,7 +105,7 @@ std::string findApplicationVersion() {
 }
 
 std::string formatVersion(const std::string& text) {
-    if (text.empty() || text == NO_VERSION) {
+    if (isNoVersion(text)) {
         return DEFAULT_SOFTWARE_VERSION;
     }
     const VersionComponents components = versionComponents(text);

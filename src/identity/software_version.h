@@ -66,6 +66,9 @@ std::size_t chooseApplication(const std::vector<Inf_Data>& records);
 /// string when there is no such key.
 std::string versionText(const Inf_Data& record);
 
+/// Whether a version text is that of no version: empty, or "N/A".
+bool isNoVersion(const std::string& text);
+
 /// formatVersion of findApplicationVersion; DEFAULT_SOFTWARE_VERSION when memory runs out; where
 /// even that short string needs memory (GCC before 5), it may throw std::bad_alloc.
 std::string softwareVersion();
@@ -75,8 +78,8 @@ std::string softwareVersion();
 /// runs out.
 std::string findApplicationVersion();
 
-/// The versionComponents of a version text, at least two hexadecimal digits each; "000000" for an
-/// empty text and for "N/A". "1.2" gives "010202".
+/// The versionComponents of a version text, at least two hexadecimal digits each; "000000" for no
+/// version. "1.2" gives "010202".
 std::string formatVersion(const std::string& text);
 
 /// The first three components of a version text. A missing one repeats the one before it.

@@ -28,6 +28,13 @@ void expectVersions(const FormatCase (&table)[Count]) {
     }
 }
 
+TEST(IsNoVersionTest, EmptyTextAndItsNameAreNoVersion) {
+    EXPECT_TRUE(isNoVersion(""));
+    EXPECT_TRUE(isNoVersion("N/A"));
+    EXPECT_FALSE(isNoVersion("N"));
+    EXPECT_FALSE(isNoVersion("0"));
+}
+
 TEST(FormatVersionByteTest, NumbersBecomeTwoLowerCaseHexadecimalDigits) {
     expectBytes({{"0", "00"},
                  {"1", "01"},
