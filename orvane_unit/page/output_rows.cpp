@@ -1,28 +1,29 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/output_rows.h"
 
+#include "orvane_unit/page/room.h"
 #include "orvane_unit/report/place_text.h"
 
-#include <utility>
+#include <algorithm>
 
 namespace orvane::desk {
 
-std::vector<OutputRow> outputRows(const std::vector<Line>& lines) {
-    std::vector<OutputRow> rows;
-    std::size_t number = 1;
-    for (const Line& line : lines) {
-        if (line.text.empty()) {
-            rows.push_back({number, "", false, true, &line.origin});
-        }
-        for (std::size_t at = 0; at < line.text.size();) {
-            const std::size_t end = line.text.find('\n', at);
-            const bool hasEnd = end != std::string::npos;
-            rows.push_back({number, line.text.substr(at, end - at), hasEnd, false, &line.origin});
-            number += hasEnd ? 1 : 0;
-            at = hasEnd ? end + 1 : line.text.size();
-        }
+bool OutputRows::next(OutputRow& row) {
+    if (index_ == lines_.size()) {
+        return false;
     }
-    return rows;
+    const Line& line = lines_[index_];
+    const std::size_t end = std::min(line.text.find('\n', at_), line.text.size());
+    const bool hasEnd = end < line.text.size();
+    row = {number_, std::string_view(line.text).substr(at_, end - at_), hasEnd, line.text.empty(),
+           &line.origin};
+    number_ += hasEnd ? 1 : 0;
+    at_ = end + (hasEnd ? 1 : 0);
+    if (at_ == line.text.size()) {
+        at_ = 0;
+        ++index_;
+    }
+    return true;
 }
 
 std::string originText(const Origin& origin, std::set<Reason>& said) {
@@ -34,7 +35,7 @@ std::string originText(const Origin& origin, std::set<Reason>& said) {
             text += (text.empty() ? "" : "; ") + reasonInfo(reason).sentence;
         }
     }
-    return text + (text.empty() || place.empty() ? "" : ": ") + place;
+    return text + (text.empty() || place.empty() ? "" : ": ") + briefly(place);
 }
 
 } // namespace orvane::desk

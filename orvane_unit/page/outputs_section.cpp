@@ -2,8 +2,10 @@
 #include "orvane_unit/page/outputs_section.h"
 
 #include "kit/description/value_key.h"
+#include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/output_rows.h"
+#include "orvane_unit/page/room.h"
 #include "orvane_unit/page/table_titles.h"
 #include "orvane_unit/page/unit_id.h"
 #include "orvane_unit/page/wide_table.h"
@@ -29,26 +31,42 @@ std::string codesText(const std::vector<Reason>& reasons) {
 }
 
 /// The cells of a line: its number and its text.
-void addLine(Markup& page, const OutputRow& row) {
+void addLine(Markup& page, const OutputRow& row, Room& room) {
     page.add("th", row.isLeftOut ? "-" : std::to_string(row.number));
     const Element cell(page, "td");
     if (row.isLeftOut) {
         page.add("small", {{"class", "sign"}}, "(left out)");
         return;
     }
-    page.add("code", row.text);
+    addCode(page, row.text, room);
     if (!row.hasEnd) {
         page.add("small", {{"class", "sign"}}, "(no line end)");
     }
 }
 
-void addLines(Markup& page, const std::vector<Line>& lines) {
+/// Says how much of an output is not shown, if anything.
+void addMore(Markup& page, OutputRows& rows) {
+    std::size_t lines = 0;
+    std::size_t bytes = 0;
+    for (OutputRow row; rows.next(row); ++lines) {
+        bytes += row.size();
+    }
+    if (lines == 0) {
+        return;
+    }
+    const Element more(page, "p", {{"class", "more"}});
+    page.addText(kit::counted(lines, "more line") + " of " + kit::counted(bytes, "byte") +
+                 " in all: see ");
+    page.add("code", "orvane-unit explain --json --content");
+}
+
+void addRows(Markup& page, OutputRows& rows, Room& room) {
     const WideTable table(page, "lines");
     addTitles(page, {"line", "text", "origin"});
     std::optional<Element> body; // of neighbours with the same reasons, which are given once
     const std::vector<Reason>* reasons = nullptr;
     std::set<Reason> said;
-    for (const OutputRow& row : outputRows(lines)) {
+    for (OutputRow row; !room.isUsedUp() && rows.next(row);) {
         if (reasons == nullptr || *reasons != row.origin->reasons) {
             reasons = &row.origin->reasons;
             body.emplace(page, "tbody", Attributes{{"data-reasons", codesText(*reasons)}});
@@ -56,9 +74,33 @@ void addLines(Markup& page, const std::vector<Line>& lines) {
         const Element line(page, "tr",
                            {{"class", isIntended(*reasons) ? "" : "fallback"},
                             {"data-key", keyText(row.origin->key)}});
-        addLine(page, row);
+        addLine(page, row, room);
         page.add("td", originText(*row.origin, said));
     }
+}
+
+void addLines(Markup& page, const std::vector<Line>& lines) {
+    OutputRows rows(lines);
+    Room room;
+    addRows(page, rows, room);
+    addMore(page, rows);
+}
+
+/// Adds what is there, whatever it comes from.
+void addContent(Markup& page, const std::string& content) {
+    const std::vector<Line> lines = {{content, {}}};
+    OutputRows rows(lines);
+    Room room;
+    {
+        const WideTable table(page, "lines left");
+        addTitles(page, {"line", "text"});
+        const Element body(page, "tbody");
+        for (OutputRow row; !room.isUsedUp() && rows.next(row);) {
+            const Element line(page, "tr");
+            addLine(page, row, room);
+        }
+    }
+    addMore(page, rows);
 }
 
 /// What is at the output's path after the run, if the output's own lines don't say it.
@@ -79,13 +121,7 @@ void addWhatIsLeft(Markup& page, const Output& output) {
              output.contentAfter.empty() ? "There after the run: an empty file."
                                          : "There after the run, and not from this output:");
     if (!output.contentAfter.empty()) {
-        const WideTable table(page, "lines left");
-        addTitles(page, {"line", "text"});
-        const Element body(page, "tbody");
-        for (const OutputRow& row : outputRows({{output.contentAfter, {}}})) {
-            const Element line(page, "tr");
-            addLine(page, row);
-        }
+        addContent(page, output.contentAfter);
     }
 }
 

@@ -97,35 +97,6 @@ void requireUnit(const fs::path& root, const DecodedUnit& unit) {
     }
 }
 
-/// The most bytes of an output or a version file: on a page they take many times as many. A
-/// browser shows more only slowly, if at all.
-constexpr std::size_t LONGEST_SHOWN = std::size_t{1} << 20U;
-
-void requireShowable(const std::string& path, std::size_t size) {
-    if (size > LONGEST_SHOWN) {
-        throw kit::KitError("", path,
-                            " has more than " + std::to_string(LONGEST_SHOWN) +
-                                " bytes, too many for a page");
-    }
-}
-
-void requireShowable(const PageUnit& unit) {
-    for (const Output& output : unit.explanation) {
-        std::size_t size = 0;
-        for (const Line& line : output.lines) {
-            size += line.text.size();
-        }
-        requireShowable(output.path, std::max(size, output.contentAfter.size()));
-    }
-    for (const VersionFile& file : unit.decoded.versions.found.files) {
-        std::size_t size = 0;
-        for (const auto& [key, value] : file.record) {
-            size += key.size() + value.size();
-        }
-        requireShowable(file.path, size);
-    }
-}
-
 /// Makes a copy of the unit at `root` without its serial, which it returns as redactSerial does.
 /// None of `serials`, those of all units, may stand in the copy.
 kit::Bytes copyWithoutSerial(const fs::path& root, const fs::path& copy,
@@ -228,7 +199,6 @@ private:
 
     PageUnit readInputs(const std::string& name, const fs::path& root, DecodedUnit decoded) const {
         PageUnit unit{name, explainUnit(root, {"-" + request_.letters}), std::move(decoded), {}};
-        requireShowable(unit);
         if (request_.hasImpacts) {
             unit.impacts = findImpacts(root, {}, progress_);
         }

@@ -5,6 +5,7 @@
 #include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/output_rows.h"
+#include "orvane_unit/page/room.h"
 #include "orvane_unit/page/unit_id.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/report/place_text.h"
@@ -43,7 +44,8 @@ std::string linesOf(const Trouble& trouble) {
 
 std::vector<Trouble> troublesOf(const Output& output) {
     std::vector<Trouble> troubles;
-    for (const OutputRow& row : outputRows(output.lines)) {
+    OutputRows rows(output.lines);
+    for (OutputRow row; rows.next(row);) {
         if (isIntended(row.origin->reasons)) {
             continue;
         }
@@ -74,7 +76,7 @@ void addTrouble(Markup& page, const Trouble& trouble) {
     page.add("code", keyText(trouble.origin->key));
     const std::string place = placeText(*trouble.origin);
     if (!place.empty()) {
-        page.addText(" (" + place + ")");
+        page.addText(" (" + briefly(place) + ")");
     }
 }
 

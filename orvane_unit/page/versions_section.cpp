@@ -7,6 +7,7 @@
 #include "kit/host/text.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/explain/version_choice.h"
+#include "orvane_unit/page/room.h"
 #include "orvane_unit/page/table_titles.h"
 #include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/phrases.h"
@@ -22,28 +23,74 @@ namespace orvane::desk {
 
 namespace {
 
-void addFile(Markup& page, const VersionFiles& versions, std::size_t index) {
+/// Says how many things are not shown, if any.
+void addMore(Markup& page, std::size_t count, const char* thing) {
+    if (count > 0) {
+        const Element more(page, "p", {{"class", "more"}});
+        page.addText(kit::counted(count, thing) + ": see ");
+        page.add("code", "orvane-unit show --only versions");
+    }
+}
+
+void addEntry(Markup& page, const std::string& name, const std::string& value,
+              const std::string& key, Room& room) {
+    const Element row(page, "tr", {{"data-key", key}});
+    {
+        const Element cell(page, "th");
+        addText(page, name, room);
+    }
+    const Element cell(page, "td");
+    addCode(page, value, room);
+}
+
+/// Adds what a file says, as much of it as there is room for.
+void addFile(Markup& page, const VersionFiles& versions, std::size_t index, Room& room) {
     const VersionFile& file = versions.files[index];
     const bool isChosen = versions.chosen == index;
     const std::string key = keyText(kit::fileKey(file.path));
     const Element item(page, "li", {{"class", isChosen ? "version chosen" : "version"}});
     page.add("h4", {{"data-key", key}}, file.path);
+    room.take(file.path);
     page.add("p", {{"class", "sign"}}, choiceText(versions, index));
-    const WideTable table(page, "record");
-    addTitles(page, {"key", "value"});
-    const Element body(page, "tbody");
-    for (const auto& [name, value] : file.record) {
-        const Element row(page, "tr", {{"data-key", name == VERSION_KEY ? key : ""}});
-        page.add("th", name);
-        const Element cell(page, "td");
-        page.add("code", value);
+    std::size_t shown = 0;
+    {
+        const WideTable table(page, "record");
+        addTitles(page, {"key", "value"});
+        const Element body(page, "tbody");
+        for (const auto& [name, value] : file.record) {
+            if (room.isUsedUp()) {
+                break;
+            }
+            ++shown;
+            addEntry(page, name, value, name == VERSION_KEY ? key : "", room);
+        }
     }
+    addMore(page, file.record.size() - shown, "more key");
+}
+
+/// Adds the files as far as there is room for them, and the chosen one in any case.
+void addFiles(Markup& page, const VersionFiles& versions) {
+    Room room;
+    Room chosenRoom;
+    std::size_t left = 0;
+    {
+        const Element files(page, "ol", {{"class", "version-files"}});
+        for (std::size_t i = 0; i < versions.files.size(); ++i) {
+            Room& own = versions.chosen == i ? chosenRoom : room;
+            if (own.isUsedUp()) {
+                ++left;
+            } else {
+                addFile(page, versions, i, own);
+            }
+        }
+    }
+    addMore(page, left, "more file");
 }
 
 void addStep(Markup& page, const std::string& what, const std::string& result) {
     const Element step(page, "li");
     page.addText(what + ": ");
-    page.add("code", result);
+    page.add("code", briefly(result));
 }
 
 /// How the six digits come about, step by step.
@@ -59,13 +106,13 @@ void addSteps(Markup& page, const VersionFiles& versions) {
     addStep(page, std::string("the value of \"") + VERSION_KEY + "\"",
             infValue(record, VERSION_KEY));
     addStep(page, "without its prefix", text);
-    if (text.empty() || text == NO_VERSION) {
+    if (isNoVersion(text)) {
         addStep(page, "no version, so the digits are those for none", formatVersion(text));
         return;
     }
     for (const std::string& component : versionComponents(text)) {
         addStep(page,
-                "component " + kit::inQuotes(component) + ", the number " +
+                "component " + kit::inQuotes(briefly(component)) + ", the number " +
                     std::to_string(componentNumber(component)) + ", in hexadecimal",
                 formatVersionByte(component));
     }
@@ -79,9 +126,13 @@ void addVersions(Markup& page, const DecodedVersions& versions, const std::strin
     page.add("h3", "Software version");
     {
         const Element summary(page, "p", {{"class", "summary"}});
-        page.addText("Version ");
-        page.add("code", {{"class", "version-text"}}, versions.version);
-        page.addText(", as digits ");
+        if (versions.version.empty()) {
+            page.addText("There is no version; its digits are ");
+        } else {
+            page.addText("Version ");
+            page.add("code", {{"class", "version-text"}}, briefly(versions.version));
+            page.addText(", as digits ");
+        }
         page.add("code", {{"class", "version-digits"}}, versions.digits);
     }
     if (!versions.found.hasFolder) {
@@ -90,10 +141,7 @@ void addVersions(Markup& page, const DecodedVersions& versions, const std::strin
     } else if (versions.found.files.empty()) {
         page.add("p", "There is no version description file.");
     } else {
-        const Element files(page, "ol", {{"class", "version-files"}});
-        for (std::size_t i = 0; i < versions.found.files.size(); ++i) {
-            addFile(page, versions.found, i);
-        }
+        addFiles(page, versions.found);
     }
     addSteps(page, versions.found);
 }

@@ -20,25 +20,26 @@ from drivers.random_units import Finding, Question, RandomUnit
 from model.tree import Tree
 
 
-def page_faults(unit: markup.Element, explained: explanation.Explanation, held: dict[str, Any]) -> list[str]:
-    """Where the page says something else than explain and show."""
+def page_faults(unit: markup.Element, written: Sequence[explanation.Output], explained: explanation.Explanation,
+                held: dict[str, Any]) -> list[str]:
+    """Where the page, with `written` outputs, says something else than explain and show."""
     outputs = [{"path": output.path, "outcome": output.outcome, "isIntended": output.is_intended,
                 "reasons": output.reasons, "lines": reading.merged(output.lines), "left": output.left,
                 "content": output.content} for output in explained.outputs]
     shown = [{"path": output.path, "outcome": output.outcome, "isIntended": output.is_intended,
               "reasons": output.reasons, "lines": output.lines, "left": output.left,
-              "content": output.content} for output in reading.outputs(unit)]
+              "content": output.content} for output in written]
     slots = [slot for slot in held["records"]["slots"] if slot["number"] != 15]
     records = {"slots": slots, **{name: held["records"][name] for name in ("aux", "crc", "crcVerdict")}}
     params = [{name: value for name, value in row.items() if name != "code"} for row in held["params"]["rows"]]
     tuning = ([held["tuning"]["blocks"][block] for block in reading.BLOCKS]
               if held["tuning"]["disk"] == "from-tuning-block" else None)
+    versions = reading.expected_versions(held["versions"], explanation.to_bytes)
     return [*reading.differences("outputs", shown, outputs),
             *reading.differences("params", reading.params(unit), params),
             *reading.differences("records", reading.records(unit), records),
             *reading.differences("tuning", reading.tuning(unit), tuning),
-            *reading.differences("versions", reading.versions(unit),
-                                 reading.expected_versions(held["versions"], explanation.to_bytes)),
+            *reading.differences("versions", reading.versions(unit, versions), versions),
             *reading.differences("files", reading.files(unit), held["files"])]
 
 
@@ -54,8 +55,9 @@ def check(unit: RandomUnit, tools: Tools) -> Finding:
         return Finding([f"report: status {said.status}, said {said.stdout!r} {said.stderr!r}"], frozenset())
     try:
         article = markup.parse(file.read_bytes()).one("article", "unit")
-        lines = page_faults(article, explained, json.loads(held.stdout))
-        outputs = reading.outputs(article)
+        outputs = tuple(reading.completed(shown, whole)
+                        for shown, whole in zip(reading.outputs(article), explained.outputs, strict=True))
+        lines = page_faults(article, outputs, explained, json.loads(held.stdout))
     except (ValueError, KeyError) as error:
         return Finding([f"report: {error!r}"], frozenset())
     result = runner.run(tools.command(root, options), root)

@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import re
 from collections.abc import Iterable, Sequence
+from dataclasses import dataclass
 from typing import Any
 
 from drivers.explain.explanation import Output
@@ -13,9 +14,14 @@ from drivers.page.markup import BadMarkup, Element, shown
 
 STATES = ("generated", "stock", "empty", "kept", "not-asked")
 THERE = re.compile(r"There after the run(?:: (.+)\.|, and not from this output:)")
+CUT = re.compile(r"\((\d+) more bytes?\)")
+MORE = re.compile(r"\d+ more lines? of (\d+) bytes? in all: ")
 KINDS = {"missing": "nothing", "folder": "folder", "device": "other", "an empty file": "file"}
 DETAIL = re.compile(r"byte (\d+), (?:(\d) bytes, )?group (\d), raw (\d+|none), default (-?\d+), "
                     r"mask (0x[0-9a-f]{8})(?:: (.*))?")
+
+# The keys and values of a version file.
+Entries = list[tuple[bytes, bytes]]
 
 # The blocks that the page shows field by field.
 BLOCKS = (2, 3)
@@ -43,22 +49,46 @@ def _lines(table: Element) -> list[Line]:
 
 
 def _text(row: Element) -> bytes:
-    sign = row.first("small", "sign")
-    if sign is not None and sign.text() == "(left out)":
+    signs = [sign.text() for sign in row.all("small", "sign")]
+    if "(left out)" in signs:
         return b""
-    return shown(row.one("code").text()) + (b"" if sign is not None else b"\n")
+    text = shown(row.one("code").text())
+    return text if signs else text + b"\n"
 
 
-def _left(section: Element, written: bytes) -> tuple[str, bytes | None]:
+def _cut(part: Element) -> int:
+    """How many bytes more the lines of a part have than it shows."""
+    found = 0
+    for row in part.all("tr"):
+        signs = [sign.text() for sign in row.all("small", "sign")]
+        for match in filter(None, map(CUT.fullmatch, signs)):
+            found += int(match[1]) + ("(no line end)" not in signs)
+    for more in part.all("p", "more"):
+        match = MORE.match(more.text())
+        if match is None:
+            raise BadMarkup(more.text())
+        found += int(match[1])
+    return found
+
+
+def _parts(section: Element) -> tuple[Element, Element]:
+    """What the section of an output says of its lines, and of what is there after the run."""
+    children = section.children
+    index = next((index for index, child in enumerate(children)
+                  if isinstance(child, Element) and child.name == "p" and "left" in child.classes()), len(children))
+    return Element("", {}, children[:index]), Element("", {}, children[index:])
+
+
+def _left(part: Element, written: bytes) -> tuple[str, bytes | None]:
     """What is at the path after the run, and its content if it is a file."""
-    said = section.first("p", "left")
+    said = part.first("p", "left")
     if said is None:
         return "file", written
     match = THERE.fullmatch(said.text())
     if not match:
         raise BadMarkup(said.text())
     if match[1] is None:
-        return "file", b"".join(map(_text, _rows(section.one("table", "left"))))
+        return "file", b"".join(map(_text, _rows(part.one("table", "left"))))
     kind = KINDS[match[1]]
     return kind, b"" if kind == "file" else None
 
@@ -70,7 +100,15 @@ def _state(element: Element) -> str:
     return states[0]
 
 
-def outputs(unit: Element) -> tuple[Output, ...]:
+@dataclass(frozen=True)
+class Shown(Output):
+    """An output on a page: `lines` and `content` may only begin there, and have so many bytes more."""
+
+    lines_cut: int
+    content_cut: int
+
+
+def outputs(unit: Element) -> tuple[Shown, ...]:
     """The outputs, each with merged lines. Its tile and its section must say the same."""
     found = []
     sections = list(unit.one("section", "outputs").all("section", "output"))
@@ -80,13 +118,41 @@ def outputs(unit: Element) -> tuple[Output, ...]:
         told = (tile.one("a").text(), tile.one("a").attributes["href"], _state(tile), tile.one("strong").text())
         if told != (path, "#" + section.attributes["id"], state, state):
             raise BadMarkup(f"{path}: the tile says {told}")
-        tables = [table for table in section.all("table") if "left" not in table.classes()]
-        lines = [line for table in tables for line in _lines(table)]
-        left, content = _left(section, b"".join(line.text for line in lines))
-        found.append(Output(path, state, "fallback" not in tile.classes(),
-                            tuple(item.one("code").text() for item in tile.all("li", "reason")),
-                            merged(lines), left, content))
+        written, there = _parts(section)
+        lines = [line for table in written.all("table") for line in _lines(table)]
+        left, content = _left(there, b"".join(line.text for line in lines))
+        found.append(Shown(path, state, "fallback" not in tile.classes(),
+                           tuple(item.one("code").text() for item in tile.all("li", "reason")),
+                           merged(lines), left, content, _cut(written), _cut(there if there.children else written)))
     return tuple(found)
+
+
+def completed(shown: Shown, whole: Output) -> Output:
+    """What the page shows, and from `whole` what it has no room for; its size must be as the page says."""
+    lines, content = shown.lines, shown.content
+    if shown.lines_cut:
+        rest = _after(whole.lines, len(shown.text()))
+        if sum(len(line.text) for line in rest) != shown.lines_cut:
+            raise BadMarkup(f"{shown.path}: {shown.lines_cut} bytes are not shown")
+        lines = merged([*lines, *rest])
+    if shown.content_cut and content is not None:
+        more = (whole.content or b"")[len(content):]
+        if len(more) != shown.content_cut:
+            raise BadMarkup(f"{shown.path}: {shown.content_cut} bytes of what is there are not shown")
+        content += more
+    return Output(shown.path, shown.outcome, shown.is_intended, shown.reasons, lines, shown.left, content)
+
+
+def _after(lines: Iterable[Line], size: int) -> list[Line]:
+    """The lines without their first bytes."""
+    found: list[Line] = []
+    for line in lines:
+        if found or len(line.text) > size:
+            found.append(Line(line.text[size:], line.reasons, line.key))
+            size = 0
+        else:
+            size -= len(line.text)
+    return found
 
 
 def params(unit: Element) -> list[dict[str, Any]]:
@@ -160,14 +226,51 @@ def tuning(unit: Element) -> list[dict[str, Any]] | None:
     return [blocks[block] for block in BLOCKS]
 
 
-def versions(unit: Element) -> dict[str, Any]:
+def _whole(cell: Element, text: bytes, said: bytes) -> bytes:
+    """`text` of a cell, and from `said` what there was no room for, which must be as long as the page says."""
+    sign = cell.first("small", "sign")
+    if sign is None:
+        return text
+    match = CUT.fullmatch(sign.text())
+    if match is None or int(match[1]) != len(said) - len(text):
+        raise BadMarkup(f"{sign.text()}: {len(text)} of {len(said)} bytes are shown")
+    return text + said[len(text):]
+
+
+def _more(element: Element) -> int:
+    """How many things of an element are not shown."""
+    more = next((child for child in element.children
+                 if isinstance(child, Element) and child.name == "p" and "more" in child.classes()), None)
+    return 0 if more is None else int(more.text().split()[0])
+
+
+def _record(item: Element, said: Entries) -> Entries:
+    rows = _rows(item.one("table"))
+    if _more(item) != len(said) - len(rows):
+        raise BadMarkup(f"{len(rows)} of {len(said)} keys are shown")
+    found = []
+    for row, (key, value) in zip(rows, said):
+        name, code = row.one("th"), row.one("code")
+        begin = "".join(child for child in name.children if isinstance(child, str))
+        found.append((_whole(name, shown(begin), key), _whole(row.one("td"), shown(code.text()), value)))
+    return found + said[len(rows):]
+
+
+def versions(unit: Element, said: dict[str, Any]) -> dict[str, Any]:
+    """The versions, and from `said` what there was no room for."""
     section = unit.one("section", "versions")
+    items = {shown(item.one("h4").text()): item for item in section.all("li", "version")}
     files = []
-    for item in section.all("li", "version"):
-        rows = [(shown(row.one("th").text()), shown(row.one("code").text())) for row in _rows(item.one("table"))]
-        files.append({"path": shown(item.one("h4").text()), "isChosen": "chosen" in item.classes(), "record": rows})
+    for file in said["files"]:
+        item = items.pop(file["path"], None)
+        files.append(file if item is None else {"path": file["path"], "isChosen": "chosen" in item.classes(),
+                                                "record": _record(item, file["record"])})
+    left = len(said["files"]) - len(list(section.all("li", "version")))
+    if items or _more(section) != left:
+        raise BadMarkup(f"version files {list(items)}, and {left} that are not shown")
+    text = section.first("code", "version-text")
     return {"hasFolder": section.first("p", "fallback") is None, "files": files,
-            "version": shown(section.one("code", "version-text").text()),
+            "version": b"" if text is None else shown(text.text()),
             "digits": shown(section.one("code", "version-digits").text())}
 
 

@@ -4,7 +4,9 @@
 from __future__ import annotations
 
 import unittest
+from dataclasses import replace
 
+from drivers.explain.explanation import Output
 from drivers.explain.value_reasons import Line
 from drivers.page import markup, reading
 from drivers.page.markup import BadMarkup, parse, shown
@@ -77,6 +79,29 @@ class Reading(unittest.TestCase):
         self.assertEqual(output.content, b"old\n")
         self.assertEqual(len(output.lines), 3)
 
+    def test_what_is_cut_is_completed(self) -> None:
+        cut = LINES.replace('c</code><small class="sign">(no line end)</small>',
+                            'c</code><small class="sign">(2 more bytes)</small>')
+        output, = reading.outputs(unit(cut, '<p class="more">2 more lines of 5 bytes in all: see that</p>'))
+        self.assertEqual((output.lines_cut, output.content_cut), (8, 8))
+        rest = b"<b>\ncde\nfg\nhi"
+        whole = Output("/tmp/a", "generated", False, ("template-empty",),
+                       (*output.lines[:2], Line(rest, ("from-template",), b"file./t")), "file",
+                       b"a\\b\t\xff\n" + rest)
+        self.assertEqual(reading.completed(output, whole), whole)
+        other = replace(whole, content=b"A" + whole.content[1:])
+        self.assertNotEqual(reading.completed(output, other), other)
+        for wrong in (replace(whole, lines=whole.lines[:2]), replace(whole, content=b"a")):
+            with self.assertRaises(BadMarkup):
+                reading.completed(output, wrong)
+
+    def test_cut_content_of_another_output(self) -> None:
+        more = ('<p class="left">There after the run, and not from this output:</p><table class="left"><tbody>'
+                '<tr><td><code>old</code></td></tr></tbody></table>'
+                '<p class="more">1 more line of 1 byte in all: see that</p>')
+        output, = reading.outputs(unit(LINES, more))
+        self.assertEqual((output.lines_cut, output.content_cut), (0, 1))
+
     def test_tile_that_says_something_else_is_refused(self) -> None:
         for old, new in (("#o1", "#o2"), (">/tmp/a<", ">/tmp/b<"), ("<strong>generated", "<strong>stock"),
                          ("state-generated", "state-kept")):
@@ -94,6 +119,26 @@ class Reading(unittest.TestCase):
         for wrong in ("", first.replace("group-3", "group-2"), first.replace("param.134", "param.13")):
             with self.subTest(wrong), self.assertRaises(BadMarkup):
                 reading.params(parse(cells.format(wrong).encode()))
+
+    def test_versions(self) -> None:
+        page = ('<section class="versions"><p>{}<code class="version-digits">010203</code></p><ol>'
+                '<li class="version"><h4>/a</h4><table><tbody><tr><th>k</th><td><code>v</code></td></tr>'
+                '<tr><th>key<small class="sign">(1 more byte)</small></th><td><code>ab</code>'
+                '<small class="sign">(3 more bytes)</small></td></tr></tbody></table><p class="more">2 more keys</p></li>'
+                '<li class="version chosen"><h4>/c</h4><table><tbody></tbody></table></li></ol>'
+                '<p class="more">1 more file</p></section>')
+        entries = [(b"k", b"v"), (b"keys", b"abcde"), (b"x", b"y"), (b"z", b"")]
+        said = {"hasFolder": True, "version": b"1.2.3", "digits": b"010203",
+                "files": [{"path": b"/a", "isChosen": False, "record": entries},
+                          {"path": b"/b", "isChosen": False, "record": []},
+                          {"path": b"/c", "isChosen": True, "record": []}]}
+        text = '<code class="version-text">1.2.3</code>'
+        self.assertEqual(reading.versions(parse(page.format(text).encode()), said), said)
+        self.assertEqual(reading.versions(parse(page.format("").encode()), said), {**said, "version": b""})
+        for old, new in (("1 more byte", "2 more bytes"), ("3 more", "4 more"), ("2 more keys", "1 more key"),
+                         ("1 more file", "2 more files"), ("/a<", "/d<")):
+            with self.subTest(new), self.assertRaises(BadMarkup):
+                reading.versions(parse(page.format(text).replace(old, new).encode()), said)
 
     def test_differences_are_named(self) -> None:
         self.assertEqual(reading.differences("x", {"a": [1, {"b": 2}]}, {"a": [1, {"b": 2}]}), [])

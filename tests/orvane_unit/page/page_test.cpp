@@ -7,6 +7,7 @@
 #include "orvane_unit/explain/explain.h"
 #include "orvane_unit/page/markup.h"
 #include "orvane_unit/page/page.h"
+#include "orvane_unit/page/room.h"
 #include "orvane_unit/report/names.h"
 #include "orvane_unit/show/decoded_unit.h"
 #include "tests/kit/unit/described_unit.h"
@@ -38,6 +39,15 @@ std::string pageOf(const std::function<void(kit::UnitDescription&)>& change) {
 }
 
 void unchanged(kit::UnitDescription& /*unit*/) {}
+
+PageUnit fleetUnit(const std::string& name, const std::string& model, const std::string& serial) {
+    static const DescribedUnit DESCRIBED;
+    PageUnit unit = unitAt(DESCRIBED.root());
+    unit.name = name;
+    unit.decoded.identity.model = model;
+    unit.decoded.identity.serial = serial;
+    return unit;
+}
 
 /// The part of `page` from `begin` to before the next `end`.
 std::string partOf(const std::string& page, const std::string& begin, const std::string& end) {
@@ -305,6 +315,96 @@ TEST(PageTest, WithoutAVersionTheDigitsAreThoseForNone) {
     EXPECT_TRUE(holds(na, "those for none: \n<code>000000</code>"));
 }
 
+/// The page of a unit whose first output has this one line, or these.
+std::string outputPage(const std::string& text) {
+    PageUnit unit = fleetUnit("a", "M", "1");
+    unit.explanation.front().lines = {{text, desk::fixedText()}};
+    unit.explanation.front().contentAfter = text;
+    return partOf(desk::pageText({unit}, "ai"), "<section class=\"output ", "</section>");
+}
+
+std::string linesOf(std::size_t count) {
+    std::string text;
+    for (std::size_t i = 0; i < count; ++i) {
+        text += "x\n";
+    }
+    return text;
+}
+
+TEST(PageTest, LinesThatAreTooManyAreCounted) {
+    const std::string whole = outputPage(linesOf(desk::Room::MOST_TEXTS));
+    EXPECT_EQ(countOf(whole, "<code>x</code>"), desk::Room::MOST_TEXTS);
+    EXPECT_FALSE(holds(whole, "more line"));
+    const std::string begin = outputPage(linesOf(desk::Room::MOST_TEXTS + 1));
+    EXPECT_EQ(countOf(begin, "<code>x</code>"), desk::Room::MOST_TEXTS);
+    EXPECT_TRUE(holds(begin, "<p class=\"more\">1 more line of 2 bytes in all: see "
+                             "\n<code>orvane-unit explain --json --content</code></p>"));
+    EXPECT_TRUE(holds(outputPage(linesOf(desk::Room::MOST_TEXTS + 1) + "abc"),
+                      "2 more lines of 5 bytes in all: "));
+}
+
+TEST(PageTest, LineThatIsTooLongIsCut) {
+    const std::string longest(desk::Room::MOST_BYTES, 'x');
+    EXPECT_FALSE(holds(outputPage(longest + "\n"), "more byte"));
+    const std::string cut = outputPage(longest + "yz\nnext");
+    EXPECT_TRUE(holds(cut, "xxx</code>\n<small class=\"sign\">(2 more bytes)</small></td>"));
+    EXPECT_TRUE(holds(cut, "1 more line of 4 bytes in all: "));
+}
+
+/// The part of a page about so many version files, of which `chosen` counts.
+std::string versionsPage(std::size_t count, std::size_t chosen, const Inf_Data& record) {
+    PageUnit unit = fleetUnit("a", "M", "1");
+    desk::VersionFiles& versions = unit.decoded.versions.found;
+    versions.files.clear();
+    for (std::size_t i = 0; i < count; ++i) {
+        versions.files.push_back({"/" + std::to_string(i) + ".inf", record, i == chosen});
+    }
+    versions.chosen = chosen;
+    return sectionOf(desk::pageText({unit}, "ai"), "versions");
+}
+
+TEST(PageTest, VersionFilesThatAreTooManyAreCounted) {
+    // The chosen one has room of its own.
+    const std::string whole = versionsPage(desk::Room::MOST_TEXTS + 1, 0, {});
+    EXPECT_EQ(countOf(whole, "<li class=\"version"), desk::Room::MOST_TEXTS + 1);
+    EXPECT_FALSE(holds(whole, "more file"));
+    const std::string begin =
+        versionsPage(desk::Room::MOST_TEXTS + 9, desk::Room::MOST_TEXTS + 5, {});
+    EXPECT_EQ(countOf(begin, "<li class=\"version"), desk::Room::MOST_TEXTS + 1);
+    EXPECT_TRUE(holds(begin, "/" + std::to_string(desk::Room::MOST_TEXTS + 5) + ".inf</h4>"));
+    EXPECT_TRUE(holds(begin, "<p class=\"more\">8 more files: see "
+                             "\n<code>orvane-unit show --only versions</code></p>"));
+}
+
+TEST(PageTest, VersionsThatAreTooLongAreCut) {
+    Inf_Data record;
+    for (std::size_t i = 0; i < desk::Room::MOST_TEXTS; ++i) {
+        record.emplace("key " + std::to_string(i), "v");
+    }
+    const std::string keys = versionsPage(1, 0, record);
+    EXPECT_EQ(countOf(keys, "<tr><th>key "), desk::Room::MOST_TEXTS / 2);
+    EXPECT_TRUE(holds(keys, ">" + std::to_string(desk::Room::MOST_TEXTS / 2) + " more keys: see "));
+    const std::string longText(desk::Room::MOST_BYTES, 'x');
+    const std::string text = versionsPage(1, 0, {{"Version Number", "1." + longText + ".3"}});
+    EXPECT_LT(text.size(), desk::Room::MOST_BYTES + 16 * desk::LONGEST_IN_SENTENCE);
+    EXPECT_TRUE(holds(text, "xxx ... (28676 more bytes)</code>"));
+}
+
+TEST(PageTest, PageOfTheLargestUnitIsBelowFourMebibytes) {
+    std::string text;
+    for (std::size_t i = 0; i < desk::Room::MOST_TEXTS; ++i) {
+        text += std::string(desk::Room::MOST_BYTES / desk::Room::MOST_TEXTS, '&') + "\n";
+    }
+    PageUnit unit = fleetUnit("a", "M", "1");
+    for (desk::Output& output : unit.explanation) {
+        output.lines = {{text + text, {{desk::Reason::fromTemplate}, kit::fileKey("/t"), {}}}};
+        output.contentAfter = text;
+    }
+    unit.decoded.versions.found.files.assign(20000, {"/&.inf", {{"key", text}}, false});
+    unit.decoded.versions.found.chosen = 0;
+    EXPECT_LT(desk::pageText({unit}, "ai").size(), 4U << 20U);
+}
+
 TEST(PageTest, FilesHaveTheirKeys) {
     const std::string files = sectionOf(pageOf(unchanged), "files");
     EXPECT_TRUE(holds(itemOf(files, "tr", "file./fs/mp/etc/airplay_static.conf"),
@@ -332,15 +432,6 @@ TEST(PageTest, BytesOfAHostileUnitStayText) {
     EXPECT_TRUE(std::all_of(page.begin(), page.end(), [](char byte) {
         return byte == '\n' || static_cast<unsigned char>(byte) >= ' ';
     }));
-}
-
-PageUnit fleetUnit(const std::string& name, const std::string& model, const std::string& serial) {
-    static const DescribedUnit DESCRIBED;
-    PageUnit unit = unitAt(DESCRIBED.root());
-    unit.name = name;
-    unit.decoded.identity.model = model;
-    unit.decoded.identity.serial = serial;
-    return unit;
 }
 
 TEST(PageTest, FleetHasARowForEachUnitAndMarksRareValues) {

@@ -187,22 +187,18 @@ TEST_F(ReportCommandTest, BadInputLeavesNoPage) {
     EXPECT_EQ(folderNames(folder()), (Names{"bad.toml", "bare", "good", "waits"}));
 }
 
-TEST_F(ReportCommandTest, WhatIsTooLongForAPageIsRefused) {
-    const std::string tooLong = " has more than 1048576 bytes, too many for a page\n";
-    EXPECT_EQ(report({makeUnit("template",
-                               [](kit::UnitDescription& unit) {
-                                   unit.files["/fs/mp/etc/airplay_static.conf"] =
-                                       std::string(MEBIBYTE, 'x');
-                               })},
-                     2),
-              "orvane-unit: /tmp/airplay.conf" + tooLong);
-    EXPECT_EQ(report({makeUnit("versions",
-                               [](kit::UnitDescription& unit) {
-                                   unit.files["/fs/rwdata/.Version/a.inf"] =
-                                       "key=" + std::string(MEBIBYTE, 'x');
-                               })},
-                     2),
-              "orvane-unit: /fs/rwdata/.Version/a.inf" + tooLong);
+TEST_F(ReportCommandTest, HugeUnitMakesASmallPage) {
+    const std::string lineEnds(MEBIBYTE, '\n');
+    const fs::path root = makeUnit("huge", [&lineEnds](kit::UnitDescription& unit) {
+        unit.files["/fs/mp/etc/airplay_static.conf"] = lineEnds;
+        unit.files["/fs/mp/etc/mm/iap2_static.cfg"] = lineEnds;
+        unit.files["/fs/rwdata/.Version/app.inf"] =
+            "Type=Application\nVersion Number=1." + std::string(MEBIBYTE, '&') + "\n";
+    });
+    EXPECT_EQ(report({root, "-a", "-i"}, 1), ""); // the version has too few components
+    EXPECT_LT(fs::file_size(page()), MEBIBYTE);
+    EXPECT_TRUE(hasText(" more lines of "));
+    EXPECT_TRUE(hasText(" more bytes)"));
 }
 
 TEST_F(ReportCommandTest, PageThatCannotBeWrittenIsAnError) {
