@@ -47,7 +47,7 @@ void addUnit(Markup& page, const PageUnit& unit, const std::string& id) {
     addVerdict(page, unit.explanation, id);
     addOutputs(page, unit.explanation, id);
     addImage(page, unit.decoded.image, id);
-    addRecords(page, unit.decoded.records, id);
+    addRecords(page, unit.decoded.records, unit.decoded.tuning, id);
     addTuning(page, unit.decoded.tuning, id);
     addVersions(page, unit.decoded.versions, id);
     addFiles(page, unit.decoded.files, id);

@@ -126,11 +126,12 @@ const char* sentenceOf(CrcVerdict verdict) {
 
 } // namespace
 
-void addRecords(Markup& page, const DecodedRecords& records, const std::string& id) {
+void addRecords(Markup& page, const DecodedRecords& records, const TuningArea& tuning,
+                const std::string& id) {
     const Element section(page, "section", {{"class", "records"}, {"id", id + "-records"}});
     page.add("h3", "Record area of the boot disk");
     page.add("p", summaryOf(records));
-    drawRecords(page, records);
+    drawRecords(page, records, tuning);
     addSlots(page, records);
     addRest(page, records);
     const Element crc(page, "p",

@@ -7,6 +7,7 @@
 #include "kit/tuning/tuning_encode.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/page/bar_plot.h"
+#include "orvane_unit/page/content_text.h"
 #include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/phrases.h"
 #include "tuning/audio_profile.h"
@@ -17,7 +18,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <functional>
-#include <iterator>
 #include <vector>
 
 namespace orvane::desk {
@@ -53,10 +53,21 @@ void addWord(Markup& page, const DpsField& field, std::int32_t code) {
     }
 }
 
+/// The blocks that the tool reads, by number.
+std::vector<std::int32_t> readBlocks() {
+    std::vector<std::int32_t> ids;
+    for (const TuningOutput& output : TUNING_OUTPUTS) {
+        ids.push_back(output.blockId);
+    }
+    std::sort(ids.begin(), ids.end());
+    return ids;
+}
+
 /// A field in each of the blocks that the tool reads.
 struct FieldValues {
     const DpsField& field;
-    std::vector<std::vector<std::int32_t>> values; ///< in the order of TUNING_OUTPUTS
+    std::vector<std::int32_t> blocks;
+    std::vector<std::vector<std::int32_t>> values; ///< in each of the blocks
 
     bool isSame() const {
         return std::adjacent_find(values.begin(), values.end(), std::not_equal_to<>()) ==
@@ -65,16 +76,16 @@ struct FieldValues {
 };
 
 FieldValues fieldValues(const TuningArea& tuning, const DpsField& field) {
-    FieldValues all{field, {}};
-    for (const TuningOutput& output : TUNING_OUTPUTS) {
-        all.values.push_back(valuesOf(blockOf(tuning, output.blockId), field));
+    FieldValues all{field, readBlocks(), {}};
+    for (const std::int32_t id : all.blocks) {
+        all.values.push_back(valuesOf(blockOf(tuning, id), field));
     }
     return all;
 }
 
 void addValue(Markup& page, const FieldValues& all, std::size_t index) {
     const std::vector<std::int32_t>& values = all.values[index];
-    const auto block = static_cast<std::uint64_t>(TUNING_OUTPUTS[index].blockId);
+    const auto block = static_cast<std::uint64_t>(all.blocks[index]);
     const Element cell(page, "td",
                        {{"data-key", keyText(kit::tuningFieldKey(block, all.field.key))}});
     if (all.field.kind == DpsKind::list) {
@@ -104,11 +115,10 @@ void addFields(Markup& page, const TuningArea& tuning) {
         const Element head(page, "thead");
         const Element row(page, "tr");
         page.add("th", "field");
-        for (const TuningOutput& output : TUNING_OUTPUTS) {
-            page.add("th",
-                     "block " + std::to_string(output.blockId) + ", " + purposeOf(output.blockId));
+        for (const std::int32_t block : readBlocks()) {
+            page.add("th", "block " + std::to_string(block) + ", " + purposeOf(block));
         }
-        page.add("th", "the two");
+        page.add("th", "comparison");
     }
     const Element body(page, "tbody");
     for (const DpsField& field : DPS_LAYOUT) {
@@ -131,22 +141,15 @@ void addUnread(Markup& page, const TuningArea& tuning, std::int32_t id) {
     }
 }
 
-bool isRead(std::int32_t id) {
-    return std::any_of(std::begin(TUNING_OUTPUTS), std::end(TUNING_OUTPUTS),
-                       [id](const TuningOutput& output) { return output.blockId == id; });
-}
-
-bool isZero(const DpsBlock& block) {
-    return kit::withoutTrailingZeros({block.bytes.begin(), block.bytes.end()}).empty();
-}
-
 void addOtherBlocks(Markup& page, const TuningArea& tuning) {
+    const std::vector<std::int32_t> read = readBlocks();
     for (std::int32_t id = 0; id < DPS_BLOCK_COUNT; ++id) {
-        if (!isRead(id)) {
+        if (std::find(read.begin(), read.end(), id) == read.end()) {
+            const auto& bytes = blockOf(tuning, id).bytes;
             page.add("li",
                      {{"data-key", keyText(kit::tuningBlockKey(static_cast<std::uint64_t>(id)))}},
                      "block " + std::to_string(id) + ", which no run reads: " +
-                         (isZero(blockOf(tuning, id)) ? "zeros" : "not all zeros"));
+                         contentText(kit::sparseContent(kit::Bytes(bytes.begin(), bytes.end()))));
         }
     }
 }
@@ -162,8 +165,8 @@ void addTuning(Markup& page, const TuningArea& tuning, const std::string& id) {
     }
     addFields(page, tuning);
     const Element rest(page, "ul", {{"class", "rest"}});
-    for (const TuningOutput& output : TUNING_OUTPUTS) {
-        addUnread(page, tuning, output.blockId);
+    for (const std::int32_t block : readBlocks()) {
+        addUnread(page, tuning, block);
     }
     addOtherBlocks(page, tuning);
 }

@@ -78,6 +78,14 @@ std::size_t countOf(const std::string& text, const std::string& what) {
     return count;
 }
 
+std::string repeated(const std::string& text, std::size_t count) {
+    std::string all;
+    for (std::size_t i = 0; i < count; ++i) {
+        all += text;
+    }
+    return all;
+}
+
 bool holds(const std::string& text, const std::string& what) {
     return text.find(what) != std::string::npos;
 }
@@ -191,6 +199,8 @@ TEST(PageTest, ImageHasACellForEachByte) {
     EXPECT_TRUE(holds(model, "<b>139</b>\n<code>1a</code>"));
     EXPECT_TRUE(holds(
         model, "byte 139, group 3, raw 26, default 0, mask 0x7ffffffe: model Quarion Velmira"));
+    EXPECT_TRUE(holds(image, "<small>byte 0, group 0, raw 0, default 0</small>"));
+    EXPECT_TRUE(holds(image, "A mask is given unless it is 0xffffffff."));
     EXPECT_TRUE(holds(image, "byte 134, the upper one of parameter 134"));
 }
 
@@ -227,6 +237,51 @@ TEST(PageTest, RecordAreaIsDrawnAndListed) {
     EXPECT_TRUE(holds(records, "<strong class=\"state\">computed</strong>"));
 }
 
+/// What the drawing says of the part with a title.
+std::string contentOfPart(const std::string& records, const std::string& title) {
+    const std::string begin = "<title>" + title + "</title>\n<desc>";
+    return partOf(records, begin, "</desc>").substr(begin.size());
+}
+
+TEST(PageTest, PartsOfTheRecordAreaHaveTheirContent) {
+    constexpr std::uint64_t BASE = 1U << 20U;
+    const std::string records = sectionOf(pageOf([](kit::UnitDescription& unit) {
+                                              unit.disk.aux = std::string("\0ab", 3);
+                                              unit.disk.tuning[7].raw =
+                                                  std::string("x\0y", 3) + std::string(30, 'z');
+                                              unit.disk.bytes[BASE + 200] = "note";
+                                              unit.disk.bytes[BASE + 2216] = "n";
+                                              unit.disk.bytes[BASE + 6000] = std::string(32, 'n');
+                                              unit.disk.bytes[BASE + 8000] = "far";
+                                          }),
+                                          "records");
+    EXPECT_EQ(countOf(records, "<desc>"), countOf(records, "<g class=\"part "));
+    EXPECT_EQ(contentOfPart(records, "slot 9: 8 bytes at 129"),
+              "8 bytes not zero, the first at 129: 53 4e 30 30 34 32 31 37");
+    EXPECT_EQ(contentOfPart(records, "slot 8: 16 bytes at 113"), "zeros");
+    EXPECT_EQ(contentOfPart(records, "auxiliary area: 1024 bytes at 3072"),
+              "2 bytes not zero, the first at 3073: 61 62");
+    EXPECT_EQ(contentOfPart(records, "tuning block 7: 188 bytes at 5412"),
+              "32 bytes not zero, the first at 5412: 78 00 79" + repeated(" 7a", 29) + " ...");
+    EXPECT_EQ(contentOfPart(records, "tuning block 6: 188 bytes at 5224"), "zeros");
+    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 2048 bytes at 137"),
+              "4 bytes not zero, the first at 200: 6e 6f 74 65");
+    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 856 bytes at 2216"),
+              "1 byte not zero, the first at 2216: 6e");
+    EXPECT_EQ(
+        contentOfPart(records, "rest of the tuning area, which nothing reads: 2216 bytes at 5976"),
+        "35 bytes not zero, the first at 6000: 6e" + repeated(" 6e", 31) + " ...");
+    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 1040384 bytes at 8192"), "zeros");
+}
+
+TEST(PageTest, DrawingHasColoursWithoutTheStyle) {
+    const std::string drawing =
+        partOf(sectionOf(pageOf(unchanged), "records"), "<svg class=\"drawing\"", "</svg>");
+    EXPECT_EQ(countOf(drawing, "<rect "), countOf(drawing, " fill=\"#"));
+    EXPECT_EQ(countOf(drawing, "<path "), countOf(drawing, " fill=\"none\""));
+    EXPECT_EQ(countOf(drawing, "<text "), countOf(drawing, " stroke=\"none\">"));
+}
+
 TEST(PageTest, BytesThatBelongToNothingAreShown) {
     constexpr std::uint64_t BASE = 1U << 20U; // of the record area on a disk of two mebibytes
     const std::string records = sectionOf(pageOf([](kit::UnitDescription& unit) {
@@ -251,6 +306,7 @@ TEST(PageTest, DiskThatCannotBeReadIsSaid) {
     const std::string records = sectionOf(page, "records");
     EXPECT_TRUE(holds(records, "the boot disk can&#39;t be opened"));
     EXPECT_EQ(countOf(records, "can&#39;t be read</td>"), 18U); // 17 slots, and the auxiliary area
+    EXPECT_EQ(countOf(records, "<desc>can&#39;t be read</desc>"), countOf(records, "<desc>"));
     EXPECT_TRUE(holds(records, "<strong class=\"state\">unreadable</strong>"));
     EXPECT_TRUE(holds(sectionOf(page, "tuning"), "the boot disk can&#39;t be opened."));
 }
@@ -267,6 +323,8 @@ TEST(PageTest, TuningBlocksAreSideBySide) {
                   }),
                   "tuning");
     EXPECT_EQ(countOf(partOf(tuning, "<tbody>", "</tbody>"), "<th>"), 44U);
+    EXPECT_TRUE(holds(tuning, "<th>block 2, speech recognition</th>\n<th>block 3, telephony</th>"
+                              "\n<th>comparison</th>"));
     EXPECT_EQ(countOf(tuning, "<tr class=\"differs\""), 3U);
     EXPECT_TRUE(holds(itemOf(tuning, "td", "tuning.3.qwaAECSwitch"),
                       "<span class=\"word code-2\">qwaOn</span> 2"));
@@ -279,7 +337,7 @@ TEST(PageTest, TuningBlocksAreSideBySide) {
     EXPECT_TRUE(holds(list, "<path class=\"bar\" d=\"M7 0h5v1h-5z\"/>"));
     EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.3.raw"), "byte 1: no field reads"));
     EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.3.raw"), "<code>0xc0</code>"));
-    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.7"), "not all zeros"));
+    EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.7"), ": 1 byte not zero, the first at 0: 78"));
     EXPECT_TRUE(holds(itemOf(tuning, "li", "tuning.0"), ": zeros"));
 }
 
@@ -323,23 +381,15 @@ std::string outputPage(const std::string& text) {
     return partOf(desk::pageText({unit}, "ai"), "<section class=\"output ", "</section>");
 }
 
-std::string linesOf(std::size_t count) {
-    std::string text;
-    for (std::size_t i = 0; i < count; ++i) {
-        text += "x\n";
-    }
-    return text;
-}
-
 TEST(PageTest, LinesThatAreTooManyAreCounted) {
-    const std::string whole = outputPage(linesOf(desk::Room::MOST_TEXTS));
+    const std::string whole = outputPage(repeated("x\n", desk::Room::MOST_TEXTS));
     EXPECT_EQ(countOf(whole, "<code>x</code>"), desk::Room::MOST_TEXTS);
     EXPECT_FALSE(holds(whole, "more line"));
-    const std::string begin = outputPage(linesOf(desk::Room::MOST_TEXTS + 1));
+    const std::string begin = outputPage(repeated("x\n", desk::Room::MOST_TEXTS + 1));
     EXPECT_EQ(countOf(begin, "<code>x</code>"), desk::Room::MOST_TEXTS);
     EXPECT_TRUE(holds(begin, "<p class=\"more\">1 more line of 2 bytes in all: see "
                              "\n<code>orvane-unit explain --json --content</code></p>"));
-    EXPECT_TRUE(holds(outputPage(linesOf(desk::Room::MOST_TEXTS + 1) + "abc"),
+    EXPECT_TRUE(holds(outputPage(repeated("x\n", desk::Room::MOST_TEXTS + 1) + "abc"),
                       "2 more lines of 5 bytes in all: "));
 }
 
