@@ -156,3 +156,21 @@ def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str)
         print("\n".join(f"{question.name}: never {outcome}" for outcome in missing))
         return 1
     return 1 if differing else 0
+
+
+@dataclass(frozen=True)
+class UnitTools(runner.Tools):
+    """The tool, and orvane-unit."""
+
+    unit_tool: str
+
+
+def ask_with_unit_tool(question: Question, description: str, arguments: Sequence[str]) -> int:
+    """The main function of a driver of UnitTools. Returns the exit status, as `ask`."""
+    parser = argparse.ArgumentParser(question.name, description=description)
+    add_arguments(parser, units=1000)
+    parser.add_argument("--unit-tool", required=True, help="orvane-unit")
+    options = parser.parse_args(arguments)
+    common = runner.tools(options)
+    tools = UnitTools(common.orvane, common.enter, common.names, options.unit_tool)
+    return ask(question, tools, options, "--unit-tool", options.unit_tool)

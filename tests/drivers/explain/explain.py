@@ -13,27 +13,20 @@ not be run.
 
 from __future__ import annotations
 
-import argparse
 import os
 import random
 import subprocess
 from collections.abc import Sequence
-from dataclasses import dataclass
 from pathlib import Path
 
 from drivers import random_units, runner
 from drivers.explain import explanation, reasons, same_tree
-from drivers.random_units import Finding, Question, RandomUnit
+from drivers.random_units import Finding, Question, RandomUnit, UnitTools
 from drivers.unit_tool import MARKER, MARKER_TEXT, Said
 from drivers.units import make_unit
 from model import snapshot
 from model.prediction import parse_options
 from model.tree import Tree
-
-
-@dataclass(frozen=True)
-class Tools(runner.Tools):
-    unit_tool: str
 
 
 def ask(command: Sequence[str]) -> Said:
@@ -93,7 +86,7 @@ def described(unit_tool: str, root: Path, folder: Path) -> list[str]:
     return [f"described and made again: {line}" for line in same_tree.differences(root, copy)]
 
 
-def check(unit: RandomUnit, tools: Tools) -> Finding:
+def check(unit: RandomUnit, tools: UnitTools) -> Finding:
     root, options = unit.root, unit.arguments
     stages = reasons.stages(root, letters_of(options), tools.names)
     before = snapshot.take(root)
@@ -120,10 +113,4 @@ QUESTION = Question("explain", make_marked_unit, check, tuple(reasons.CODES), en
 
 
 def main(arguments: Sequence[str]) -> int:
-    parser = argparse.ArgumentParser(QUESTION.name, description=__doc__)
-    random_units.add_arguments(parser, units=1000)
-    parser.add_argument("--unit-tool", required=True, help="orvane-unit")
-    options = parser.parse_args(arguments)
-    common = runner.tools(options)
-    tools = Tools(common.orvane, common.enter, common.names, options.unit_tool)
-    return random_units.ask(QUESTION, tools, options, "--unit-tool", options.unit_tool)
+    return random_units.ask_with_unit_tool(QUESTION, __doc__ or "", arguments)

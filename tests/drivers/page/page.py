@@ -7,16 +7,15 @@ not be run.
 
 from __future__ import annotations
 
-import argparse
 import json
 from collections.abc import Sequence
 from typing import Any
 
 from drivers import random_units, runner
 from drivers.explain import explanation
-from drivers.explain.explain import Tools, ask, ask_explain, letters_of, make_marked_unit
+from drivers.explain.explain import ask, ask_explain, letters_of, make_marked_unit
 from drivers.page import markup, reading
-from drivers.random_units import Finding, Question, RandomUnit
+from drivers.random_units import Finding, Question, RandomUnit, UnitTools
 from model.tree import Tree
 
 
@@ -43,7 +42,7 @@ def page_faults(unit: markup.Element, written: Sequence[explanation.Output], exp
             *reading.differences("files", reading.files(unit), held["files"])]
 
 
-def check(unit: RandomUnit, tools: Tools) -> Finding:
+def check(unit: RandomUnit, tools: UnitTools) -> Finding:
     root, options = unit.root, unit.arguments
     explained, status, lines = ask_explain(tools.unit_tool, root, options)
     held = ask([tools.unit_tool, "show", str(root), "--json"])
@@ -72,10 +71,4 @@ QUESTION = Question("page", make_marked_unit, check, reading.STATES, enough_unit
 
 
 def main(arguments: Sequence[str]) -> int:
-    parser = argparse.ArgumentParser(QUESTION.name, description=__doc__)
-    random_units.add_arguments(parser, units=1000)
-    parser.add_argument("--unit-tool", required=True, help="orvane-unit")
-    options = parser.parse_args(arguments)
-    common = runner.tools(options)
-    tools = Tools(common.orvane, common.enter, common.names, options.unit_tool)
-    return random_units.ask(QUESTION, tools, options, "--unit-tool", options.unit_tool)
+    return random_units.ask_with_unit_tool(QUESTION, __doc__ or "", arguments)
