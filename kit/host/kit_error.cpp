@@ -23,11 +23,16 @@ KitError::KitError(const std::string& before, const fs::path& path, const std::s
     : std::runtime_error(before + nameOf(path) + after), text_(before + nameOf(path) + after),
       before_(before), path_(path), after_(after) {}
 
+bool KitError::isAbout(const fs::path& place) const {
+    const fs::path below = path_.lexically_relative(place);
+    return !path_.empty() && !below.empty() && *below.begin() != "..";
+}
+
 KitError KitError::moved(const fs::path& from, const fs::path& to) const {
-    const fs::path below = path_.lexically_relative(from);
-    if (path_.empty() || below.empty() || *below.begin() == "..") {
+    if (!isAbout(from)) {
         return *this;
     }
+    const fs::path below = path_.lexically_relative(from);
     return {before_, below == "." ? to : to / below, after_};
 }
 

@@ -22,6 +22,9 @@ public:
     /// The whole text. what() ends at the first zero byte.
     const std::string& text() const { return text_; }
 
+    /// Whether it is about a path at or below `place`.
+    bool isAbout(const std::filesystem::path& place) const;
+
     /// The same error with `to` in place of `from`, if its path is at or below that.
     KitError moved(const std::filesystem::path& from, const std::filesystem::path& to) const;
 

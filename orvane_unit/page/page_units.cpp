@@ -128,23 +128,37 @@ void requireSameChoice(const DecodedUnit& original, const DecodedUnit& copy,
     }
 }
 
+/// Calls `use` with the root of a unit that is made from the description.
+template <class Use>
+auto inMadeRoot(const fs::path& file, const Use& use) {
+    if (!fs::is_regular_file(file) && fs::exists(file)) {
+        throw kit::KitError("", file, " is neither a unit nor a description");
+    }
+    const kit::UnitDescription description = kit::readDescription(file);
+    const kit::ScratchFolder scratch;
+    const fs::path root = scratch.path() / "unit";
+    try {
+        kit::makeUnit(description, root);
+        return use(root);
+    } catch (const kit::KitError& error) {
+        throw error.moved(root, file);
+    }
+}
+
+/// The error of a unit or description, which it names: many others may be on the page.
+kit::KitError named(const kit::KitError& error, const fs::path& source) {
+    const bool isNamed =
+        error.isAbout(source) || error.text().compare(0, source.native().size(), source) == 0;
+    return isNamed ? error : kit::KitError("", source, ": " + error.text());
+}
+
 /// Calls `use` with the root of the unit; that of a description is made for it.
 template <class Use>
 auto inRoot(const Source& source, const Use& use) {
-    if (isFolder(source.path)) {
-        return use(source.path);
-    }
-    if (!fs::is_regular_file(source.path) && fs::exists(source.path)) {
-        throw kit::KitError("", source.path, " is neither a unit nor a description");
-    }
-    const kit::UnitDescription description = kit::readDescription(source.path);
-    const kit::ScratchFolder scratch;
-    const fs::path root = scratch.path() / "unit";
-    kit::makeUnit(description, root);
     try {
-        return use(root);
+        return isFolder(source.path) ? use(source.path) : inMadeRoot(source.path, use);
     } catch (const kit::KitError& error) {
-        throw error.moved(root, source.path);
+        throw named(error, source.path);
     }
 }
 

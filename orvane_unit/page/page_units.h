@@ -21,9 +21,9 @@ struct PageRequest {
 /// Reads all units that `request` names. A folder that is not a unit stands for the units and
 /// descriptions (*.toml) in it, in the order of their names. Units are only read; descriptions are
 /// made, and serials replaced as by kit::captureUnit, in temporary folders. `progress` counts
-/// units, or the inputs of a single one. Throws kit::KitError, also for a root that holds nothing
-/// that the tool opens, and for a unit that holds the serial of another one whose serial is to be
-/// replaced.
+/// units, or the inputs of a single one. Throws kit::KitError, which names the unit, also for a
+/// root that holds nothing that the tool opens, and for a unit that holds the serial of another one
+/// whose serial is to be replaced.
 std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& progress);
 
 } // namespace orvane::desk

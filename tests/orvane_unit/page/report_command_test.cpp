@@ -152,7 +152,9 @@ TEST_F(ReportCommandTest, SerialsOfAllUnitsAreRedactedInTheirNames) {
 TEST_F(ReportCommandTest, SerialThatCannotBeRedactedIsAnError) {
     const fs::path root =
         makeUnit("bench", [](kit::UnitDescription& unit) { unit.disk.slots[9] = "abc"; });
-    EXPECT_NE(report({root, "--redact-serial"}, 2).find("a serial of 3 bytes"), std::string::npos);
+    const std::string error = report({root, "--redact-serial"}, 2);
+    EXPECT_EQ(error.find("orvane-unit: " + root.string() + ": "), 0U) << error;
+    EXPECT_NE(error.find("a serial of 3 bytes"), std::string::npos) << error;
 }
 
 TEST_F(ReportCommandTest, ImpactIsSaidWhenAskedFor) {
@@ -179,12 +181,30 @@ TEST_F(ReportCommandTest, BadInputLeavesNoPage) {
         unit.absent = {"/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM"};
     });
     ASSERT_EQ(::mkfifo((waits / "fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM").c_str(), 0666), 0);
-    EXPECT_NE(report({makeUnit("good"), waits}, 2).find("SHARED_MEM"), std::string::npos);
+    EXPECT_EQ(report({makeUnit("good"), waits}, 2).find("orvane-unit: " + waits.string() + ": "),
+              0U);
     writeFile(folder() / "bad.toml", "[engine]\n");
     EXPECT_EQ(report({folder() / "bad.toml"}, 2)
                   .find("orvane-unit: " + folder().string() + "/bad.toml:1:"),
               0U);
     EXPECT_EQ(folderNames(folder()), (Names{"bad.toml", "bare", "good", "waits"}));
+}
+
+TEST_F(ReportCommandTest, ErrorNamesItsUnitOnce) {
+    fs::create_directory(folder() / "fleet");
+    makeUnit("fleet/good");
+    const fs::path waits = makeUnit("fleet/waits");
+    fs::remove(waits / "fs/mp/etc/airplay_static.conf");
+    ASSERT_EQ(::mkfifo((waits / "fs/mp/etc/airplay_static.conf").c_str(), 0666), 0);
+    const std::string description = folder() / "bad.toml";
+    writeFile(description, "[disk]\nsize = -1\n");
+    const std::string none = folder() / "none.toml";
+    for (const std::string& source : {waits.string(), description, none}) {
+        const std::string error = report({folder() / "fleet/good", source}, 2);
+        EXPECT_NE(error.find(source), std::string::npos) << error;
+        EXPECT_EQ(error.find(source), error.rfind(source)) << error;
+    }
+    EXPECT_EQ(report({folder() / "fleet"}, 2).find("orvane-unit: " + waits.string() + ": "), 0U);
 }
 
 TEST_F(ReportCommandTest, HugeUnitMakesASmallPage) {
