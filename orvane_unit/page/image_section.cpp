@@ -82,10 +82,12 @@ void addLegend(Markup& page) {
 }
 
 std::string summaryOf(const Image& image) {
-    std::string text = kit::counted(image.size, "byte");
     if (image.reason != Reason::fromImage) {
-        text += ": " + reasonInfo(image.reason).sentence;
-    } else if (image.size < CONFIG_IMAGE_SIZE) {
+        return "There is no usable image: " + reasonInfo(image.reason).sentence +
+               ". The tool's own defaults hold.";
+    }
+    std::string text = kit::counted(image.size, "byte");
+    if (image.size < CONFIG_IMAGE_SIZE) {
         text += " of " + std::to_string(CONFIG_IMAGE_SIZE);
     } else if (image.size > CONFIG_IMAGE_SIZE) {
         text += ", of which " + std::to_string(image.size - CONFIG_IMAGE_SIZE) +

@@ -71,8 +71,9 @@ void addImpacts(Markup& page, const std::vector<Impact>& impacts, const Explanat
         static_cast<std::size_t>(std::count_if(impacts.begin(), impacts.end(), isShown));
     page.add("p", "Each parameter, each byte of a slot that is read, and each tuning field was "
                   "changed in a copy of the unit. " +
-                      kit::counted(shown, "input") + " changed lines, with these numbers; " +
-                      std::to_string(impacts.size() - shown) + " changed nothing here.");
+                      kit::counted(shown, "input") + (shown == 1 ? " changes" : " change") +
+                      " the lines below; " + std::to_string(impacts.size() - shown) +
+                      (impacts.size() - shown == 1 ? " changes" : " change") + " nothing.");
     const WideTable table(page, "matrix");
     {
         const Element head(page, "thead");

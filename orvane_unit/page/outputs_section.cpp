@@ -10,6 +10,7 @@
 #include "orvane_unit/page/unit_id.h"
 #include "orvane_unit/page/wide_table.h"
 #include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
 
 #include <cstddef>
 #include <optional>
@@ -35,7 +36,7 @@ void addLine(Markup& page, const OutputRow& row, Room& room) {
     page.add("th", row.isLeftOut ? "-" : std::to_string(row.number));
     const Element cell(page, "td");
     if (row.isLeftOut) {
-        page.add("small", {{"class", "sign"}}, "(left out)");
+        page.add("small", {{"class", "sign"}}, LEFT_OUT);
         return;
     }
     addCode(page, row.text, room);
@@ -55,8 +56,7 @@ void addMore(Markup& page, OutputRows& rows) {
         return;
     }
     const Element more(page, "p", {{"class", "more"}});
-    page.addText(kit::counted(lines, "more line") + " of " + kit::counted(bytes, "byte") +
-                 " in all: see ");
+    page.addText(kit::counted(lines, "more line") + " (" + kit::counted(bytes, "byte") + "): see ");
     page.add("code", "orvane-unit explain --json --content");
 }
 
@@ -110,16 +110,19 @@ void addWhatIsLeft(Markup& page, const Output& output) {
         written += line.text;
     }
     if (output.kindAfter != PathKind::file) {
-        page.add("p", {{"class", "left"}},
-                 std::string("There after the run: ") + wordOf(output.kindAfter) + ".");
+        const std::string what = output.kindAfter == PathKind::nothing
+                                     ? "nothing"
+                                     : std::string("a ") + wordOf(output.kindAfter);
+        page.add("p", {{"class", "left"}}, "After the run, " + what + " is there.");
         return;
     }
     if (written == output.contentAfter && !written.empty()) {
         return;
     }
     page.add("p", {{"class", "left"}},
-             output.contentAfter.empty() ? "There after the run: an empty file."
-                                         : "There after the run, and not from this output:");
+             output.contentAfter.empty()
+                 ? "After the run, an empty file is there."
+                 : "After the run, a file is there that this output did not write:");
     if (!output.contentAfter.empty()) {
         addContent(page, output.contentAfter);
     }

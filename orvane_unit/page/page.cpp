@@ -74,14 +74,14 @@ void addDocument(Markup& page, const std::vector<PageUnit>& units, const std::st
     const Element body(page, "body");
     {
         const Element header(page, "header");
-        page.add("h1", "What orvane " + optionsText(letters) + " leaves, and why");
-        page.add("p", "Before a run; nothing was written.");
+        page.add("h1", "What orvane " + optionsText(letters) + " writes, and why");
+        page.add("p", "The unit as it was before a run. Nothing was written to it.");
         if (isRedacted) {
             page.add(
                 "p", {{"class", "redacted"}},
-                "Serials are replaced by X. The CRC, the size of the disk and places on it are "
-                "those of the copy without the serial, and what stood at the outputs is left "
-                "out.");
+                "Serials are replaced by X. The CRC, the size of the disk and the places on it are "
+                "those of the copy without the serial. What was at the outputs before the run is "
+                "left out.");
         }
     }
     {

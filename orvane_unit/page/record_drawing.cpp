@@ -123,15 +123,14 @@ std::vector<Part> namedParts(const DecodedRecords& records, const Contents& cont
     return parts;
 }
 
-/// The same, and between them what belongs to nothing.
+/// The same, and between them what is unused.
 std::vector<Part> allParts(const DecodedRecords& records, const TuningArea& tuning) {
     const Contents contents(records, tuning);
     std::vector<Part> parts;
     std::uint64_t done = 0;
     const auto addGap = [&parts, &done, &contents](std::uint64_t end) {
         if (done < end) {
-            parts.push_back(
-                {done, end, NOTHING, "belongs to nothing", "", {}, contents.rest(done, end)});
+            parts.push_back({done, end, NOTHING, "unused", "", {}, contents.rest(done, end)});
         }
     };
     for (Part& part : namedParts(records, contents)) {

@@ -94,7 +94,7 @@ void addRest(Markup& page, const DecodedRecords& records) {
     if (records.rest.empty()) {
         return;
     }
-    page.add("p", "Not zero, and belonging to nothing:");
+    page.add("p", "Bytes that are not zero, at unused places:");
     const Element list(page, "ul", {{"class", "rest"}});
     std::size_t done = 0;
     for (const auto& [offset, bytes] : records.rest) {
@@ -113,7 +113,7 @@ void addRest(Markup& page, const DecodedRecords& records) {
 const char* sentenceOf(CrcVerdict verdict) {
     switch (verdict) {
     case CrcVerdict::computed:
-        return "the disk has none to compare it with";
+        return "the disk stores no CRC to compare it with";
     case CrcVerdict::blank:
         return "the records are all zero";
     case CrcVerdict::ambiguous:

@@ -51,9 +51,7 @@ std::vector<Trouble> troublesOf(const Output& output) {
         }
         const auto same =
             std::find_if(troubles.begin(), troubles.end(), [&row](const Trouble& other) {
-                return other.isLeftOut == row.isLeftOut &&
-                       other.origin->reasons == row.origin->reasons &&
-                       placeText(*other.origin) == placeText(*row.origin);
+                return other.isLeftOut == row.isLeftOut && saysTheSame(*other.origin, *row.origin);
             });
         if (same == troubles.end()) {
             troubles.push_back({row.origin, row.isLeftOut, row.number, 1});
@@ -115,10 +113,10 @@ std::string summaryOf(const Explanation& explanation) {
     const auto good = static_cast<std::size_t>(
         std::count_if(explanation.begin(), explanation.end(),
                       [](const Output& output) { return isIntended(output); }));
-    return good == explanation.size()
-               ? "All outputs are as intended."
-               : std::to_string(explanation.size() - good) + " of " +
-                     kit::counted(explanation.size(), "output") + " not as intended.";
+    const std::size_t bad = explanation.size() - good;
+    return bad == 0 ? "All outputs are as intended."
+                    : std::to_string(bad) + " of " + kit::counted(explanation.size(), "output") +
+                          (bad == 1 ? " is" : " are") + " not as intended.";
 }
 
 } // namespace

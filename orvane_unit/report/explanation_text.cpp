@@ -6,6 +6,7 @@
 #include "orvane_unit/explain/place.h"
 #include "orvane_unit/explain/reasons.h"
 #include "orvane_unit/report/names.h"
+#include "orvane_unit/report/phrases.h"
 #include "orvane_unit/report/place_text.h"
 #include "orvane_unit/report/terminal.h"
 
@@ -42,7 +43,7 @@ std::string lineText(const Line& line) {
                kit::counted(line.text.size(), "byte");
     }
     if (line.text.empty()) {
-        return "(left out)";
+        return LEFT_OUT;
     }
     return kit::printable(line.text.substr(0, line.text.size() - 1)); // without its line end
 }
@@ -59,10 +60,6 @@ std::string originText(const Origin& origin, std::set<Reason>& said) {
         }
     }
     return kit::printable(text);
-}
-
-bool saysTheSame(const Origin& one, const Origin& other) {
-    return one.reasons == other.reasons && placeText(one) == placeText(other);
 }
 
 /// A line of the report: the text of one or more lines of the output, and their origin.

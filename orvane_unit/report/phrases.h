@@ -12,6 +12,9 @@
 
 namespace orvane::desk {
 
+/// Stands where a line would be that was left out.
+constexpr char LEFT_OUT[] = "(left out)";
+
 /// "0x00ff": at least `digits` digits.
 std::string hexNumber(std::uint32_t number, unsigned digits);
 

@@ -82,4 +82,8 @@ std::string placeText(const Origin& origin) {
     return std::visit(PlaceText{origin.key}, origin.place);
 }
 
+bool saysTheSame(const Origin& one, const Origin& other) {
+    return one.reasons == other.reasons && placeText(one) == placeText(other);
+}
+
 } // namespace orvane::desk

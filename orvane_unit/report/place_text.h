@@ -15,4 +15,7 @@ std::string holderText(const kit::ValueKey& key);
 /// own text. Bytes of the unit are not escaped.
 std::string placeText(const Origin& origin);
 
+/// Whether two values have the same place and reasons, as those of a block of zeros.
+bool saysTheSame(const Origin& one, const Origin& other);
+
 } // namespace orvane::desk

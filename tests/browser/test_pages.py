@@ -33,9 +33,9 @@ def bytes_of(table: list[dict[str, Any]]) -> bytes:
 
 def left_by(output: dict[str, Any]) -> bytes | None:
     """What the page says is at the output's path after a run; None if it is no file."""
-    if output["left"] == "There after the run: an empty file.":
+    if output["left"] == "After the run, an empty file is there.":
         return b""
-    if output["left"].startswith("There after the run: "):
+    if output["left"].endswith(" is there."):
         return None
     return bytes_of(output["tables"][-1])
 

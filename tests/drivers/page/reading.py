@@ -13,10 +13,10 @@ from drivers.explain.value_reasons import Line
 from drivers.page.markup import BadMarkup, Element, shown
 
 STATES = ("generated", "stock", "empty", "kept", "not-asked")
-THERE = re.compile(r"There after the run(?:: (.+)\.|, and not from this output:)")
+THERE = re.compile(r"After the run, (?:(.+) is there\.|a file is there that this output did not write:)")
 CUT = re.compile(r"\((\d+) more bytes?\)")
-MORE = re.compile(r"\d+ more lines? of (\d+) bytes? in all: ")
-KINDS = {"missing": "nothing", "folder": "folder", "device": "other", "an empty file": "file"}
+MORE = re.compile(r"\d+ more lines? \((\d+) bytes?\): ")
+KINDS = {"nothing": "nothing", "a folder": "folder", "a device": "other", "an empty file": "file"}
 DETAIL = re.compile(r"byte (\d+), (?:(\d) bytes, )?group (\d), raw (\d+|none), default (-?\d+)"
                     r"(?:, mask (0x[0-9a-f]{8}))?(?:: (.*))?")
 

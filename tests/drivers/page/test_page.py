@@ -58,11 +58,11 @@ class Reading(unittest.TestCase):
 
     def test_what_is_left(self) -> None:
         for said, left, content in (
-                ("There after the run: missing.", "nothing", None),
-                ("There after the run: a folder.", None, None),
-                ("There after the run: folder.", "folder", None),
-                ("There after the run: device.", "other", None),
-                ("There after the run: an empty file.", "file", b"")):
+                ("After the run, nothing is there.", "nothing", None),
+                ("After the run, folder is there.", None, None),
+                ("After the run, a folder is there.", "folder", None),
+                ("After the run, a device is there.", "other", None),
+                ("After the run, an empty file is there.", "file", b"")):
             with self.subTest(said):
                 more = f'<p class="left">{said}</p>'
                 if left is None:
@@ -73,7 +73,7 @@ class Reading(unittest.TestCase):
                 self.assertEqual((output.left, output.content), (left, content))
 
     def test_content_of_another_output(self) -> None:
-        more = ('<p class="left">There after the run, and not from this output:</p><table class="left"><tbody>'
+        more = ('<p class="left">After the run, a file is there that this output did not write:</p><table class="left"><tbody>'
                 '<tr><td><code>old</code></td></tr></tbody></table>')
         output, = reading.outputs(unit(LINES, more))
         self.assertEqual(output.content, b"old\n")
@@ -82,7 +82,7 @@ class Reading(unittest.TestCase):
     def test_what_is_cut_is_completed(self) -> None:
         cut = LINES.replace('c</code><small class="sign">(no line end)</small>',
                             'c</code><small class="sign">(2 more bytes)</small>')
-        output, = reading.outputs(unit(cut, '<p class="more">2 more lines of 5 bytes in all: see that</p>'))
+        output, = reading.outputs(unit(cut, '<p class="more">2 more lines (5 bytes): see that</p>'))
         self.assertEqual((output.lines_cut, output.content_cut), (8, 8))
         rest = b"<b>\ncde\nfg\nhi"
         whole = Output("/tmp/a", "generated", False, ("template-empty",),
@@ -96,9 +96,9 @@ class Reading(unittest.TestCase):
                 reading.completed(output, wrong)
 
     def test_cut_content_of_another_output(self) -> None:
-        more = ('<p class="left">There after the run, and not from this output:</p><table class="left"><tbody>'
+        more = ('<p class="left">After the run, a file is there that this output did not write:</p><table class="left"><tbody>'
                 '<tr><td><code>old</code></td></tr></tbody></table>'
-                '<p class="more">1 more line of 1 byte in all: see that</p>')
+                '<p class="more">1 more line (1 byte): see that</p>')
         output, = reading.outputs(unit(LINES, more))
         self.assertEqual((output.lines_cut, output.content_cut), (0, 1))
 

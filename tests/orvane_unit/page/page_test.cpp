@@ -182,11 +182,11 @@ TEST(PageTest, WhatIsLeftByAnEarlierRunIsShown) {
     });
     const std::string output =
         partOf(page, "data-path=\"" + std::string(TELEPHONY_TUNING_FILE) + "\"", "</section>");
-    EXPECT_TRUE(holds(output, "There after the run, and not from this output:"));
+    EXPECT_TRUE(holds(output, "After the run, a file is there that this output did not write:"));
     EXPECT_TRUE(holds(output, "<code>of an earlier run</code>"));
     const std::string other =
         partOf(page, "data-path=\"" + std::string(SPEECHREC_TUNING_FILE) + "\"", "</section>");
-    EXPECT_TRUE(holds(other, "There after the run: missing."));
+    EXPECT_TRUE(holds(other, "After the run, nothing is there."));
 }
 
 TEST(PageTest, ImageHasACellForEachByte) {
@@ -215,7 +215,9 @@ TEST(PageTest, CellsPastTheEndOfAShortImageAreMarked) {
     EXPECT_EQ(countOf(image, "<code>--</code>"), 179U - 134);
     const std::string none = sectionOf(
         pageOf([](kit::UnitDescription& unit) { unit.absent = {CONFIG_SHM_NAME}; }), "image");
-    EXPECT_TRUE(holds(none, "0 bytes: the configuration image can&#39;t be opened."));
+    EXPECT_TRUE(holds(none,
+                      "There is no usable image: the configuration image can&#39;t be opened. "
+                      "The tool&#39;s own defaults hold."));
     EXPECT_EQ(countOf(none, "past the end</span>"), 179U);
 }
 
@@ -226,8 +228,8 @@ TEST(PageTest, RecordAreaIsDrawnAndListed) {
     EXPECT_TRUE(holds(records, "<title>slot 9: 8 bytes at 129</title>"));
     EXPECT_TRUE(holds(records, "<title>auxiliary area: 1024 bytes at 3072</title>"));
     EXPECT_TRUE(holds(records, "<title>tuning block 9: 188 bytes at 5788</title>"));
-    EXPECT_TRUE(holds(records, "<title>belongs to nothing: 2048 bytes at 137</title>"));
-    EXPECT_TRUE(holds(records, "<title>belongs to nothing: 1040384 bytes at 8192</title>"));
+    EXPECT_TRUE(holds(records, "<title>unused: 2048 bytes at 137</title>"));
+    EXPECT_TRUE(holds(records, "<title>unused: 1040384 bytes at 8192</title>"));
     const std::string table = partOf(records, "<table class=\"slots\"", "</table>");
     EXPECT_TRUE(holds(itemOf(table, "tr", "slot.9"), "<code>53 4e 30 30 34 32 31 37</code>"));
     EXPECT_TRUE(holds(itemOf(table, "tr", "slot.16"), "<code>&lt;line&gt; 7</code>"));
@@ -264,14 +266,14 @@ TEST(PageTest, PartsOfTheRecordAreaHaveTheirContent) {
     EXPECT_EQ(contentOfPart(records, "tuning block 7: 188 bytes at 5412"),
               "32 bytes not zero, the first at 5412: 78 00 79" + repeated(" 7a", 29) + " ...");
     EXPECT_EQ(contentOfPart(records, "tuning block 6: 188 bytes at 5224"), "zeros");
-    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 2048 bytes at 137"),
+    EXPECT_EQ(contentOfPart(records, "unused: 2048 bytes at 137"),
               "4 bytes not zero, the first at 200: 6e 6f 74 65");
-    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 856 bytes at 2216"),
+    EXPECT_EQ(contentOfPart(records, "unused: 856 bytes at 2216"),
               "1 byte not zero, the first at 2216: 6e");
     EXPECT_EQ(
         contentOfPart(records, "rest of the tuning area, which nothing reads: 2216 bytes at 5976"),
         "35 bytes not zero, the first at 6000: 6e" + repeated(" 6e", 31) + " ...");
-    EXPECT_EQ(contentOfPart(records, "belongs to nothing: 1040384 bytes at 8192"), "zeros");
+    EXPECT_EQ(contentOfPart(records, "unused: 1040384 bytes at 8192"), "zeros");
 }
 
 TEST(PageTest, DrawingHasColoursWithoutTheStyle) {
@@ -293,12 +295,12 @@ TEST(PageTest, BytesThatBelongToNothingAreShown) {
                                               }
                                           }),
                                           "records");
-    EXPECT_TRUE(holds(records, "Not zero, and belonging to nothing:"));
+    EXPECT_TRUE(holds(records, "Bytes that are not zero, at unused places:"));
     EXPECT_TRUE(holds(itemOf(records, "li", "disk.bytes.1048776"),
                       "4 bytes at 200: \n<code>6e 6f 74 65</code>"));
     EXPECT_TRUE(holds(itemOf(records, "li", "disk.bytes.1057576"), "78</code> ..."));
     EXPECT_TRUE(holds(records, "<li>5 more places</li>"));
-    EXPECT_FALSE(holds(sectionOf(pageOf(unchanged), "records"), "belonging to nothing"));
+    EXPECT_FALSE(holds(sectionOf(pageOf(unchanged), "records"), "unused places"));
 }
 
 TEST(PageTest, DiskThatCannotBeReadIsSaid) {
@@ -363,6 +365,8 @@ TEST(PageTest, WithoutAVersionTheDigitsAreThoseForNone) {
         pageOf([](kit::UnitDescription& unit) { unit.files.erase("/fs/rwdata/.Version/app.inf"); }),
         "versions");
     EXPECT_TRUE(holds(none, "There is no version description file."));
+    EXPECT_TRUE(holds(none, "<p class=\"summary\">There is no version; its digits are "));
+    EXPECT_FALSE(holds(none, "version-text"));
     EXPECT_TRUE(holds(none, "no file is chosen, so the digits are those for no version: "
                             "\n<code>000000</code>"));
     const std::string na = sectionOf(pageOf([](kit::UnitDescription& unit) {
@@ -387,10 +391,10 @@ TEST(PageTest, LinesThatAreTooManyAreCounted) {
     EXPECT_FALSE(holds(whole, "more line"));
     const std::string begin = outputPage(repeated("x\n", desk::Room::MOST_TEXTS + 1));
     EXPECT_EQ(countOf(begin, "<code>x</code>"), desk::Room::MOST_TEXTS);
-    EXPECT_TRUE(holds(begin, "<p class=\"more\">1 more line of 2 bytes in all: see "
+    EXPECT_TRUE(holds(begin, "<p class=\"more\">1 more line (2 bytes): see "
                              "\n<code>orvane-unit explain --json --content</code></p>"));
     EXPECT_TRUE(holds(outputPage(repeated("x\n", desk::Room::MOST_TEXTS + 1) + "abc"),
-                      "2 more lines of 5 bytes in all: "));
+                      "2 more lines (5 bytes): "));
 }
 
 TEST(PageTest, LineThatIsTooLongIsCut) {
@@ -398,7 +402,7 @@ TEST(PageTest, LineThatIsTooLongIsCut) {
     EXPECT_FALSE(holds(outputPage(longest + "\n"), "more byte"));
     const std::string cut = outputPage(longest + "yz\nnext");
     EXPECT_TRUE(holds(cut, "xxx</code>\n<small class=\"sign\">(2 more bytes)</small></td>"));
-    EXPECT_TRUE(holds(cut, "1 more line of 4 bytes in all: "));
+    EXPECT_TRUE(holds(cut, "1 more line (4 bytes): "));
 }
 
 /// The part of a page about so many version files, of which `chosen` counts.
@@ -515,8 +519,7 @@ TEST(PageTest, ImpactsOnOtherOutputsThanTheRunsAreLeftOut) {
     const std::string impacts = sectionOf(desk::pageText({unit}, "a"), "impacts");
     EXPECT_TRUE(holds(impacts, "param.139"));
     EXPECT_FALSE(holds(impacts, "param.36"));
-    EXPECT_TRUE(
-        holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing here."));
+    EXPECT_TRUE(holds(impacts, "1 input changes the lines below; 1 changes nothing."));
 }
 
 TEST(PageTest, ImpactsAreAMatrix) {
@@ -532,8 +535,7 @@ TEST(PageTest, ImpactsAreAMatrix) {
     EXPECT_TRUE(holds(itemOf(impacts, "tr", "param.139"),
                       "<td>16 of 17</td>\n<td class=\"changed\">5, 12</td>"
                       "\n<td class=\"changed\">all</td>"));
-    EXPECT_TRUE(
-        holds(impacts, "1 input changed lines, with these numbers; 1 changed nothing here."));
+    EXPECT_TRUE(holds(impacts, "1 input changes the lines below; 1 changes nothing."));
     EXPECT_FALSE(holds(desk::pageText({fleetUnit("a", "M", "1")}, "ai"), "class=\"impacts\""));
 }
 
