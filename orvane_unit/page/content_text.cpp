@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/content_text.h"
 
-#include "kit/host/bytes.h"
 #include "kit/host/text.h"
 
 #include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <map>
+#include <type_traits>
 
 namespace orvane::desk {
 

@@ -5,6 +5,7 @@
 #include "orvane_unit/report/place_text.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace orvane::desk {
 

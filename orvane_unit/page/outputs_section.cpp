@@ -64,15 +64,15 @@ void addRows(Markup& page, OutputRows& rows, Room& room) {
     const WideTable table(page, "lines");
     addTitles(page, {"line", "text", "origin"});
     std::optional<Element> body; // of neighbours with the same reasons, which are given once
-    const std::vector<Reason>* reasons = nullptr;
+    const std::vector<Reason>* common = nullptr;
     std::set<Reason> said;
     for (OutputRow row; !room.isUsedUp() && rows.next(row);) {
-        if (reasons == nullptr || *reasons != row.origin->reasons) {
-            reasons = &row.origin->reasons;
-            body.emplace(page, "tbody", Attributes{{"data-reasons", codesText(*reasons)}});
+        if (common == nullptr || *common != row.origin->reasons) {
+            common = &row.origin->reasons;
+            body.emplace(page, "tbody", Attributes{{"data-reasons", codesText(*common)}});
         }
         const Element line(page, "tr",
-                           {{"class", isIntended(*reasons) ? "" : "fallback"},
+                           {{"class", isIntended(*common) ? "" : "fallback"},
                             {"data-key", keyText(row.origin->key)}});
         addLine(page, row, room);
         page.add("td", originText(*row.origin, said));

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/page/page_units.h"
 
-#include "identity/inf_file.h"
 #include "kit/description/parse_description.h"
 #include "kit/description/unit_description.h"
 #include "kit/host/bytes.h"

@@ -12,6 +12,7 @@
 #include "tuning/dps_block.h"
 
 #include <algorithm>
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <map>

@@ -70,17 +70,16 @@ void addFile(Markup& page, const VersionFiles& versions, std::size_t index, Room
 
 /// Adds the files as far as there is room for them, and the chosen one in any case.
 void addFiles(Markup& page, const VersionFiles& versions) {
-    Room room;
-    Room chosenRoom;
+    std::array<Room, 2> rooms; // of the others, and of the chosen one
     std::size_t left = 0;
     {
         const Element files(page, "ol", {{"class", "version-files"}});
         for (std::size_t i = 0; i < versions.files.size(); ++i) {
-            Room& own = versions.chosen == i ? chosenRoom : room;
-            if (own.isUsedUp()) {
+            Room& room = rooms.at(versions.chosen == i ? 1 : 0);
+            if (room.isUsedUp()) {
                 ++left;
             } else {
-                addFile(page, versions, i, own);
+                addFile(page, versions, i, room);
             }
         }
     }

@@ -19,9 +19,10 @@ return [...document.querySelectorAll(".unit")].map(unit => [...unit.querySelecto
     path: output.dataset.path,
     state: output.querySelector(".state").textContent,
     left: output.querySelector("p.left")?.textContent ?? "",
-    tables: [...output.querySelectorAll("table.lines")].map(table => [...table.tBodies[0].rows].map(row => ({
-        code: row.querySelector("code")?.textContent,
-        sign: row.querySelector(".sign")?.textContent ?? ""})))})))
+    tables: [...output.querySelectorAll("table.lines")].map(table =>
+        [...table.querySelectorAll("tbody tr")].map(row => ({
+            code: row.querySelector("code")?.textContent,
+            sign: row.querySelector(".sign")?.textContent ?? ""})))})))
 """
 
 
