@@ -362,21 +362,25 @@ function completeUnits() {
 
 const inOrder = new Intl.Collator("en", {numeric: true}).compare;
 
-function textAt(row, column) {
-    return row.cells[column].textContent.trim();
+/** The value of a cell, without the signs below it. The first cell of a row has a link. */
+function valueOf(cell) {
+    return cell.firstChild.textContent.trim();
 }
 
-/** Sorts the rows by a column, upwards first. Rows that are equal keep their order. */
+/** Sorts the rows by a column, upwards first. Rows that are equal there keep their order. */
 function sortBy(table, column) {
     const heads = [...table.tHead.rows[0].cells];
-    const isUp = heads[column].getAttribute("aria-sort") !== "ascending";
-    for (const head of heads) {
-        head.removeAttribute("aria-sort");
+    const head = heads[column];
+    const isUp = head.getAttribute("aria-sort") !== "ascending";
+    for (const other of heads) {
+        other.removeAttribute("aria-sort");
     }
-    heads[column].setAttribute("aria-sort", isUp ? "ascending" : "descending");
+    head.setAttribute("aria-sort", isUp ? "ascending" : "descending");
+    const isNumber = head.dataset.order === "number";
+    const compare = isNumber ? (a, b) => Number(a.value) - Number(b.value) : (a, b) => inOrder(a.value, b.value);
     const body = table.tBodies[0];
-    const rows = [...body.rows].map(row => ({row, text: textAt(row, column)}));
-    rows.sort((a, b) => isUp ? inOrder(a.text, b.text) : inOrder(b.text, a.text));
+    const rows = [...body.rows].map(row => ({row, value: valueOf(row.cells[column])}));
+    rows.sort(isUp ? compare : (a, b) => compare(b, a));
     body.append(...rows.map(each => each.row));
 }
 

@@ -116,6 +116,20 @@ class ReasonsTest(PagesTestCase):
         self.check_no_trouble()
 
 
+class DefaultsTest(PagesTestCase):
+    def test_a_default_does_not_look_like_what_was_read(self) -> None:
+        """A serial on a disk that is the tool's default for one without a disk."""
+        without = units.make(self.folder / "without", units.GOLDEN / "tuning-disk-absent/unit.toml")
+        self.browser.open(units.report(self.folder / "page.html", units.make(self.folder / "sample"), without))
+        good, bad = (row.find_elements(By.CSS_SELECTOR, "td")[4] for row in self.browser.all("#fleet tbody tr"))
+        self.assertEqual(good.text, "SN004217")
+        self.assertTrue(bad.text.endswith("\ndefault, not read"), bad.text)
+        sign = self.browser.run("return getComputedStyle(arguments[0], '::before').content",
+                                bad.find_element(By.CSS_SELECTOR, ".sign"))
+        self.assertIn("\u26a0", sign)
+        self.check_no_trouble()
+
+
 class FleetTest(PagesTestCase):
     """200 units: a table of them first."""
 
@@ -140,10 +154,23 @@ class FleetTest(PagesTestCase):
     def head(self, title: str) -> WebElement:
         return next(head for head in self.browser.all("#fleet thead th") if head.text.split("\n")[0] == title)
 
-    def column(self, title: str) -> list[str]:
+    def sort_by(self, title: str) -> None:
+        """Upwards."""
+        head = self.head(title)
+        button = head.find_element(By.CSS_SELECTOR, "button")
+        button.click()
+        if head.get_attribute("aria-sort") != "ascending":
+            button.click()
+
+    def column(self, title: str, selector: str = "*") -> list[str]:
+        """The texts of its cells that the selector matches."""
         titles = self.browser.run(
             "return [...document.querySelectorAll('#fleet thead th')].map(head => head.textContent.trim())")
-        return [row[titles.index(title)] for row in self.rows()]
+        at = titles.index(title)
+        matched = self.browser.run(
+            "return [...document.querySelectorAll('#fleet tbody tr')].filter(row => row.checkVisibility())"
+            ".map(row => row.cells[arguments[0]].matches(arguments[1]))", at, selector)
+        return [row[at] for row, is_matched in zip(self.rows(), matched) if is_matched]
 
     def type_filter(self, text: str) -> None:
         box = self.browser.one("#filter")
@@ -166,6 +193,35 @@ class FleetTest(PagesTestCase):
                 self.assertEqual(self.column(title), sorted(self.column(title), reverse=True))
                 self.assertEqual(len(self.browser.all("#fleet [aria-sort]")), 1)
         self.assertEqual(sorted(self.rows()), before)
+
+    def test_numbers_are_sorted_by_their_values(self) -> None:
+        self.sort_by("CRC")
+        crcs = [int(crc, 16) for crc in self.column("CRC")]
+        self.assertGreater(len(set(crcs)), 100)
+        self.assertEqual(crcs, sorted(crcs))
+
+    def test_rows_that_are_equal_keep_their_order(self) -> None:
+        for direction in ("ascending", "descending"):
+            with self.subTest(direction):
+                self.sort_by("unit")
+                self.sort_by("model")
+                self.sort_by("brand")
+                if direction == "descending":
+                    self.head("brand").find_element(By.CSS_SELECTOR, "button").click()
+                found = list(zip(self.column("brand"), self.column("model"), self.column("unit")))
+                self.assertEqual(self.head("brand").get_attribute("aria-sort"), direction)
+                self.assertEqual(found, sorted(sorted(found), key=lambda row: row[0],
+                                               reverse=direction == "descending"))
+
+    def test_what_another_value_is_more_frequent_than_is_marked(self) -> None:
+        for title in ("brand", "model", "serial", "airplay.conf"):
+            with self.subTest(title):
+                values = self.column(title)
+                most = max(map(values.count, values))
+                self.assertEqual(self.column(title, ".rare"),
+                                 [value for value in values if values.count(value) < most])
+        self.assertEqual(self.column("serial", ".rare"), [])
+        self.assertNotEqual(self.column("brand", ".rare"), [])
 
     def test_filtering_keeps_rows_with_every_word(self) -> None:
         every = self.rows()

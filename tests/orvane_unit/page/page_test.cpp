@@ -506,10 +506,36 @@ TEST(PageTest, FleetHasARowForEachUnitAndMarksRareValues) {
     EXPECT_TRUE(holds(fleet, "<td>3 not-asked</td>"));
 }
 
-TEST(PageTest, NothingIsRareAmongHalves) {
-    const std::string page =
+TEST(PageTest, NothingIsRareAmongTheMostFrequent) {
+    const std::string halves =
         desk::pageText({fleetUnit("a", "M", "1"), fleetUnit("b", "N", "2")}, "ai");
-    EXPECT_FALSE(holds(page, " rare\""));
+    EXPECT_FALSE(holds(halves, " rare\""));
+    const std::string fleet = desk::pageText({fleetUnit("a", "M", "1"), fleetUnit("b", "N", "2"),
+                                              fleetUnit("c", "M", "3"), fleetUnit("d", "N", "4"),
+                                              fleetUnit("e", "O", "5")},
+                                             "ai");
+    EXPECT_EQ(countOf(fleet, " rare\""), 1U);
+    EXPECT_TRUE(holds(fleet, "<td class=\"value rare\">O"));
+}
+
+TEST(PageTest, FleetTellsDefaultsFromWhatWasRead) {
+    PageUnit unread = fleetUnit("b", "M", "00000000");
+    unread.decoded.records.slots.at(9).bytes.reset();
+    unread.decoded.image.params.at(139 - 1).raw.reset();
+    unread.decoded.records.crcVerdict = desk::CrcVerdict::unreadable;
+    PageUnit odd = fleetUnit("c", "M", "");
+    odd.decoded.image.params.at(139 - 1).raw = 200;
+    odd.decoded.versions.version = "";
+    const std::string page = desk::pageText({fleetUnit("a", "M", "00000000"), unread, odd}, "ai");
+    const std::string fleet = partOf(page, "<section id=\"fleet\"", "</section>");
+    EXPECT_EQ(countOf(fleet, "default, not read"), 2U);
+    EXPECT_TRUE(holds(fleet, "<td class=\"value\">00000000</td>"));
+    EXPECT_TRUE(holds(fleet, "<td class=\"value fallback\">00000000\n"
+                             "<span class=\"sign\">default, not read</span></td>"));
+    EXPECT_TRUE(holds(fleet, "default, no model has code 200"));
+    EXPECT_TRUE(holds(fleet, "<span class=\"sign\">empty</span>"));
+    EXPECT_TRUE(holds(fleet, "<span class=\"sign\">none found</span>"));
+    EXPECT_TRUE(holds(fleet, "<span class=\"sign\">unreadable</span>"));
 }
 
 TEST(PageTest, ImpactsOnOtherOutputsThanTheRunsAreLeftOut) {
