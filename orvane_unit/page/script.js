@@ -97,17 +97,16 @@ function openPanelOf(element) {
 
 // --- Lighting up what belongs together ---------------------------------------------------------------
 
-/** The keys that belong to a key: itself, and for a field of a tuning block the block. */
-function relatedKeys(key) {
-    const field = /^(tuning\.\d+)\../.exec(key);
-    return field ? [key, field[1]] : [key];
+/** The key of the whole that a value belongs to: the first two parts of its own. Often it is the value itself. */
+function wholeOf(key) {
+    return key.split(".", 2).join(".");
 }
 
-/** The elements of each key of a unit. */
+/** For each key of a unit the elements that show the value or, if it is a whole, something of it. */
 function elementsByKey(unit) {
     const found = new Map();
-    for (const element of unit.querySelectorAll("[data-key]:not([data-key=''])")) {
-        for (const key of relatedKeys(element.dataset.key)) {
+    for (const element of unit.querySelectorAll("[data-key]")) {
+        for (const key of new Set([element.dataset.key, wholeOf(element.dataset.key)])) {
             if (!found.has(key)) {
                 found.set(key, []);
             }
@@ -119,15 +118,20 @@ function elementsByKey(unit) {
 
 const keysOf = new WeakMap(); // the elements by key of a unit, made when they are first needed
 
-/** Everything that shows the same value as the element, itself included, in the order of the page. */
+/**
+ * Everything that shows the element's value, itself included, a part of the value or the whole that it belongs
+ * to, in the order of the page.
+ */
 function partners(element) {
     const unit = element.closest(".unit");
     if (!keysOf.has(unit)) {
         keysOf.set(unit, elementsByKey(unit));
     }
-    const keys = relatedKeys(element.dataset.key);
-    return keys.flatMap((key, i) =>
-        keysOf.get(unit).get(key)?.filter(other => i === 0 || other.dataset.key === key) ?? []);
+    const key = element.dataset.key;
+    const whole = wholeOf(key);
+    const same = keysOf.get(unit).get(key);
+    const wholes = whole === key ? [] : keysOf.get(unit).get(whole).filter(other => other.dataset.key === whole);
+    return [...same, ...wholes];
 }
 
 let lit = []; // what is lit now
@@ -149,8 +153,7 @@ function light(element) {
 
 /** The element with a key that an event is about, if any. */
 function keyed(event) {
-    const element = event.target.closest?.(".unit [data-key]");
-    return element?.dataset.key ? element : null;
+    return event.target.closest?.(".unit [data-key]") ?? null;
 }
 
 /** Brings the partners of the element into view: the first line, and the first other one. */

@@ -27,7 +27,7 @@ class OneUnitTest(BrowserTestCase):
         folder = tempfile.TemporaryDirectory(prefix="orvane page-")
         cls.addClassCleanup(folder.cleanup)
         root = units.make(Path(folder.name) / "sample")
-        cls.page = units.report(Path(folder.name) / "a page.html", root)
+        cls.page = units.report(Path(folder.name) / "a page.html", root, options=("--impact",))
 
     def setUp(self) -> None:
         super().setUp()
@@ -111,6 +111,16 @@ class OneUnitTest(BrowserTestCase):
     def test_a_field_lights_up_its_block_in_the_drawing(self) -> None:
         self.browser.point_at(self.line("tuning.3.qwaAECSwitch"))
         self.assertEqual(set(self.browser.run(LIT)), {"tuning.3.qwaAECSwitch", "tuning.3"})
+
+    def test_a_byte_lights_up_with_its_slot_both_ways(self) -> None:
+        row = ".matrix [data-key='slot.9.0']"
+        self.browser.point_at(self.browser.one(row))
+        self.assertEqual(set(self.browser.run(LIT)), {"slot.9.0", "slot.9"})
+        self.assertTrue(self.browser.all(".lines tr.lit"))
+        self.assertTrue(self.browser.all(".part.lit"))
+        self.browser.point_at(self.browser.one(".slots [data-key='slot.9']"))
+        self.assertTrue(self.browser.all(f"{row}.lit"))
+        self.assertLessEqual(set(self.browser.run(LIT)), {"slot.9", *(f"slot.9.{byte}" for byte in range(8))})
 
     def test_nothing_stays_lit_when_the_pointer_leaves(self) -> None:
         self.browser.point_at(self.browser.one(f".cell[data-key='{MODEL}']"))
