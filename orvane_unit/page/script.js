@@ -173,12 +173,12 @@ function reveal(element) {
 function followPointerAndFocus() {
     document.addEventListener("pointerover", event => {
         const element = keyed(event);
-        light(element ?? document.activeElement.closest(".unit [data-key]:not([data-key=''])"));
-        showDetail(element);
+        light(element ?? document.activeElement.closest(".unit [data-key]"));
+        showDetail(event);
     });
     document.addEventListener("focusin", event => {
         light(keyed(event));
-        showDetail(keyed(event));
+        showDetail(event);
     });
     document.addEventListener("focusout", () => light(null));
     document.addEventListener("click", event => {
@@ -197,33 +197,37 @@ function followPointerAndFocus() {
 
 // --- Details of bytes and slots ------------------------------------------------------------------------
 
+/** The bytes of a slot or the auxiliary area as a text, which stands in the table. */
+function slotText(part) {
+    const row = part.dataset.key && partners(part).find(other => other.matches(".slots tr"));
+    const text = row?.cells[4]?.textContent;
+    return text ? `, as text ${text}` : "";
+}
+
 /** What a cell of the image or a part of the drawing stands for, in words. */
 function detailText(element) {
-    if (element.matches(".cell")) {
-        return `Parameter ${element.querySelector("b").textContent}, ${element.querySelector("small").textContent}`;
-    }
-    const row = partners(element).find(other => other.matches(".slots tr"));
-    const content = row && [...row.cells].slice(3).map(cell => cell.textContent.trim()).filter(Boolean).join(", as text ");
-    return element.querySelector("title").textContent + (content ? `: ${content}` : "");
+    const textOf = selector => element.querySelector(selector).textContent;
+    return element.matches(".cell") ? `Parameter ${textOf("b")}, ${textOf("small")}` :
+        `${textOf("title")}: ${textOf("desc")}${slotText(element)}`;
 }
 
 /** Shows the details of a cell or a part at the place for them. Others leave what is there. */
-function showDetail(element) {
-    const place = element?.matches(".cell, .part") && element.closest("section").querySelector(".details");
-    if (place) {
-        place.textContent = detailText(element);
+function showDetail(event) {
+    const element = event.target.closest?.(".cell, .part");
+    if (element) {
+        element.closest("section").querySelector(".details").textContent = detailText(element);
     }
 }
 
 function makeDetails(unit) {
     for (const [shown, hint] of [[".cells", "Point at a byte, or move to it by the arrow keys, for its details."],
-                                 [".drawing", "Point at a part for its content."]]) {
-        // A screen reader has the same in each cell and in the table.
+                                 [".drawing", "Point at a part, or move to it by the arrow keys, for its content."]]) {
+        // A screen reader has the same in each cell and part.
         unit.querySelector(shown)?.after(make("p", {class: "details", "aria-hidden": "true"}, hint));
     }
 }
 
-// --- One stop of the Tab key for each table and for the image ---------------------------------------------
+// --- One stop of the Tab key for each table, the image and the drawing --------------------------------------
 
 /** The item below or above: in the nearest row that has another height, the one that is least aside. */
 function movedAcross(key, item, items) {
@@ -254,12 +258,13 @@ function makeGroup(group, items) {
         }
     };
     moveTo(items[0]);
-    group.addEventListener("focusin", event => {
+    const around = group.parentElement; // a drawing that listens to the focus would take it itself
+    around.addEventListener("focusin", event => {
         if (items.includes(event.target)) {
             moveTo(event.target);
         }
     });
-    group.addEventListener("keydown", event => {
+    around.addEventListener("keydown", event => {
         const index = items.indexOf(event.target);
         if (index < 0 || !isPlain(event)) {
             return;
@@ -273,25 +278,28 @@ function makeGroup(group, items) {
     });
 }
 
+/** A list of items to choose from. What is in an option is its name: its elements have no roles of their own. */
+function makeList(list, selector, name) {
+    const items = [...list.querySelectorAll(selector)];
+    list.setAttribute("role", "listbox");
+    list.setAttribute("aria-label", name);
+    for (const item of items) {
+        item.setAttribute("role", "option");
+    }
+    makeGroup(list, items);
+}
+
 function makeGroups(unit) {
     for (const table of unit.querySelectorAll("table")) {
-        const items = [...table.querySelectorAll("[data-key]:not([data-key=''])")];
+        const items = [...table.querySelectorAll("[data-key]")];
         if (items.length > 0) {
             table.setAttribute("role", "grid");
             table.setAttribute("aria-label", headingOf(table));
             makeGroup(table, items);
         }
     }
-    const cells = unit.querySelector(".cells");
-    const items = [...cells?.children ?? []];
-    if (items.length > 0) {
-        cells.setAttribute("role", "listbox");
-        cells.setAttribute("aria-label", "Bytes of the image");
-        for (const cell of items) {
-            cell.setAttribute("role", "option");
-        }
-        makeGroup(cells, items);
-    }
+    makeList(unit.querySelector(".cells"), ".cell", "Bytes of the image");
+    makeList(unit.querySelector(".drawing"), ".part", "Parts of the record area");
 }
 
 /** A box that scrolls and in which nothing takes the focus takes it itself. */

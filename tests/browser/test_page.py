@@ -131,14 +131,14 @@ class OneUnitTest(BrowserTestCase):
     def tab_to(self, selector: str) -> WebElement:
         for _ in range(60):
             self.browser.press(Keys.TAB)
-            if (element := self.browser.focused()).get_dom_attribute("data-key") and \
-                    self.browser.run("return arguments[0].matches(arguments[1])", element, selector):
+            element = self.browser.focused()
+            if self.browser.run("return arguments[0].matches(arguments[1])", element, selector):
                 return element
         raise AssertionError(f"60 stops of the Tab key, and none is {selector}")
 
     def test_keys_lead_from_a_line_to_its_source(self) -> None:
         self.open_output("airplay.conf")
-        line = self.tab_to(".lines tr")
+        line = self.tab_to(".lines [data-key]")
         self.assertEqual(line.get_attribute("data-key"), MODEL)
         self.check_lit(MODEL)
         self.browser.press(Keys.ARROW_DOWN)
@@ -179,8 +179,9 @@ class OneUnitTest(BrowserTestCase):
         stops = []
         for _ in range(3):
             self.browser.press(Keys.TAB)
-            stops.append(self.browser.run("return document.activeElement.closest('section').className"))
-        self.assertEqual(stops, ["records", "tuning", "versions"])
+            stops.append(self.browser.run(
+                "return document.activeElement.closest('.drawing, section').classList[0]"))
+        self.assertEqual(stops, ["drawing", "records", "tuning"])
 
     # --- Details
 
@@ -198,6 +199,35 @@ class OneUnitTest(BrowserTestCase):
         details = self.browser.one(".records .details").text
         for part in ("slot 9", "8 bytes at 129", "53 4e 30", "SN004217"):
             self.assertIn(part, details)
+
+    def test_each_part_of_the_drawing_shows_its_details_at_the_focus(self) -> None:
+        parts = self.browser.all(".part")
+        self.assertGreater(len(parts), 20)
+        self.assertTrue(self.browser.all(".part:not([data-key])"))
+        self.assertEqual(self.tab_to(".part"), parts[0])
+        for part in parts:
+            self.assertEqual(self.browser.focused(), part)
+            details = self.browser.run("return arguments[0].textContent", self.browser.one(".records .details"))
+            title, content = (self.browser.run("return arguments[0].querySelector(arguments[1]).textContent",
+                                               part, each) for each in ("title", "desc"))
+            self.assertNotEqual(content, "")
+            self.assertEqual(details.partition(", as text ")[0], f"{title}: {content}")
+            self.browser.press(Keys.ARROW_RIGHT)
+        self.browser.press(Keys.HOME)
+        self.assertEqual(self.browser.focused(), parts[0])
+
+    def test_a_part_that_belongs_to_nothing_replaces_the_details(self) -> None:
+        details = self.browser.one(".records .details")
+        for part in (".part[data-key='slot.9']", ".part.nothing", ".part.spare"):
+            before = details.text
+            self.browser.point_at(self.browser.all(part)[-1])
+            self.assertNotEqual(details.text, before)
+        self.assertIn("which nothing reads", details.text)
+
+    def test_each_part_of_the_drawing_is_an_option_with_a_name(self) -> None:
+        titles = self.browser.run("return [...document.querySelectorAll('.part title')].map(each => each.textContent)")
+        options = [name for role, name in self.browser.usable() if role == "option"]
+        self.assertEqual(options[-len(titles):], titles)
 
     # --- For everybody
 
