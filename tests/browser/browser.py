@@ -28,10 +28,17 @@ ARGUMENTS = (
 )
 WIDE = (1600, 1000)
 NARROW = (360, 800)
+PAPER = (717, 1046)  # A4 without the margins that the browser leaves
 PATIENCE = 120  # seconds: only a browser that hangs takes so long
 
 # The texts of a page that are shown, with the least contrast that each has with what is behind it.
 CONTRASTS = Path(__file__).with_name("contrasts.js").read_text(encoding="utf-8")
+# The texts of a page that can't be read whole.
+CUTS = Path(__file__).with_name("cuts.js").read_text(encoding="utf-8")
+
+
+def role_and_name(node: dict[str, Any]) -> tuple[str, str]:
+    return node.get("role", {}).get("value", ""), node.get("name", {}).get("value", "")
 
 
 class Browser:

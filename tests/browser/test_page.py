@@ -7,7 +7,7 @@ import tempfile
 from pathlib import Path
 
 import units
-from browser import NARROW, BrowserTestCase
+from browser import CUTS, NARROW, BrowserTestCase
 from selenium.webdriver.common.keys import Keys
 from selenium.webdriver.remote.webelement import WebElement
 
@@ -299,6 +299,15 @@ class MeasuresTest(BrowserTestCase):
             "<p hidden style='color: #fff'>not shown</p><p style='color: #0008'>glass</p>")
         poor = [each.split("'")[1] for each in self.browser.poor_contrasts()]
         self.assertEqual(poor, ["grey", "behind", "pattern", "glass"])
+
+    def test_texts_that_are_cut_are_found(self) -> None:
+        self.open_text(
+            "<style>body { margin: 0 }</style><p class=good>good</p><p class=a hidden>hidden</p>"
+            "<div style='width: 5em; overflow: auto'><p class=b><nobr>too wide for its box</nobr></p></div>"
+            "<div style='height: 1em; overflow: hidden'><br><br><p class=c>too far below</p></div>"
+            "<div style='clip-path: inset(50%)'><p class=d>clipped</p></div><p class=e style='margin-left: 1590px'>"
+            "<nobr>behind the side of the page</nobr></p><p class=tabs hidden>only on screens</p>")
+        self.assertEqual([each[-1] for each in self.browser.run(CUTS)], ["a", "b", "c", "d", "e"])
 
     def test_messages_requests_and_violations_are_found(self) -> None:
         policy = "<meta http-equiv='Content-Security-Policy' content=\"{}\">"

@@ -8,7 +8,7 @@ from pathlib import Path
 from typing import Any
 
 import units
-from browser import NARROW, BrowserTestCase
+from browser import CUTS, NARROW, PAPER, BrowserTestCase
 from selenium.webdriver.common.by import By
 from selenium.webdriver.remote.webelement import WebElement
 
@@ -114,6 +114,26 @@ class ReasonsTest(PagesTestCase):
         self.browser.see_all_units()
         self.check_looks()
         self.check_no_trouble()
+
+
+class PaperTest(PagesTestCase):
+    """A table of a fleet, and units, of which one has long lines everywhere."""
+
+    def test_nothing_is_cut_and_nothing_is_for_the_pointer(self) -> None:
+        page = units.report(self.folder / "page.html", units.long_lines(self.folder / "long"),
+                            *units.many(self.folder, 40))
+        self.browser.open(page)
+        self.browser.one("#filter").send_keys("no such unit")
+        self.browser.prefer("light", media="print")
+        self.browser.resize(*PAPER)
+        self.assertEqual(self.browser.run(CUTS), [])
+        self.assertEqual(self.browser.run("return document.documentElement.scrollWidth"), PAPER[0])
+        text = self.browser.one("#unit-1").text
+        for part in (units.LONG_LINE, "/tmp/telephony_FFFF.txt", "parameter 139", "mask 0x7ffffffe"):
+            self.assertIn(part, text)
+        self.assertEqual(len(self.browser.all("#fleet tbody tr")), 41)
+        for each in self.browser.all("#fleet :is(input, button), #unit-1 :is(button, .details)"):
+            self.assertTrue(not each.is_displayed() or each.value_of_css_property("border-style") == "none")
 
 
 class DefaultsTest(PagesTestCase):

@@ -80,6 +80,19 @@ Version Number = <i>_1"><script>1</script>.2.'3
 '''
 
 
+LONG_LINE = "key = " + "a-value-without-a-blank-" * 40 + "end"
+LONG = f"""
+[image.params]
+139 = 26
+[disk]
+aux = "{'x' * 96}"
+[files]
+"/fs/mp/etc/airplay_static.conf" = "{LONG_LINE}\\n"
+"/fs/mp/etc/mm/iap2_static.cfg" = "{'words ' * 200}\\n"
+"/fs/rwdata/.Version/{'long-name-' * 20}.inf" = "Type = Application\\nVersion Number = {'1' * 300}\\n{'k' * 200} = 1\\n"
+"""
+
+
 def call(*words: str | Path, statuses: tuple[int, ...] = (0,), folder: Path | None = None) -> bytes:
     said = subprocess.run([UNIT_TOOL, *words], check=False, capture_output=True, cwd=folder)
     if said.returncode not in statuses:
@@ -96,6 +109,10 @@ def make_from_text(root: Path, text: str) -> Path:
     description = root.with_name(f"{root.name}.description")
     description.write_text(text, encoding="utf-8")
     return make(root, description)
+
+
+def long_lines(root: Path) -> Path:
+    return make_from_text(root, LONG)
 
 
 def hostile(root: Path) -> Path:
