@@ -363,6 +363,7 @@ function completeUnits() {
         }
     }, {rootMargin: "100%"});
     for (const unit of document.querySelectorAll(".unit")) {
+        unit.setAttribute("aria-label", unit.querySelector("h2").textContent); // also if it is not laid out
         observer.observe(unit);
     }
     addEventListener("hashchange", followAddress);
@@ -376,6 +377,28 @@ const inOrder = new Intl.Collator("en", {numeric: true}).compare;
 /** The value of a cell, without the signs below it. The first cell of a row has a link. */
 function valueOf(cell) {
     return cell.firstChild.textContent.trim();
+}
+
+let late = []; // rows that are still laid out only if they are seen
+
+/** To lay out hundreds of rows takes longer than anybody should wait: those that are not seen come bit by bit. */
+function layOutLater(rows) {
+    if (late.length === 0) {
+        setTimeout(layOutSome, 100);
+    }
+    late = [...rows];
+    for (const row of late) {
+        row.classList.add("late");
+    }
+}
+
+function layOutSome() {
+    for (const row of late.splice(0, 10)) {
+        row.classList.remove("late");
+    }
+    if (late.length > 0) {
+        setTimeout(layOutSome);
+    }
 }
 
 /** Sorts the rows by a column, upwards first. Rows that are equal there keep their order. */
@@ -393,6 +416,7 @@ function sortBy(table, column) {
     const rows = [...body.rows].map(row => ({row, value: valueOf(row.cells[column])}));
     rows.sort(isUp ? compare : (a, b) => compare(b, a));
     body.append(...rows.map(each => each.row));
+    layOutLater(body.rows);
 }
 
 /** The text, which may go on in another line after each "_". */
@@ -420,6 +444,7 @@ function makeFilter(table) {
         for (const row of rows) {
             row.hidden = !words.every(word => texts.get(row).includes(word));
         }
+        layOutLater(rows);
         shown.value = `${rows.filter(row => !row.hidden).length} of ${rows.length} units`;
     };
     input.addEventListener("input", filter);

@@ -124,16 +124,37 @@ class Browser:
                     found.append(f"request for {url}")
         return found
 
+    def nodes(self) -> list[dict[str, Any]]:
+        """Those of the browser's accessibility tree that a screen reader is told of."""
+        return [node for node in self.command("Accessibility.getFullAXTree")["nodes"] if not node["ignored"]]
+
     def usable(self) -> list[tuple[str, str]]:
         """Role and name of everything that takes the focus, in the browser's accessibility tree."""
-        found = []
-        for node in self.command("Accessibility.getFullAXTree")["nodes"]:
-            is_usable = any(each["name"] == "focusable" and each["value"].get("value")
-                            for each in node.get("properties", ()))
-            role = node.get("role", {}).get("value", "")
-            if is_usable and not node["ignored"] and role != "RootWebArea":
-                found.append((role, node.get("name", {}).get("value", "")))
-        return found
+        def is_focusable(node: dict[str, Any]) -> bool:
+            return any(each["name"] == "focusable" and each["value"].get("value")
+                       for each in node.get("properties", ()))
+        return [each for each in map(role_and_name, filter(is_focusable, self.nodes()))
+                if each[0] != "RootWebArea"]
+
+    def cells(self, selector: str) -> list[list[str]]:
+        """The roles of the cells of a table in the browser's accessibility tree, row by row."""
+        nodes = {node["nodeId"]: node for node in self.command("Accessibility.getFullAXTree")["nodes"]}
+        table = self.command("Runtime.evaluate", expression=f"document.querySelector({json.dumps(selector)})")
+        whole = self.command("Accessibility.getPartialAXTree", objectId=table["result"]["objectId"],
+                             fetchRelatives=False)["nodes"][0]
+        rows = []
+        waiting = [whole["nodeId"]]
+        while waiting:
+            node = nodes[waiting.pop()]
+            if node["role"]["value"] == "row":
+                rows.append([nodes[child]["role"]["value"] for child in node["childIds"]])
+            else:
+                waiting += reversed(node["childIds"])
+        return rows
+
+    def everything(self) -> list[tuple[str, str]]:
+        """Role and name of everything in the browser's accessibility tree."""
+        return list(map(role_and_name, self.nodes()))
 
     def poor_contrasts(self) -> list[str]:
         """The shown texts whose contrast with what is behind them is less than 4.5."""

@@ -4,11 +4,12 @@
 from __future__ import annotations
 
 import tempfile
+import time
 from pathlib import Path
 from typing import Any
 
 import units
-from browser import CUTS, NARROW, PAPER, BrowserTestCase
+from browser import CUTS, NARROW, PAPER, PATIENCE, BrowserTestCase
 from selenium.webdriver.common.by import By
 from selenium.webdriver.remote.webelement import WebElement
 
@@ -172,7 +173,8 @@ class FleetTest(PagesTestCase):
             "cell.textContent.trim() : cell.firstChild.textContent.trim()))")
 
     def head(self, title: str) -> WebElement:
-        return next(head for head in self.browser.all("#fleet thead th") if head.text.split("\n")[0] == title)
+        return self.browser.run("return [...document.querySelectorAll('#fleet thead th')]"
+                                ".find(head => head.textContent.trim() === arguments[0])", title)
 
     def sort_by(self, title: str) -> None:
         """Upwards."""
@@ -264,6 +266,24 @@ class FleetTest(PagesTestCase):
         self.assertEqual(len(unit.find_elements(By.CSS_SELECTOR, "[role=tab]")), 6)
         self.browser.run("scrollTo(0, 0)")
         self.type_filter(" ")
+
+    def test_the_page_is_small_enough(self) -> None:
+        self.assertLess(self.page.stat().st_size, 20 * 2**20)
+
+    def test_the_table_is_one_for_a_screen_reader(self) -> None:
+        """Although it is laid out as boxes."""
+        self.sort_by("model")
+        limit = time.monotonic() + PATIENCE
+        while self.browser.all("#fleet .late") and time.monotonic() < limit:
+            pass
+        cells = self.browser.cells("#fleet table")
+        self.assertEqual(len(cells), 202)
+        self.assertEqual(set(cells[0]), {"columnheader"})
+        for row in cells[1:]:
+            self.assertEqual(row, ["rowheader"] + ["cell"] * 13)
+        names = [name for role, name in self.browser.everything() if role == "article"]
+        self.assertEqual(len(names), 200)
+        self.assertNotIn("", names)
 
     def test_the_box_and_the_heads_have_names(self) -> None:
         self.assertEqual(self.browser.one("#filter").accessible_name, "Filter")
