@@ -78,10 +78,13 @@ class Browser:
 
     def open(self, path: Path, fragment: str = "") -> None:
         """Loads the page anew, at the top and without a pointer over it."""
+        self.open_address(path.resolve().as_uri(), fragment)
+
+    def open_address(self, address: str, fragment: str = "") -> None:
         self.driver.get("about:blank")
         for kind in ("browser", "performance"):
             self.driver.get_log(kind)
-        self.page = path.resolve().as_uri()
+        self.page = address
         self.driver.get(self.page + fragment)
 
     def see_all_units(self) -> None:

@@ -3,7 +3,10 @@
 
 from __future__ import annotations
 
+import collections
+import http.server
 import tempfile
+import threading
 from pathlib import Path
 
 import units
@@ -262,23 +265,67 @@ class OneUnitTest(BrowserTestCase):
         self.assertFalse(any(tab.is_displayed() for tab in self.browser.all("[role=tab]")))
 
 
-class WithoutScriptTest(BrowserTestCase):
-    """What a server shows that forbids scripts and styles."""
+class AttachedPage(http.server.BaseHTTPRequestHandler):
+    """A build server, which lets an attached page use neither its style nor its script."""
 
-    def test_verdict_outputs_values_and_origins_are_there(self) -> None:
+    content: bytes
+
+    def do_GET(self) -> None:
+        self.send_response(200)
+        self.send_header("Content-Type", "text/html")
+        self.send_header("Content-Security-Policy", "default-src 'none'")
+        self.end_headers()
+        self.wfile.write(self.content)
+
+    def log_message(self, *_: object) -> None:
+        pass
+
+
+class WithoutStyleAndScriptTest(BrowserTestCase):
+    """What a build server shows of an attached page."""
+
+    @classmethod
+    def setUpClass(cls) -> None:
+        super().setUpClass()
         with tempfile.TemporaryDirectory(prefix="orvane page-") as folder:
-            page = units.report(Path(folder) / "page.html", units.make(Path(folder) / "sample"))
-            self.browser.command("Emulation.setScriptExecutionDisabled", value=True)
-            try:
-                self.browser.open(page)
-            finally:
-                self.browser.command("Emulation.setScriptExecutionDisabled", value=False)
-            self.assertFalse(self.browser.all("[role=tab]"))
-            self.assertTrue(all(panel.is_displayed() for panel in self.browser.all(".output")))
-            text = self.browser.one("body").text
-            for part in ("All outputs are as intended.", "model = Quarion Velmira",
-                         "parameter 139, image byte 139: 1a", "SN004217", "qwaAECSwitch"):
-                self.assertIn(part, text)
+            root = units.make(Path(folder) / "sample")
+            AttachedPage.content = units.report(Path(folder) / "page.html", root, options=("--impact",)).read_bytes()
+        server = http.server.ThreadingHTTPServer(("127.0.0.1", 0), AttachedPage)
+        cls.addClassCleanup(server.server_close)
+        threading.Thread(target=server.serve_forever, daemon=True).start()
+        cls.addClassCleanup(server.shutdown)
+        cls.browser.open_address(f"http://127.0.0.1:{server.server_port}/")
+
+    def test_neither_style_nor_script_are_used(self) -> None:
+        self.assertEqual(self.browser.run("return document.styleSheets.length"), 0)
+        self.assertEqual(self.browser.all(".scripted, [role=tab]"), [])
+
+    def test_headings_lead_to_everything(self) -> None:
+        headings = [name for role, name in self.browser.everything() if role == "heading"]
+        for name in ("Verdict", "Outputs", "Configuration image", "Record area of the boot disk", "Tuning blocks",
+                     "Software version", "Files", "What changes which lines", "/tmp/telephony_FFFF.txt",
+                     "/tmp/speechrec_FFFF.txt", "/tmp/airplay.conf", "/tmp/iap2_device.cfg", "/tmp/iap2.cfg",
+                     "/tmp/iap1.cfg"):
+            self.assertTrue(any(each.startswith(name) for each in headings), name)
+
+    def test_each_cell_of_a_table_is_one_and_shows_its_content(self) -> None:
+        roles = collections.Counter(role for role, _ in self.browser.everything())
+        self.assertNotIn("LayoutTable", roles)
+        self.assertEqual(roles["table"], len(self.browser.all("table")))
+        self.assertEqual(roles["cell"] + roles["rowheader"] + roles["columnheader"],
+                         len(self.browser.all("td, th")))
+        lost = self.browser.run(
+            "const words = text => text.trim().split(/\\s+/).join(' ');"
+            "return [...document.querySelectorAll('td, th')].filter(cell => "
+            "words(cell.innerText) !== words(cell.textContent)).map(cell => cell.outerHTML)")
+        self.assertEqual(lost, [])
+
+    def test_nothing_is_hidden(self) -> None:
+        self.assertEqual(self.browser.run(CUTS), [])
+        text = self.browser.one("body").text
+        for part in ("All outputs are as intended.", "as intended", "model = Quarion Velmira",
+                     "parameter 139, image byte 139: 1a", "SN004217", "qwaAECSwitch"):
+            self.assertIn(part, text)
 
 
 class MeasuresTest(BrowserTestCase):
