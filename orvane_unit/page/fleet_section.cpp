@@ -157,7 +157,7 @@ void addCell(Markup& page, const Value& value, bool isState, bool isRare) {
         page.add("span", {{"class", "sign"}}, value.trouble);
     }
     if (isRare) {
-        page.add("span", {{"class", "sign"}}, "\u2260 most frequent");
+        page.add("span", {{"class", "sign"}}, "\u2260 most");
     }
 }
 
