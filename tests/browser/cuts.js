@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 //
-// The body of a function: the texts of the page that can't be read whole, because they are not shown, stick out
-// of the page at its sides, or are cut by a box that they are in. What only people at a screen need is left out.
+// The body of a function: the texts, in the elements of a selector or in all of the page, that can't be read
+// whole, because they are not shown, stick out of the page at its sides, or are cut by a box that they are in.
+// What only people at a screen need is left out.
 const ONLY_ON_SCREENS = ".tabs, .details, .filter, svg, script, style";
 
 /** The box that cuts what is in the element; undefined if it lets everything stick out. */
@@ -39,11 +40,13 @@ function isWhole(text) {
 }
 
 const cut = [];
-const walker = document.createTreeWalker(document.body, NodeFilter.SHOW_TEXT);
-while (walker.nextNode()) {
-    const text = walker.currentNode;
-    if (text.textContent.trim() && !text.parentElement.closest(ONLY_ON_SCREENS) && !isWhole(text)) {
-        cut.push(`${text.textContent.trim().slice(0, 60)} in ${text.parentElement.closest("[class]")?.className}`);
+for (const part of document.querySelectorAll(arguments[0] ?? "body")) {
+    const walker = document.createTreeWalker(part, NodeFilter.SHOW_TEXT);
+    while (walker.nextNode()) {
+        const text = walker.currentNode;
+        if (text.textContent.trim() && !text.parentElement.closest(ONLY_ON_SCREENS) && !isWhole(text)) {
+            cut.push(`${text.textContent.trim().slice(0, 60)} in ${text.parentElement.closest("[class]")?.className}`);
+        }
     }
 }
 return cut;
