@@ -28,13 +28,6 @@ std::string groupName(std::uint32_t group) {
     return "group " + std::to_string(group);
 }
 
-/// Most parameters have this mask, so it is said once for all of them.
-constexpr std::uint32_t USUAL_MASK = 0xFFFFFFFF;
-
-std::string maskText(std::uint32_t mask) {
-    return mask == USUAL_MASK ? "" : ", mask " + hexNumber(mask, 8);
-}
-
 std::string rawText(const DecodedParam& param) {
     return param.raw ? std::to_string(*param.raw) : "none";
 }
@@ -49,7 +42,8 @@ std::string detailOf(const Cell& cell) {
     const std::string size = param.size == 1 ? "" : kit::counted(param.size, "byte") + ", ";
     const std::string text = place + ", " + size + groupName(param.row.group) + ", raw " +
                              rawText(param) + ", default " +
-                             std::to_string(param.row.defaultValue) + maskText(param.row.mask);
+                             std::to_string(param.row.defaultValue) + ", mask " +
+                             hexNumber(param.row.mask, 8);
     return param.meaning.empty() ? text : text + ": " + param.meaning;
 }
 
@@ -103,7 +97,6 @@ void addImage(Markup& page, const DecodedImage& image, const std::string& id) {
     page.add("h3", "Configuration image");
     page.add("p", {{"data-key", keyText(kit::imageSizeKey())}}, summaryOf(image.found));
     addLegend(page);
-    page.add("p", "A mask is given unless it is " + hexNumber(USUAL_MASK, 8) + ".");
     const Element cells(page, "ol", {{"class", "cells"}});
     for (const DecodedParam& param : image.params) {
         for (std::uint32_t index = 0; index < param.size; ++index) {

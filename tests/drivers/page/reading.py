@@ -17,8 +17,8 @@ THERE = re.compile(r"After the run, (?:(.+) is there\.|a file is there that this
 CUT = re.compile(r"\((\d+) more bytes?\)")
 MORE = re.compile(r"\d+ more lines? \((\d+) bytes?\): ")
 KINDS = {"nothing": "nothing", "a folder": "folder", "a device": "other", "an empty file": "file"}
-DETAIL = re.compile(r"byte (\d+), (?:(\d) bytes, )?group (\d), raw (\d+|none), default (-?\d+)"
-                    r"(?:, mask (0x[0-9a-f]{8}))?(?:: (.*))?")
+DETAIL = re.compile(r"byte (\d+), (?:(\d) bytes, )?group (\d), raw (\d+|none), default (-?\d+), "
+                    r"mask (0x[0-9a-f]{8})(?:: (.*))?")
 
 # The keys and values of a version file.
 Entries = list[tuple[bytes, bytes]]
@@ -168,7 +168,7 @@ def params(unit: Element) -> list[dict[str, Any]]:
             raise BadMarkup(f"cell {number}: {cell.attributes}")
         found.append({"number": number, "group": int(match[3]), "offset": int(match[1]), "size": int(match[2] or 1),
                       "raw": None if match[4] == "none" else int(match[4]), "default": int(match[5]),
-                      "mask": int(match[6] or "0xffffffff", 16), "meaning": match[7]})
+                      "mask": int(match[6], 16), "meaning": match[7]})
     if sum(row["size"] for row in found) != len(cells):
         raise BadMarkup(f"{len(cells)} cells")
     return found

@@ -112,10 +112,10 @@ class Reading(unittest.TestCase):
         cells = ('<section class="image"><ol>{}<li class="cell group-3" data-key="param.134"><b>134</b>'
                  '<small>byte 134, the upper one of parameter 134</small></li></ol></section>')
         first = ('<li class="cell group-3" data-key="param.134"><b>134</b><small>byte 133, 2 bytes, group 3, raw 7, '
-                 'default -1, mask 0x0000ffff: audio profile 7</small></li>')
+                 'default -1, mask 0xffffffff: audio profile 7</small></li>')
         self.assertEqual(reading.params(parse(cells.format(first).encode())),
                          [{"number": 134, "group": 3, "offset": 133, "size": 2, "raw": 7, "default": -1,
-                           "mask": 0xffff, "meaning": "audio profile 7"}])
+                           "mask": 0xffffffff, "meaning": "audio profile 7"}])
         for wrong in ("", first.replace("group-3", "group-2"), first.replace("param.134", "param.13")):
             with self.subTest(wrong), self.assertRaises(BadMarkup):
                 reading.params(parse(cells.format(wrong).encode()))
