@@ -237,6 +237,23 @@ TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndClosesTheHandle) {
     }
 }
 
+TEST_F(ConfigStoreTest, WholeImageThatCannotBeMappedIsMinus1AndClosesTheHandle) {
+    if (sizeof ORVANE_EMULATOR != 1) {
+        GTEST_SKIP() << "an emulator does not pass this limit on";
+    }
+    const int before = openDescriptors();
+    ConfigStore store;
+    std::int32_t result = 0;
+    {
+        const ResourceLimit noMoreMemory(RLIMIT_AS, 0);
+        result = store.open();
+    }
+    EXPECT_EQ(-1, result);
+    expectClosed(store);
+    EXPECT_EQ(0U, store.length);
+    EXPECT_EQ(before, openDescriptors());
+}
+
 TEST_F(ConfigStoreTest, ObjectOfOneByteIsMapped) {
     writeImage("\x5A");
     ConfigStore store;

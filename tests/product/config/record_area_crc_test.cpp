@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/host/descriptor.h"
 #include "tests/product/config/area_disk.h"
+#include "tests/support/disturbed_reads.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
@@ -105,6 +106,22 @@ TEST_F(RecordAreaCrcTest, PipeInPlaceOfTheDiskIsAllOnes) {
 TEST_F(RecordAreaCrcTest, NoFreeDescriptorIsAllOnes) {
     const ResourceLimit none(RLIMIT_NOFILE, 0);
     EXPECT_EQ(FAILED, recordAreaCrc());
+}
+
+TEST_F(RecordAreaCrcTest, RefusedReadAfterAGoodSeekIsAllOnes) {
+    const DisturbedReads reads = DisturbedReads::failing();
+    expectFailure();
+    EXPECT_EQ(1, reads.count()) << "the read must come, so the seek must succeed";
+}
+
+TEST_F(RecordAreaCrcTest, BytesThatAShortReadLacksCountAsZeros) {
+    std::uint32_t crc = 0;
+    {
+        const DisturbedReads reads = DisturbedReads::ofAtMost(100);
+        crc = recordAreaCrc();
+        EXPECT_EQ(1, reads.count());
+    }
+    EXPECT_EQ(~referenceCrc(area().substr(1, 100) + std::string(36, '\0')), crc);
 }
 
 TEST_F(RecordAreaCrcTest, DiskTooShortForSlot15IsAllOnes) {

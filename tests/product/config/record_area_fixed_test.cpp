@@ -5,6 +5,8 @@
 #include "config/record_slots.h"
 #include "kit/host/descriptor.h"
 #include "tests/product/config/area_disk.h"
+#include "tests/support/disturbed_reads.h"
+#include "tests/support/file_event_log.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
@@ -16,6 +18,7 @@
 #include <array>
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace orvane::test {
 
@@ -114,6 +117,20 @@ TEST_P(FixedAreaTest, LengthAboveTheAreaFailsAndTouchesNothing) {
     EXPECT_EQ(-1, fixed.write(&byte, 0xFFFFFFFF));
     EXPECT_EQ('#', byte);
     expectUntouchedDisk();
+}
+
+TEST_P(FixedAreaTest, RefusedArgumentsLeaveTheDiskUnopened) {
+    FileEventLog opens(IN_OPEN, {DISK_PATH});
+    char byte = '#';
+    for (const std::uint32_t length : {0U, fixed.size + 1, 0xFFFFFFFFU}) {
+        EXPECT_EQ(-1, fixed.read(&byte, length));
+        EXPECT_EQ(-1, fixed.write(&byte, length));
+    }
+    EXPECT_EQ(-1, fixed.read(nullptr, 1));
+    EXPECT_EQ(-1, fixed.write(nullptr, 1));
+    EXPECT_EQ(opens.take(), std::vector<std::string>());
+    EXPECT_EQ(0, fixed.read(&byte, 1));
+    EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
 }
 
 TEST_P(FixedAreaTest, AbsentDiskFailsAndIsNotCreated) {
@@ -217,15 +234,13 @@ TEST_P(FixedAreaTest, RefusedReadFails) {
 }
 
 TEST_P(FixedAreaTest, ShortReadIsSuccess) {
-    // The kernel fills what it may and stops at the edge; an emulator refuses the whole transfer.
-    const EdgeOfMemory edge(100);
-    ASSERT_TRUE(edge.isMade());
-    const kit::Descriptor disk(open(DISK_PATH, O_RDONLY | O_CLOEXEC));
-    const bool isShort = ::read(disk.number(), edge.begin(), 1000) == 100;
-    EXPECT_EQ(isShort ? 0 : -1, fixed.read(edge.begin(), 1000));
-    if (isShort) {
-        EXPECT_EQ(area().substr(fixed.offset, 100), std::string(edge.begin(), 100));
+    std::string buffer(1000, '#');
+    {
+        const DisturbedReads reads = DisturbedReads::ofAtMost(100);
+        EXPECT_EQ(0, fixed.read(buffer.data(), 1000));
+        EXPECT_EQ(1, reads.count());
     }
+    EXPECT_EQ(area().substr(fixed.offset, 100) + std::string(900, '#'), buffer);
 }
 
 TEST_P(FixedAreaTest, DiskNeedsOnlyThePermissionOfTheDirection) {

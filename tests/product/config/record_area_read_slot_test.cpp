@@ -4,6 +4,8 @@
 #include "config/record_area.h"
 #include "kit/host/descriptor.h"
 #include "tests/product/config/area_disk.h"
+#include "tests/support/disturbed_reads.h"
+#include "tests/support/file_event_log.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
@@ -14,6 +16,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace orvane::test {
 
@@ -109,6 +112,36 @@ TEST_F(ReadRecordSlotTest, UnknownSlotFailsAndLeavesZeros) {
         SCOPED_TRACE(slot);
         expectFailure(slot, 8);
     }
+}
+
+TEST_F(ReadRecordSlotTest, DiskIsOpenedBeforeTheSlotIsLookedUp) {
+    FileEventLog opens(IN_OPEN, {DISK_PATH});
+    expectFailure(18, 8);
+    EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
+}
+
+TEST_F(ReadRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
+    FileEventLog opens(IN_OPEN, {DISK_PATH});
+    char byte = '#';
+    EXPECT_EQ(-1, readRecordSlot(9, nullptr, 8));
+    EXPECT_EQ(-1, readRecordSlot(9, &byte, 0));
+    EXPECT_EQ(opens.take(), std::vector<std::string>());
+}
+
+TEST_F(ReadRecordSlotTest, RefusedReadAfterAGoodSeekFailsAndLeavesZeros) {
+    const DisturbedReads reads = DisturbedReads::failing();
+    expectFailure(9, 8);
+    EXPECT_EQ(1, reads.count()) << "the read must come, so the seek must succeed";
+}
+
+TEST_F(ReadRecordSlotTest, ShortReadIsSuccessAndLeavesZerosAfterIt) {
+    std::string buffer = "############";
+    {
+        const DisturbedReads reads = DisturbedReads::ofAtMost(3);
+        EXPECT_EQ(0, read(9, buffer, 10));
+        EXPECT_EQ(1, reads.count());
+    }
+    EXPECT_EQ(area().substr(129, 3) + std::string(7, '\0') + "##", buffer);
 }
 
 TEST_F(ReadRecordSlotTest, AbsentDiskFailsAndLeavesZeros) {

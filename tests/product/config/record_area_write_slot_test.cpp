@@ -4,6 +4,7 @@
 #include "config/record_area.h"
 #include "kit/host/descriptor.h"
 #include "tests/product/config/area_disk.h"
+#include "tests/support/file_event_log.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 
@@ -119,6 +120,19 @@ TEST_F(WriteRecordSlotTest, UnknownSlotFailsAndWritesNothing) {
         expectFailure(slot, "ABCDEFGH");
     }
     expectUntouchedDisk();
+}
+
+TEST_F(WriteRecordSlotTest, DiskIsOpenedBeforeTheSlotIsLookedUp) {
+    FileEventLog opens(IN_OPEN, {DISK_PATH});
+    expectFailure(18, "ABCDEFGH");
+    EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
+}
+
+TEST_F(WriteRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
+    FileEventLog opens(IN_OPEN, {DISK_PATH});
+    EXPECT_EQ(-1, writeRecordSlot(9, nullptr, 8));
+    EXPECT_EQ(-1, writeRecordSlot(9, "ABCDEFGH", 0));
+    EXPECT_EQ(opens.take(), std::vector<std::string>());
 }
 
 TEST_F(WriteRecordSlotTest, AbsentDiskFailsAndIsNotCreated) {

@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/product/tuning/tuning_test.h"
+#include "tests/support/disturbed_reads.h"
+#include "tests/support/file_event_log.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 #include "tuning/tuning_file.h"
@@ -145,6 +147,28 @@ TEST_F(TuningFileTest, DeviceThatCannotBeReadIsRenderedAsZeros) {
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+TEST_F(TuningFileTest, RefusedReadAfterAGoodSeekIsRenderedAsZeros) {
+    setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
+    {
+        const DisturbedReads reads = DisturbedReads::failing();
+        generateTuningFile(2, ANY_TUNING_FILE);
+        EXPECT_EQ(reads.count(), 1) << "the read must come, so the seek must succeed";
+    }
+    EXPECT_EQ(readFile(ANY_TUNING_FILE), fileOfZeros(2));
+}
+
+TEST_F(TuningFileTest, BytesThatAShortReadLacksAreRenderedAsZeros) {
+    setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
+    {
+        const DisturbedReads reads = DisturbedReads::ofAtMost(2 * BLOCK_SIZE + 24);
+        generateTuningFile(2, ANY_TUNING_FILE);
+    }
+    const std::string text = readFile(ANY_TUNING_FILE);
+    EXPECT_EQ(lineOf(text, "qwaHFEExtent"), "qwaHFEExtent 85");
+    EXPECT_EQ(lineOf(text, "qwaNRAtten"), "qwaNRAtten 85"); // its second byte is lacking
+    EXPECT_EQ(lineOf(text, "qwaRECSuppress"), "qwaRECSuppress 0");
+}
+
 TEST_F(TuningFileTest, EachCallReadsTheDeviceAgain) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     EXPECT_EQ(lineOf(rendered(2), "qwaHFEExtent"), "qwaHFEExtent 85");
@@ -206,6 +230,13 @@ TEST_F(TuningFileTest, FileThatCannotBeOpenedIsSkipped) {
     EXPECT_TRUE(std::filesystem::is_directory("/tmp/folder.txt"));
     EXPECT_TRUE(std::filesystem::is_empty("/tmp/folder.txt"));
     EXPECT_FALSE(exists("/nowhere"));
+}
+
+TEST_F(TuningFileTest, DeviceIsReadEvenWhenTheFileCannotBeOpened) {
+    putFolder(ANY_TUNING_FILE);
+    FileEventLog reads(IN_ACCESS, {DISK_PATH});
+    generateTuningFile(3, ANY_TUNING_FILE);
+    EXPECT_EQ(reads.take(), std::vector<std::string>{DISK_PATH});
 }
 
 TEST_F(TuningFileTest, OlderFileStaysWhenItCannotBeOpened) {
