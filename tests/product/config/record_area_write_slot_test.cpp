@@ -88,10 +88,10 @@ TEST_F(WriteRecordSlotTest, TwentyBytesIntoSlot0WriteOne) {
     expectArea(areaWith(0, "a"));
 }
 
-TEST_F(WriteRecordSlotTest, CallersBufferIsNotChanged) {
-    const std::string bytes = "AB";
-    EXPECT_EQ(0, writeRecordSlot(1, bytes.data(), 2));
-    EXPECT_EQ("AB", bytes);
+TEST_F(WriteRecordSlotTest, PaddingIsNotPutIntoTheCallersBuffer) {
+    std::string buffer = "AB, and room for a slot of 16 bytes";
+    EXPECT_EQ(0, writeRecordSlot(1, buffer.data(), 2));
+    EXPECT_EQ("AB, and room for a slot of 16 bytes", buffer);
 }
 
 TEST_F(WriteRecordSlotTest, WrittenSlotIsReadBack) {
