@@ -6,10 +6,8 @@ namespace orvane {
 namespace {
 
 /// The buffer of every file that is copied. Streams that share it may be open together: each reads
-/// only during its own copy. Its size makes large templates fast: each read is many whole pages,
-/// one byte less than the buffer, since libstdc++ keeps one back.
-constexpr std::size_t INPUT_BUFFER_SIZE = 131073; // bytes
-std::array<char, INPUT_BUFFER_SIZE> InputBuffer;  // NOLINT(*-non-const-global-variables)
+/// only during its own copy.
+std::array<char, INPUT_BUFFER_SIZE> InputBuffer; // NOLINT(*-non-const-global-variables)
 
 /// The buffer comes first: a file stream accepts one only before its first use, if at all.
 template <typename FileStream, std::size_t SIZE>

@@ -23,6 +23,10 @@ struct AccessoryFile {
 constexpr std::size_t OUTPUT_BUFFER_SIZE = 1024; // bytes
 using OutputBuffer = std::array<char, OUTPUT_BUFFER_SIZE>;
 
+/// All files that are copied share one buffer. Its size makes large templates fast: each read is
+/// many whole pages, one byte less than the buffer, since libstdc++ keeps one back.
+constexpr std::size_t INPUT_BUFFER_SIZE = 131073; // bytes
+
 /// What becomes of an accessory file: it is generated, or replaced by its stock file because a
 /// stream that it depends on has failed.
 enum class MergeDecision {
