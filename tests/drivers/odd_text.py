@@ -5,7 +5,9 @@ from __future__ import annotations
 
 import random
 
-LONG_LINE = 70_000
+from drivers import input_lengths
+
+LONG_LINE = input_lengths.ONE_READ + 1
 
 NUMBERS = (
     b"0", b"1", b"7", b"9", b"10", b"15", b"16", b"99", b"127", b"128", b"255", b"256",

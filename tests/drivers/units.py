@@ -6,7 +6,7 @@ from __future__ import annotations
 import random
 from pathlib import Path
 
-from drivers import odd_text
+from drivers import input_lengths, odd_text
 from model import configuration, parts, records
 from model.tree import Tree
 
@@ -21,6 +21,10 @@ DISK_SIZES = (
 )
 
 TEXT_SIZES = (1, 40, 700, 4_095, 4_096, 8_000, 8_191, 8_192, 16_384, 70_000)
+
+# How many of the product files take several reads, and how many of those are of the longest.
+LONG_SHARE = 0.01
+LONGEST_SHARE = 0.05
 
 # After the tenth block are only bytes that the tool doesn't read.
 AREA_SIZE = records.DPS_AREA_SIZE + 20
@@ -128,8 +132,15 @@ def _text(rng: random.Random, size: int) -> bytes:
     return text if kind < 0.6 else text[:-1] + b"\n"
 
 
+def _product_size(rng: random.Random) -> int:
+    if rng.random() < LONG_SHARE:
+        longest = rng.random() < LONGEST_SHARE
+        return input_lengths.LONGEST if longest else rng.choice(input_lengths.AROUND)
+    return rng.choice(TEXT_SIZES[:3] if rng.random() < 0.6 else TEXT_SIZES)
+
+
 def _product_file(root: Path, rng: random.Random, path: str, ordinary: bool) -> None:
-    text = _text(rng, rng.choice(TEXT_SIZES[:3] if rng.random() < 0.6 else TEXT_SIZES))
+    text = _text(rng, _product_size(rng))
     kind = 1.0 if ordinary and rng.random() < 0.97 else rng.random()
     if kind < 0.2:
         return

@@ -7,6 +7,7 @@ from collections.abc import Callable
 from dataclasses import dataclass
 from pathlib import Path
 
+from drivers import input_lengths
 from model import parts
 
 
@@ -48,10 +49,11 @@ def _airplay_fallback(root: Path) -> None:
 
 
 def _large_templates(root: Path) -> None:
-    """Longer than a stream's buffer, so that writes fail in the middle of a copy."""
+    """Each takes three reads, so that reads and writes also fail behind the first."""
     _whole_unit(root)
+    text = b"key = value without a last line end;" * (input_lengths.AROUND[-1] // 36)
     for path in parts.TEMPLATES:
-        parts.put(root, path, b"key = value without a last line end;" * 600)
+        parts.put(root, path, text)
 
 
 def _templates_missing(root: Path) -> None:

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/inf_file.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/permissions.h"
 #include "tests/support/unit_test.h"
 
@@ -137,10 +138,20 @@ TEST_F(InfFileTest, BytesAbove127AreTextLikeAnyOther) {
 }
 
 TEST_F(InfFileTest, LongLinesAreReadWhole) {
-    const std::string longKey(70000, 'k');
-    const std::string longValue(200000, 'v');
-    EXPECT_EQ(parse(longKey + "=" + longValue + "\nA=1\n" + std::string(70000, 'x') + "\nB=2\n"),
-              (Inf_Data{{longKey, longValue}, {"A", "1"}, {"B", "2"}}));
+    for (const std::size_t length : INPUT_LENGTHS) {
+        SCOPED_TRACE(length);
+        const std::string longKey(length, 'k');
+        const std::string longValue(length - 1, 'v');
+        EXPECT_TRUE(parse(longKey + "=" + longValue + "\nA=1\n" + std::string(length, 'x') +
+                          "\nB=2\n") == (Inf_Data{{longKey, longValue}, {"A", "1"}, {"B", "2"}}));
+    }
+}
+
+TEST_F(InfFileTest, LinesOfLongFilesAreReadToTheLast) {
+    for (const std::size_t length : {INPUT_LENGTHS[0], INPUT_LENGTHS[7], LONGER_THAN_ANY_BUFFER}) {
+        SCOPED_TRACE(length);
+        EXPECT_TRUE(parse(markedText(length) + "\nA=1\n") == (Inf_Data{{"A", "1"}}));
+    }
 }
 
 TEST_F(InfFileTest, EmptyFileGivesNothing) {

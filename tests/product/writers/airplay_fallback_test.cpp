@@ -3,6 +3,7 @@
 // The AirPlay file when it can't be generated.
 #include "tests/product/writers/airplay_unit.h"
 #include "tests/support/folder_names.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 #include "writers/airplay_writer.h"
@@ -39,7 +40,7 @@ TEST_F(AirplayFallbackTest, MissingTemplateInstallsTheStockFile) {
 
 TEST_F(AirplayFallbackTest, StockFileLongerThanAnyBufferIsCopiedWhole) {
     remove(AIRPLAY_TEMPLATE);
-    const std::string stock = std::string(100000, 's') + "end";
+    const std::string stock = markedText(LONGER_THAN_ANY_BUFFER);
     writeFile(AIRPLAY_STOCK, stock);
     updateAirplayConfigFile();
     EXPECT_TRUE(readFile(AIRPLAY_OUTPUT) == stock);

@@ -4,6 +4,7 @@
 #include "tests/product/writers/airplay_unit.h"
 #include "tests/support/file_event_log.h"
 #include "tests/support/folder_names.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/resource_limit.h"
 #include "writers/airplay_writer.h"
 
@@ -84,7 +85,7 @@ TEST_F(AirplayWriterTest, TemplateIsNotParsed) {
 }
 
 TEST_F(AirplayWriterTest, TemplateLongerThanAnyBufferIsCopiedWhole) {
-    const std::string content = std::string(100000, 'x') + "end";
+    const std::string content = markedText(LONGER_THAN_ANY_BUFFER);
     writeFile(AIRPLAY_TEMPLATE, content);
     updateAirplayConfigFile();
     EXPECT_TRUE(readFile(AIRPLAY_OUTPUT) == plainAirplayHead() + content);

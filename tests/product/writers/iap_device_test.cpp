@@ -2,6 +2,7 @@
 //
 // The iAP2 device file, first of the three.
 #include "tests/product/writers/iap_unit.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/permissions.h"
 #include "tests/support/resource_limit.h"
 #include "writers/iap_writer.h"
@@ -66,7 +67,7 @@ TEST_F(IapDeviceTest, TemplateIsNotParsed) {
 }
 
 TEST_F(IapDeviceTest, TemplateLongerThanAnyBufferIsCopiedWhole) {
-    const std::string content = std::string(100000, 'x') + "end";
+    const std::string content = markedText(LONGER_THAN_ANY_BUFFER);
     writeFile(DEVICE_TEMPLATE, content);
     updateIapConfigFiles();
     EXPECT_TRUE(readFile(DEVICE_OUTPUT) == iap2Head() + content + DEVICE_TAIL);
@@ -117,7 +118,7 @@ TEST_F(IapDeviceTest, TemplateWithoutReadPermissionInstallsTheStockFile) {
 
 TEST_F(IapDeviceTest, StockFileLongerThanAnyBufferIsCopiedWhole) {
     remove(DEVICE_TEMPLATE);
-    const std::string stock = std::string(100000, 's') + "end";
+    const std::string stock = markedText(LONGER_THAN_ANY_BUFFER);
     writeFile(DEVICE_STOCK, stock);
     updateIapConfigFiles();
     EXPECT_TRUE(readFile(DEVICE_OUTPUT) == stock);

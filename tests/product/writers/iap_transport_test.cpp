@@ -2,6 +2,7 @@
 //
 // The iAP2 and iAP1 transport files, second and third of the three.
 #include "tests/product/writers/iap_unit.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/resource_limit.h"
 #include "writers/iap_writer.h"
 
@@ -71,7 +72,7 @@ TEST_F(IapTransportTest, TemplatesAreNotParsed) {
 }
 
 TEST_F(IapTransportTest, TemplatesLongerThanAnyBufferAreCopiedWhole) {
-    const std::string content = std::string(100000, 'x') + "end";
+    const std::string content = markedText(LONGER_THAN_ANY_BUFFER);
     writeFile(IAP2_TEMPLATE, content);
     writeFile(IAP1_TEMPLATE, content);
     updateIapConfigFiles();

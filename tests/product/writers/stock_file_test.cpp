@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/product/writers/accessory_paths.h"
 #include "tests/support/file_event_log.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"
 #include "writers/template_merge.h"
 
 #include <filesystem>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -36,13 +38,13 @@ TEST_F(StockFileTest, ReplacesAnOlderLongerOutput) {
 }
 
 TEST_F(StockFileTest, IsCopiedByteForByte) {
-    std::string content("\0\r\n\x1a\xff no line end", 17);
-    for (const std::size_t length : std::vector<std::size_t>{1, 17, 511, 4096, 8192, 100000}) {
+    const std::string anyBytes("\0\r\n\x1a\xff no line end", 17);
+    const std::string longText = anyBytes + markedText(LONGER_THAN_ANY_BUFFER);
+    std::vector<std::size_t> lengths{1, 17, 511, 4096, 8192, longText.size()};
+    lengths.insert(lengths.end(), std::begin(INPUT_LENGTHS), std::end(INPUT_LENGTHS));
+    for (const std::size_t length : lengths) {
         SCOPED_TRACE(length);
-        while (content.size() < length) {
-            content.push_back(static_cast<char>(content.size() % 251));
-        }
-        const std::string stock = content.substr(0, length);
+        const std::string stock = longText.substr(0, length);
         writeFile(STOCK, stock);
         installStockFile(ACCESSORY_FILE);
         EXPECT_TRUE(readFile(OUTPUT) == stock);

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tests/product/writers/accessory_paths.h"
 #include "tests/support/file_event_log.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/resource_limit.h"
 #include "tests/support/unit_test.h"
 #include "writers/template_merge.h"
@@ -8,6 +9,7 @@
 #include <sys/stat.h>
 
 #include <filesystem>
+#include <iterator>
 #include <string>
 #include <utility>
 #include <vector>
@@ -188,14 +190,13 @@ TEST_F(TemplateMergeTest, CopiesEveryByteOfAnyTemplate) {
 }
 
 TEST_F(TemplateMergeTest, CopiesTemplatesOfAnyLength) {
-    const std::vector<std::size_t> lengths{511,  512,  1023, 1024, 4095,  4096,  4097,
-                                           8190, 8191, 8192, 8193, 16384, 100000};
+    std::vector<std::size_t> lengths{511,  512,  1023, 1024, 4095, 4096,
+                                     4097, 8190, 8191, 8192, 8193, 16384};
+    lengths.insert(lengths.end(), std::begin(INPUT_LENGTHS), std::end(INPUT_LENGTHS));
+    lengths.push_back(LONGER_THAN_ANY_BUFFER);
     for (const std::size_t length : lengths) {
         SCOPED_TRACE(length);
-        std::string content;
-        for (std::size_t i = 0; i < length; ++i) {
-            content.push_back(static_cast<char>('a' + i % 23));
-        }
+        const std::string content = markedText(length);
         writeFile(TEMPLATE, content);
         mergeBetween("<", ">");
         EXPECT_TRUE(readFile(OUTPUT) == "<" + content + ">");
@@ -282,6 +283,20 @@ TEST_F(TemplateMergeTest, CloseFailsTheOutputThatCannotBeWrittenWhole) {
     EXPECT_TRUE(merge.output.fail());
     EXPECT_FALSE(merge.templateFile.fail());
     EXPECT_EQ(readFile(OUTPUT), std::string(100, 'x'));
+}
+
+TEST_F(TemplateMergeTest, CopyThatCannotBeWrittenWholeEndsWhereTheWriteFailed) {
+    // In the middle of what the first, the second and the third read gives.
+    const std::string content = markedText(INPUT_LENGTHS[7]);
+    writeFile(TEMPLATE, content);
+    for (const std::size_t room : {100000U, 200000U, 290000U}) {
+        SCOPED_TRACE(room);
+        {
+            const ResourceLimit limit(RLIMIT_FSIZE, room);
+            mergeBetween("<", ">");
+        }
+        EXPECT_TRUE(readFile(OUTPUT) == ("<" + content).substr(0, room));
+    }
 }
 
 TEST_F(TemplateMergeTest, DestructionClosesBoth) {
