@@ -46,16 +46,21 @@ class Finding:
 class Question:
     """What a driver checks in each unit.
 
-    `make` fills an empty folder and returns the arguments of the run. `check` gets the tools of the
-    driver; it raises BrokenRun if a tool could not be run. Some unit must reach each of `outcomes`
-    if there are `enough_units`.
+    `make` fills an empty folder and returns the arguments of the run. So does each of `certain`, for the first
+    units, which are not random. `check` gets the tools of the driver; it raises BrokenRun if a tool could not
+    be run. Some unit must reach each of `outcomes` if there are `enough_units`.
     """
 
     name: str
     make: Callable[[Path, random.Random], Sequence[str]]
     check: Callable[[RandomUnit, Any], Finding]
     outcomes: Sequence[str]
-    enough_units: int
+    enough_units: int = 0
+    certain: Sequence[Callable[[Path], Sequence[str]]] = ()
+
+    def fill(self, root: Path, rng: random.Random, index: int) -> Sequence[str]:
+        """Makes the unit with this number, and returns the arguments of its run."""
+        return self.certain[index](root) if index < len(self.certain) else self.make(root, rng)
 
 
 @dataclass(frozen=True)
@@ -77,7 +82,7 @@ def _check(question: Question, tools: Any, seed: str, index: int) -> Report:
         root = Path(folder) / "unit"
         root.mkdir()
         rng = generator(seed, index)
-        arguments = question.make(root, rng)
+        arguments = question.fill(root, rng, index)
         try:
             return Report(index, arguments, question.check(RandomUnit(root, arguments, rng), tools))
         except runner.BrokenRun as error:
@@ -90,7 +95,7 @@ def _keep(question: Question, keep: Path, seed: str, index: int) -> Path:
     if root.exists():
         raise SystemExit(f"{root} is already there")
     root.mkdir(parents=True)
-    question.make(root, generator(seed, index))
+    question.fill(root, generator(seed, index), index)
     return root
 
 
@@ -118,7 +123,7 @@ def _print_outcomes(question: Question, reached: Counter[str]) -> list[str]:
 def add_arguments(parser: argparse.ArgumentParser, units: int) -> None:
     """The arguments of every driver of random units; `units` is the usual number of units."""
     runner.add_arguments(parser)
-    parser.add_argument("--units", type=int, default=units)
+    parser.add_argument("--units", type=int, default=units, help="how many random ones")
     parser.add_argument("--seed", default="1", help='"random" draws one')
     parser.add_argument("--only", type=int, help="the number of a single unit")
     parser.add_argument("--keep", type=Path, help="folder for units that differ")
@@ -132,7 +137,7 @@ def ask(question: Question, tools: Any, options: argparse.Namespace, *more: str)
         options.seed = str(random.SystemRandom().randrange(10**9))
         print(f"{question.name}: seed {options.seed}")
     single = options.only is not None
-    indices = [options.only] if single else range(options.units)
+    indices = [options.only] if single else range(len(question.certain) + options.units)
     reached: Counter[str] = Counter()
     differing = 0
     with runner.workers(options.jobs) as pool:

@@ -24,6 +24,16 @@ def make(root: Path, rng: random.Random) -> list[str]:
     return [f"-{rng.choice('ai')}"]
 
 
+def make_even(root: Path) -> list[str]:
+    (root / "number").write_text("2", encoding="ascii")
+    return ["-a"]
+
+
+def make_odd(root: Path) -> list[str]:
+    (root / "number").write_text("3", encoding="ascii")
+    return ["-a"]
+
+
 def number(unit: RandomUnit) -> int:
     return int((unit.root / "number").read_text(encoding="ascii"))
 
@@ -86,6 +96,15 @@ class Asking(unittest.TestCase):
         status, said = self.ask(all_bad)
         self.assertEqual((status, said.count("\n  wrong: ")), (1, MOST_DIFFERENCES))
         self.assertIn("asked: the other units were skipped\n", said)
+
+    def test_certain_units_come_first(self) -> None:
+        question = Question("asked", make, by_number, ("even", "odd"), certain=(make_even, make_odd))
+        parser = argparse.ArgumentParser()
+        random_units.add_arguments(parser, units=30)
+        options = parser.parse_args(["--orvane", "o", "--enter", "e", "--units", "0"])
+        with contextlib.redirect_stdout(io.StringIO()) as said:
+            self.assertEqual(random_units.ask(question, None, options), 0)
+        self.assertIn("asked: 2 units, 0 with a difference (seed 1)\n", said.getvalue())
 
     def test_a_unit_that_was_not_run(self) -> None:
         status, said = self.ask(not_run)

@@ -16,10 +16,12 @@ from __future__ import annotations
 import os
 import random
 import subprocess
-from collections.abc import Sequence
+from collections.abc import Callable, Sequence
+from functools import partial
 from pathlib import Path
 
 from drivers import random_units, runner
+from drivers.certain_units import CERTAIN_UNITS
 from drivers.explain import explanation, reasons, same_tree
 from drivers.random_units import Finding, Question, RandomUnit, UnitTools
 from drivers.unit_tool import MARKER, MARKER_TEXT, Said
@@ -43,8 +45,18 @@ def ask(command: Sequence[str]) -> Said:
 def make_marked_unit(root: Path, rng: random.Random) -> list[str]:
     """Returns the options of the run: those in the drawn arguments, or one of each if there are none."""
     arguments = make_unit(root, rng)
-    (root / MARKER).write_bytes(MARKER_TEXT)
+    mark(root)
     return [f"-{letter}" for letter in parse_options(arguments)[0] or "ai"]
+
+
+def mark(root: Path) -> None:
+    (root / MARKER).write_bytes(MARKER_TEXT)
+
+
+def make_and_mark(make: Callable[[Path], Sequence[str]], root: Path) -> Sequence[str]:
+    arguments = make(root)
+    mark(root)
+    return arguments
 
 
 def letters_of(options: Sequence[str]) -> str:
@@ -109,7 +121,8 @@ def check(unit: RandomUnit, tools: UnitTools) -> Finding:
     return Finding(lines, frozenset(reached))
 
 
-QUESTION = Question("explain", make_marked_unit, check, tuple(reasons.CODES), enough_units=600)
+QUESTION = Question("explain", make_marked_unit, check, tuple(reasons.CODES),
+                    certain=tuple(partial(make_and_mark, make) for make in CERTAIN_UNITS))
 
 
 def main(arguments: Sequence[str]) -> int:
