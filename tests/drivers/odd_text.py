@@ -5,9 +5,9 @@ from __future__ import annotations
 
 import random
 
-from drivers import input_lengths
+from drivers import buffers
 
-LONG_LINE = input_lengths.ONE_READ + 1
+LONG_LINE = buffers.ONE_READ + 1
 
 NUMBERS = (
     b"0", b"1", b"7", b"9", b"10", b"15", b"16", b"99", b"127", b"128", b"255", b"256",

@@ -6,7 +6,7 @@ from __future__ import annotations
 import random
 from pathlib import Path
 
-from drivers import input_lengths, odd_text
+from drivers import buffers, odd_text
 from model import configuration, parts, records
 from model.tree import Tree
 
@@ -135,7 +135,7 @@ def _text(rng: random.Random, size: int) -> bytes:
 def _product_size(rng: random.Random) -> int:
     if rng.random() < LONG_SHARE:
         longest = rng.random() < LONGEST_SHARE
-        return input_lengths.LONGEST if longest else rng.choice(input_lengths.AROUND)
+        return buffers.LONGEST if longest else rng.choice(buffers.AROUND)
     return rng.choice(TEXT_SIZES[:3] if rng.random() < 0.6 else TEXT_SIZES)
 
 

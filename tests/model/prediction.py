@@ -14,7 +14,7 @@ from pathlib import Path
 
 from model import snapshot, writers
 from model.snapshot import Entry
-from model.system import Fault, Library, System
+from model.system import CHOICES, Fault, Library, Streams, System
 from model.tree import Tree
 
 OPTION_LETTERS = b"ia"
@@ -80,14 +80,16 @@ def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcom
 
 
 def predict(root: Path, arguments: Sequence[str], names: Sequence[str],
-            faults: Sequence[Fault] = (), retries_interrupted: bool = True) -> Prediction:
+            faults: Sequence[Fault] = (), streams: Streams = Streams()) -> Prediction:
     """`names` are the model display names, code 1 first."""
     letters, complaints = parse_options(arguments)
     outcomes: list[Outcome] = []
     met: set[Fault] = set()
-    for choices in itertools.product((False, True), repeat=4 if faults else 0):
-        library = Library(*choices, retries_interrupted=retries_interrupted)
-        system = System(Tree(root), faults, library)
+    open_choices = [name for operation in {fault.operation for fault in faults}
+                        for name in CHOICES.get(operation, ())]
+    for choices in itertools.product((False, True), repeat=len(open_choices)):
+        library = Library(**dict(zip(open_choices, choices)))
+        system = System(Tree(root), faults, library, streams)
         outcome = _run(system, letters, names)
         met |= system.met
         if all(outcome.written != other.written for other in outcomes):

@@ -76,12 +76,19 @@ class OutputStream:
         write, the first piece of a gathered one) are either tried again at close or lost. Later
         bytes are dropped. One exception: a copy that has already moved a byte doesn't mark its
         destination, so the lines after the copy are still written.
+
+        With a second buffer the call's own bytes are lost. Pending is then the chunk of the first buffer
+        that made the second write out its own.
         """
+        library, chunk = self._system.library, self._system.streams.chunk
         whole = self._content
         end = fault.offset + fault.length
         pending = fault.pieces[0] if len(fault.pieces) > 1 else fault.length
         kept = whole[:fault.offset]
-        if self._system.library.pending_kept:
+        if library.pending_kept and chunk:
+            start = end - (chunk - 1 if library.chunk_overlaps else 0)
+            kept += whole[start:start + chunk]
+        elif library.pending_kept:
             kept += whole[fault.offset:fault.offset + pending]
         tail = b""
         fails = True
@@ -89,7 +96,7 @@ class OutputStream:
             start, stop = self._copied
             if start < fault.offset + pending and end <= stop:
                 tail = whole[stop:]
-                fails = end == len(whole) and self._system.library.last_write_fails_stream
+                fails = end == len(whole) and library.last_write_fails_stream
         self._content = kept + (b"" if fails else tail)
         self.failed = self.failed or fails
 

@@ -35,6 +35,19 @@ class Fault:
 
 
 @dataclass(frozen=True)
+class Streams:
+    """How a C++ library has built its file streams.
+
+    `retry_interrupted`: a stream repeats a read or write that a signal interrupted. `chunk` is the length
+    of a stream's own buffer where what it holds goes through a second buffer, that of a C stream; 0 where
+    there is none.
+    """
+
+    retry_interrupted: bool = True
+    chunk: int = 0
+
+
+@dataclass(frozen=True)
 class Library:
     """What a C++ library may do when a call under a stream fails.
 
@@ -42,6 +55,9 @@ class Library:
     outcome whatever is chosen here.
     """
 
+    # A C stream that has read some bytes of what it was asked for gives them, and no error: the next read
+    # goes on behind them. Only with a second buffer.
+    read_error_forgotten: bool = False
     # Reading fails after the first byte of a copy: one library throws inside (which marks the destination
     # failed), another sees a plain end.
     broken_copy_fails: bool = False
@@ -52,8 +68,16 @@ class Library:
     # The last write of a file may come from the copy (which has already moved bytes, so doesn't mark the
     # stream) or from close (which does).
     last_write_fails_stream: bool = False
-    # A stream repeats a read or write that a signal interrupted.
-    retries_interrupted: bool = True
+    # A second buffer that is full has all of the pending chunk but its last byte, or nothing of it: that
+    # depends on whether the stream has begun with a chunk of a single byte.
+    chunk_overlaps: bool = False
+
+
+# Which of them may matter when this operation fails.
+CHOICES = {
+    "read": ("read_error_forgotten", "broken_copy_fails", "unfinished_line_kept"),
+    "write": ("pending_kept", "last_write_fails_stream", "chunk_overlaps"),
+}
 
 
 @dataclass(frozen=True)
@@ -66,9 +90,11 @@ class Handle:
 class System:
     """The tree as the tool's calls see it, in the order of the calls."""
 
-    def __init__(self, tree: Tree, faults: Sequence[Fault], library: Library) -> None:
+    def __init__(self, tree: Tree, faults: Sequence[Fault], library: Library,
+                 streams: Streams = Streams()) -> None:
         self.tree = tree
         self.library = library
+        self.streams = streams
         self.met: set[Fault] = set()
         self._faults = tuple(faults)
         self._counts: Counter[tuple[str, str]] = Counter()
@@ -127,7 +153,7 @@ class System:
             return fault
         if fault.kind == "short":
             return None  # a stream continues with the rest
-        if fault.error == "EINTR" and self.library.retries_interrupted:
+        if fault.error == "EINTR" and self.streams.retry_interrupted:
             return None
         return fault
 
@@ -135,9 +161,12 @@ class System:
         """Everything that a stream reads from a file, and whether an error ended it."""
         content = b"" if handle.place.kind == FOLDER_PLACE else self.tree.read(handle.place)
         fault = self.transfer_fault("read", handle)
-        if fault is not None:
+        if fault is not None and not self._forgets(fault):
             return content[:fault.offset], True
         return content, handle.place.kind == FOLDER_PLACE
+
+    def _forgets(self, fault: Fault) -> bool:
+        return (self.library.read_error_forgotten and self.streams.chunk > 0 and fault.offset > 0)
 
     def list_folder(self, path: str) -> list[str]:
         """Entry names in the order of the listing; nothing if it can't be opened."""

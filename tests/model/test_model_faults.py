@@ -5,7 +5,7 @@ from __future__ import annotations
 
 from model import parts
 from model.prediction import predict
-from model.system import Fault
+from model.system import Fault, Streams
 from model.unit_case import NAMES, STATIC, STOCK, UnitCase
 from model.test_model_iap import HARDWARE1, HARDWARE2, VEHICLE, accessory
 from model.tuning import tuning_text
@@ -23,9 +23,10 @@ class Faults(UnitCase):
         self.block = accessory(b"12345678", NAMES[0].encode(), b"1.2.3")
         self.compact = accessory(b"12345678", NAMES[0].encode(), b"010203")
 
-    def contents(self, argument: str, fault: Fault, name: str) -> list[bytes | None]:
+    def contents(self, argument: str, fault: Fault, name: str,
+                 streams: Streams = Streams()) -> list[bytes | None]:
         """What the file may hold, in all outcomes."""
-        prediction = predict(self.root, [argument], NAMES, [fault])
+        prediction = predict(self.root, [argument], NAMES, [fault], streams)
         self.assertEqual(prediction.unmet, ())
         found = []
         for outcome in prediction.alternatives:
@@ -120,7 +121,8 @@ class Faults(UnitCase):
 
     def test_interrupted_read_of_a_library_that_does_not_go_on(self) -> None:
         fault = Fault("read", STATIC[2], 1, error="EINTR")
-        (outcome,) = predict(self.root, ["-i"], NAMES, [fault], False).alternatives
+        (outcome,) = predict(self.root, ["-i"], NAMES, [fault],
+                              Streams(retry_interrupted=False)).alternatives
         self.assertEqual(outcome.written["/tmp/iap2.cfg"], self.block + HARDWARE2)
 
     def test_write_error_at_close(self) -> None:
@@ -144,6 +146,23 @@ class Faults(UnitCase):
                       pieces=(0, 8191))
         self.assertEqual(self.contents("-i", fault, "iap2_device.cfg"),
                          [start + b"x" * 8191 + VEHICLE])
+
+    def test_write_error_under_a_c_stream_loses_its_buffer_and_may_keep_the_next_chunk(self) -> None:
+        text = b"".join(b"%07d\n" % line for line in range(1000))
+        parts.put(self.root, STATIC[2], text)
+        whole = self.block + HARDWARE2 + text
+        fault = Fault("write", "/tmp/iap2.cfg", 1, length=4096)
+        found = self.contents("-i", fault, "iap2.cfg", Streams(chunk=1024))
+        self.assertEqual(set(found), {b"", whole[4096:5120], whole[3073:4097]})
+
+    def test_read_error_within_what_a_c_stream_was_asked_for_may_go_unseen(self) -> None:
+        start = self.block + HARDWARE2
+        content = self.content(STATIC[2])
+        for offset, unseen in ((0, False), (5, True)):
+            found = self.contents("-i", Fault("read", STATIC[2], 1, offset=offset), "iap2.cfg",
+                                  Streams(chunk=1024))
+            self.assertIn(start + content[:offset], found)
+            self.assertEqual(start + content in found, unseen)
 
     def test_unmet_fault_is_reported(self) -> None:
         fault = Fault("open", "/nowhere", 1)

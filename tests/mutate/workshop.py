@@ -24,7 +24,7 @@ CONFIGURATION = ("-DCMAKE_CXX_COMPILER=g++", "-DCMAKE_BUILD_TYPE=Debug",
                  "-DCMAKE_CXX_FLAGS_DEBUG=",
                  "-DCMAKE_EXE_LINKER_FLAGS=-static", "-DORVANE_KIT=ON", "-DORVANE_TESTS=ON",
                  "-DORVANE_TEST_FOLDERS=product;whole_runs",
-                 "-DORVANE_FAULTS=ON")
+                 "-DORVANE_FAULTS_EVERY=5")
 
 
 CXX_FLAGS = "-O0 -w -D_GLIBCXX_ASSERTIONS"

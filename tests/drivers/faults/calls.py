@@ -22,7 +22,8 @@ PIECE = re.compile(r"iov_len=(\d+)")
 
 @dataclass(frozen=True)
 class Call:
-    """`number` counts the calls of this name from the start of the traced process.
+    """`number` counts the calls of this name from the start of the traced process, `turn` those that name
+    the path or use a descriptor of it: an emulator makes calls of its own between them.
 
     `occurrence`, `offset` and `pieces` are those of a fault of this call; `moved` is its result,
     the number of bytes transferred.
@@ -33,6 +34,7 @@ class Call:
     operation: str
     path: str
     occurrence: int
+    turn: int
     offset: int = 0
     moved: int = 0
     pieces: tuple[int, ...] = ()
@@ -49,6 +51,7 @@ class _Reader:
     def __init__(self) -> None:
         self.calls: list[Call] = []
         self._numbers: Counter[str] = Counter()
+        self._turns: Counter[tuple[str, str]] = Counter()
         self._occurrences: Counter[tuple[str, str]] = Counter()
         self._descriptors: dict[int, _Descriptor] = {}
         self._mappings: dict[str, str] = {}
@@ -63,6 +66,7 @@ class _Reader:
             # Earlier calls belong to the launcher or its start.
             self.calls.clear()
             self._occurrences.clear()
+            self._turns.clear()
             self._descriptors.clear()
             return
         operation = OPERATIONS.get(name)
@@ -82,8 +86,12 @@ class _Reader:
         key = (operation, path)
         self._occurrences[key] += 1
         self.calls.append(Call(name, self._numbers[name], operation, path,
-                               self._occurrences[key]))
+                               self._occurrences[key], self._turn(name, path)))
         return self._occurrences[key]
+
+    def _turn(self, name: str, path: str) -> int:
+        self._turns[name, path] += 1
+        return self._turns[name, path]
 
     def _open(self, name: str, arguments: str, result: int) -> None:
         quoted = QUOTED.search(arguments)
@@ -106,7 +114,8 @@ class _Reader:
             return
         pieces = tuple(map(int, PIECE.findall(arguments)))
         self.calls.append(Call(name, self._numbers[name], operation, descriptor.path,
-                               descriptor.opening, descriptor.position, max(result, 0), pieces))
+                               descriptor.opening, self._turn(name, descriptor.path),
+                               descriptor.position, max(result, 0), pieces))
         descriptor.position += max(result, 0)
         if operation == "close":
             self._descriptors = {number: other for number, other in self._descriptors.items()

@@ -7,7 +7,7 @@ from collections.abc import Callable
 from dataclasses import dataclass
 from pathlib import Path
 
-from drivers import input_lengths
+from drivers import buffers
 from model import parts
 
 
@@ -51,7 +51,7 @@ def _airplay_fallback(root: Path) -> None:
 def _large_templates(root: Path) -> None:
     """Each takes three reads, so that reads and writes also fail behind the first."""
     _whole_unit(root)
-    text = b"key = value without a last line end;" * (input_lengths.AROUND[-1] // 36)
+    text = b"key = value without a last line end;" * (buffers.AROUND[-1] // 36)
     for path in parts.TEMPLATES:
         parts.put(root, path, text)
 

@@ -43,6 +43,13 @@ class Trace(unittest.TestCase):
             ("writev", 1, "write", "/tmp/out", 1), ("close", 3, "close", "/tmp/out", 1),
             ("openat", 5, "open", "/tmp/out", 2), ("write", 3, "write", "/tmp/out", 2)])
 
+    def test_turns_of_a_path(self) -> None:
+        found = [(call.name, call.path, call.turn)
+                 for call in own_calls(TRACE.splitlines()) if call.path == "/tmp/out"]
+        self.assertEqual(found, [
+            ("openat", "/tmp/out", 1), ("write", "/tmp/out", 1), ("writev", "/tmp/out", 1),
+            ("close", "/tmp/out", 1), ("openat", "/tmp/out", 2), ("write", "/tmp/out", 2)])
+
     def test_bytes_covered(self) -> None:
         found = [(call.offset, call.moved, call.pieces)
                  for call in own_calls(TRACE.splitlines()) if call.operation == "write"]

@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Lengths of inputs at which the tool has to read again.
+"""The lengths of the tool's buffers, and of inputs at which it has to read again.
 
-They come from its source, so that they can't fall behind when its buffer changes.
+They come from its source, so that they can't fall behind when it changes.
 """
 
 from __future__ import annotations
@@ -12,15 +12,18 @@ from pathlib import Path
 SOURCE = Path(__file__).resolve().parents[2] / "src/writers/template_merge.h"
 
 
-def _buffer_size() -> int:
-    found = re.findall(r"INPUT_BUFFER_SIZE = (\d+);", SOURCE.read_text())
+def _constant(name: str) -> int:
+    found = re.findall(rf"\b{name} = (\d+);", SOURCE.read_text())
     if len(found) != 1:
-        raise SystemExit(f"{SOURCE} must give INPUT_BUFFER_SIZE as one number, not {found}")
+        raise SystemExit(f"{SOURCE} must give {name} as one number, not {found}")
     return int(found[0])
 
 
+# Of an output.
+OUTPUT = _constant("OUTPUT_BUFFER_SIZE")
+
 # What one read of a copied file gives; a library that keeps no byte of the buffer back reads one more.
-ONE_READ = _buffer_size() - 1
+ONE_READ = _constant("INPUT_BUFFER_SIZE") - 1
 
 # One below, at and above one read and two, and beyond.
 AROUND = (ONE_READ - 1, ONE_READ, ONE_READ + 1, ONE_READ + 2,
