@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstddef>
 #include <string>
 #include <vector>
@@ -206,7 +207,10 @@ TEST_F(TraceTest, CalibrationFileIsNeverOpened) {
     remove(IMAGE_PATH);
     putFolder("/fs/rwdata/CALS");
     writeFile("/fs/rwdata/CALS/cal_active.bin", std::string(179, '\1'));
-    for (const std::string& operation : run("-a").operations) {
+    const Operations operations = run("-a").operations;
+    const std::string noImage = std::string("read ") + IMAGE_PATH + " failed";
+    EXPECT_EQ(std::count(operations.begin(), operations.end(), noImage), 4);
+    for (const std::string& operation : operations) {
         EXPECT_EQ(operation.find("CALS"), std::string::npos) << operation;
     }
 }
