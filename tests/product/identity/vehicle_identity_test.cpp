@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "config/config_store.h"
-#include "identity/model_names.h"
 #include "identity/vehicle_identity.h"
 #include "tests/product/image_offsets.h"
+#include "tests/support/model_list.h"
 #include "tests/support/unit_test.h"
 
 #include <fstream>
@@ -122,7 +122,7 @@ TEST_F(VehicleIdentityTest, ModelCodesOneTo47GiveTheirEntry) {
     for (int code = 1; code <= 47; ++code) {
         SCOPED_TRACE(code);
         setByte(MODEL_OFFSET, code);
-        EXPECT_EQ(model(), ModelNameTable.at(static_cast<std::size_t>(code - 1)));
+        EXPECT_EQ(model(), listedModel(code));
     }
 }
 

@@ -157,7 +157,7 @@ TEST(DpsLayoutTest, EveryLineFitsItsBuffer) {
 
 TEST(DecodeFieldTest, ZerosDecodeToZero) {
     const DpsBlock block{};
-    for (const DpsField& field : DPS_LAYOUT) {
+    for (const DpsField& field : EXPECTED_LAYOUT) {
         for (std::size_t element = 0; element < field.count; ++element) {
             EXPECT_EQ(decodeField(block, field, element), 0) << field.key;
         }
@@ -167,7 +167,7 @@ TEST(DecodeFieldTest, ZerosDecodeToZero) {
 TEST(DecodeFieldTest, OnesDecodeToTheHighestCodeOrMinusOne) {
     DpsBlock block{};
     block.bytes.fill(0xFF);
-    for (const DpsField& field : DPS_LAYOUT) {
+    for (const DpsField& field : EXPECTED_LAYOUT) {
         const std::int32_t expected = field.encoding == DpsEncoding::code2 ? 3
                                       : field.encoding == DpsEncoding::u8  ? 255
                                                                            : -1;

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The values in the head of the generated AirPlay file.
-#include "identity/model_names.h"
 #include "tests/product/writers/airplay_unit.h"
 #include "tests/support/file_event_log.h"
+#include "tests/support/model_list.h"
 #include "writers/airplay_writer.h"
 
 #include <filesystem>
@@ -102,7 +102,7 @@ TEST_F(AirplayValuesTest, WritesTheNameOfTheModel) {
     for (const int code : {1, 25, 32, 47}) {
         setImage(MODEL_OFFSET, bytes({code}));
         AirplayValues values;
-        values.model = ModelNameTable[static_cast<std::size_t>(code) - 1];
+        values.model = listedModel(code);
         EXPECT_EQ(generatedHead(), airplayHead(values));
     }
 }
@@ -121,8 +121,7 @@ TEST_F(AirplayValuesTest, EveryValueIsInItsOwnPlace) {
     setImage(FUEL_TYPE_OFFSET, bytes({1}));
     setImage(PROFILE_OFFSET, bytes({5, 0}));
     setImage(MODEL_OFFSET, bytes({26}));
-    EXPECT_EQ(generatedHead(),
-              airplayHead({ModelNameTable[25], "QUARION", profileLines("5"), "7"}));
+    EXPECT_EQ(generatedHead(), airplayHead({listedModel(26), "QUARION", profileLines("5"), "7"}));
 }
 
 TEST_F(AirplayValuesTest, SecondRunGathersEverythingAgain) {
@@ -134,7 +133,7 @@ TEST_F(AirplayValuesTest, SecondRunGathersEverythingAgain) {
     writeFile(AIRPLAY_TEMPLATE, "s\n");
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT),
-              airplayHead({ModelNameTable[29], "QUARION", profileLines("9"), "1"}) + "s\n");
+              airplayHead({listedModel(30), "QUARION", profileLines("9"), "1"}) + "s\n");
 }
 
 TEST_F(AirplayValuesTest, GathersItsValuesBeforeItOpensTheOutput) {
@@ -145,8 +144,7 @@ TEST_F(AirplayValuesTest, GathersItsValuesBeforeItOpensTheOutput) {
     std::filesystem::create_symlink(IMAGE_PATH, AIRPLAY_OUTPUT);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT),
-              airplayHead({ModelNameTable[29], "QUARION", profileLines("9"), "1"}) +
-                  "static = 1\n");
+              airplayHead({listedModel(30), "QUARION", profileLines("9"), "1"}) + "static = 1\n");
 }
 
 TEST_F(AirplayValuesTest, EachValueHasItsOwnLookupBeforeTheFilesAreOpened) {

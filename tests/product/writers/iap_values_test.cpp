@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // The values in the three iAP files.
-#include "identity/model_names.h"
 #include "tests/product/image_offsets.h"
 #include "tests/product/writers/iap_unit.h"
 #include "tests/support/file_event_log.h"
 #include "tests/support/folder_names.h"
+#include "tests/support/model_list.h"
 #include "writers/iap_writer.h"
 
 #include <filesystem>
@@ -49,8 +49,7 @@ protected:
 TEST_F(IapValuesTest, ModelIsTheNameOfItsCode) {
     for (const int code : {1, 25, 32, 47}) {
         setImage(MODEL_OFFSET, std::string(1, static_cast<char>(code)));
-        expectValues({ModelNameTable[static_cast<std::size_t>(code) - 1], "SN004217", "3.10.2"},
-                     "030a02");
+        expectValues({listedModel(code), "SN004217", "3.10.2"}, "030a02");
     }
 }
 
@@ -157,13 +156,13 @@ TEST_F(IapValuesTest, SecondRunGathersEverythingAgain) {
     setImage(MODEL_OFFSET, "\x1e");
     setDiskFromEnd(SERIAL_FROM_END, "OTHER\0\0\0"s);
     setVersion("4.5.6");
-    expectValues({ModelNameTable[29], "OTHER", "4.5.6"}, "040506");
+    expectValues({listedModel(30), "OTHER", "4.5.6"}, "040506");
 }
 
 TEST_F(IapValuesTest, ModelIsGatheredBeforeTheFirstFileIsOpened) {
     setImage(MODEL_OFFSET, "\x1e");
     std::filesystem::create_symlink(IMAGE_PATH, DEVICE_OUTPUT);
-    expectValues({ModelNameTable[29], "SN004217", "3.10.2"}, "030a02");
+    expectValues({listedModel(30), "SN004217", "3.10.2"}, "030a02");
 }
 
 TEST_F(IapValuesTest, SerialIsGatheredBeforeTheFirstFileIsOpened) {
