@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 //
 // A unit in, its /tmp out: golden/CASE holds the unit, the arguments and the expected /tmp.
+#include "config/param_catalogue.h"
+#include "config/record_slots.h"
+#include "identity/vehicle_identity.h"
 #include "kit/description/parse_description.h"
 #include "kit/enter/entered_root.h"
 #include "kit/enter/run_inside.h"
@@ -9,11 +12,15 @@
 #include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
+#include "tuning/audio_profile.h"
+#include "tuning/dps_block.h"
 
 #include <gtest/gtest.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <cstddef>
+#include <cstdint>
 #include <filesystem>
 #include <set>
 #include <sstream>
@@ -144,8 +151,69 @@ std::string caseName(const ::testing::TestParamInfo<std::string>& parameter) {
 
 INSTANTIATE_TEST_SUITE_P(Golden, GoldenTest, ::testing::ValuesIn(goldenCases()), caseName);
 
-TEST(GoldenCases, AreFound) {
-    EXPECT_GE(goldenCases().size(), 25U);
+TEST(GoldenCases, AreAllFound) {
+    EXPECT_EQ(goldenCases().size(), 115U) << "a new case, or a lost one: set their number";
+}
+
+/// What the cases lay at an offset that a person wrote, where no table of the product has a part:
+/// the offsets, from the start of the image and from the end of the disk.
+struct RawPlaces {
+    std::set<std::uint32_t> ofImage;
+    std::set<std::uint64_t> ofDisk;
+};
+
+bool isVisible(const kit::Bytes& bytes) {
+    return bytes.find_first_not_of('\0') != kit::Bytes::npos;
+}
+
+RawPlaces rawPlaces() {
+    RawPlaces places;
+    for (const std::string& name : goldenCases()) {
+        const kit::UnitDescription unit =
+            kit::readDescription(fs::path(ORVANE_GOLDEN_DIR) / name / "unit.toml");
+        for (const auto& [offset, bytes] : unit.image.bytes) {
+            if (isVisible(bytes)) {
+                places.ofImage.insert(offset);
+            }
+        }
+        for (const auto& [offset, bytes] : unit.disk.bytes) {
+            if (isVisible(bytes)) {
+                places.ofDisk.insert(unit.disk.size - offset);
+            }
+        }
+    }
+    return places;
+}
+
+TEST(GoldenCases, LayEveryParameterThatIsReadByHand) {
+    const RawPlaces places = rawPlaces();
+    for (const std::uint16_t number :
+         {RIGHT_HAND_DRIVE_PARAM, BRAND_PARAM, FUEL_TYPE_PARAM, AUDIO_PROFILE_PARAM, MODEL_PARAM}) {
+        const std::uint32_t offset = ParamCatalogue.rows.at(number - 1U).offset;
+        EXPECT_EQ(places.ofImage.count(offset), 1U) << "parameter " << number;
+    }
+}
+
+TEST(GoldenCases, LayEverySlotByHand) {
+    const RawPlaces places = rawPlaces();
+    for (std::uint32_t slot = 0; slot < RECORD_SLOT_COUNT; ++slot) {
+        std::uint32_t size = 0;
+        std::uint64_t offset = NO_SLOT_OFFSET;
+        recordSlotLayout(slot, size, offset);
+        EXPECT_EQ(places.ofDisk.count(RECORD_AREA_SIZE - offset), 1U) << "slot " << slot;
+    }
+}
+
+TEST(GoldenCases, LayEveryTuningFieldByHand) {
+    const RawPlaces places = rawPlaces();
+    for (const std::int32_t block : {DPS_BLOCK_TELEPHONY, DPS_BLOCK_SPEECHREC}) {
+        for (const DpsField& field : DPS_LAYOUT) {
+            const std::size_t offset =
+                static_cast<std::size_t>(block) * DPS_BLOCK_SIZE + field.offset;
+            EXPECT_EQ(places.ofDisk.count(TUNING_AREA_START - offset), 1U)
+                << field.key << " of block " << block;
+        }
+    }
 }
 
 } // namespace
