@@ -29,7 +29,9 @@ endfunction()
 
 add_library(orvane_program INTERFACE)
 if(ORVANE_STATIC)
-  target_link_options(orvane_program INTERFACE -static)
+  # The map says which members of which archives a program contains (packaging/bill_of_materials.py).
+  target_link_options(orvane_program INTERFACE -static
+    "LINKER:-Map=${PROJECT_BINARY_DIR}/$<TARGET_PROPERTY:NAME>.map")
 elseif(CMAKE_SYSTEM_NAME STREQUAL QNX)
   # A unit may lack the compiler's own libraries, or have those of another compiler. Its C library belongs
   # to the unit.

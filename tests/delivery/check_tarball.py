@@ -5,14 +5,16 @@ its programs start. Exit status: 0 yes, 1 no, with the reason."""
 
 from __future__ import annotations
 
+import json
 import subprocess
 import sys
 import tarfile
 import tempfile
 from pathlib import Path
 
+import bill_rules
 import hardening
-from shipped import IN_TARBALL, PROGRAMS, VERSION
+from shipped import BILL, IN_TARBALL, PROGRAMS, VERSION
 
 
 def complaints(tarball: Path, emulator: str) -> list[str]:
@@ -25,8 +27,7 @@ def complaints(tarball: Path, emulator: str) -> list[str]:
         if found != IN_TARBALL:
             return [f"it holds {sorted(found)}"]
         if owners != {"root (0:0)"}:
-            return [f"its files belong to {', '.join(sorted(owners))} instead of root: pack as root, "
-                    "or where users can make user namespaces"]
+            return [f"its files belong to {', '.join(sorted(owners))} instead of root"]
         missing = [f"{program}: {reason}" for program in sorted(PROGRAMS)
                    for reason in hardening.missing_in_program(folder / program)]
         said = subprocess.run([emulator, folder / "bin/orvane-unit", "--version"], text=True,
@@ -36,7 +37,9 @@ def complaints(tarball: Path, emulator: str) -> list[str]:
         silent = subprocess.run([emulator, folder / "bin/orvane"], capture_output=True, check=False)
         if (silent.returncode, silent.stdout, silent.stderr) != (0, b"", b""):
             missing.append(f"orvane: {silent}")
-        return missing
+        bill = json.loads((folder / BILL).read_text(encoding="utf-8"))
+        content = {name: (folder / name).read_bytes() for name in found - {BILL}}
+        return missing + bill_rules.broken_rules(bill, content)
 
 
 def main() -> int:

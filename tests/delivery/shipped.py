@@ -10,5 +10,6 @@ PROJECT = Path(__file__).resolve().parents[2]
 VERSION = re.search(r"project\(orvane VERSION (\S+)", (PROJECT / "CMakeLists.txt").read_text())[1]
 
 PROGRAMS = {"bin/orvane", "bin/orvane-unit"}
-EVERYWHERE = PROGRAMS | {"share/doc/orvane/copyright"}
+BILL = "share/doc/orvane/orvane.spdx.json"
+EVERYWHERE = PROGRAMS | {"share/doc/orvane/copyright", BILL}
 IN_TARBALL = EVERYWHERE | {"bin/orvane-field"}
