@@ -56,7 +56,7 @@ if(Python3_FOUND)
 else()
   message(STATUS "no python3: CHANGELOG.md will not be installed")
 endif()
-install(FILES README.md DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT host)
+install(FILES README.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT host)
 install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT host)
 
 set(CPACK_PACKAGE_NAME orvane)

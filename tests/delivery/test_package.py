@@ -28,7 +28,7 @@ IN_PACKAGE = {f"usr/{name}" for name in EVERYWHERE | {
     "share/bash-completion/completions/orvane-unit", "share/fish/vendor_completions.d/orvane-unit.fish",
     "share/zsh/site-functions/_orvane-unit", "share/zsh/vendor-completions/_orvane-unit",
     "share/doc/orvane/changelog.gz", "share/lintian/overrides/orvane",
-    "share/doc/orvane/README.md"} | {f"share/doc/orvane/{name}" for name in DOCUMENTS}}
+    "share/doc/orvane/README.md", "share/doc/orvane/SECURITY.md"} | {f"share/doc/orvane/{name}" for name in DOCUMENTS}}
 
 
 def call(*words: str | Path) -> str:
