@@ -7,8 +7,7 @@ file(CHMOD_RECURSE ${CPACK_TEMPORARY_DIRECTORY} DIRECTORY_PERMISSIONS
 
 if(CPACK_ORVANE_BILL_OF_MATERIALS)
   execute_process(COMMAND ${CPACK_ORVANE_BILL_OF_MATERIALS} --prefix ${CPACK_PACKAGING_INSTALL_PREFIX}
-    ${CPACK_TEMPORARY_DIRECTORY}     COMMAND_ERROR_IS_FATAL ANY)
+    ${CPACK_TEMPORARY_DIRECTORY} COMMAND_ERROR_IS_FATAL ANY)
 else()
-  message(STATUS "The package has no bill of materials: that needs a static build by Ninja, python3, and the "
-    "packages of a Debian")
+  message(STATUS "no bill of materials: it needs a static build by Ninja with Debian's packages, and python3")
 endif()

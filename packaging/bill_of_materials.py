@@ -53,10 +53,10 @@ class Incomplete(Exception):
 class Part:
     """What a program has of one Debian package."""
     archives: set[str] = field(default_factory=set)
-    headers: int = 0
+    has_headers: bool = False
 
     def __str__(self) -> str:
-        return "; ".join([*sorted(self.archives), *(["headers"] if self.headers else [])])
+        return "; ".join([*sorted(self.archives), *(["headers"] if self.has_headers else [])])
 
 
 @dataclass(frozen=True)
@@ -128,7 +128,7 @@ class Build:
         for path in linked:
             parts.setdefault(owners[path], Part()).archives.add(Path(path).name)
         for path in headers:
-            parts.setdefault(owners[path], Part()).headers += 1
+            parts.setdefault(owners[path], Part()).has_headers = True
         return parts
 
     def foreign(self, names: set[str]) -> set[str]:

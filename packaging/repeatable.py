@@ -8,6 +8,7 @@ from __future__ import annotations
 
 import gzip
 import re
+import shutil
 import subprocess
 import sys
 import tarfile
@@ -50,10 +51,12 @@ def installed_size(root: Path) -> int:
 
 def main() -> int:
     for package in map(Path, sys.argv[1:]):
-        if package.suffix == ".deb":
+        if package.suffix != ".deb":
+            pack_tarball_again(package)
+        elif shutil.which("dpkg-deb"):
             pack_debian_package_again(package)
         else:
-            pack_tarball_again(package)
+            print(f"{package.name} depends on where it was packed: there is no dpkg-deb", file=sys.stderr)
     return 0
 
 

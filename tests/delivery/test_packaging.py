@@ -88,6 +88,16 @@ class DebianPackageTest(unittest.TestCase):
             self.assertEqual(size, "3\n")  # two blocks of the file, and a folder
 
 
+    def test_without_the_tool_the_package_stays_and_a_line_says_so(self) -> None:
+        with tempfile.TemporaryDirectory() as holder:
+            package = self.package(Path(holder), 5)
+            before = package.read_bytes()
+            done = subprocess.run([sys.executable, REPEATABLE, package], check=True, text=True,
+                                  stderr=subprocess.PIPE, env={"PATH": holder})
+            self.assertEqual(package.read_bytes(), before)
+            self.assertIn("5.deb depends on where it was packed", done.stderr)
+
+
 class ChangelogTest(unittest.TestCase):
     def as_debian(self, text: str) -> tuple[int, str]:
         with tempfile.TemporaryDirectory() as holder:
