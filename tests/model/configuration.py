@@ -22,11 +22,13 @@ def width(number: int) -> int:
     return 2 if number in TWO_BYTES_WIDE else 1
 
 
+# Rules: VEH-01, VEH-06, VEH-10, PRO-01
 def offset(number: int) -> int:
     """The image is packed: a parameter directly follows those before it."""
     return sum(width(before) for before in range(1, number))
 
 
+# Rules: IMG-01 to IMG-04, IMG-06 to IMG-10
 def parameter(system: System, number: int) -> int | None:
     """Opens, measures, maps, reads and closes; None without a readable image.
 

@@ -18,6 +18,7 @@ UNKNOWN_MODEL = b"VOXA"
 DEFAULT_SERIAL = b"ABCD1234abc"
 
 
+# Rules: VEH-02, VEH-03
 def load_names(path: Path = MODEL_NAMES) -> list[str]:
     """The model display names, code 1 first.
 
@@ -31,25 +32,30 @@ def load_names(path: Path = MODEL_NAMES) -> list[str]:
     return names
 
 
+# Rules: VEH-01, VEH-02, VEH-04, VEH-05, VEH-13
 def model_name(system: System, names: Sequence[str]) -> bytes:
     code = configuration.parameter(system, configuration.MODEL) or 0
     return names[code - 1].encode("ascii") if 1 <= code <= MODEL_COUNT else UNKNOWN_MODEL
 
 
+# Rules: VEH-06 to VEH-09, VEH-13
 def brand_name(system: System) -> bytes:
     code = configuration.parameter(system, configuration.BRAND)
     return b"QUARION" if code == 2 else b"MARL"
 
 
+# Rules: VEH-10 to VEH-12
 def right_hand_drive(system: System) -> int:
     return configuration.parameter(system, configuration.RIGHT_HAND_DRIVE) or 0
 
 
+# Rules: IAP-04
 def fuel_type(system: System) -> None:
     """Unused, but its source is read on every run."""
     configuration.parameter(system, configuration.FUEL_TYPE)
 
 
+# Rules: SER-02 to SER-05
 def unit_serial(system: System) -> bytes:
     record = records.serial_record(system)
     if record is None:

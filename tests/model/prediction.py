@@ -33,6 +33,7 @@ class Outcome:
     ways: Mapping[str, str]
 
 
+# Rules: RUN-01, RUN-02
 @dataclass(frozen=True)
 class Prediction:
     """Any one of `alternatives` is right; without faults there is exactly one.
@@ -47,6 +48,7 @@ class Prediction:
     status: int = 0
 
 
+# Rules: OPT-03 to OPT-14
 def parse_options(arguments: Sequence[str]) -> tuple[list[str], bytes]:
     """The letters of writers to run, and what the C library says about the others.
 
@@ -65,6 +67,7 @@ def parse_options(arguments: Sequence[str]) -> tuple[list[str], bytes]:
     return letters, complaints
 
 
+# Rules: RUN-04, RUN-14, OPT-01, OPT-02, OPT-03, OPT-05
 def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcome:
     ways: dict[str, str] = {}
     for letter in letters:
@@ -79,6 +82,7 @@ def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcom
     return Outcome(written, tmp if "/tmp" in after else None, ways)
 
 
+# Rules: RUN-03, RUN-06
 def predict(root: Path, arguments: Sequence[str], names: Sequence[str],
             faults: Sequence[Fault] = (), streams: Streams = Streams()) -> Prediction:
     """`names` are the model display names, code 1 first."""

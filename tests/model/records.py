@@ -13,6 +13,7 @@ TUNING_AREA = 0xFF000
 DPS_AREA_SIZE = 1880
 
 
+# Rules: SER-05, SER-06, TUN-05
 def _read_from_end(system: System, distance: int, count: int) -> bytes | None:
     """One transfer, `distance` bytes before the end; a short one is a success."""
     handle = system.open_reading(DISK)
@@ -31,10 +32,12 @@ def _read_from_end(system: System, distance: int, count: int) -> bytes | None:
     return result
 
 
+# Rules: SER-01, SER-07
 def serial_record(system: System) -> bytes | None:
     return _read_from_end(system, RECORD_AREA - SERIAL_OFFSET, SERIAL_SIZE)
 
 
+# Rules: TUN-01, TUN-05, TUN-06
 def tuning_blocks(system: System) -> bytes | None:
     """Always as long as the blocks; zeros replace what a short read didn't give."""
     blocks = _read_from_end(system, TUNING_AREA, DPS_AREA_SIZE)

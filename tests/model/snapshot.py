@@ -52,6 +52,7 @@ def take(root: Path, path: str = "") -> dict[str, Entry]:
     return entries
 
 
+# Rules: RUN-04, RUN-05, RUN-07, RUN-08
 def changed(before: Mapping[str, Entry], written: Mapping[str, bytes],
             new_mode: int | None = None) -> dict[str, Entry]:
     """What `before` becomes when `written` is written; an existing file keeps its mode."""

@@ -18,6 +18,7 @@ class InputStream:
             return b"", False
         return self._system.read_stream(self._handle)
 
+    # Rules: VER-04, VER-13
     def lines(self) -> list[bytes]:
         content, broken = self.rest()
         lines = content.split(b"\n")
@@ -45,6 +46,7 @@ class OutputStream:
         if not self.failed:
             self._content += content
 
+    # Rules: MRG-03 to MRG-06
     def copy(self, source: InputStream) -> None:
         """Fails when no byte moves; an empty source is enough for that."""
         if self.failed:
@@ -69,6 +71,7 @@ class OutputStream:
             self.failed = True
         self._handle = None
 
+    # Rules: MRG-11
     def _apply(self, fault: Fault) -> None:
         """Sets what the file holds after the write of `fault` failed.
 
@@ -101,6 +104,7 @@ class OutputStream:
         self.failed = self.failed or fails
 
 
+# Rules: MRG-08 to MRG-10
 def install_stock(system: System, stock_path: str, output_path: str) -> None:
     """Neither opening is checked; the output's is a second one of that path."""
     stock = InputStream(system, stock_path)

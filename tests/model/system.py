@@ -116,6 +116,7 @@ class System:
     def _succeeds(self, operation: str, path: str) -> bool:
         return self._fault(operation, path, self._count(operation, path)) is None
 
+    # Rules: MRG-07
     def open_reading(self, path: str) -> Handle | None:
         """Folders can be opened for reading, too; reading them fails."""
         opening = self._count("open", path)
@@ -126,6 +127,7 @@ class System:
             return None
         return Handle(path, opening, place)
 
+    # Rules: RUN-09, RUN-11 to RUN-13, MRG-01
     def open_writing(self, path: str) -> Handle | None:
         """Creates or truncates; a failed opening changes nothing."""
         opening = self._count("open", path)
@@ -168,6 +170,7 @@ class System:
     def _forgets(self, fault: Fault) -> bool:
         return (self.library.read_error_forgotten and self.streams.chunk > 0 and fault.offset > 0)
 
+    # Rules: VER-01, VER-16, VER-21
     def list_folder(self, path: str) -> list[str]:
         """Entry names in the order of the listing; nothing if it can't be opened."""
         handle = self.open_reading(path)

@@ -34,6 +34,7 @@ class Tree:
     def _real(self, path: str) -> str:
         return os.fspath(self.root) + path
 
+    # Rules: RUN-10
     def resolve(self, path: str) -> Place | None:
         """None if a part of the path is missing, not a folder, or a loop of links.
 

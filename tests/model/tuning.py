@@ -69,6 +69,7 @@ MEQEnable 4* 171
 """
 
 
+# Rules: TUN-12 to TUN-20
 def _value(block: bytes, stored: str, offset: int) -> bytes:
     if stored[0] in "sm":
         code = block[offset] >> int(stored[1:]) & 3
@@ -84,6 +85,7 @@ def _value(block: bytes, stored: str, offset: int) -> bytes:
     return SWITCH_WORDS.get(number, b"") if stored == "H" else b"%d" % number
 
 
+# Rules: TUN-08 to TUN-11, TUN-21, FLD-01 to FLD-44
 def tuning_text(block: bytes, block_id: int) -> bytes:
     lines = [b"; Genereated config from DPS (blockId %d)\n" % block_id]
     for row in LAYOUT.split("\n"):
@@ -94,6 +96,7 @@ def tuning_text(block: bytes, block_id: int) -> bytes:
     return b"".join(lines)
 
 
+# Rules: TUN-02, TUN-03, TUN-04, TUN-05, TUN-07
 def generate_tuning_file(system: System, block_id: int, path: str) -> str:
     """The disk is read even if the file can't be opened afterwards."""
     blocks = records.tuning_blocks(system)
@@ -107,6 +110,7 @@ def generate_tuning_file(system: System, block_id: int, path: str) -> str:
     return "generated" if blocks is not None else "fallback"
 
 
+# Rules: PRO-01 to PRO-07, PRO-09
 def audio_profile(system: System, ways: dict[str, str]) -> int | None:
     """None if unknown. The files are complete before the profile is known."""
     profile = configuration.parameter(system, configuration.AUDIO_PROFILE)

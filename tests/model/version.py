@@ -16,6 +16,7 @@ INT_MAX = 2**31 - 1
 INT_MIN = -(2**31)
 
 
+# Rules: VER-05 to VER-12, VER-22
 def read_record(system: System, path: str) -> dict[bytes, bytes]:
     """Lines without "=", or with nothing after it, make no entry."""
     record: dict[bytes, bytes] = {}
@@ -28,6 +29,7 @@ def read_record(system: System, path: str) -> dict[bytes, bytes]:
     return record
 
 
+# Rules: VER-02, VER-03, VER-14 to VER-21
 def application_version(system: System) -> bytes:
     """Every file is read before the first that describes an application is chosen."""
     found = [
@@ -41,6 +43,7 @@ def application_version(system: System) -> bytes:
     return b""
 
 
+# Rules: VER-28 to VER-30
 def extracted(component: bytes) -> int:
     """0 if there is no number; a number out of range becomes the limit."""
     match = NUMBER.match(component)
@@ -52,6 +55,7 @@ def extracted(component: bytes) -> int:
     return max(INT_MIN, min(INT_MAX, value))
 
 
+# Rules: VER-31 to VER-33
 def format_component(component: bytes) -> bytes:
     """The remainder has the dividend's sign; a negative one takes eight digits."""
     value = extracted(component)
@@ -59,6 +63,7 @@ def format_component(component: bytes) -> bytes:
     return b"%02x" % (remainder & 0xFFFFFFFF)
 
 
+# Rules: VER-23 to VER-27, VER-34
 def format_version(text: bytes) -> bytes:
     """A missing component repeats the one before it."""
     if text in (b"", b"N/A"):

@@ -29,6 +29,7 @@ class Accessory:
     serial: bytes
     model: bytes
 
+    # Rules: IAP-05 to IAP-11, IAP-14
     def block(self, firmware: bytes) -> bytes:
         """Each value ends at its first NUL."""
         return (
@@ -43,10 +44,12 @@ class Accessory:
         )
 
 
+# Rules: IAP-15
 def _to_nul(value: bytes) -> bytes:
     return value.split(b"\0", 1)[0]
 
 
+# Rules: AIR-04 to AIR-20, AIR-22
 def airplay_head(model: bytes, brand: bytes, profile: int | None, drive: int) -> bytes:
     head = (
         b"# Default name of the accessory if a name is not specified in the user prefs.\n"
@@ -67,6 +70,7 @@ def airplay_head(model: bytes, brand: bytes, profile: int | None, drive: int) ->
     return head + b"# rightHandDrive mode setting right\nrightHandDrive = %d\n\n" % drive
 
 
+# Rules: MRG-02, AIR-01 to AIR-03, AIR-21, PRO-06, PRO-08, PRO-10
 def write_airplay(system: System, names: Sequence[str], ways: dict[str, str]) -> None:
     model = identity.model_name(system, names)
     brand = identity.brand_name(system)
@@ -86,6 +90,8 @@ def write_airplay(system: System, names: Sequence[str], ways: dict[str, str]) ->
     output.close()
 
 
+# Rules: MRG-02, IAP-01 to IAP-04, IAP-12, IAP-13, IAP-16, TWO-01 to TWO-04
+# Rules: ONE-01 to ONE-11, PRO-11
 def write_iap(system: System, names: Sequence[str], ways: dict[str, str]) -> None:
     accessory = Accessory(identity.unit_serial(system), identity.model_name(system, names))
     firmware = version.application_version(system)
@@ -122,6 +128,7 @@ def write_iap(system: System, names: Sequence[str], ways: dict[str, str]) -> Non
         stream.close()
 
 
+# Rules: DEV-01 to DEV-06
 def _write_device(
         system: System, block: bytes, ways: dict[str, str]) -> tuple[InputStream, OutputStream]:
     output = OutputStream(system, DEVICE)

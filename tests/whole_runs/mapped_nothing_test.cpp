@@ -37,6 +37,7 @@ protected:
     }
 };
 
+// Rules: IMG-03
 TEST_F(MappedNothingTest, EmptyImageCountsAsMissing) {
     if (sizeof ORVANE_EMULATOR != 1) {
         GTEST_SKIP() << "an emulator always maps whole pages";

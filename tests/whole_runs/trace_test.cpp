@@ -133,6 +133,7 @@ protected:
     }
 };
 
+// Rules: IMG-10, MRG-01
 TEST_F(TraceTest, AirplayGathersThenWritesAndFlushesTheLastLines) {
     setImage(133, {3, 0});
     Operations expected;
@@ -165,6 +166,7 @@ TEST_F(TraceTest, AirplayGathersThenWritesAndFlushesTheLastLines) {
     EXPECT_EQ(trace.leftOpen, Operations());
 }
 
+// Rules: PRO-06, TUN-07
 TEST_F(TraceTest, GeneratedProfileWritesBothTuningFilesBeforeAirplayIsOpened) {
     setImage(133, "\xFF\xFF");
     const Trace trace = run("-a");
@@ -203,6 +205,7 @@ TEST_F(TraceTest, AirplayFallbackOpensTheOutputTwice) {
     EXPECT_EQ(trace.leftOpen, Operations());
 }
 
+// Rules: IMG-05
 TEST_F(TraceTest, CalibrationFileIsNeverOpened) {
     remove(IMAGE_PATH);
     putFolder("/fs/rwdata/CALS");
@@ -215,6 +218,7 @@ TEST_F(TraceTest, CalibrationFileIsNeverOpened) {
     }
 }
 
+// Rules: IMG-10, MRG-01, IAP-01, IAP-03, IAP-04, IAP-16
 TEST_F(TraceTest, IapRunsItsStagesInOrderAndScansTheVersionsTwice) {
     Operations expected = iapValues();
     append(expected, generated("/tmp/iap2_device.cfg", "/fs/mp/etc/iap2_device_static.cfg",
@@ -247,6 +251,7 @@ TEST_F(TraceTest, IapFallbacksKeepTheirStreamsOpenUntilTheEnd) {
     EXPECT_EQ(trace.leftOpen, Operations());
 }
 
+// Rules: OPT-06
 TEST_F(TraceTest, WithoutOptionsNothingIsTouched) {
     leave();
     EXPECT_EQ(traceRun(hostRoot(), {}).operations, Operations());

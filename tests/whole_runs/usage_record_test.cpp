@@ -59,6 +59,7 @@ std::optional<Section> findSection(const std::string& file, const std::string& n
                                            : findSectionAs<Elf64_Ehdr, Elf64_Shdr>(file, name);
 }
 
+// Rules: OPT-15
 TEST(UsageRecord, HoldsExactlyTheUsageText) {
     const auto section = findSection(readFile(ORVANE_BINARY), "QNX_usage");
     ASSERT_TRUE(section.has_value());

@@ -31,6 +31,7 @@ protected:
     }
 };
 
+// Rules: PAR-04
 TEST_F(ConfigStoreLifecycleTest, CloseOnANeverOpenedHandleDoesNothing) {
     const int before = openDescriptors();
     ConfigStore store;
@@ -41,6 +42,7 @@ TEST_F(ConfigStoreLifecycleTest, CloseOnANeverOpenedHandleDoesNothing) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+// Rules: PAR-04
 TEST_F(ConfigStoreLifecycleTest, SecondCloseDoesNothing) {
     ConfigStore store;
     ASSERT_EQ(0, store.open());

@@ -45,6 +45,7 @@ TEST_F(ConfigStoreTest, CannotBeCopied) {
     EXPECT_FALSE(std::is_copy_assignable_v<ConfigStore>);
 }
 
+// Rules: IMG-01
 TEST_F(ConfigStoreTest, NamesAreFixed) {
     EXPECT_STREQ("/fs/tmpfs/VS_DIAG_SERVICE_CONFIG_SHARED_MEM", CONFIG_SHM_NAME);
     EXPECT_STREQ("/fs/rwdata/CALS", CAL_FILE_DIR);
@@ -78,6 +79,7 @@ TEST_F(ConfigStoreTest, InitClosesWithoutReleasing) {
     store.length = 179;
 }
 
+// Rules: PAR-01
 TEST_F(ConfigStoreTest, OpenMapsTheWholeImage) {
     setImage(0, "\x11");
     setImage(178, "\x22");
@@ -91,6 +93,7 @@ TEST_F(ConfigStoreTest, OpenMapsTheWholeImage) {
     EXPECT_EQ(0x22, store.data[178]);
 }
 
+// Rules: IMG-06
 TEST_F(ConfigStoreTest, ContentIsNotValidated) {
     // Longer than the catalogue, several pages, all 0xFF.
     writeImage(std::string(20000, '\xFF') + "\x5A");
@@ -137,6 +140,7 @@ TEST_F(ConfigStoreTest, UnreadableObjectIsMinus2) {
     expectClosed(store);
 }
 
+// Rules: PAR-02
 TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndKeepsTheHandle) {
     remove(IMAGE_PATH);
     const int before = openDescriptors();
@@ -154,6 +158,7 @@ TEST_F(ConfigStoreTest, AbsentObjectIsMinus2AndKeepsTheHandle) {
     EXPECT_EQ(0xA5, value);
 }
 
+// Rules: IMG-05
 TEST_F(ConfigStoreTest, CalibrationFileIsNotAFallback) {
     remove(IMAGE_PATH);
     std::filesystem::create_directories("/fs/rwdata/CALS");
@@ -205,6 +210,7 @@ TEST_F(ConfigStoreTest, ObjectWithoutASizeIsMinus2AndItsDescriptorStaysUntilClos
     EXPECT_FALSE(isOpenDescriptor(descriptor));
 }
 
+// Rules: PAR-03
 TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndClosesTheHandle) {
     writeImage("");
     const int before = openDescriptors();
@@ -216,6 +222,7 @@ TEST_F(ConfigStoreTest, EmptyObjectIsMinus1AndClosesTheHandle) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+// Rules: PAR-03
 TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndClosesTheHandle) {
     // More than a 32-bit process has, and more than the limit leaves a 64-bit one. The files are
     // sparse. In 32 bits the second has length 0.
@@ -237,6 +244,7 @@ TEST_F(ConfigStoreTest, ObjectTooLargeToMapIsMinus1AndClosesTheHandle) {
     }
 }
 
+// Rules: PAR-03
 TEST_F(ConfigStoreTest, WholeImageThatCannotBeMappedIsMinus1AndClosesTheHandle) {
     if (sizeof ORVANE_EMULATOR != 1) {
         GTEST_SKIP() << "an emulator does not pass this limit on";
@@ -275,6 +283,7 @@ TEST_F(ConfigStoreTest, ShortObjectIsReadToTheEndOfItsPage) {
     EXPECT_EQ(0, byte);
 }
 
+// Rules: PAR-04
 TEST_F(ConfigStoreTest, CloseReleasesAndKeepsTheLength) {
     const int before = openDescriptors();
     ConfigStore store;

@@ -35,6 +35,7 @@ TEST(Crc32Test, RegisterStartsWithAllOnes) {
     EXPECT_EQ(0xFFFFFFFFU, CRC32_INITIAL);
 }
 
+// Rules: CRC-02
 TEST(Crc32Test, TableFollowsFromThePolynomial) {
     ASSERT_EQ(256U, CRC32_TABLE.size());
     for (std::uint32_t byte = 0; byte < 256; ++byte) {
@@ -57,6 +58,7 @@ TEST(Crc32Test, GivesThePublishedCheckValues) {
     EXPECT_EQ(0x00000000U, complementedCrc(""));
 }
 
+// Rules: CRC-02
 TEST(Crc32Test, StepFollowsThePolynomialForEveryByte) {
     std::uint32_t crc = CRC32_INITIAL;
     for (std::uint32_t round = 0; round < 64; ++round) {

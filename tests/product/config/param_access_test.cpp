@@ -79,6 +79,7 @@ TEST_F(ParamAccessTest, StatusCodesAreFixed) {
     EXPECT_EQ(3U, PARAM_STORE_NOT_OPEN);
 }
 
+// Rules: CAT-04, PAR-06, PAR-08
 TEST_F(ParamAccessTest, EveryOneByteParameterComesFromItsOffset) {
     openStore();
     for (std::uint16_t number = 1; number <= 171; ++number) {
@@ -95,6 +96,7 @@ TEST_F(ParamAccessTest, EveryOneByteParameterComesFromItsOffset) {
     }
 }
 
+// Rules: CAT-04, PAR-06, PAR-08
 TEST_F(ParamAccessTest, EveryTwoByteParameterComesFromItsOffset) {
     openStore();
     for (std::uint16_t number = 1; number <= 171; ++number) {
@@ -110,6 +112,7 @@ TEST_F(ParamAccessTest, EveryTwoByteParameterComesFromItsOffset) {
     }
 }
 
+// Rules: PAR-08
 TEST_F(ParamAccessTest, GenericGetterReadsBothSizesAndNothingBeyond) {
     openStore();
     for (std::uint16_t number = 1; number <= 171; ++number) {
@@ -129,6 +132,7 @@ TEST_F(ParamAccessTest, GenericGetterReadsBothSizesAndNothingBeyond) {
     }
 }
 
+// Rules: IMG-09, PAR-08
 TEST_F(ParamAccessTest, LowByteOfAWordComesFirstInTheImage) {
     setImage(133, "\x34\x12");
     openStore();
@@ -140,6 +144,7 @@ TEST_F(ParamAccessTest, LowByteOfAWordComesFirstInTheImage) {
     EXPECT_EQ(0x1234, value);
 }
 
+// Rules: IMG-09
 TEST_F(ParamAccessTest, WordIsNotSignExtended) {
     setImage(133, "\xFF\xFF");
     openStore();
@@ -159,6 +164,7 @@ TEST_F(ParamAccessTest, LastParameterIsTheLastByteOfTheImage) {
     EXPECT_EQ(0x5A, value);
 }
 
+// Rules: PAR-05, PAR-09
 TEST_F(ParamAccessTest, UnknownNumberIsStatus1AndKeepsTheOutput) {
     openStore();
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
@@ -173,6 +179,7 @@ TEST_F(ParamAccessTest, UnknownNumberIsStatus1AndKeepsTheOutput) {
     }
 }
 
+// Rules: PAR-06, PAR-09
 TEST_F(ParamAccessTest, GetterOfTheWrongWidthIsStatus2AndKeepsTheOutput) {
     openStore();
     std::uint8_t byte = 0xA5;
@@ -183,6 +190,7 @@ TEST_F(ParamAccessTest, GetterOfTheWrongWidthIsStatus2AndKeepsTheOutput) {
     EXPECT_EQ(0xA5A5, word);
 }
 
+// Rules: PAR-07, PAR-09
 TEST_F(ParamAccessTest, StoreThatWasNeverOpenedIsStatus3AndKeepsTheOutput) {
     std::uint8_t byte = 0xA5;
     std::uint16_t word = 0xA5A5;
@@ -194,6 +202,7 @@ TEST_F(ParamAccessTest, StoreThatWasNeverOpenedIsStatus3AndKeepsTheOutput) {
     EXPECT_EQ(0xA5A5, word);
 }
 
+// Rules: PAR-05
 TEST_F(ParamAccessTest, NumberIsCheckedBeforeTheStore) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);
@@ -207,6 +216,7 @@ TEST_F(ParamAccessTest, NumberIsCheckedBeforeTheStore) {
     }
 }
 
+// Rules: PAR-06
 TEST_F(ParamAccessTest, WidthIsCheckedBeforeTheStore) {
     std::uint8_t byte = 0;
     std::uint16_t word = 0;
@@ -256,6 +266,7 @@ TEST(LentStoreTest, EveryDescriptorButMinusOneIsOpen) {
     }
 }
 
+// Rules: IMG-06
 TEST(LentStoreTest, LengthIsNotConsulted) {
     std::array<std::uint8_t, 179> image{};
     image[133] = 0x34;

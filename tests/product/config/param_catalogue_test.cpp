@@ -65,12 +65,14 @@ TEST(ParamCatalogueTest, ReadOnlyMemoryIsDistinguishedFromWritable) {
     EXPECT_EQ("rw", mappingRights(&writable).substr(0, 2));
 }
 
+// Rules: CAT-03
 TEST(ParamTypeSizeTest, EveryTypeCodeHasItsSize) {
     for (std::uint32_t code = 0; code < TYPE_SIZES.size(); ++code) {
         EXPECT_EQ(TYPE_SIZES.at(code), paramTypeSize(code)) << "type code " << code;
     }
 }
 
+// Rules: CAT-03
 TEST(ParamTypeSizeTest, CodeWithoutAnEntryHasSizeOne) {
     for (const std::uint32_t code :
          {9U, 10U, 17U, 44U, 256U, 264U, 0x7FFFFFFFU, 0x80000000U, 0x80000008U, 0xFFFFFFFFU}) {
@@ -78,6 +80,7 @@ TEST(ParamTypeSizeTest, CodeWithoutAnEntryHasSizeOne) {
     }
 }
 
+// Rules: CAT-10
 TEST(LookupParamTest, KnownNumberGivesIndexAndWholeRow) {
     for (std::uint16_t number = 1; number <= 171; ++number) {
         SCOPED_TRACE(number);
@@ -89,6 +92,7 @@ TEST(LookupParamTest, KnownNumberGivesIndexAndWholeRow) {
     }
 }
 
+// Rules: CAT-01, CAT-11
 TEST(LookupParamTest, UnknownNumberClearsTheIndexAndKeepsTheRow) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);
@@ -100,6 +104,7 @@ TEST(LookupParamTest, UnknownNumberClearsTheIndexAndKeepsTheRow) {
     }
 }
 
+// Rules: CAT-05, CAT-12
 TEST(ParamGroupTest, KnownNumberGivesItsGroup) {
     struct GroupEnds {
         std::uint16_t first;
@@ -120,6 +125,7 @@ TEST(ParamGroupTest, KnownNumberGivesItsGroup) {
     }
 }
 
+// Rules: CAT-12
 TEST(ParamGroupTest, UnknownNumberHasGroupEight) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         EXPECT_EQ(8U, paramGroup(number)) << "parameter " << number;
@@ -127,6 +133,7 @@ TEST(ParamGroupTest, UnknownNumberHasGroupEight) {
     EXPECT_EQ(8U, NO_GROUP);
 }
 
+// Rules: CAT-13
 TEST(DescribeParamTest, KnownNumberGivesNumberTypeSizeAndGroup) {
     struct Case {
         std::uint16_t number, type, size, group;
@@ -158,6 +165,7 @@ TEST(DescribeParamTest, InfoIsFourHalfWordsInIssuedOrder) {
     EXPECT_EQ(6U, offsetof(ParamInfo, group));
 }
 
+// Rules: CAT-14
 TEST(DescribeParamTest, UnknownNumberKeepsTheInfo) {
     for (const std::uint16_t number : UNKNOWN_NUMBERS) {
         SCOPED_TRACE(number);

@@ -127,6 +127,7 @@ const ParamDescriptor& rowOf(std::uint32_t number) {
 
 } // namespace
 
+// Rules: CAT-01
 TEST(ParamRowsTest, NumberIsThePositionPlusOne) {
     ASSERT_EQ(171U, ParamCatalogue.rows.size());
     for (std::uint32_t number = 1; number <= 171; ++number) {
@@ -134,12 +135,14 @@ TEST(ParamRowsTest, NumberIsThePositionPlusOne) {
     }
 }
 
+// Rules: CAT-02
 TEST(ParamRowsTest, EightParametersHaveTwoBytesAndAllOthersOne) {
     for (std::uint32_t number = 1; number <= 171; ++number) {
         EXPECT_EQ(isTwoBytes(number) ? 1U : 0U, rowOf(number).type) << "parameter " << number;
     }
 }
 
+// Rules: CAT-04
 TEST(ParamRowsTest, OffsetsRunWithoutGapsToTheEndOfTheImage) {
     std::uint32_t offset = 0;
     for (std::uint32_t number = 1; number <= 171; ++number) {
@@ -159,12 +162,14 @@ TEST(ParamRowsTest, OffsetsOfKnownParameters) {
     }
 }
 
+// Rules: CAT-05
 TEST(ParamRowsTest, GroupsAreRangesOfNumbers) {
     for (std::uint32_t number = 1; number <= 171; ++number) {
         EXPECT_EQ(issuedGroup(number), rowOf(number).group) << "parameter " << number;
     }
 }
 
+// Rules: CAT-06
 TEST(ParamRowsTest, IdIsTheIssuedCodeAboveTheCommonLowHalf) {
     std::uint32_t number = 0;
     for (const auto& [listedNumber, code] : CODES) {
@@ -173,6 +178,7 @@ TEST(ParamRowsTest, IdIsTheIssuedCodeAboveTheCommonLowHalf) {
     }
 }
 
+// Rules: CAT-07
 TEST(ParamRowsTest, OnlyCode86OccursTwice) {
     std::multiset<std::uint32_t> codes;
     for (const ParamDescriptor& row : ParamCatalogue.rows) {
@@ -187,12 +193,14 @@ TEST(ParamRowsTest, OnlyCode86OccursTwice) {
     EXPECT_EQ(206U, *codes.rbegin());
 }
 
+// Rules: CAT-08
 TEST(ParamRowsTest, FourParametersHaveADefault) {
     for (std::uint32_t number = 1; number <= 171; ++number) {
         EXPECT_EQ(issuedDefault(number), rowOf(number).defaultValue) << "parameter " << number;
     }
 }
 
+// Rules: CAT-09
 TEST(ParamRowsTest, MasksAreAsIssued) {
     std::uint32_t allOnes = 0;
     for (std::uint32_t number = 1; number <= 171; ++number) {

@@ -95,6 +95,7 @@ protected:
     std::vector<std::uint16_t> values = untouchedValues();
 };
 
+// Rules: PAR-10
 TEST_F(ReadAllParamsTest, EachSlotGetsOneParameter) {
     EXPECT_EQ(0, readAllParams(store, values.data(), 171));
     expectValues(171, 0);
@@ -107,6 +108,7 @@ TEST_F(ReadAllParamsTest, OneByteParameterIsZeroExtended) {
     EXPECT_EQ(0x00FF, values[0]);
 }
 
+// Rules: PAR-10
 TEST_F(ReadAllParamsTest, StopsAfterCount) {
     for (const std::uint32_t count : {1U, 2U, 133U, 134U, 135U, 170U}) {
         SCOPED_TRACE(count);
@@ -117,6 +119,7 @@ TEST_F(ReadAllParamsTest, StopsAfterCount) {
     }
 }
 
+// Rules: PAR-10
 TEST_F(ReadAllParamsTest, CountZeroOpensAndClosesAndReadsNothing) {
     EXPECT_EQ(0, readAllParams(store, values.data(), 0));
     expectValues(0, 0);
@@ -124,6 +127,7 @@ TEST_F(ReadAllParamsTest, CountZeroOpensAndClosesAndReadsNothing) {
     EXPECT_EQ(179U, store.length) << "the store was not opened";
 }
 
+// Rules: PAR-12
 TEST_F(ReadAllParamsTest, CountBeyondTheCatalogueFillsAllThenZeroesOneAndIsStatus1) {
     for (const std::uint32_t count : {172U, 173U, 200U, 65535U}) {
         SCOPED_TRACE(count);
@@ -144,6 +148,7 @@ TEST_F(ReadAllParamsTest, CountIsNotTruncatedTo16Bits) {
     }
 }
 
+// Rules: PAR-11
 TEST_F(ReadAllParamsTest, AbsentImageIsMinus2WhateverTheCount) {
     remove(IMAGE_PATH);
     for (const std::uint32_t count : {0U, 1U, 200U}) {
@@ -154,6 +159,7 @@ TEST_F(ReadAllParamsTest, AbsentImageIsMinus2WhateverTheCount) {
     }
 }
 
+// Rules: PAR-11
 TEST_F(ReadAllParamsTest, EmptyImageIsMinus1WhateverTheCount) {
     writeImage("");
     for (const std::uint32_t count : {0U, 1U, 200U}) {

@@ -54,11 +54,13 @@ TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForZeros) {
     EXPECT_EQ(~referenceCrc(std::string(136, '\0')), recordAreaCrc());
 }
 
+// Rules: CRC-01, CRC-03
 TEST_F(RecordAreaCrcTest, IsTheComplementOfTheUsualCrcForSlot15) {
     EXPECT_EQ(~referenceCrc(area().substr(1, 136)), recordAreaCrc());
     expectUntouchedDisk();
 }
 
+// Rules: CRC-03
 TEST_F(RecordAreaCrcTest, IsAKnownRegisterForAKnownRecord) {
     // Both figures are the complement of zlib's crc32 of the 136 bytes.
     resetDisk(2 * MEBIBYTE);
@@ -67,6 +69,7 @@ TEST_F(RecordAreaCrcTest, IsAKnownRegisterForAKnownRecord) {
     EXPECT_EQ(0xC89E2DF9U, recordAreaCrc());
 }
 
+// Rules: CRC-01
 TEST_F(RecordAreaCrcTest, EveryByteOfSlot15Counts) {
     const std::uint32_t before = recordAreaCrc();
     for (std::size_t offset = 1; offset <= 136; ++offset) {
@@ -77,6 +80,7 @@ TEST_F(RecordAreaCrcTest, EveryByteOfSlot15Counts) {
     EXPECT_EQ(before, recordAreaCrc());
 }
 
+// Rules: CRC-01
 TEST_F(RecordAreaCrcTest, BytesOutsideSlot15DoNotCount) {
     const std::uint32_t before = recordAreaCrc();
     setDiskFromEnd(BASE_FROM_END, std::string(1, '\0'));
@@ -84,12 +88,14 @@ TEST_F(RecordAreaCrcTest, BytesOutsideSlot15DoNotCount) {
     EXPECT_EQ(before, recordAreaCrc());
 }
 
+// Rules: CRC-04
 TEST_F(RecordAreaCrcTest, AbsentDiskIsAllOnes) {
     remove(DISK_PATH);
     expectFailure();
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
+// Rules: CRC-04
 TEST_F(RecordAreaCrcTest, FolderInPlaceOfTheDiskIsAllOnes) {
     putFolder(DISK_PATH);
     expectFailure();
@@ -108,12 +114,14 @@ TEST_F(RecordAreaCrcTest, NoFreeDescriptorIsAllOnes) {
     EXPECT_EQ(FAILED, recordAreaCrc());
 }
 
+// Rules: CRC-04
 TEST_F(RecordAreaCrcTest, RefusedReadAfterAGoodSeekIsAllOnes) {
     const DisturbedReads reads = DisturbedReads::failing();
     expectFailure();
     EXPECT_EQ(1, reads.count()) << "the read must come, so the seek must succeed";
 }
 
+// Rules: CRC-05
 TEST_F(RecordAreaCrcTest, BytesThatAShortReadLacksCountAsZeros) {
     std::uint32_t crc = 0;
     {
@@ -124,6 +132,7 @@ TEST_F(RecordAreaCrcTest, BytesThatAShortReadLacksCountAsZeros) {
     EXPECT_EQ(~referenceCrc(area().substr(1, 100) + std::string(36, '\0')), crc);
 }
 
+// Rules: CRC-04
 TEST_F(RecordAreaCrcTest, DiskTooShortForSlot15IsAllOnes) {
     writeFile(DISK_PATH, area().substr(2));
     expectFailure();

@@ -73,6 +73,7 @@ protected:
 
 INSTANTIATE_TEST_SUITE_P(Areas, FixedAreaTest, ::testing::Values(AUX, TUNING), nameOf);
 
+// Rules: ARE-01 to ARE-03
 TEST_P(FixedAreaTest, ReadsFromItsStart) {
     for (const std::uint32_t length : {1U, 2U, 188U, 1023U, fixed.size - 1, fixed.size}) {
         SCOPED_TRACE(length);
@@ -83,6 +84,7 @@ TEST_P(FixedAreaTest, ReadsFromItsStart) {
     expectUntouchedDisk();
 }
 
+// Rules: ARE-01, ARE-02, ARE-04
 TEST_P(FixedAreaTest, WritesFromItsStartAndNothingElse) {
     for (const std::uint32_t length : {1U, 2U, 188U, 1023U, fixed.size - 1, fixed.size}) {
         SCOPED_TRACE(length);
@@ -93,6 +95,7 @@ TEST_P(FixedAreaTest, WritesFromItsStartAndNothingElse) {
     }
 }
 
+// Rules: ARE-05
 TEST_P(FixedAreaTest, NullBufferFails) {
     const int before = openDescriptors();
     for (const std::uint32_t length : {0U, 1U, fixed.size}) {
@@ -103,11 +106,13 @@ TEST_P(FixedAreaTest, NullBufferFails) {
     expectUntouchedDisk();
 }
 
+// Rules: ARE-05
 TEST_P(FixedAreaTest, LengthZeroFails) {
     expectFailure(0);
     expectUntouchedDisk();
 }
 
+// Rules: ARE-05
 TEST_P(FixedAreaTest, LengthAboveTheAreaFailsAndTouchesNothing) {
     expectFailure(fixed.size + 1);
     expectFailure(fixed.size + 0x10000);
@@ -119,6 +124,7 @@ TEST_P(FixedAreaTest, LengthAboveTheAreaFailsAndTouchesNothing) {
     expectUntouchedDisk();
 }
 
+// Rules: ARE-05
 TEST_P(FixedAreaTest, RefusedArgumentsLeaveTheDiskUnopened) {
     FileEventLog opens(IN_OPEN, {DISK_PATH});
     char byte = '#';
@@ -133,6 +139,7 @@ TEST_P(FixedAreaTest, RefusedArgumentsLeaveTheDiskUnopened) {
     EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
 }
 
+// Rules: ARE-06
 TEST_P(FixedAreaTest, AbsentDiskFailsAndIsNotCreated) {
     remove(DISK_PATH);
     expectFailure(8);
@@ -176,6 +183,7 @@ TEST_P(FixedAreaTest, NoFreeDescriptorFails) {
     EXPECT_EQ("####", buffer);
 }
 
+// Rules: ARE-06
 TEST_P(FixedAreaTest, DiskTooShortForTheAreaFails) {
     const std::size_t size = fixed.fromEnd - 1;
     resetDisk(size);
@@ -233,6 +241,7 @@ TEST_P(FixedAreaTest, RefusedReadFails) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+// Rules: ARE-07
 TEST_P(FixedAreaTest, ShortReadIsSuccess) {
     std::string buffer(1000, '#');
     {
@@ -262,6 +271,7 @@ TEST_P(FixedAreaTest, LeavesNoDescriptorOpen) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+// Rules: ARE-01, ARE-02
 TEST(FixedAreaSizeTest, SizesAreAsPublished) {
     EXPECT_EQ(1024U, AUX_AREA_SIZE);
     EXPECT_EQ(4096U, TUNING_AREA_SIZE);

@@ -37,6 +37,7 @@ protected:
     }
 };
 
+// Rules: SLT-01 to SLT-18, SLT-20
 TEST_F(ReadRecordSlotTest, EverySlotIsReadWhole) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
@@ -47,6 +48,7 @@ TEST_F(ReadRecordSlotTest, EverySlotIsReadWhole) {
     expectUntouchedDisk();
 }
 
+// Rules: SLT-21
 TEST_F(ReadRecordSlotTest, LongerBufferIsPaddedWithZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
@@ -56,6 +58,7 @@ TEST_F(ReadRecordSlotTest, LongerBufferIsPaddedWithZeros) {
     }
 }
 
+// Rules: SLT-20
 TEST_F(ReadRecordSlotTest, ShorterBufferGetsTheFirstBytes) {
     for (const SlotPlace& place : SLOT_PLACES) {
         for (std::uint32_t length = 1; length < place.size; ++length) {
@@ -94,6 +97,7 @@ TEST_F(ReadRecordSlotTest, LengthLimitsWhatIsZeroed) {
     EXPECT_EQ(area().substr(0, 1) + std::string(99998, '\0') + "#", buffer);
 }
 
+// Rules: SLT-29
 TEST_F(ReadRecordSlotTest, NullBufferFails) {
     const int before = openDescriptors();
     EXPECT_EQ(-1, readRecordSlot(9, nullptr, 8));
@@ -101,12 +105,14 @@ TEST_F(ReadRecordSlotTest, NullBufferFails) {
     EXPECT_EQ(before, openDescriptors());
 }
 
+// Rules: SLT-29
 TEST_F(ReadRecordSlotTest, LengthZeroFailsAndKeepsTheBuffer) {
     std::string buffer = "####";
     EXPECT_EQ(-1, read(9, buffer, 0));
     EXPECT_EQ("####", buffer);
 }
 
+// Rules: SLT-22, SLT-23
 TEST_F(ReadRecordSlotTest, UnknownSlotFailsAndLeavesZeros) {
     for (const std::uint32_t slot : UNKNOWN_SLOTS) {
         SCOPED_TRACE(slot);
@@ -120,6 +126,7 @@ TEST_F(ReadRecordSlotTest, DiskIsOpenedBeforeTheSlotIsLookedUp) {
     EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
 }
 
+// Rules: SLT-29
 TEST_F(ReadRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
     FileEventLog opens(IN_OPEN, {DISK_PATH});
     char byte = '#';
@@ -128,12 +135,14 @@ TEST_F(ReadRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
     EXPECT_EQ(opens.take(), std::vector<std::string>());
 }
 
+// Rules: SLT-22, SLT-23
 TEST_F(ReadRecordSlotTest, RefusedReadAfterAGoodSeekFailsAndLeavesZeros) {
     const DisturbedReads reads = DisturbedReads::failing();
     expectFailure(9, 8);
     EXPECT_EQ(1, reads.count()) << "the read must come, so the seek must succeed";
 }
 
+// Rules: SLT-24
 TEST_F(ReadRecordSlotTest, ShortReadIsSuccessAndLeavesZerosAfterIt) {
     std::string buffer = "############";
     {
@@ -144,6 +153,7 @@ TEST_F(ReadRecordSlotTest, ShortReadIsSuccessAndLeavesZerosAfterIt) {
     EXPECT_EQ(area().substr(129, 3) + std::string(7, '\0') + "##", buffer);
 }
 
+// Rules: SLT-22, SLT-23
 TEST_F(ReadRecordSlotTest, AbsentDiskFailsAndLeavesZeros) {
     remove(DISK_PATH);
     expectFailure(9, 8);
@@ -151,6 +161,7 @@ TEST_F(ReadRecordSlotTest, AbsentDiskFailsAndLeavesZeros) {
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
+// Rules: SLT-22, SLT-23
 TEST_F(ReadRecordSlotTest, FolderInPlaceOfTheDiskFailsAndLeavesZeros) {
     putFolder(DISK_PATH);
     expectFailure(9, 8);
@@ -181,6 +192,7 @@ TEST_F(ReadRecordSlotTest, NoFreeDescriptorFailsAndLeavesZeros) {
     EXPECT_EQ(std::string(8, '\0'), buffer);
 }
 
+// Rules: SLT-22, SLT-23
 TEST_F(ReadRecordSlotTest, DiskTooShortForTheSlotFailsAndLeavesZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);

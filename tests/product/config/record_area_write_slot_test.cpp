@@ -43,6 +43,7 @@ protected:
     }
 };
 
+// Rules: SLT-01 to SLT-18, SLT-25
 TEST_F(WriteRecordSlotTest, EverySlotIsWrittenWholeAndNothingElse) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
@@ -53,6 +54,7 @@ TEST_F(WriteRecordSlotTest, EverySlotIsWrittenWholeAndNothingElse) {
     }
 }
 
+// Rules: SLT-26
 TEST_F(WriteRecordSlotTest, ShorterBufferIsPaddedWithZeros) {
     for (const SlotPlace& place : SLOT_PLACES) {
         if (place.size == 1) {
@@ -68,6 +70,7 @@ TEST_F(WriteRecordSlotTest, ShorterBufferIsPaddedWithZeros) {
     }
 }
 
+// Rules: SLT-27
 TEST_F(WriteRecordSlotTest, ExcessOfALongerBufferIsIgnored) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
@@ -78,11 +81,13 @@ TEST_F(WriteRecordSlotTest, ExcessOfALongerBufferIsIgnored) {
     }
 }
 
+// Rules: SLT-26
 TEST_F(WriteRecordSlotTest, TwoBytesIntoSlot1AreFollowedBy14Zeros) {
     EXPECT_EQ(0, write(1, "\x41\x42"));
     expectArea(areaWith(1, "\x41\x42" + std::string(14, '\0')));
 }
 
+// Rules: SLT-27
 TEST_F(WriteRecordSlotTest, TwentyBytesIntoSlot0WriteOne) {
     EXPECT_EQ(0, write(0, "abcdefghijklmnopqrst"));
     expectArea(areaWith(0, "a"));
@@ -101,6 +106,7 @@ TEST_F(WriteRecordSlotTest, WrittenSlotIsReadBack) {
     EXPECT_EQ("SER-42" + std::string(6, '\0'), buffer);
 }
 
+// Rules: SLT-29
 TEST_F(WriteRecordSlotTest, NullBufferFails) {
     const int before = openDescriptors();
     EXPECT_EQ(-1, writeRecordSlot(9, nullptr, 8));
@@ -109,11 +115,13 @@ TEST_F(WriteRecordSlotTest, NullBufferFails) {
     expectUntouchedDisk();
 }
 
+// Rules: SLT-29
 TEST_F(WriteRecordSlotTest, LengthZeroFailsAndWritesNoPadding) {
     EXPECT_EQ(-1, writeRecordSlot(9, "ABCDEFGH", 0));
     expectUntouchedDisk();
 }
 
+// Rules: SLT-28
 TEST_F(WriteRecordSlotTest, UnknownSlotFailsAndWritesNothing) {
     for (const std::uint32_t slot : UNKNOWN_SLOTS) {
         SCOPED_TRACE(slot);
@@ -128,6 +136,7 @@ TEST_F(WriteRecordSlotTest, DiskIsOpenedBeforeTheSlotIsLookedUp) {
     EXPECT_EQ(opens.take(), std::vector<std::string>{DISK_PATH});
 }
 
+// Rules: SLT-29
 TEST_F(WriteRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
     FileEventLog opens(IN_OPEN, {DISK_PATH});
     EXPECT_EQ(-1, writeRecordSlot(9, nullptr, 8));
@@ -135,6 +144,7 @@ TEST_F(WriteRecordSlotTest, RefusedArgumentsLeaveTheDiskUnopened) {
     EXPECT_EQ(opens.take(), std::vector<std::string>());
 }
 
+// Rules: SLT-28
 TEST_F(WriteRecordSlotTest, AbsentDiskFailsAndIsNotCreated) {
     remove(DISK_PATH);
     expectFailure(9, "ABCDEFGH");
@@ -166,6 +176,7 @@ TEST_F(WriteRecordSlotTest, NoFreeDescriptorFails) {
     expectUntouchedDisk();
 }
 
+// Rules: SLT-28
 TEST_F(WriteRecordSlotTest, DiskTooShortForTheSlotFails) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);

@@ -16,6 +16,7 @@ TEST(RecordSlotsTest, AreaIsTheLastMebibyte) {
     EXPECT_EQ(0xFFFFFFFFFFFFFFFFU, NO_SLOT_OFFSET);
 }
 
+// Rules: SLT-01 to SLT-18
 TEST(RecordSlotsTest, EverySlotHasItsSizeAndOffset) {
     for (const SlotPlace& place : SLOT_PLACES) {
         SCOPED_TRACE(place.slot);
@@ -38,6 +39,7 @@ TEST(RecordSlotsTest, LongestSlotHasTheMaximumSize) {
     EXPECT_EQ(RECORD_SLOT_MAX_SIZE, longest);
 }
 
+// Rules: SLT-19
 TEST(RecordSlotsTest, UnknownSlotKeepsBothOutputs) {
     for (const std::uint32_t slot : UNKNOWN_SLOTS) {
         SCOPED_TRACE(slot);
@@ -49,6 +51,7 @@ TEST(RecordSlotsTest, UnknownSlotKeepsBothOutputs) {
     }
 }
 
+// Rules: SLT-16
 TEST(RecordSlotsTest, Slot15CoversSlots1To9) {
     std::uint32_t size = 0;
     std::uint64_t begin = 0;

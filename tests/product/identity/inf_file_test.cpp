@@ -18,6 +18,7 @@ protected:
     }
 };
 
+// Rules: VER-08
 TEST(TrimSpacesTest, OnlySpacesAtTheEndsAreRemoved) {
     constexpr const char* TABLE[][2] = {
         {"", ""},    {" ", ""},        {"     ", ""},  {"a", "a"},           {" a", "a"},
@@ -28,6 +29,7 @@ TEST(TrimSpacesTest, OnlySpacesAtTheEndsAreRemoved) {
     }
 }
 
+// Rules: VER-09
 TEST(TrimSpacesTest, OtherWhiteSpaceIsKept) {
     for (const char c : {'\t', '\r', '\n', '\v', '\f', '\0', '\xA0'}) {
         SCOPED_TRACE(static_cast<int>(c));
@@ -61,6 +63,7 @@ TEST(InfDataTest, KeysAreInByteOrder) {
     EXPECT_EQ(values, "01234");
 }
 
+// Rules: VER-05
 TEST_F(InfFileTest, LinesBecomeEntries) {
     EXPECT_EQ(parse("Type=Application\nVersion Number=3.10.2\n"),
               (Inf_Data{{"Type", "Application"}, {"Version Number", "3.10.2"}}));
@@ -71,39 +74,48 @@ TEST_F(InfFileTest, AllKeysAreKept) {
               (Inf_Data{{"Size", "12"}, {"Vendor", "none"}, {"X", "y"}}));
 }
 
+// Rules: VER-04
 TEST_F(InfFileTest, LastLineNeedsNoLineEnd) {
     EXPECT_EQ(parse("A=1\nB=2"), (Inf_Data{{"A", "1"}, {"B", "2"}}));
 }
 
+// Rules: VER-08
 TEST_F(InfFileTest, SpacesAroundKeyAndValueAreRemoved) {
     EXPECT_EQ(parse("   Type   =   Main Application   \n"),
               (Inf_Data{{"Type", "Main Application"}}));
 }
 
+// Rules: VER-05
 TEST_F(InfFileTest, OnlyTheFirstEqualsSignSplits) {
     EXPECT_EQ(parse("A=1=2=3\nB==\nC= =4\n"), (Inf_Data{{"A", "1=2=3"}, {"B", "="}, {"C", "=4"}}));
 }
 
+// Rules: VER-11
 TEST_F(InfFileTest, LaterLineReplacesAnEarlierOneOfTheSameKey) {
     EXPECT_EQ(parse("A=1\nB=2\n A =3\n"), (Inf_Data{{"A", "3"}, {"B", "2"}}));
 }
 
+// Rules: VER-12
 TEST_F(InfFileTest, KeysAreCaseSensitive) {
     EXPECT_EQ(parse("Type=1\ntype=2\n"), (Inf_Data{{"Type", "1"}, {"type", "2"}}));
 }
 
+// Rules: VER-06
 TEST_F(InfFileTest, LineWithoutEqualsSignIsSkipped) {
     EXPECT_EQ(parse("Type\n\n   \n[section]\nA=1\n; comment\n"), (Inf_Data{{"A", "1"}}));
 }
 
+// Rules: VER-07
 TEST_F(InfFileTest, LineWithNothingAfterTheEqualsSignIsSkipped) {
     EXPECT_EQ(parse("A=\nB=2\n=\n  =\nC="), (Inf_Data{{"B", "2"}}));
 }
 
+// Rules: VER-07
 TEST_F(InfFileTest, SkippedEmptyValueKeepsTheEarlierOne) {
     EXPECT_EQ(parse("A=1\nA=\n"), (Inf_Data{{"A", "1"}}));
 }
 
+// Rules: VER-10
 TEST_F(InfFileTest, ValueOfSpacesIsAnEmptyEntry) {
     EXPECT_EQ(parse("A= \n"), (Inf_Data{{"A", ""}}));
     EXPECT_EQ(parse("A=1\nA=   \n"), (Inf_Data{{"A", ""}}));
@@ -114,6 +126,7 @@ TEST_F(InfFileTest, LineStartingWithTheEqualsSignHasTheEmptyKey) {
     EXPECT_EQ(parse("   =2\n"), (Inf_Data{{"", "2"}}));
 }
 
+// Rules: VER-09
 TEST_F(InfFileTest, CarriageReturnBelongsToTheValue) {
     EXPECT_EQ(parse("A=1\r\nB=\r\nC=2 \r\n\r\n"),
               (Inf_Data{{"A", "1\r"}, {"B", "\r"}, {"C", "2 \r"}}));
@@ -123,20 +136,24 @@ TEST_F(InfFileTest, CarriageReturnAloneDoesNotEndALine) {
     EXPECT_EQ(parse("A=1\rB=2\n"), (Inf_Data{{"A", "1\rB=2"}}));
 }
 
+// Rules: VER-09
 TEST_F(InfFileTest, TabsAreKept) {
     EXPECT_EQ(parse("\tA\t=\t1\t\n \tB = 2\n"), (Inf_Data{{"\tA\t", "\t1\t"}, {"\tB", "2"}}));
 }
 
+// Rules: VER-13
 TEST_F(InfFileTest, ZeroBytesAreTextLikeAnyOther) {
     const std::string content("K\0y=v\0l\nB=\0\n", 12);
     EXPECT_EQ(parse(content), (Inf_Data{{std::string("K\0y", 3), std::string("v\0l", 3)},
                                         {"B", std::string(1, '\0')}}));
 }
 
+// Rules: VER-13
 TEST_F(InfFileTest, BytesAbove127AreTextLikeAnyOther) {
     EXPECT_EQ(parse("\xFF\xFE=\x80\n"), (Inf_Data{{"\xFF\xFE", "\x80"}}));
 }
 
+// Rules: VER-13
 TEST_F(InfFileTest, LongLinesAreReadWhole) {
     for (const std::size_t length : INPUT_LENGTHS) {
         SCOPED_TRACE(length);
@@ -166,6 +183,7 @@ TEST_F(InfFileTest, FileIsAddedToTheRecord) {
     EXPECT_EQ(record, (Inf_Data{{"A", "1"}, {"B", "20"}, {"C", "30"}}));
 }
 
+// Rules: VER-22
 TEST_F(InfFileTest, FileThatCannotBeOpenedOrReadAddsNothing) {
     std::filesystem::create_directory("/tmp/folder.inf");
     std::filesystem::create_symlink("/tmp/nowhere", "/tmp/dangling.inf");
@@ -182,6 +200,7 @@ TEST_F(InfFileTest, FileThatCannotBeOpenedOrReadAddsNothing) {
     }
 }
 
+// Rules: VER-22
 TEST_F(InfFileTest, FileWithoutReadPermissionAddsNothing) {
     writeFile(INF_FILE, "A=1\n");
     std::filesystem::permissions(INF_FILE, std::filesystem::perms::none);
@@ -191,6 +210,7 @@ TEST_F(InfFileTest, FileWithoutReadPermissionAddsNothing) {
     EXPECT_TRUE(record.empty());
 }
 
+// Rules: RUN-05
 TEST_F(InfFileTest, FileIsOnlyRead) {
     parse("A=1\n");
     EXPECT_EQ(readFile(INF_FILE), "A=1\n");

@@ -63,6 +63,7 @@ TEST(ModelNamesTest, EachNameHasAModelAfterTheBrandWord) {
     }
 }
 
+// Rules: VEH-03
 TEST(ModelNamesTest, Code32HasTheNameOfCodeOne) {
     EXPECT_EQ(nameOfCode(32), nameOfCode(1));
 }
@@ -76,6 +77,7 @@ TEST(ModelNamesTest, AllOtherNamesDiffer) {
     EXPECT_EQ(names.size(), 46U);
 }
 
+// Rules: VEH-02
 TEST(ModelNamesTest, NamesMatchTheirCodes) {
     EXPECT_EQ(nameOfCode(1), "Marl Tulvari");
     EXPECT_EQ(nameOfCode(26), "Quarion Velmira");
@@ -83,6 +85,7 @@ TEST(ModelNamesTest, NamesMatchTheirCodes) {
 }
 
 /// The product data as a separate list, which the model reads as well.
+// Rules: VEH-02
 TEST(ModelNamesTest, NamesMatchTheProductData) {
     std::ifstream list(ORVANE_MODEL_NAMES);
     std::size_t code = 0;

@@ -7,6 +7,7 @@ namespace orvane::test {
 
 class SoftwareVersionTest : public VersionFolderTest {};
 
+// Rules: VER-01
 TEST_F(SoftwareVersionTest, FolderIsTheVersionFolderWithItsSlash) {
     EXPECT_STREQ(VERSION_DIR, "/fs/rwdata/.Version/");
 }
@@ -17,6 +18,7 @@ TEST_F(SoftwareVersionTest, VersionOfTheApplicationIsFound) {
     EXPECT_EQ(softwareVersion(), "030a02");
 }
 
+// Rules: VER-21
 TEST_F(SoftwareVersionTest, MissingFolderGivesNoVersion) {
     remove(VERSION_FOLDER);
     EXPECT_EQ(findApplicationVersion(), "");
@@ -35,6 +37,7 @@ TEST_F(SoftwareVersionTest, EmptyFolderGivesNoVersion) {
     EXPECT_EQ(softwareVersion(), "000000");
 }
 
+// Rules: VER-21
 TEST_F(SoftwareVersionTest, NoFileOfTheTypeGivesNoVersion) {
     put("a.inf", description("Bootloader", "1.2.3"));
     put("b.inf", "Version Number=4.5.6\n");
@@ -43,6 +46,7 @@ TEST_F(SoftwareVersionTest, NoFileOfTheTypeGivesNoVersion) {
     EXPECT_EQ(softwareVersion(), "000000");
 }
 
+// Rules: VER-19, VER-20
 TEST_F(SoftwareVersionTest, PrefixBeforeTheFirstUnderscoreIsDropped) {
     constexpr const char* TABLE[][2] = {
         {"ABC_3.10.2_rc", "3.10.2_rc"},
@@ -76,6 +80,7 @@ TEST_F(SoftwareVersionTest, VersionInTheFileBecomesDigits) {
     }
 }
 
+// Rules: VER-09
 TEST_F(SoftwareVersionTest, CarriageReturnsAndTabsAreKept) {
     EXPECT_EQ(versionOf("Type=Application\r\nVersion Number=\t1.2.3\r\n"), "\t1.2.3\r");
 }
@@ -91,6 +96,7 @@ TEST_F(SoftwareVersionTest, LongLinesDoNotHideTheOthers) {
               "1.2." + tail);
 }
 
+// Rules: RUN-14
 TEST_F(SoftwareVersionTest, EachCallScansAgain) {
     put("app.inf", description("Application", "1.2.3"));
     EXPECT_EQ(findApplicationVersion(), "1.2.3");
@@ -106,6 +112,7 @@ TEST_F(SoftwareVersionTest, EachCallScansAgain) {
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
+// Rules: RUN-05
 TEST_F(SoftwareVersionTest, FolderIsOnlyRead) {
     put("app.inf", description("Application", "1.2.3"));
     EXPECT_EQ(softwareVersion(), "010203");

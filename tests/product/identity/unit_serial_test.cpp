@@ -21,10 +21,12 @@ protected:
     }
 };
 
+// Rules: SER-01, SER-02
 TEST_F(UnitSerialTest, FullRecordGivesEightCharacters) {
     EXPECT_EQ(serialOf("SN004217"), "SN004217");
 }
 
+// Rules: SER-02
 TEST_F(UnitSerialTest, SerialEndsAtTheFirstZeroByte) {
     EXPECT_EQ(serialOf(std::string("AB\0\0\0\0\0\0", 8)), "AB");
     EXPECT_EQ(serialOf(std::string("AB\0CD\0EF", 8)), "AB");
@@ -32,15 +34,18 @@ TEST_F(UnitSerialTest, SerialEndsAtTheFirstZeroByte) {
     EXPECT_EQ(serialOf(std::string("\0ABCDEFG", 8)), "");
 }
 
+// Rules: SER-03
 TEST_F(UnitSerialTest, RecordOfZerosGivesTheEmptyTextAndNotTheDefault) {
     EXPECT_EQ(serialOf(std::string(8, '\0')), "");
 }
 
+// Rules: SER-04
 TEST_F(UnitSerialTest, BytesAreKeptAsTheyAre) {
     EXPECT_EQ(serialOf("  a\t\n\r= "), "  a\t\n\r= ");
     EXPECT_EQ(serialOf("\xFF\x80\x7F\x01\xC3\xA4\xFE\x1B"), "\xFF\x80\x7F\x01\xC3\xA4\xFE\x1B");
 }
 
+// Rules: SER-01
 TEST_F(UnitSerialTest, NeighbouringRecordsDoNotShow) {
     setDiskFromEnd(MEBIBYTE, std::string(4096, 'x'));
     EXPECT_EQ(serialOf("SN004217"), "SN004217");
@@ -52,32 +57,38 @@ TEST_F(UnitSerialTest, DiskOfOneMebibyteHoldsTheRecord) {
     EXPECT_EQ(serialOf("12345678"), "12345678");
 }
 
+// Rules: SER-06
 TEST_F(UnitSerialTest, DeviceMayStartAtTheRecord) {
     resetDisk(SERIAL_BEFORE_END);
     EXPECT_EQ(serialOf("87654321"), "87654321");
 }
 
+// Rules: SER-05
 TEST_F(UnitSerialTest, MissingDeviceGivesTheDefault) {
     remove(DISK_PATH);
     EXPECT_EQ(serial(), "ABCD1234abc");
 }
 
+// Rules: SER-05
 TEST_F(UnitSerialTest, DeviceThatCannotBeOpenedGivesTheDefault) {
     remove(DISK_PATH);
     std::filesystem::create_symlink(DISK_PATH, DISK_PATH);
     EXPECT_EQ(serial(), "ABCD1234abc");
 }
 
+// Rules: SER-06
 TEST_F(UnitSerialTest, DeviceTooShortForTheSeekGivesTheDefault) {
     resetDisk(SERIAL_BEFORE_END - 1);
     EXPECT_EQ(serial(), "ABCD1234abc");
 }
 
+// Rules: SER-05
 TEST_F(UnitSerialTest, DeviceThatCannotBeReadGivesTheDefault) {
     putFolder(DISK_PATH);
     EXPECT_EQ(serial(), "ABCD1234abc");
 }
 
+// Rules: SER-05
 TEST_F(UnitSerialTest, DefaultIsLongerThanAnySerial) {
     remove(DISK_PATH);
     EXPECT_EQ(serial().size(), 11U);

@@ -70,6 +70,7 @@ TEST_F(VehicleIdentityTest, ConstantsNameParametersSlotAndDefaults) {
     EXPECT_STREQ(MODEL_NAME_FALLBACK, "VOXA");
 }
 
+// Rules: VEH-11
 TEST_F(VehicleIdentityTest, DriveSideIsTheRawValue) {
     for (int value = 0; value <= 255; ++value) {
         setByte(DRIVE_SIDE_OFFSET, value);
@@ -77,6 +78,7 @@ TEST_F(VehicleIdentityTest, DriveSideIsTheRawValue) {
     }
 }
 
+// Rules: VEH-10
 TEST_F(VehicleIdentityTest, DriveSideIsReadFromItsOwnByte) {
     writeImageBut(0x55, DRIVE_SIDE_OFFSET, 0);
     EXPECT_EQ(getRightHandDrive(), 0U);
@@ -84,6 +86,7 @@ TEST_F(VehicleIdentityTest, DriveSideIsReadFromItsOwnByte) {
     EXPECT_EQ(getRightHandDrive(), 0xA5U);
 }
 
+// Rules: VEH-07, VEH-08
 TEST_F(VehicleIdentityTest, BrandCodeTwoIsTheSecondBrandAndAnyOtherTheFirst) {
     for (int value = 0; value <= 255; ++value) {
         SCOPED_TRACE(value);
@@ -92,6 +95,7 @@ TEST_F(VehicleIdentityTest, BrandCodeTwoIsTheSecondBrandAndAnyOtherTheFirst) {
     }
 }
 
+// Rules: VEH-06
 TEST_F(VehicleIdentityTest, BrandIsReadFromItsOwnByte) {
     writeImageBut(2, BRAND_OFFSET, 1);
     EXPECT_EQ(brand(), "MARL");
@@ -99,6 +103,7 @@ TEST_F(VehicleIdentityTest, BrandIsReadFromItsOwnByte) {
     EXPECT_EQ(brand(), "QUARION");
 }
 
+// Rules: PAR-13, PAR-14
 TEST_F(VehicleIdentityTest, FuelTypeHasThreeCodesAndIsGasolineForAllOthers) {
     for (int value = 0; value <= 255; ++value) {
         SCOPED_TRACE(value);
@@ -111,6 +116,7 @@ TEST_F(VehicleIdentityTest, FuelTypeHasThreeCodesAndIsGasolineForAllOthers) {
     }
 }
 
+// Rules: PAR-13
 TEST_F(VehicleIdentityTest, FuelTypeIsReadFromItsOwnByte) {
     writeImageBut(1, FUEL_TYPE_OFFSET, 2);
     EXPECT_EQ(fuelType(), "cng");
@@ -118,6 +124,7 @@ TEST_F(VehicleIdentityTest, FuelTypeIsReadFromItsOwnByte) {
     EXPECT_EQ(fuelType(), "electric");
 }
 
+// Rules: VEH-02
 TEST_F(VehicleIdentityTest, ModelCodesOneTo47GiveTheirEntry) {
     for (int code = 1; code <= 47; ++code) {
         SCOPED_TRACE(code);
@@ -135,11 +142,13 @@ TEST_F(VehicleIdentityTest, FirstSecondBrandAndLastModelHaveTheirNames) {
     EXPECT_EQ(model(), "Marl Quillon");
 }
 
+// Rules: VEH-03
 TEST_F(VehicleIdentityTest, ModelCode32GivesTheNameOfCodeOne) {
     setByte(MODEL_OFFSET, 32);
     EXPECT_EQ(model(), "Marl Tulvari");
 }
 
+// Rules: VEH-04
 TEST_F(VehicleIdentityTest, ModelCodesOutsideTheTableGiveTheFallback) {
     setByte(MODEL_OFFSET, 0);
     EXPECT_EQ(model(), "VOXA");
@@ -150,6 +159,7 @@ TEST_F(VehicleIdentityTest, ModelCodesOutsideTheTableGiveTheFallback) {
     }
 }
 
+// Rules: VEH-01
 TEST_F(VehicleIdentityTest, ModelIsReadFromItsOwnByte) {
     writeImageBut(1, MODEL_OFFSET, 26);
     EXPECT_EQ(model(), "Quarion Velmira");
@@ -157,6 +167,7 @@ TEST_F(VehicleIdentityTest, ModelIsReadFromItsOwnByte) {
     EXPECT_EQ(model(), "VOXA");
 }
 
+// Rules: VEH-13
 TEST_F(VehicleIdentityTest, BrandAndModelAreIndependent) {
     setByte(BRAND_OFFSET, 2);
     setByte(MODEL_OFFSET, 1);
@@ -164,17 +175,20 @@ TEST_F(VehicleIdentityTest, BrandAndModelAreIndependent) {
     EXPECT_EQ(model(), "Marl Tulvari");
 }
 
+// Rules: IMG-02, VEH-05, VEH-09, VEH-12
 TEST_F(VehicleIdentityTest, MissingImageGivesTheDefaults) {
     writeImage(std::string(179, '\x02'));
     remove(IMAGE_PATH);
     expectDefaults();
 }
 
+// Rules: IMG-03
 TEST_F(VehicleIdentityTest, EmptyImageGivesTheDefaults) {
     writeImage("");
     expectDefaults();
 }
 
+// Rules: IMG-02, IMG-04
 TEST_F(VehicleIdentityTest, ImageThatCannotBeMappedGivesTheDefaults) {
     putFolder(IMAGE_PATH);
     expectDefaults();
@@ -185,6 +199,7 @@ TEST_F(VehicleIdentityTest, ZerosInTheImageGiveTheDefaults) {
     expectDefaults();
 }
 
+// Rules: IMG-07
 TEST_F(VehicleIdentityTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(std::string(36, '\x02'));
     EXPECT_EQ(getRightHandDrive(), 2U);
@@ -193,6 +208,7 @@ TEST_F(VehicleIdentityTest, ShortImageIsReadToTheEndOfItsPage) {
     EXPECT_EQ(model(), "VOXA");
 }
 
+// Rules: IMG-05
 TEST_F(VehicleIdentityTest, CalibrationFileDoesNotReplaceTheImage) {
     remove(IMAGE_PATH);
     std::filesystem::create_directories("/fs/rwdata/CALS");

@@ -35,6 +35,7 @@ TEST(IsNoVersionTest, EmptyTextAndItsNameAreNoVersion) {
     EXPECT_FALSE(isNoVersion("0"));
 }
 
+// Rules: VER-32
 TEST(FormatVersionByteTest, NumbersBecomeTwoLowerCaseHexadecimalDigits) {
     expectBytes({{"0", "00"},
                  {"1", "01"},
@@ -48,6 +49,7 @@ TEST(FormatVersionByteTest, NumbersBecomeTwoLowerCaseHexadecimalDigits) {
                  {"255", "ff"}});
 }
 
+// Rules: VER-31, VER-32
 TEST(FormatVersionByteTest, AllBytesHaveTheirDigits) {
     static const std::string digits = "0123456789abcdef";
     for (std::size_t value = 0; value < 256; ++value) {
@@ -57,6 +59,7 @@ TEST(FormatVersionByteTest, AllBytesHaveTheirDigits) {
     }
 }
 
+// Rules: VER-31
 TEST(FormatVersionByteTest, NumbersFrom256OnAreReducedModulo256) {
     expectBytes({{"256", "00"},
                  {"257", "01"},
@@ -68,6 +71,7 @@ TEST(FormatVersionByteTest, NumbersFrom256OnAreReducedModulo256) {
                  {"2147483392", "00"}});
 }
 
+// Rules: VER-31, VER-33
 TEST(FormatVersionByteTest, NegativeRemaindersAreTwosComplementIn32Bits) {
     expectBytes({{"-1", "ffffffff"},
                  {"-2", "fffffffe"},
@@ -81,6 +85,7 @@ TEST(FormatVersionByteTest, NegativeRemaindersAreTwosComplementIn32Bits) {
                  {"-0", "00"}});
 }
 
+// Rules: VER-30
 TEST(FormatVersionByteTest, NumbersOutOfRangeCountAsTheNearestInRange) {
     expectBytes({{"2147483646", "fe"},
                  {"2147483647", "ff"},
@@ -115,10 +120,12 @@ TEST(FormatVersionByteTest, NumbersOfAnyLengthAreRead) {
     EXPECT_EQ(formatVersionByte("-" + zeros + "257"), "ffffffff");
 }
 
+// Rules: VER-28
 TEST(FormatVersionByteTest, LeadingZerosAreDecimal) {
     expectBytes({{"00", "00"}, {"007", "07"}, {"010", "0a"}, {"08", "08"}, {"-010", "fffffff6"}});
 }
 
+// Rules: VER-28
 TEST(FormatVersionByteTest, LeadingWhiteSpaceIsSkipped) {
     expectBytes({{" 5", "05"},
                  {"    12", "0c"},
@@ -134,6 +141,7 @@ TEST(FormatVersionByteTest, LeadingWhiteSpaceIsSkipped) {
                   "00"}});
 }
 
+// Rules: VER-28
 TEST(FormatVersionByteTest, OneSignIsAllowed) {
     expectBytes({{"+5", "05"},
                  {"+0", "00"},
@@ -148,6 +156,7 @@ TEST(FormatVersionByteTest, OneSignIsAllowed) {
                  {"-", "00"}});
 }
 
+// Rules: VER-28
 TEST(FormatVersionByteTest, NumberEndsAtTheFirstNonDigit) {
     expectBytes({{"5x", "05"},
                  {"5 6", "05"},
@@ -168,6 +177,7 @@ TEST(FormatVersionByteTest, NumberEndsAtTheFirstNonDigit) {
                  {"1:2", "01"}});
 }
 
+// Rules: VER-29
 TEST(FormatVersionByteTest, TextThatIsNotANumberIsZero) {
     expectBytes({{"", "00"},
                  {" ", "00"},
@@ -190,11 +200,13 @@ TEST(FormatVersionByteTest, ZeroByteIsANonDigit) {
     EXPECT_EQ(formatVersionByte({'-', '\0', '5'}), "00");
 }
 
+// Rules: VER-23, VER-24
 TEST(FormatVersionTest, MissingVersionGivesTheDefault) {
     EXPECT_STREQ(DEFAULT_SOFTWARE_VERSION, "000000");
     expectVersions({{"", "000000"}, {"N/A", "000000"}});
 }
 
+// Rules: VER-25, VER-26
 TEST(FormatVersionTest, ThreeComponentsAreJoined) {
     expectVersions({{"3.10.2", "030a02"},
                     {"1.2.3_45", "010203"},
@@ -204,14 +216,17 @@ TEST(FormatVersionTest, ThreeComponentsAreJoined) {
                     {"256.15.x", "000f00"}});
 }
 
+// Rules: VER-27
 TEST(FormatVersionTest, MissingComponentsRepeatTheOneBefore) {
     expectVersions({{"1.2", "010202"}, {"7", "070707"}, {"7_8", "070707"}, {"1.2_3", "010202"}});
 }
 
+// Rules: VER-34
 TEST(FormatVersionTest, ComponentsAfterTheThirdDoNotMatter) {
     expectVersions({{"1.2.3.4", "010203"}, {"1.2.3.4.5_6", "010203"}, {"1.2.3_4.5", "010203"}});
 }
 
+// Rules: VER-29
 TEST(FormatVersionTest, EmptyComponentsAreZero) {
     expectVersions({{".", "000000"},
                     {"..", "000000"},
@@ -226,10 +241,12 @@ TEST(FormatVersionTest, EmptyComponentsAreZero) {
                     {"1.2._3", "010200"}});
 }
 
+// Rules: VER-26
 TEST(FormatVersionTest, UnderscoreEndsAComponentsNumberOnly) {
     expectVersions({{"1_9.2.3", "010203"}, {"1.2_9.3", "010203"}, {"_1.2.3", "000203"}});
 }
 
+// Rules: VER-24, VER-29
 TEST(FormatVersionTest, TextThatIsNotAVersionGivesZeros) {
     expectVersions({{"unknown", "000000"},
                     {"n/a", "000000"},
@@ -239,6 +256,7 @@ TEST(FormatVersionTest, TextThatIsNotAVersionGivesZeros) {
                     {" ", "000000"}});
 }
 
+// Rules: VER-33
 TEST(FormatVersionTest, NegativeComponentsTakeEightDigits) {
     expectVersions({{"-1.2.3", "ffffffff0203"},
                     {"1.-300.3", "01ffffffd403"},

@@ -7,6 +7,7 @@ namespace orvane::test {
 
 class VersionSelectionTest : public VersionFolderTest {};
 
+// Rules: VER-02
 TEST_F(VersionSelectionTest, MarkerMayStandAnywhereInTheName) {
     for (const char* name : {"a.inf", "a.info", "b.inf.old", ".inf", ".infinite", "a.b.inf~",
                              "x.inf.inf", "a inf.inf "}) {
@@ -17,6 +18,7 @@ TEST_F(VersionSelectionTest, MarkerMayStandAnywhereInTheName) {
     }
 }
 
+// Rules: VER-03
 TEST_F(VersionSelectionTest, NamesWithoutTheMarkerAreIgnored) {
     for (const char* name :
          {"a.INF", "a.Inf", "ainf", "inf", "a.in", "a.i.nf", "a.txt", "a_inf", "i.nf"}) {
@@ -25,12 +27,14 @@ TEST_F(VersionSelectionTest, NamesWithoutTheMarkerAreIgnored) {
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
+// Rules: VER-01
 TEST_F(VersionSelectionTest, FilesInSubfoldersAreIgnored) {
     std::filesystem::create_directories(pathOf("sub"));
     put("sub/app.inf", description("Application", "1.2.3"));
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
+// Rules: VER-14
 TEST_F(VersionSelectionTest, TypeNeedsOnlyContainTheWord) {
     for (const char* type : {"Application", "MainApplication", "Applications", "My Application 2",
                              "Boot,Application", "\tApplication\r", "=Application"}) {
@@ -39,6 +43,7 @@ TEST_F(VersionSelectionTest, TypeNeedsOnlyContainTheWord) {
     }
 }
 
+// Rules: VER-15
 TEST_F(VersionSelectionTest, TypeIsCaseSensitiveAndTakenWhole) {
     for (const char* type :
          {"application", "APPLICATION", "Applicatio", "pplication", "Appl ication", "App", "N/A"}) {
@@ -47,6 +52,7 @@ TEST_F(VersionSelectionTest, TypeIsCaseSensitiveAndTakenWhole) {
     }
 }
 
+// Rules: VER-12
 TEST_F(VersionSelectionTest, KeysMustMatchExactly) {
     EXPECT_EQ(versionOf("type=Application\nVersion Number=1\n"), "");
     EXPECT_EQ(versionOf("\tType=Application\nVersion Number=1\n"), "");
@@ -58,15 +64,18 @@ TEST_F(VersionSelectionTest, KeysMustMatchExactly) {
     EXPECT_EQ(versionOf("Other=Application\nVersion Number=1\n"), "");
 }
 
+// Rules: VER-08
 TEST_F(VersionSelectionTest, SpacesAroundKeyEqualsSignAndValueDoNotMatter) {
     EXPECT_EQ(versionOf("  Type  =  Application  \n  Version Number  =  1.2.3  \n"), "1.2.3");
 }
 
+// Rules: VER-11
 TEST_F(VersionSelectionTest, LastLineOfAKeyCounts) {
     EXPECT_EQ(versionOf("Type=Boot\nType=Application\nVersion Number=1\nVersion Number=2\n"), "2");
     EXPECT_EQ(versionOf("Type=Application\nVersion Number=1\nType=Boot\n"), "");
 }
 
+// Rules: VER-16
 TEST_F(VersionSelectionTest, FirstApplicationInListingOrderWins) {
     const std::vector<std::string> names = {"d.inf", "a.inf", "h.inf", "b.inf",
                                             "g.inf", "c.inf", "f.inf", "e.inf"};
@@ -100,6 +109,7 @@ TEST_F(VersionSelectionTest, ListingOrderHoldsForNamesInAscendingAndDescendingOr
     }
 }
 
+// Rules: VER-16
 TEST_F(VersionSelectionTest, LowerVersionWinsWhenListedFirst) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), description("Application", "1.0.0"));
@@ -118,6 +128,7 @@ TEST_F(VersionSelectionTest, FilesOfOtherTypesAreSkipped) {
     EXPECT_EQ(findApplicationVersion(), "3.0.0");
 }
 
+// Rules: VER-17, VER-21
 TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithoutAVersion) {
     for (const char* content :
          {"Type=Application\n", "Type=Application\nVersion Number=\n",
@@ -132,6 +143,7 @@ TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithoutAVersion) {
     }
 }
 
+// Rules: VER-17
 TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithThePlaceholder) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), description("Application", "N/A"));
@@ -140,6 +152,7 @@ TEST_F(VersionSelectionTest, FirstMatchEndsTheSearchEvenWithThePlaceholder) {
     EXPECT_EQ(softwareVersion(), "000000");
 }
 
+// Rules: VER-18
 TEST_F(VersionSelectionTest, EachFileHasItsOwnRecord) {
     const std::vector<std::string> listed = makeFiles({"x.inf", "y.inf"});
     put(listed.at(0), "Version Number=1.2.3\n");
@@ -150,6 +163,7 @@ TEST_F(VersionSelectionTest, EachFileHasItsOwnRecord) {
     EXPECT_EQ(findApplicationVersion(), "");
 }
 
+// Rules: VER-22
 TEST_F(VersionSelectionTest, FoldersAndDanglingLinksWithTheMarkerAreHarmless) {
     std::filesystem::create_directory(pathOf("x.inf"));
     std::filesystem::create_symlink("/tmp/nowhere", pathOf("y.inf"));

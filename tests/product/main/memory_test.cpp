@@ -72,10 +72,12 @@ protected:
     }
 };
 
+// Rules: RUN-01
 TEST_F(MemoryTest, EveryAllocationMayFailAlone) {
     failAtEveryMoment(Shortage::once);
 }
 
+// Rules: RUN-01
 TEST_F(MemoryTest, MemoryMayRunOutForGoodAtEveryMoment) {
     failAtEveryMoment(Shortage::forGood);
 }

@@ -65,15 +65,18 @@ protected:
 
 } // namespace
 
+// Rules: OPT-06
 TEST_F(OptionsTest, NoOptionsDoNothing) {
     EXPECT_EQ(expectFiles({}, NOTHING), "");
 }
 
+// Rules: OPT-01
 TEST_F(OptionsTest, LetterARunsTheAirplayWriter) {
     EXPECT_EQ(expectFiles({"-a"}, AIRPLAY_FILE), "");
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead() + "static = 1\n");
 }
 
+// Rules: OPT-02
 TEST_F(OptionsTest, LetterIRunsTheIapWriter) {
     EXPECT_EQ(expectFiles({"-i"}, IAP_FILES), "");
     EXPECT_EQ(readFile(DEVICE_OUTPUT), plainDevice());
@@ -81,6 +84,7 @@ TEST_F(OptionsTest, LetterIRunsTheIapWriter) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
 }
 
+// Rules: OPT-04
 TEST_F(OptionsTest, BothLettersRunBothWriters) {
     for (const std::vector<std::string>& arguments :
          std::vector<std::vector<std::string>>{{"-ai"}, {"-ia"}, {"-a", "-i"}, {"-i", "-a"}}) {
@@ -90,6 +94,7 @@ TEST_F(OptionsTest, BothLettersRunBothWriters) {
     }
 }
 
+// Rules: OPT-03
 TEST_F(OptionsTest, WritersRunInTheOrderOfTheLetters) {
     // Two outputs are one file, so that the last writer's content stays.
     std::filesystem::create_symlink(IAP1_OUTPUT, AIRPLAY_OUTPUT);
@@ -105,6 +110,7 @@ TEST_F(OptionsTest, WritersRunInTheOrderOfTheLetters) {
     }
 }
 
+// Rules: RUN-14, OPT-05
 TEST_F(OptionsTest, RepeatedLetterARunsItsWriterAgain) {
     for (const std::vector<std::string>& arguments :
          std::vector<std::vector<std::string>>{{"-aa"}, {"-a", "-a"}}) {
@@ -121,6 +127,7 @@ TEST_F(OptionsTest, RepeatedLetterARunsItsWriterAgain) {
     }
 }
 
+// Rules: RUN-14, OPT-05
 TEST_F(OptionsTest, RepeatedLetterIRunsItsWriterAgain) {
     for (const std::vector<std::string>& arguments :
          std::vector<std::vector<std::string>>{{"-ii"}, {"-i", "-i"}}) {
@@ -135,6 +142,7 @@ TEST_F(OptionsTest, RepeatedLetterIRunsItsWriterAgain) {
     }
 }
 
+// Rules: OPT-08
 TEST_F(OptionsTest, UnknownLetterIsNamedByTheLibrary) {
     const std::string said = expectFiles({"-x"}, NOTHING);
     EXPECT_EQ(said.rfind("orvane: ", 0), 0U) << said;
@@ -143,6 +151,7 @@ TEST_F(OptionsTest, UnknownLetterIsNamedByTheLibrary) {
     EXPECT_EQ(said.find("Usage"), std::string::npos) << said;
 }
 
+// Rules: OPT-08, OPT-10
 TEST_F(OptionsTest, EveryOtherCharacterIsUnknown) {
     for (char letter = '!'; letter <= '~'; ++letter) {
         if (letter == 'a' || letter == 'i' || letter == '-') {
@@ -153,6 +162,7 @@ TEST_F(OptionsTest, EveryOtherCharacterIsUnknown) {
     }
 }
 
+// Rules: OPT-09
 TEST_F(OptionsTest, UnknownLetterDoesNotStopLaterOnes) {
     EXPECT_NE(expectFiles({"-x", "-a"}, AIRPLAY_FILE), "");
     EXPECT_NE(expectFiles({"-xa"}, AIRPLAY_FILE), "");
@@ -160,16 +170,19 @@ TEST_F(OptionsTest, UnknownLetterDoesNotStopLaterOnes) {
     EXPECT_NE(expectFiles({"-ax", "-i"}, ALL_FILES), "");
 }
 
+// Rules: OPT-08
 TEST_F(OptionsTest, EveryUnknownLetterIsNamed) {
     const std::string said = expectFiles({"-xyx", "-z"}, NOTHING);
     EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 4) << said;
 }
 
+// Rules: OPT-07
 TEST_F(OptionsTest, LettersTakeNoArgument) {
     EXPECT_EQ(expectFiles({"-a", "i"}, AIRPLAY_FILE), "");
     EXPECT_EQ(expectFiles({"-i", "a"}, IAP_FILES), "");
 }
 
+// Rules: OPT-12, OPT-13
 TEST_F(OptionsTest, FirstOperandEndsTheOptions) {
     for (const char* operand : {"word", "a", "i", "-", ""}) {
         EXPECT_EQ(expectFiles({operand, "-a"}, NOTHING), "");
@@ -178,6 +191,7 @@ TEST_F(OptionsTest, FirstOperandEndsTheOptions) {
     }
 }
 
+// Rules: OPT-14
 TEST_F(OptionsTest, DoubleDashEndsTheOptions) {
     EXPECT_EQ(expectFiles({"--"}, NOTHING), "");
     EXPECT_EQ(expectFiles({"--", "-a"}, NOTHING), "");
@@ -200,6 +214,7 @@ TEST_F(OptionsTest, NoArgumentVectorDoesNothing) {
     EXPECT_EQ(folderNames("/tmp"), NOTHING);
 }
 
+// Rules: RUN-01 to RUN-03
 TEST_F(OptionsTest, FailureOfTheWritersIsNotAFailureOfTheProgram) {
     for (const char* path : {"/fs", "/dev", "/tmp"}) {
         remove(path);
@@ -214,6 +229,7 @@ TEST_F(OptionsTest, WriterThatThrowsEndsSilently) {
     EXPECT_EQ(streams.stop(), "");
 }
 
+// Rules: RUN-01 to RUN-03
 TEST_F(OptionsTest, StockFilesAreInstalledSilently) {
     remove(AIRPLAY_TEMPLATE);
     remove(DEVICE_TEMPLATE);

@@ -131,6 +131,7 @@ TEST_F(OptionParserTest, LettersComeInTheirOrder) {
     }
 }
 
+// Rules: OPT-12
 TEST_F(OptionParserTest, FirstOperandIsTheEnd) {
     const Parsed parsed = parse(CommandLine({"orvane", "word", "-a"}));
     EXPECT_EQ("", parsed.letters);
@@ -138,6 +139,7 @@ TEST_F(OptionParserTest, FirstOperandIsTheEnd) {
     EXPECT_EQ(1, parsed.next);
 }
 
+// Rules: OPT-12
 TEST_F(OptionParserTest, OperandBetweenOptionsIsTheEnd) {
     const Parsed parsed = parse(CommandLine({"orvane", "-a", "word", "-i"}));
     EXPECT_EQ("a", parsed.letters);
@@ -151,6 +153,7 @@ TEST_F(OptionParserTest, WordsAreNotReordered) {
     EXPECT_EQ(words, line.words());
 }
 
+// Rules: OPT-14
 TEST_F(OptionParserTest, DoubleDashIsTheEndAndIsPassed) {
     const Parsed parsed = parse(CommandLine({"orvane", "-a", "--", "-i"}));
     EXPECT_EQ("a", parsed.letters);
@@ -158,6 +161,7 @@ TEST_F(OptionParserTest, DoubleDashIsTheEndAndIsPassed) {
     EXPECT_EQ(3, parsed.next);
 }
 
+// Rules: OPT-13
 TEST_F(OptionParserTest, LoneDashIsAnOperand) {
     const Parsed parsed = parse(CommandLine({"orvane", "-a", "-", "-i"}));
     EXPECT_EQ("a", parsed.letters);
@@ -179,17 +183,20 @@ TEST_F(OptionParserTest, EndIsFinal) {
     }
 }
 
+// Rules: OPT-09
 TEST_F(OptionParserTest, UnknownLetterIsAQuestionMarkAndParsingGoesOn) {
     EXPECT_EQ("?a", parse(CommandLine({"orvane", "-x", "-a"})).letters);
     EXPECT_EQ("a?i", parse(CommandLine({"orvane", "-axi"})).letters);
     EXPECT_EQ("??", parse(CommandLine({"orvane", "-A", "-I"})).letters);
 }
 
+// Rules: OPT-11
 TEST_F(OptionParserTest, LongOptionsAreUnknownLetters) {
     EXPECT_EQ("?a", parse(CommandLine({"orvane", "--a"})).letters);
     EXPECT_EQ("?????", parse(CommandLine({"orvane", "--help"})).letters);
 }
 
+// Rules: OPT-08
 TEST_F(OptionParserTest, DiagnosticIsTheCLibrarysOwn) {
     for (const char* word : {"-x", "-xy", "-A", "-?", "-+", "-:", "-;", "--a"}) {
         SCOPED_TRACE(word);
@@ -241,6 +248,7 @@ TEST_F(OptionParserTest, ClusterIsFollowedAcrossCalls) {
     }
 }
 
+// Rules: RUN-06
 TEST_F(OptionParserTest, WorksWithPosixlyCorrectSetToo) {
     ASSERT_EQ(0, setenv("POSIXLY_CORRECT", "1", 1));
     EXPECT_EQ("a", parse(CommandLine({"orvane", "-a", "word", "-i"})).letters);

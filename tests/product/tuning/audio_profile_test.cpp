@@ -33,6 +33,7 @@ protected:
     }
 };
 
+// Rules: PRO-04, PRO-05
 TEST_F(AudioProfileTest, ConstantsNameParameterValuesAndFiles) {
     EXPECT_EQ(AUDIO_PROFILE_PARAM, 134);
     EXPECT_EQ(AUDIO_PROFILE_GENERATED, 65535);
@@ -41,12 +42,14 @@ TEST_F(AudioProfileTest, ConstantsNameParameterValuesAndFiles) {
     EXPECT_STREQ(SPEECHREC_TUNING_FILE, SPEECHREC_FILE);
 }
 
+// Rules: PRO-03, PRO-07
 TEST_F(AudioProfileTest, ZeroIsAProfileLikeAnyOther) {
     setProfile(0);
     EXPECT_EQ(getAudioProfile(), 0);
     expectNoTuningFiles();
 }
 
+// Rules: PRO-03, PRO-07
 TEST_F(AudioProfileTest, ValuesBelowTheGeneratedOnePassThrough) {
     for (const unsigned value : {1U, 2U, 255U, 256U, 0x1234U, 0x7FFFU, 0x8000U, 0x00FFU, 0xFF00U,
                                  0xFFFDU, 0xFEFFU, 65534U}) {
@@ -56,6 +59,7 @@ TEST_F(AudioProfileTest, ValuesBelowTheGeneratedOnePassThrough) {
     }
 }
 
+// Rules: IMG-09, PRO-01
 TEST_F(AudioProfileTest, ValueIsReadFromItsOwnBytesLowByteFirst) {
     writeImage(std::string(179, '\xFF'));
     setImage(133, "\x34\x12");
@@ -66,6 +70,7 @@ TEST_F(AudioProfileTest, ValueIsReadFromItsOwnBytesLowByteFirst) {
     expectNoTuningFiles();
 }
 
+// Rules: PRO-04, PRO-05
 TEST_F(AudioProfileTest, GeneratedProfileWritesBothFiles) {
     setBlock(3, 10, "\x33");
     setBlock(2, 10, "\x22");
@@ -77,6 +82,7 @@ TEST_F(AudioProfileTest, GeneratedProfileWritesBothFiles) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 34");
 }
 
+// Rules: PRO-04, TUN-03
 TEST_F(AudioProfileTest, PatternInBlockThreeShowsInTheTelephonyFileOnly) {
     setDiskFromEnd(TUNING_AREA_BEFORE_END - 564, std::string(188, '\x01'));
     setProfile(0xFFFF);
@@ -85,6 +91,7 @@ TEST_F(AudioProfileTest, PatternInBlockThreeShowsInTheTelephonyFileOnly) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 0");
 }
 
+// Rules: PRO-05, TUN-03
 TEST_F(AudioProfileTest, PatternInBlockTwoShowsInTheSpeechFileOnly) {
     setDiskFromEnd(TUNING_AREA_BEFORE_END - 376, std::string(188, '\x01'));
     setProfile(0xFFFF);
@@ -93,6 +100,7 @@ TEST_F(AudioProfileTest, PatternInBlockTwoShowsInTheSpeechFileOnly) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 1");
 }
 
+// Rules: PRO-06
 TEST_F(AudioProfileTest, TelephonyFileIsWrittenFirst) {
     // Both names lead to one file: the later writer's content remains.
     std::filesystem::create_symlink("/tmp/both", TELEPHONY_FILE);
@@ -113,27 +121,32 @@ TEST_F(AudioProfileTest, TelephonyFileIsCompleteBeforeTheDiskIsReadAgain) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 0");
 }
 
+// Rules: PRO-02
 TEST_F(AudioProfileTest, MissingImageIsAnUnknownProfile) {
     remove(IMAGE_PATH);
     expectUnknownProfile();
 }
 
+// Rules: IMG-03
 TEST_F(AudioProfileTest, EmptyImageIsAnUnknownProfile) {
     writeImage("");
     expectUnknownProfile();
 }
 
+// Rules: IMG-02, IMG-04
 TEST_F(AudioProfileTest, ImageThatCannotBeMappedIsAnUnknownProfile) {
     putFolder(IMAGE_PATH);
     expectUnknownProfile();
 }
 
+// Rules: IMG-07
 TEST_F(AudioProfileTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(std::string(134, '\xFF'));
     EXPECT_EQ(getAudioProfile(), 255);
     expectNoTuningFiles();
 }
 
+// Rules: PRO-08
 TEST_F(AudioProfileTest, ProfileIsKnownEvenWhenNeitherFileCanBeWritten) {
     putFolder(TELEPHONY_FILE);
     putFolder(SPEECHREC_FILE);
@@ -144,6 +157,7 @@ TEST_F(AudioProfileTest, ProfileIsKnownEvenWhenNeitherFileCanBeWritten) {
     EXPECT_FALSE(exists("/tmp"));
 }
 
+// Rules: PRO-09
 TEST_F(AudioProfileTest, FileThatCannotBeWrittenDoesNotStopTheOther) {
     setProfile(0xFFFF);
     putFolder(TELEPHONY_FILE);
@@ -172,6 +186,7 @@ TEST_F(AudioProfileTest, FilesOfAnEarlierRunAreReplaced) {
     EXPECT_EQ(splitLines(readFile(SPEECHREC_FILE)).size(), 45U);
 }
 
+// Rules: PRO-07
 TEST_F(AudioProfileTest, FilesOfAnEarlierRunStayWithAnyOtherProfile) {
     writeFile(TELEPHONY_FILE, "telephony");
     writeFile(SPEECHREC_FILE, "speech");

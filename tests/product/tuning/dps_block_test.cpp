@@ -78,6 +78,7 @@ TEST(DpsBlockTest, ElementsTakeOneByteOrTwo) {
     EXPECT_EQ(dpsElementSize(DpsEncoding::i16), 2U);
 }
 
+// Rules: FLD-01 to FLD-44
 TEST(DpsLayoutTest, RowsAreAsExpected) {
     ASSERT_EQ(DPS_FIELD_COUNT, 44U);
     ASSERT_EQ(DPS_LAYOUT.size(), EXPECTED_FIELD_COUNT);
@@ -177,6 +178,7 @@ TEST(DecodeFieldTest, OnesDecodeToTheHighestCodeOrMinusOne) {
     }
 }
 
+// Rules: TUN-17
 TEST(DecodeFieldTest, FourCodesShareAByteFromTheLowestBitsUp) {
     const DpsBlock block = blockWith(0, {0xE4});
     EXPECT_EQ(decoded("qwaAECSwitch", block), 0);
@@ -190,6 +192,7 @@ TEST(DecodeFieldTest, FourCodesShareAByteFromTheLowestBitsUp) {
     EXPECT_EQ(decoded("qwaHFESwitch", reverse), 0);
 }
 
+// Rules: TUN-18
 TEST(DecodeFieldTest, ByteIsUnsigned) {
     for (const int value : {0, 1, 127, 128, 255}) {
         const auto byte = static_cast<std::uint8_t>(value);
@@ -210,6 +213,7 @@ TEST(DecodeFieldTest, WideSwitchesTakeTheirWholeValue) {
     EXPECT_EQ(decoded("qwaIVOSwitch", blockWith(169, {0x00, 0x80})), -32768);
 }
 
+// Rules: TUN-19
 TEST(DecodeFieldTest, SixteenBitsAreLittleEndianAndSigned) {
     EXPECT_EQ(decoded("qwaAECFiltLen", blockWith(6, {0xFF, 0xFF})), -1);
     EXPECT_EQ(decoded("qwaAECFiltLen", blockWith(6, {0x00, 0x80})), -32768);
@@ -220,6 +224,7 @@ TEST(DecodeFieldTest, SixteenBitsAreLittleEndianAndSigned) {
     EXPECT_EQ(decoded("qwaDNSEnable", blockWith(167, {0x34, 0x12})), 4660);
 }
 
+// Rules: TUN-20
 TEST(DecodeFieldTest, ListElementsFollowOneAnother) {
     const DpsBlock block =
         blockWith(13, {0x00, 0x80, 0x01, 0x00, 0xFE, 0xFF, 0x00, 0x01, 0xFF, 0x7F, 0x55});
@@ -243,6 +248,7 @@ TEST(QwaWordTest, TablesHoldThreeWordsEach) {
     }
 }
 
+// Rules: TUN-12, TUN-13
 TEST(QwaWordTest, CodesOneToThreeHaveAWord) {
     EXPECT_STREQ(qwaWord(qwaSwitchWords, 1), "qwaOff");
     EXPECT_STREQ(qwaWord(qwaSwitchWords, 2), "qwaOn");
@@ -252,6 +258,7 @@ TEST(QwaWordTest, CodesOneToThreeHaveAWord) {
     EXPECT_STREQ(qwaWord(qwaModeWords, 3), "qwaCombined");
 }
 
+// Rules: TUN-14
 TEST(QwaWordTest, OtherCodesHaveNoWord) {
     for (const std::int32_t code :
          {0, 4, -1, -2, -3, 6, 255, 256, 257, 258, 259, 0x10001, INT_MAX, INT_MIN}) {

@@ -61,6 +61,7 @@ protected:
     }
 };
 
+// Rules: TUN-17
 TEST_F(TuningFileFieldsTest, CodeFieldsChangeTheirOwnLineOnly) {
     for (std::size_t row = 0; row < EXPECTED_FIELD_COUNT; ++row) {
         const DpsField& field = EXPECTED_LAYOUT[row];
@@ -95,6 +96,7 @@ TEST_F(TuningFileFieldsTest, WideFieldsChangeTheirOwnElementOnly) {
     }
 }
 
+// Rules: TUN-21
 TEST_F(TuningFileFieldsTest, UnreadBitsChangeNothing) {
     const std::string ofZeros = renderedWith(0, std::string(1, '\0'));
     for (const UnreadBits& unread : UNREAD_BITS) {
@@ -109,6 +111,7 @@ TEST_F(TuningFileFieldsTest, UnreadBitsChangeNothing) {
     }
 }
 
+// Rules: TUN-21
 TEST_F(TuningFileFieldsTest, UnreadBitsChangeNothingAmongOnes) {
     const std::string ones(BLOCK_SIZE, '\xFF');
     const std::string ofOnes = renderedWith(0, ones);
@@ -121,6 +124,7 @@ TEST_F(TuningFileFieldsTest, UnreadBitsChangeNothingAmongOnes) {
     }
 }
 
+// Rules: TUN-12, TUN-17
 TEST_F(TuningFileFieldsTest, FourSwitchesOfAByteHaveTheirWords) {
     const std::vector<std::string> lines = splitLines(renderedWith(0, "\xE4"));
     EXPECT_EQ(lines.at(1), "qwaAECSwitch ");
@@ -129,6 +133,7 @@ TEST_F(TuningFileFieldsTest, FourSwitchesOfAByteHaveTheirWords) {
     EXPECT_EQ(lines.at(4), "qwaHFESwitch qwaIdle");
 }
 
+// Rules: TUN-13
 TEST_F(TuningFileFieldsTest, ModeHasItsWords) {
     EXPECT_EQ(lineWith("qwaWNDBMode", 4, "\x40"), "qwaWNDBMode qwaSingleChannel");
     EXPECT_EQ(lineWith("qwaWNDBMode", 4, "\x80"), "qwaWNDBMode qwaMultiChannel");
@@ -136,6 +141,7 @@ TEST_F(TuningFileFieldsTest, ModeHasItsWords) {
     EXPECT_EQ(lineWith("qwaWNDBMode", 4, "\x3F"), "qwaWNDBMode ");
 }
 
+// Rules: FLD-18
 TEST_F(TuningFileFieldsTest, ByteSwitchTakesAllEightBits) {
     EXPECT_EQ(lineWith("qwaWNDBSwitch", 5, "\x02"), "qwaWNDBSwitch qwaOn");
     EXPECT_EQ(lineWith("qwaWNDBSwitch", 5, "\x03"), "qwaWNDBSwitch qwaIdle");
@@ -144,6 +150,7 @@ TEST_F(TuningFileFieldsTest, ByteSwitchTakesAllEightBits) {
     }
 }
 
+// Rules: TUN-14, FLD-20, FLD-43
 TEST_F(TuningFileFieldsTest, WideSwitchesTakeAllSixteenBits) {
     EXPECT_EQ(lineWith("qwaLFRSwitch", 8, littleEndian(2)), "qwaLFRSwitch qwaOn");
     EXPECT_EQ(lineWith("qwaIVOSwitch", 169, littleEndian(3)), "qwaIVOSwitch qwaIdle");
@@ -153,6 +160,7 @@ TEST_F(TuningFileFieldsTest, WideSwitchesTakeAllSixteenBits) {
     }
 }
 
+// Rules: TUN-15, TUN-18, TUN-19
 TEST_F(TuningFileFieldsTest, WideNumbersAreSignedAndBytesAreNot) {
     EXPECT_EQ(lineWith("qwaAECFiltLen", 6, "\xFF\xFF"), "qwaAECFiltLen -1");
     EXPECT_EQ(lineWith("qwaAECFiltLen", 6, std::string("\0\x80", 2)), "qwaAECFiltLen -32768");
@@ -160,12 +168,14 @@ TEST_F(TuningFileFieldsTest, WideNumbersAreSignedAndBytesAreNot) {
     EXPECT_EQ(lineWith("qwaHFEExtent", 10, "\xFF"), "qwaHFEExtent 255");
 }
 
+// Rules: FLD-42, FLD-44
 TEST_F(TuningFileFieldsTest, FieldsNamedEnableAreNumbersToo) {
     EXPECT_EQ(lineWith("qwaDNSEnable", 167, "\x34\x12"), "qwaDNSEnable 4660");
     EXPECT_EQ(lineWith("qwaDNSEnable", 167, littleEndian(1)), "qwaDNSEnable 1");
     EXPECT_EQ(lineWith("qwaMEQEnable", 171, littleEndian(2)), "qwaMEQEnable 2 0 0 0 ");
 }
 
+// Rules: TUN-16, TUN-20
 TEST_F(TuningFileFieldsTest, EachListElementIsFollowedByASpace) {
     const std::string bytes =
         littleEndian(1) + littleEndian(-2) + littleEndian(3) + littleEndian(0) + littleEndian(5);

@@ -125,6 +125,7 @@ std::string randomBlock(std::mt19937& engine, bool hasWords) {
 
 class TuningFileRandomTest : public TuningTest {};
 
+// Rules: TUN-04, TUN-09, FLD-01 to FLD-44
 TEST_F(TuningFileRandomTest, ArbitraryBlocksAgreeWithASecondDecoder) {
     std::mt19937 engine = numbersFrom(20090213);
     for (int round = 0; round < 200; ++round) {

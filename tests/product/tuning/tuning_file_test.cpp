@@ -78,10 +78,12 @@ protected:
     }
 };
 
+// Rules: TUN-08 to TUN-11, TUN-14
 TEST_F(TuningFileTest, BlockOfZerosIsWholeAndExact) {
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+// Rules: TUN-08
 TEST_F(TuningFileTest, HeaderNamesTheBlock) {
     for (int blockId = 0; blockId <= 9; ++blockId) {
         EXPECT_EQ(splitLines(rendered(blockId)).at(0),
@@ -89,6 +91,7 @@ TEST_F(TuningFileTest, HeaderNamesTheBlock) {
     }
 }
 
+// Rules: TUN-01, TUN-02
 TEST_F(TuningFileTest, EachBlockIdHasItsOwn188Bytes) {
     for (unsigned blockId = 0; blockId <= 9; ++blockId) {
         setBlock(blockId, 0, std::string(BLOCK_SIZE, static_cast<char>(blockId + 1)));
@@ -102,6 +105,7 @@ TEST_F(TuningFileTest, EachBlockIdHasItsOwn188Bytes) {
     }
 }
 
+// Rules: TUN-02, TUN-03
 TEST_F(TuningFileTest, PatternInOneBlockShowsInNoOther) {
     setBlock(3, 0, std::string(BLOCK_SIZE, '\x55'));
     for (int blockId = 0; blockId <= 9; ++blockId) {
@@ -110,6 +114,7 @@ TEST_F(TuningFileTest, PatternInOneBlockShowsInNoOther) {
     }
 }
 
+// Rules: TUN-01, TUN-03
 TEST_F(TuningFileTest, BytesAroundTheBlocksDoNotShow) {
     setDiskFromEnd(TUNING_AREA_BEFORE_END + 1024, std::string(1024, '\x55'));
     setDiskFromEnd(TUNING_AREA_BEFORE_END - 1880, std::string(4096 - 1880, '\x55'));
@@ -128,12 +133,14 @@ TEST_F(TuningFileTest, OtherBlockIdsWriteNothing) {
     }
 }
 
+// Rules: TUN-05
 TEST_F(TuningFileTest, MissingDeviceIsRenderedAsZeros) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     remove(DISK_PATH);
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+// Rules: TUN-05
 TEST_F(TuningFileTest, DeviceTooShortForTheSeekIsRenderedAsZeros) {
     resetDisk(TUNING_AREA_BEFORE_END);
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
@@ -142,11 +149,13 @@ TEST_F(TuningFileTest, DeviceTooShortForTheSeekIsRenderedAsZeros) {
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+// Rules: TUN-05
 TEST_F(TuningFileTest, DeviceThatCannotBeReadIsRenderedAsZeros) {
     putFolder(DISK_PATH);
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+// Rules: TUN-05
 TEST_F(TuningFileTest, RefusedReadAfterAGoodSeekIsRenderedAsZeros) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     {
@@ -157,6 +166,7 @@ TEST_F(TuningFileTest, RefusedReadAfterAGoodSeekIsRenderedAsZeros) {
     EXPECT_EQ(readFile(ANY_TUNING_FILE), fileOfZeros(2));
 }
 
+// Rules: TUN-06
 TEST_F(TuningFileTest, BytesThatAShortReadLacksAreRenderedAsZeros) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     {
@@ -169,6 +179,7 @@ TEST_F(TuningFileTest, BytesThatAShortReadLacksAreRenderedAsZeros) {
     EXPECT_EQ(lineOf(text, "qwaRECSuppress"), "qwaRECSuppress 0");
 }
 
+// Rules: TUN-07
 TEST_F(TuningFileTest, EachCallReadsTheDeviceAgain) {
     setBlock(2, 0, std::string(BLOCK_SIZE, '\x55'));
     EXPECT_EQ(lineOf(rendered(2), "qwaHFEExtent"), "qwaHFEExtent 85");
@@ -178,12 +189,14 @@ TEST_F(TuningFileTest, EachCallReadsTheDeviceAgain) {
     EXPECT_EQ(rendered(2), fileOfZeros(2));
 }
 
+// Rules: TUN-07
 TEST_F(TuningFileTest, DeviceIsReadBeforeTheFileIsOpened) {
     setBlock(3, 10, "\x07");
     generateTuningFile(3, DISK_PATH);
     EXPECT_EQ(lineOf(readFile(DISK_PATH), "qwaHFEExtent"), "qwaHFEExtent 7");
 }
 
+// Rules: RUN-05
 TEST_F(TuningFileTest, DeviceIsOnlyRead) {
     const std::string pattern(BLOCK_SIZE, '\x55');
     setBlock(3, 0, pattern);
@@ -194,6 +207,7 @@ TEST_F(TuningFileTest, DeviceIsOnlyRead) {
     EXPECT_FALSE(exists(DISK_PATH));
 }
 
+// Rules: RUN-09
 TEST_F(TuningFileTest, LongerOlderFileIsTruncated) {
     writeFile(ANY_TUNING_FILE, std::string(10000, 'x'));
     EXPECT_EQ(rendered(2), fileOfZeros(2));
@@ -205,18 +219,21 @@ TEST_F(TuningFileTest, RepeatedCallGivesTheSameFile) {
     EXPECT_EQ(rendered(2), first);
 }
 
+// Rules: RUN-07
 TEST_F(TuningFileTest, NewFileHasMode666LessTheMask) {
     EXPECT_EQ(modeUnder(0), 0666U);
     EXPECT_EQ(modeUnder(022), 0644U);
     EXPECT_EQ(modeUnder(077), 0600U);
 }
 
+// Rules: RUN-10
 TEST_F(TuningFileTest, LinkIsWrittenThrough) {
     std::filesystem::create_symlink("/tmp/target.txt", ANY_TUNING_FILE);
     EXPECT_EQ(rendered(2), fileOfZeros(2));
     EXPECT_EQ(readFile("/tmp/target.txt"), fileOfZeros(2));
 }
 
+// Rules: RUN-11
 TEST_F(TuningFileTest, FileThatCannotBeOpenedIsSkipped) {
     putFolder("/tmp/folder.txt");
     std::filesystem::create_symlink("/tmp/loop.txt", "/tmp/loop.txt");
@@ -232,6 +249,7 @@ TEST_F(TuningFileTest, FileThatCannotBeOpenedIsSkipped) {
     EXPECT_FALSE(exists("/nowhere"));
 }
 
+// Rules: TUN-07
 TEST_F(TuningFileTest, DeviceIsReadEvenWhenTheFileCannotBeOpened) {
     putFolder(ANY_TUNING_FILE);
     FileEventLog reads(IN_ACCESS, {DISK_PATH});
@@ -239,6 +257,7 @@ TEST_F(TuningFileTest, DeviceIsReadEvenWhenTheFileCannotBeOpened) {
     EXPECT_EQ(reads.take(), std::vector<std::string>{DISK_PATH});
 }
 
+// Rules: RUN-13
 TEST_F(TuningFileTest, OlderFileStaysWhenItCannotBeOpened) {
     writeFile(ANY_TUNING_FILE, OLD_CONTENT);
     {
@@ -263,6 +282,7 @@ TEST_F(TuningFileTest, ReadOnlyFolderGetsNoFile) {
     EXPECT_EQ(readFile("/tmp/old.txt"), OLD_CONTENT);
 }
 
+// Rules: RUN-01
 TEST_F(TuningFileTest, WriteErrorsAreIgnored) {
     for (const std::size_t room : {0U, 1U, 39U, 40U, 100U, 800U}) {
         SCOPED_TRACE(room);

@@ -29,6 +29,7 @@ int updateAirplayWithDescriptors(int count) {
 
 } // namespace
 
+// Rules: MRG-07, MRG-08, AIR-02
 TEST_F(AirplayFallbackTest, MissingTemplateInstallsTheStockFile) {
     remove(AIRPLAY_TEMPLATE);
     const std::string stock("stock\r\n\0\xff no line end", 21);
@@ -46,6 +47,7 @@ TEST_F(AirplayFallbackTest, StockFileLongerThanAnyBufferIsCopiedWhole) {
     EXPECT_TRUE(readFile(AIRPLAY_OUTPUT) == stock);
 }
 
+// Rules: RUN-09
 TEST_F(AirplayFallbackTest, StockFileReplacesAnOlderLongerOutput) {
     remove(AIRPLAY_TEMPLATE);
     writeFile(AIRPLAY_OUTPUT, std::string(20000, 'o'));
@@ -53,6 +55,7 @@ TEST_F(AirplayFallbackTest, StockFileReplacesAnOlderLongerOutput) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "stock = 1\n");
 }
 
+// Rules: RUN-10
 TEST_F(AirplayFallbackTest, StockFileGoesThroughASymlink) {
     remove(AIRPLAY_TEMPLATE);
     std::filesystem::create_symlink("/fs/rwdata/airplay", AIRPLAY_OUTPUT);
@@ -61,6 +64,7 @@ TEST_F(AirplayFallbackTest, StockFileGoesThroughASymlink) {
     EXPECT_EQ(readFile("/fs/rwdata/airplay"), "stock = 1\n");
 }
 
+// Rules: MRG-07
 TEST_F(AirplayFallbackTest, DanglingLinkAsATemplateInstallsTheStockFile) {
     for (const char* target : {"/fs/mp/etc/airplay_static.conf", "/fs/missing/template"}) {
         SCOPED_TRACE(target);
@@ -71,6 +75,7 @@ TEST_F(AirplayFallbackTest, DanglingLinkAsATemplateInstallsTheStockFile) {
     }
 }
 
+// Rules: MRG-07
 TEST_F(AirplayFallbackTest, TemplateWithoutReadPermissionInstallsTheStockFile) {
     ASSERT_EQ(chmod(AIRPLAY_TEMPLATE, 0), 0);
     {
@@ -87,6 +92,7 @@ TEST_F(AirplayFallbackTest, MissingTemplateAndStockFileLeaveAnEmptyOutput) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
+// Rules: MRG-09
 TEST_F(AirplayFallbackTest, MissingTemplateAndStockFileEmptyAnOlderOutput) {
     remove(AIRPLAY_TEMPLATE);
     remove(AIRPLAY_STOCK);
@@ -105,6 +111,7 @@ TEST_F(AirplayFallbackTest, StockFileWithoutContentLeavesAnEmptyOutput) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "");
 }
 
+// Rules: PRO-10
 TEST_F(AirplayFallbackTest, TuningFilesAreWrittenBesideTheStockFile) {
     remove(AIRPLAY_TEMPLATE);
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
@@ -114,6 +121,7 @@ TEST_F(AirplayFallbackTest, TuningFilesAreWrittenBesideTheStockFile) {
               (std::set<std::string>{"airplay.conf", "speechrec_FFFF.txt", "telephony_FFFF.txt"}));
 }
 
+// Rules: RUN-12
 TEST_F(AirplayFallbackTest, MissingTmpIsNotCreated) {
     remove("/tmp");
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
@@ -132,6 +140,7 @@ TEST_F(AirplayFallbackTest, ReadOnlyTmpStaysEmpty) {
     EXPECT_TRUE(std::filesystem::is_empty("/tmp"));
 }
 
+// Rules: RUN-13
 TEST_F(AirplayFallbackTest, ReadOnlyOlderOutputStaysAsItIs) {
     writeFile(AIRPLAY_OUTPUT, "older");
     ASSERT_EQ(chmod(AIRPLAY_OUTPUT, 0444), 0);
@@ -142,6 +151,7 @@ TEST_F(AirplayFallbackTest, ReadOnlyOlderOutputStaysAsItIs) {
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), "older");
 }
 
+// Rules: RUN-11
 TEST_F(AirplayFallbackTest, OutputThatIsAFolderStaysEmpty) {
     putFolder(AIRPLAY_OUTPUT);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
@@ -150,6 +160,7 @@ TEST_F(AirplayFallbackTest, OutputThatIsAFolderStaysEmpty) {
     EXPECT_EQ(readFile(AIRPLAY_STOCK), "stock = 1\n");
 }
 
+// Rules: MRG-10
 TEST_F(AirplayFallbackTest, NothingIsWrittenThroughADanglingLink) {
     std::filesystem::create_symlink("/fs/missing/airplay", AIRPLAY_OUTPUT);
     EXPECT_EQ(updateAirplayConfigFile(), 0);

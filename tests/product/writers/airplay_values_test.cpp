@@ -29,6 +29,7 @@ std::string generatedHead() {
 
 } // namespace
 
+// Rules: AIR-18, PRO-02
 TEST_F(AirplayValuesTest, WithoutAnImageLeavesTheAudioProfileOut) {
     remove(IMAGE_PATH);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
@@ -57,11 +58,13 @@ TEST_F(AirplayValuesTest, WithoutAnImageLeavesTheAudioProfileOut) {
               "static = 1\n");
 }
 
+// Rules: IMG-03
 TEST_F(AirplayValuesTest, EmptyImageCountsAsMissing) {
     writeImage("");
     EXPECT_EQ(generatedHead(), airplayHeadWithoutImage());
 }
 
+// Rules: AIR-17, PRO-03
 TEST_F(AirplayValuesTest, WritesEveryProfileAsAPlainNumber) {
     const std::vector<std::pair<std::string, std::string>> rows{
         {bytes({0, 0}), "0"},           {bytes({1, 0}), "1"},           {bytes({0, 1}), "256"},
@@ -75,6 +78,7 @@ TEST_F(AirplayValuesTest, WritesEveryProfileAsAPlainNumber) {
     }
 }
 
+// Rules: AIR-20
 TEST_F(AirplayValuesTest, WritesTheDriveSideAsItIs) {
     const std::vector<std::pair<int, std::string>> rows{
         {0, "0"}, {1, "1"}, {2, "2"}, {10, "10"}, {127, "127"}, {128, "128"}, {255, "255"}};
@@ -86,6 +90,7 @@ TEST_F(AirplayValuesTest, WritesTheDriveSideAsItIs) {
     }
 }
 
+// Rules: AIR-15, AIR-22
 TEST_F(AirplayValuesTest, BrandChangesTheIconPathOnly) {
     setImage(BRAND_OFFSET, bytes({2}));
     AirplayValues values;
@@ -98,6 +103,7 @@ TEST_F(AirplayValuesTest, BrandChangesTheIconPathOnly) {
     }
 }
 
+// Rules: AIR-07, AIR-22
 TEST_F(AirplayValuesTest, WritesTheNameOfTheModel) {
     for (const int code : {1, 25, 32, 47}) {
         setImage(MODEL_OFFSET, bytes({code}));
@@ -115,6 +121,7 @@ TEST_F(AirplayValuesTest, ModelOutsideTheTableGetsTheWordOfTheIconLabel) {
     }
 }
 
+// Rules: AIR-07, AIR-15, AIR-17, AIR-20
 TEST_F(AirplayValuesTest, EveryValueIsInItsOwnPlace) {
     setImage(DRIVE_SIDE_OFFSET, bytes({7}));
     setImage(BRAND_OFFSET, bytes({2}));
@@ -124,6 +131,7 @@ TEST_F(AirplayValuesTest, EveryValueIsInItsOwnPlace) {
     EXPECT_EQ(generatedHead(), airplayHead({listedModel(26), "QUARION", profileLines("5"), "7"}));
 }
 
+// Rules: RUN-14
 TEST_F(AirplayValuesTest, SecondRunGathersEverythingAgain) {
     updateAirplayConfigFile();
     setImage(DRIVE_SIDE_OFFSET, bytes({1}));
@@ -136,6 +144,7 @@ TEST_F(AirplayValuesTest, SecondRunGathersEverythingAgain) {
               airplayHead({listedModel(30), "QUARION", profileLines("9"), "1"}) + "s\n");
 }
 
+// Rules: AIR-03
 TEST_F(AirplayValuesTest, GathersItsValuesBeforeItOpensTheOutput) {
     setImage(DRIVE_SIDE_OFFSET, bytes({1}));
     setImage(BRAND_OFFSET, bytes({2}));
@@ -147,6 +156,7 @@ TEST_F(AirplayValuesTest, GathersItsValuesBeforeItOpensTheOutput) {
               airplayHead({listedModel(30), "QUARION", profileLines("9"), "1"}) + "static = 1\n");
 }
 
+// Rules: IMG-10, PRO-06
 TEST_F(AirplayValuesTest, EachValueHasItsOwnLookupBeforeTheFilesAreOpened) {
     writeFile(AIRPLAY_OUTPUT, "older");
     writeFile("/tmp/telephony_FFFF.txt", "older");
@@ -178,6 +188,7 @@ TEST_F(AirplayValuesTest, GeneratedProfileWritesTheTuningFilesToo) {
               "; Genereated config from DPS (blockId 2)\n");
 }
 
+// Rules: PRO-06
 TEST_F(AirplayValuesTest, TuningFilesAreCompleteBeforeTheOutputIsOpened) {
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
     for (const char* tuningFile : {"/tmp/telephony_FFFF.txt", "/tmp/speechrec_FFFF.txt"}) {
@@ -190,6 +201,7 @@ TEST_F(AirplayValuesTest, TuningFilesAreCompleteBeforeTheOutputIsOpened) {
     }
 }
 
+// Rules: PRO-08
 TEST_F(AirplayValuesTest, GeneratedProfileIsWrittenEvenWithoutItsTuningFiles) {
     setImage(PROFILE_OFFSET, bytes({0xFF, 0xFF}));
     putFolder("/tmp/telephony_FFFF.txt");

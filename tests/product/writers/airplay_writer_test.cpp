@@ -29,6 +29,7 @@ using AirplayWriterTest = AirplayUnitTest;
 
 } // namespace
 
+// Rules: MRG-02, AIR-01, AIR-04 to AIR-17, AIR-19 to AIR-21
 TEST_F(AirplayWriterTest, PutsTheHeadBeforeTheTemplate) {
     setImage(PROFILE_OFFSET, bytes({3, 0}));
     writeFile(AIRPLAY_TEMPLATE, "# Static part\nname = Second\n");
@@ -62,6 +63,7 @@ TEST_F(AirplayWriterTest, PutsTheHeadBeforeTheTemplate) {
               "name = Second\n");
 }
 
+// Rules: RUN-04, RUN-05
 TEST_F(AirplayWriterTest, WritesTheAirplayFileAlone) {
     const std::set<std::string> productData = folderNames("/fs/mp/etc");
     updateAirplayConfigFile();
@@ -71,12 +73,14 @@ TEST_F(AirplayWriterTest, WritesTheAirplayFileAlone) {
     EXPECT_EQ(readFile(AIRPLAY_STOCK), "stock = 1\n");
 }
 
+// Rules: MRG-04, AIR-21
 TEST_F(AirplayWriterTest, TemplateWithoutAFinalLineEndGetsNone) {
     writeFile(AIRPLAY_TEMPLATE, "a = 1\nb = 2");
     updateAirplayConfigFile();
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead() + "a = 1\nb = 2");
 }
 
+// Rules: MRG-03
 TEST_F(AirplayWriterTest, TemplateIsNotParsed) {
     const std::string content("# rightHandDrive mode setting right\r\nname = B\n\n\0\xff\n", 50);
     writeFile(AIRPLAY_TEMPLATE, content);
@@ -91,24 +95,28 @@ TEST_F(AirplayWriterTest, TemplateLongerThanAnyBufferIsCopiedWhole) {
     EXPECT_TRUE(readFile(AIRPLAY_OUTPUT) == plainAirplayHead() + content);
 }
 
+// Rules: MRG-05
 TEST_F(AirplayWriterTest, EmptyTemplateLeavesTheHeadAlone) {
     writeFile(AIRPLAY_TEMPLATE, "");
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead());
 }
 
+// Rules: MRG-06
 TEST_F(AirplayWriterTest, FolderAsATemplateLeavesTheHeadAlone) {
     putFolder(AIRPLAY_TEMPLATE);
     EXPECT_EQ(updateAirplayConfigFile(), 0);
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead());
 }
 
+// Rules: RUN-09
 TEST_F(AirplayWriterTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(AIRPLAY_OUTPUT, std::string(20000, 'o'));
     updateAirplayConfigFile();
     EXPECT_EQ(readFile(AIRPLAY_OUTPUT), plainAirplayHead() + "static = 1\n");
 }
 
+// Rules: RUN-10
 TEST_F(AirplayWriterTest, OutputThroughASymlinkReachesItsTarget) {
     std::filesystem::create_symlink("/fs/rwdata/airplay", AIRPLAY_OUTPUT);
     updateAirplayConfigFile();
@@ -116,6 +124,7 @@ TEST_F(AirplayWriterTest, OutputThroughASymlinkReachesItsTarget) {
     EXPECT_EQ(readFile("/fs/rwdata/airplay"), plainAirplayHead() + "static = 1\n");
 }
 
+// Rules: RUN-07
 TEST_F(AirplayWriterTest, NewOutputHasMode666LessTheMask) {
     const mode_t former = umask(022);
     updateAirplayConfigFile();
@@ -161,6 +170,7 @@ TEST_F(AirplayWriterTest, LineEndsOfTheLastTwoValuesAreFlushed) {
     EXPECT_EQ(changes.take().size(), 5U);
 }
 
+// Rules: MRG-11
 TEST_F(AirplayWriterTest, PartlyWrittenOutputIsLeftAsItIs) {
     for (const rlim_t size : {rlim_t{100}, rlim_t{plainAirplayHead().size() + 3}}) {
         SCOPED_TRACE(size);

@@ -66,6 +66,7 @@ orvane::IapValues someValues() {
 
 } // namespace
 
+// Rules: MRG-11
 TEST(FailedOutputTest, DeviceFileHasNoClosingSection) {
     Stage device;
     EXPECT_EQ(generateIap2DeviceFile(device.templateFile, device.output, someValues()),
@@ -73,6 +74,7 @@ TEST(FailedOutputTest, DeviceFileHasNoClosingSection) {
     expectEndedByTheFirstPart(device);
 }
 
+// Rules: MRG-11, ONE-09
 TEST(FailedOutputTest, Iap2FileSendsIap1ToItsStockFile) {
     Stage iap2;
     EXPECT_EQ(generateIap2File(iap2.templateFile, iap2.output, someValues()),
@@ -86,6 +88,7 @@ TEST(FailedOutputTest, Iap2FileSendsIap1ToItsStockFile) {
     EXPECT_EQ(iap1.str(), "");
 }
 
+// Rules: MRG-11
 TEST(FailedOutputTest, Iap1AndAirplayFilesEndWithTheFirstPart) {
     const std::ostringstream iap2;
     Stage iap1;

@@ -27,6 +27,7 @@ protected:
 
 } // namespace
 
+// Rules: IAP-05 to IAP-12, DEV-01, DEV-03 to DEV-05
 TEST_F(IapDeviceTest, HoldsTheBlockTheTemplateAndTheVehicleSection) {
     writeFile(DEVICE_TEMPLATE, "[features]\nusb=yes\n");
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -49,6 +50,7 @@ TEST_F(IapDeviceTest, HoldsTheBlockTheTemplateAndTheVehicleSection) {
     expectTransportFilesGenerated();
 }
 
+// Rules: DEV-04
 TEST_F(IapDeviceTest, TemplateWithoutAFinalLineEndIsEndedByTheNextPart) {
     writeFile(DEVICE_TEMPLATE, "[features]\nusb=yes");
     updateIapConfigFiles();
@@ -59,6 +61,7 @@ TEST_F(IapDeviceTest, TemplateWithoutAFinalLineEndIsEndedByTheNextPart) {
                                                     "\n");
 }
 
+// Rules: MRG-03
 TEST_F(IapDeviceTest, TemplateIsNotParsed) {
     const std::string content("[vehicle]\r\nserial=B\n\n\0\xff\n", 24);
     writeFile(DEVICE_TEMPLATE, content);
@@ -73,6 +76,7 @@ TEST_F(IapDeviceTest, TemplateLongerThanAnyBufferIsCopiedWhole) {
     EXPECT_TRUE(readFile(DEVICE_OUTPUT) == iap2Head() + content + DEVICE_TAIL);
 }
 
+// Rules: MRG-05, DEV-06
 TEST_F(IapDeviceTest, EmptyTemplateDropsTheVehicleSection) {
     writeFile(DEVICE_TEMPLATE, "");
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -89,6 +93,7 @@ TEST_F(IapDeviceTest, EmptyTemplateDropsTheVehicleSection) {
     expectTransportFilesGenerated();
 }
 
+// Rules: MRG-06
 TEST_F(IapDeviceTest, FolderAsATemplateDropsTheVehicleSection) {
     putFolder(DEVICE_TEMPLATE);
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -96,6 +101,7 @@ TEST_F(IapDeviceTest, FolderAsATemplateDropsTheVehicleSection) {
     expectTransportFilesGenerated();
 }
 
+// Rules: MRG-08, DEV-02, ONE-11
 TEST_F(IapDeviceTest, MissingTemplateInstallsTheStockFile) {
     remove(DEVICE_TEMPLATE);
     const std::string stock("stock\r\n\0\xff no line end", 21);
@@ -124,12 +130,14 @@ TEST_F(IapDeviceTest, StockFileLongerThanAnyBufferIsCopiedWhole) {
     EXPECT_TRUE(readFile(DEVICE_OUTPUT) == stock);
 }
 
+// Rules: RUN-09
 TEST_F(IapDeviceTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(DEVICE_OUTPUT, std::string(20000, 'o'));
     updateIapConfigFiles();
     EXPECT_EQ(readFile(DEVICE_OUTPUT), plainDevice());
 }
 
+// Rules: RUN-09
 TEST_F(IapDeviceTest, OlderLongerOutputIsReplacedWholeByTheStockFile) {
     remove(DEVICE_TEMPLATE);
     writeFile(DEVICE_OUTPUT, std::string(20000, 'o'));
@@ -145,6 +153,7 @@ TEST_F(IapDeviceTest, MissingTemplateAndStockFileLeaveAnEmptyOutput) {
     expectTransportFilesGenerated();
 }
 
+// Rules: MRG-09
 TEST_F(IapDeviceTest, MissingTemplateAndStockFileEmptyAnOlderOutput) {
     remove(DEVICE_TEMPLATE);
     remove(DEVICE_STOCK);
@@ -161,6 +170,7 @@ TEST_F(IapDeviceTest, FolderAsAStockFileLeavesAnEmptyOutput) {
     expectTransportFilesGenerated();
 }
 
+// Rules: RUN-11
 TEST_F(IapDeviceTest, OutputThatIsAFolderStaysEmpty) {
     putFolder(DEVICE_OUTPUT);
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -172,6 +182,7 @@ TEST_F(IapDeviceTest, OutputThatIsAFolderStaysEmpty) {
     expectTransportFilesGenerated();
 }
 
+// Rules: RUN-10
 TEST_F(IapDeviceTest, OutputThroughASymlinkReachesItsTarget) {
     std::filesystem::create_symlink("/fs/rwdata/device", DEVICE_OUTPUT);
     updateIapConfigFiles();
@@ -182,6 +193,7 @@ TEST_F(IapDeviceTest, OutputThroughASymlinkReachesItsTarget) {
     EXPECT_TRUE(std::filesystem::is_symlink(DEVICE_OUTPUT));
 }
 
+// Rules: RUN-13
 TEST_F(IapDeviceTest, ReadOnlyOlderOutputStaysAsItIs) {
     writeFile(DEVICE_OUTPUT, "older");
     ASSERT_EQ(chmod(DEVICE_OUTPUT, 0444), 0);
@@ -193,6 +205,7 @@ TEST_F(IapDeviceTest, ReadOnlyOlderOutputStaysAsItIs) {
     expectTransportFilesGenerated();
 }
 
+// Rules: RUN-07
 TEST_F(IapDeviceTest, NewOutputHasMode666LessTheMask) {
     const mode_t former = umask(022);
     updateIapConfigFiles();
@@ -202,6 +215,7 @@ TEST_F(IapDeviceTest, NewOutputHasMode666LessTheMask) {
     EXPECT_EQ(status.st_mode & 07777U, 0644U);
 }
 
+// Rules: MRG-11, IAP-02, ONE-11
 TEST_F(IapDeviceTest, PartlyWrittenOutputDoesNotStopLaterFiles) {
     writeFile(DEVICE_TEMPLATE, std::string(2000, 'd'));
     int result = -1;

@@ -36,6 +36,7 @@ int updateWithFileSize(rlim_t bytes) {
 
 } // namespace
 
+// Rules: MRG-08, TWO-02, ONE-10
 TEST_F(IapFallbackTest, MissingIap2TemplateInstallsTheIap2StockFileAlone) {
     remove(IAP2_TEMPLATE);
     const std::string stock("stock\r\n\0\xff no line end", 21);
@@ -69,6 +70,7 @@ TEST_F(IapFallbackTest, StockFilesLongerThanAnyBufferAreCopiedWhole) {
     EXPECT_TRUE(readFile(IAP1_OUTPUT) == stock);
 }
 
+// Rules: MRG-09, ONE-10
 TEST_F(IapFallbackTest, MissingIap2StockFileLeavesIap2EmptyAndIap1Generated) {
     remove(IAP2_TEMPLATE);
     remove(IAP2_STOCK);
@@ -94,6 +96,7 @@ TEST_F(IapFallbackTest, MissingIap2AndIap1TemplatesLeaveIap1Generated) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head());
 }
 
+// Rules: MRG-05, ONE-02, ONE-08
 TEST_F(IapFallbackTest, EmptyIap2TemplateEndsIap2AndInstallsTheIap1StockFile) {
     writeFile(IAP2_TEMPLATE, "");
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -111,6 +114,7 @@ TEST_F(IapFallbackTest, EmptyIap2TemplateEndsIap2AndInstallsTheIap1StockFile) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
+// Rules: MRG-06, ONE-08
 TEST_F(IapFallbackTest, FolderAsTheIap2TemplateEndsIap2AndInstallsTheIap1StockFile) {
     putFolder(IAP2_TEMPLATE);
     updateIapConfigFiles();
@@ -118,6 +122,7 @@ TEST_F(IapFallbackTest, FolderAsTheIap2TemplateEndsIap2AndInstallsTheIap1StockFi
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
+// Rules: RUN-11, ONE-07
 TEST_F(IapFallbackTest, Iap2OutputThatIsAFolderInstallsTheIap1StockFile) {
     putFolder(IAP2_OUTPUT);
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -134,6 +139,7 @@ TEST_F(IapFallbackTest, Iap2OutputThatIsAFolderInstallsTheIap1StockFileEvenWitho
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
+// Rules: RUN-13, ONE-07
 TEST_F(IapFallbackTest, ReadOnlyIap2OutputStaysAndInstallsTheIap1StockFile) {
     writeFile(IAP2_OUTPUT, "older");
     ASSERT_EQ(chmod(IAP2_OUTPUT, 0444), 0);
@@ -145,6 +151,7 @@ TEST_F(IapFallbackTest, ReadOnlyIap2OutputStaysAndInstallsTheIap1StockFile) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
+// Rules: MRG-08, ONE-02
 TEST_F(IapFallbackTest, Iap1StockFileIsInstalledByteForByte) {
     writeFile(IAP2_TEMPLATE, "");
     const std::string stock("stock\r\n\0\xff no line end", 21);
@@ -162,6 +169,7 @@ TEST_F(IapFallbackTest, MissingIap1StockFileLeavesIap1Empty) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), "");
 }
 
+// Rules: RUN-11
 TEST_F(IapFallbackTest, Iap1OutputThatIsAFolderStaysEmpty) {
     putFolder(IAP1_OUTPUT);
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -186,6 +194,7 @@ TEST_F(IapFallbackTest, Iap1OutputAloneThatIsAFolderStillTakesItsStockFile) {
     EXPECT_EQ(opens.take(), std::vector<std::string>{IAP1_STOCK});
 }
 
+// Rules: ONE-09
 TEST_F(IapFallbackTest, Iap2OutputWhoseCloseFailsInstallsTheIap1StockFile) {
     // Short enough for the buffer, so that nothing is written before the close.
     writeFile(IAP2_TEMPLATE, std::string(1000, '2'));
@@ -195,6 +204,7 @@ TEST_F(IapFallbackTest, Iap2OutputWhoseCloseFailsInstallsTheIap1StockFile) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), "iap1 stock\n");
 }
 
+// Rules: ONE-09
 TEST_F(IapFallbackTest, Iap2OutputThatFailsWhileItIsWrittenInstallsTheIap1StockFile) {
     writeFile(IAP2_TEMPLATE, std::string(LONGER_THAN_ANY_BUFFER, '2'));
     EXPECT_EQ(updateWithFileSize(500), 0);
@@ -220,6 +230,7 @@ TEST_F(IapFallbackTest, Iap2OutputThatJustFitsLeavesIap1Generated) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
 }
 
+// Rules: ONE-10
 TEST_F(IapFallbackTest, Iap2StockFileThatCannotBeWrittenWholeLeavesIap1Generated) {
     remove(IAP2_TEMPLATE);
     writeFile(IAP2_STOCK, std::string(1000, 's'));
@@ -239,6 +250,7 @@ TEST_F(IapFallbackTest, Iap2OutputStaysOpenUntilTheEnd) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head({"VOXA", "SN004217", "000000"}));
 }
 
+// Rules: IAP-02, ONE-06, ONE-10
 TEST_F(IapFallbackTest, AllTemplatesMissingGeneratesIap1Alone) {
     remove(DEVICE_TEMPLATE);
     remove(IAP2_TEMPLATE);
@@ -249,6 +261,7 @@ TEST_F(IapFallbackTest, AllTemplatesMissingGeneratesIap1Alone) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head());
 }
 
+// Rules: RUN-12
 TEST_F(IapFallbackTest, MissingTmpIsNotCreated) {
     remove("/tmp");
     EXPECT_EQ(updateIapConfigFiles(), 0);

@@ -19,6 +19,7 @@ using IapTransportTest = IapUnitTest;
 
 } // namespace
 
+// Rules: IAP-05 to IAP-12, TWO-01, TWO-03
 TEST_F(IapTransportTest, Iap2HoldsTheBlockAndTheTemplate) {
     writeFile(IAP2_TEMPLATE, "[iap2]\nlink=usb\n");
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -36,6 +37,8 @@ TEST_F(IapTransportTest, Iap2HoldsTheBlockAndTheTemplate) {
               "link=usb\n");
 }
 
+// Rules: IAP-05 to IAP-11, IAP-13
+// Rules: ONE-01, ONE-03 to ONE-05
 TEST_F(IapTransportTest, Iap1HoldsTheBlockTheCertificateLineAndTheTemplate) {
     writeFile(IAP1_TEMPLATE, "[iap1]\nlingo=0\n");
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -54,6 +57,7 @@ TEST_F(IapTransportTest, Iap1HoldsTheBlockTheCertificateLineAndTheTemplate) {
               "lingo=0\n");
 }
 
+// Rules: MRG-04, TWO-04, ONE-05
 TEST_F(IapTransportTest, NothingFollowsTheTemplates) {
     writeFile(IAP2_TEMPLATE, "two");
     writeFile(IAP1_TEMPLATE, "one");
@@ -62,6 +66,7 @@ TEST_F(IapTransportTest, NothingFollowsTheTemplates) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head() + "one");
 }
 
+// Rules: MRG-03
 TEST_F(IapTransportTest, TemplatesAreNotParsed) {
     const std::string content("[accessory]\r\nserial=B\n\n\0\xff\n", 26);
     writeFile(IAP2_TEMPLATE, content);
@@ -80,6 +85,7 @@ TEST_F(IapTransportTest, TemplatesLongerThanAnyBufferAreCopiedWhole) {
     EXPECT_TRUE(readFile(IAP1_OUTPUT) == iap1Head() + content);
 }
 
+// Rules: RUN-09
 TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWhole) {
     writeFile(IAP2_OUTPUT, std::string(20000, 'o'));
     writeFile(IAP1_OUTPUT, std::string(20000, 'o'));
@@ -88,6 +94,7 @@ TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWhole) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), plainIap1());
 }
 
+// Rules: RUN-09
 TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWholeByTheStockFiles) {
     writeFile(IAP2_OUTPUT, std::string(20000, 'o'));
     writeFile(IAP1_OUTPUT, std::string(20000, 'o'));
@@ -100,6 +107,7 @@ TEST_F(IapTransportTest, OlderLongerOutputsAreReplacedWholeByTheStockFiles) {
     EXPECT_EQ(readFile(IAP2_OUTPUT), "iap2 stock\n");
 }
 
+// Rules: RUN-10
 TEST_F(IapTransportTest, OutputsThroughSymlinksReachTheirTargets) {
     std::filesystem::create_symlink("/fs/rwdata/two", IAP2_OUTPUT);
     std::filesystem::create_symlink("/fs/rwdata/one", IAP1_OUTPUT);
@@ -110,6 +118,7 @@ TEST_F(IapTransportTest, OutputsThroughSymlinksReachTheirTargets) {
     EXPECT_TRUE(std::filesystem::is_symlink(IAP1_OUTPUT));
 }
 
+// Rules: IAP-01
 TEST_F(IapTransportTest, FilesAreMadeInAFixedOrder) {
     // All three outputs are one file, so that the last one made stays.
     std::filesystem::create_symlink(IAP1_OUTPUT, DEVICE_OUTPUT);
@@ -125,6 +134,7 @@ TEST_F(IapTransportTest, FilesAreMadeInAFixedOrder) {
     EXPECT_EQ(readFile(IAP2_OUTPUT), plainIap2());
 }
 
+// Rules: ONE-06
 TEST_F(IapTransportTest, MissingIap1TemplateEndsIap1AfterTheCertificateLine) {
     remove(IAP1_TEMPLATE);
     EXPECT_EQ(updateIapConfigFiles(), 0);
@@ -155,6 +165,7 @@ TEST_F(IapTransportTest, FolderAsTheIap1TemplateEndsIap1AfterTheCertificateLine)
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head());
 }
 
+// Rules: RUN-07
 TEST_F(IapTransportTest, NewOutputsHaveMode666LessTheMask) {
     const mode_t former = umask(022);
     updateIapConfigFiles();

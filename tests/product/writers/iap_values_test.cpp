@@ -46,6 +46,7 @@ protected:
 
 } // namespace
 
+// Rules: IAP-08
 TEST_F(IapValuesTest, ModelIsTheNameOfItsCode) {
     for (const int code : {1, 25, 32, 47}) {
         setImage(MODEL_OFFSET, std::string(1, static_cast<char>(code)));
@@ -58,11 +59,13 @@ TEST_F(IapValuesTest, ModelWithoutAnImageIsTheFallbackName) {
     expectValues({"VOXA", "SN004217", "3.10.2"}, "030a02");
 }
 
+// Rules: IAP-09, VEH-13
 TEST_F(IapValuesTest, BrandChangesNothing) {
     setImage(BRAND_OFFSET, "\2");
     expectValues({"VOXA", "SN004217", "3.10.2"}, "030a02");
 }
 
+// Rules: IAP-04
 TEST_F(IapValuesTest, FuelTypeIsWrittenNowhere) {
     for (const char fuelType : {'\0', '\1', '\2', '\3', '\4'}) {
         setImage(FUEL_TYPE_OFFSET, std::string(1, fuelType));
@@ -70,6 +73,7 @@ TEST_F(IapValuesTest, FuelTypeIsWrittenNowhere) {
     }
 }
 
+// Rules: IMG-10, IAP-01, IAP-03, IAP-04, IAP-16
 TEST_F(IapValuesTest, SourcesAndFilesAreOpenedInAFixedOrder) {
     for (const char* output : {DEVICE_OUTPUT, IAP2_OUTPUT, IAP1_OUTPUT}) {
         writeFile(output, "older");
@@ -88,6 +92,7 @@ TEST_F(IapValuesTest, SourcesAndFilesAreOpenedInAFixedOrder) {
                                         IAP1_OUTPUT, IAP1_TEMPLATE}));
 }
 
+// Rules: SER-02, SER-03, IAP-14
 TEST_F(IapValuesTest, SerialFillsItsSlotOrEndsAtItsFirstNul) {
     for (const auto& [inSlot, serial] : std::vector<std::pair<std::string, std::string>>{
              {"ABCDEFGH", "ABCDEFGH"},
@@ -101,6 +106,7 @@ TEST_F(IapValuesTest, SerialFillsItsSlotOrEndsAtItsFirstNul) {
     }
 }
 
+// Rules: SER-05, IAP-10
 TEST_F(IapValuesTest, SerialWithoutADiskIsTheDefault) {
     remove(DISK_PATH);
     expectSerial("ABCD1234abc");
@@ -111,6 +117,7 @@ TEST_F(IapValuesTest, SerialOnADiskWithoutRoomForTheRecordsIsTheDefault) {
     expectSerial("ABCD1234abc");
 }
 
+// Rules: IAP-11 to IAP-13
 TEST_F(IapValuesTest, VersionIsWrittenInFullAndInSixDigits) {
     expectVersion("3.10.2", "3.10.2", "030a02");
     expectVersion("ABC_3.10.2_rc", "3.10.2_rc", "030a02");
@@ -121,14 +128,17 @@ TEST_F(IapValuesTest, VersionIsWrittenInFullAndInSixDigits) {
     expectVersion("1.2.3\r", "1.2.3\r", "010203");
 }
 
+// Rules: VER-33
 TEST_F(IapValuesTest, VersionFormOfMoreThanSixDigitsIsWrittenWhole) {
     expectVersion("-1.2.3", "-1.2.3", "ffffffff0203");
 }
 
+// Rules: VER-24, IAP-12, IAP-13
 TEST_F(IapValuesTest, VersionNotAvailableIsWrittenOnlyInFull) {
     expectVersion("N/A", "N/A", "000000");
 }
 
+// Rules: VER-21, VER-23, IAP-14
 TEST_F(IapValuesTest, EmptyVersionLeavesTheLineWithoutAValue) {
     expectVersion("", "", "000000");
     remove(VERSION_FILE);
@@ -137,6 +147,7 @@ TEST_F(IapValuesTest, EmptyVersionLeavesTheLineWithoutAValue) {
     expectValues({"VOXA", "SN004217", ""}, "000000");
 }
 
+// Rules: IAP-15
 TEST_F(IapValuesTest, VersionEndsAtItsFirstNulButCountsWholeForTheSixDigits) {
     expectVersion("1.2\0.3"s, "1.2", "010203");
     expectVersion("\0001.2.3"s, "", "000203");
@@ -151,6 +162,7 @@ TEST_F(IapValuesTest, AllSourcesMissingGivesAllDefaults) {
     expectValues({"VOXA", "ABCD1234abc", ""}, "000000");
 }
 
+// Rules: RUN-14
 TEST_F(IapValuesTest, SecondRunGathersEverythingAgain) {
     updateIapConfigFiles();
     setImage(MODEL_OFFSET, "\x1e");
@@ -159,22 +171,26 @@ TEST_F(IapValuesTest, SecondRunGathersEverythingAgain) {
     expectValues({listedModel(30), "OTHER", "4.5.6"}, "040506");
 }
 
+// Rules: IAP-03
 TEST_F(IapValuesTest, ModelIsGatheredBeforeTheFirstFileIsOpened) {
     setImage(MODEL_OFFSET, "\x1e");
     std::filesystem::create_symlink(IMAGE_PATH, DEVICE_OUTPUT);
     expectValues({listedModel(30), "SN004217", "3.10.2"}, "030a02");
 }
 
+// Rules: IAP-03
 TEST_F(IapValuesTest, SerialIsGatheredBeforeTheFirstFileIsOpened) {
     std::filesystem::create_symlink(DISK_PATH, DEVICE_OUTPUT);
     expectSerial("SN004217");
 }
 
+// Rules: IAP-03
 TEST_F(IapValuesTest, VersionIsGatheredBeforeTheFirstFileAndAgainAfterTheSecond) {
     std::filesystem::create_symlink(VERSION_FILE, DEVICE_OUTPUT);
     expectValues({"VOXA", "SN004217", "3.10.2"}, "000000");
 }
 
+// Rules: IAP-16
 TEST_F(IapValuesTest, SixDigitsAreFoundAfterTheSecondFileIsClosed) {
     std::filesystem::create_symlink(VERSION_FILE, IAP2_OUTPUT);
     const std::string newer = "Type=Application\nVersion Number=9.10.11\n";
@@ -185,6 +201,7 @@ TEST_F(IapValuesTest, SixDigitsAreFoundAfterTheSecondFileIsClosed) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head({"VOXA", "SN004217", "090a0b"}) + "iap1=1\n");
 }
 
+// Rules: IAP-16
 TEST_F(IapValuesTest, SixDigitsAreFoundAfterTheSecondStockFileIsInstalled) {
     std::filesystem::create_symlink(VERSION_FILE, IAP2_OUTPUT);
     remove(IAP2_TEMPLATE);
@@ -195,11 +212,13 @@ TEST_F(IapValuesTest, SixDigitsAreFoundAfterTheSecondStockFileIsInstalled) {
     EXPECT_EQ(readFile(IAP1_OUTPUT), iap1Head({"VOXA", "SN004217", "090a0b"}) + "iap1=1\n");
 }
 
+// Rules: IAP-16
 TEST_F(IapValuesTest, SixDigitsAreFoundBeforeTheThirdFileIsOpened) {
     std::filesystem::create_symlink(VERSION_FILE, IAP1_OUTPUT);
     expectValues({"VOXA", "SN004217", "3.10.2"}, "030a02");
 }
 
+// Rules: RUN-04
 TEST_F(IapValuesTest, WritesTheThreeFilesAlone) {
     const std::set<std::string> deviceData = folderNames("/fs/mp/etc");
     const std::set<std::string> transportData = folderNames("/fs/mp/etc/mm");

@@ -37,6 +37,7 @@ TEST_F(StockFileTest, ReplacesAnOlderLongerOutput) {
     EXPECT_EQ(readFile(OUTPUT), "stock\n");
 }
 
+// Rules: MRG-08
 TEST_F(StockFileTest, IsCopiedByteForByte) {
     const std::string anyBytes("\0\r\n\x1a\xff no line end", 17);
     const std::string longText = anyBytes + markedText(LONGER_THAN_ANY_BUFFER);
@@ -63,6 +64,7 @@ TEST_F(StockFileTest, UsesItsOwnStreams) {
     EXPECT_EQ(readFile(OUTPUT), "stock\n");
 }
 
+// Rules: MRG-09
 TEST_F(StockFileTest, MissingLeavesAnEmptyOutput) {
     remove(STOCK);
     writeFile(OUTPUT, "older");
@@ -76,6 +78,7 @@ TEST_F(StockFileTest, MissingStillCreatesTheOutput) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
+// Rules: MRG-09
 TEST_F(StockFileTest, EmptyLeavesAnEmptyOutput) {
     writeFile(STOCK, "");
     writeFile(OUTPUT, "older");
@@ -83,6 +86,7 @@ TEST_F(StockFileTest, EmptyLeavesAnEmptyOutput) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
+// Rules: MRG-09
 TEST_F(StockFileTest, FolderInItsPlaceLeavesAnEmptyOutput) {
     putFolder(STOCK);
     writeFile(std::string(STOCK) + "/inner", "inner");
@@ -91,12 +95,14 @@ TEST_F(StockFileTest, FolderInItsPlaceLeavesAnEmptyOutput) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
+// Rules: RUN-11
 TEST_F(StockFileTest, LeavesAnOutputThatIsAFolderEmpty) {
     putFolder(OUTPUT);
     installStockFile(ACCESSORY_FILE);
     EXPECT_TRUE(std::filesystem::is_empty(OUTPUT));
 }
 
+// Rules: RUN-12
 TEST_F(StockFileTest, DoesNotCreateTheOutputsFolder) {
     remove("/tmp");
     installStockFile(ACCESSORY_FILE);
@@ -120,6 +126,7 @@ TEST_F(StockFileTest, IsClosedBeforeTheOutput) {
     EXPECT_EQ(closes.take(), (std::vector<std::string>{STOCK, OUTPUT}));
 }
 
+// Rules: RUN-10
 TEST_F(StockFileTest, GoesThroughASymlink) {
     std::filesystem::create_symlink("/fs/rwdata/target", OUTPUT);
     installStockFile(ACCESSORY_FILE);

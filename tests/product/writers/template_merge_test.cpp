@@ -46,6 +46,7 @@ void mergeBetween(const std::string& before, const std::string& after) {
 
 } // namespace
 
+// Rules: MRG-02
 TEST_F(TemplateMergeTest, AppendsTheTemplateToWhatWasWritten) {
     mergeBetween("before\n", "after\n");
     EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\nafter\n");
@@ -119,6 +120,7 @@ TEST_F(TemplateMergeTest, OutputIsOpenedFirst) {
     EXPECT_FALSE(merge.templateFile.is_open());
 }
 
+// Rules: MRG-01
 TEST_F(TemplateMergeTest, TemplateIsOpenedLastAndClosedFirst) {
     writeFile(OUTPUT, "older");
     FileEventLog opens(IN_OPEN, {OUTPUT, TEMPLATE});
@@ -129,6 +131,7 @@ TEST_F(TemplateMergeTest, TemplateIsOpenedLastAndClosedFirst) {
     EXPECT_EQ(closes.take(), (std::vector<std::string>{TEMPLATE, OUTPUT}));
 }
 
+// Rules: MRG-01
 TEST_F(TemplateMergeTest, OutputIsTruncatedAtOnce) {
     writeFile(OUTPUT, "older");
     const OpenMerge merge;
@@ -142,12 +145,14 @@ TEST_F(TemplateMergeTest, OutputIsTruncatedWithoutATemplateToo) {
     EXPECT_EQ(readFile(OUTPUT), "");
 }
 
+// Rules: RUN-09
 TEST_F(TemplateMergeTest, OlderLongerOutputIsReplacedWhole) {
     writeFile(OUTPUT, std::string(20000, 'o'));
     mergeBetween("before\n", "");
     EXPECT_EQ(readFile(OUTPUT), "before\ntemplate\n");
 }
 
+// Rules: RUN-07
 TEST_F(TemplateMergeTest, NewOutputHasMode666LessTheMask) {
     for (const auto& [mask, mode] : {std::pair<mode_t, mode_t>{0, 0666}, {027, 0640}}) {
         remove(OUTPUT);
@@ -158,6 +163,7 @@ TEST_F(TemplateMergeTest, NewOutputHasMode666LessTheMask) {
     }
 }
 
+// Rules: RUN-08
 TEST_F(TemplateMergeTest, OlderOutputStaysTheSameFile) {
     writeFile(OUTPUT, "older");
     std::filesystem::create_hard_link(OUTPUT, "/tmp/other-name");
@@ -167,6 +173,7 @@ TEST_F(TemplateMergeTest, OlderOutputStaysTheSameFile) {
     EXPECT_EQ(modeOf(OUTPUT), 0600U);
 }
 
+// Rules: RUN-10
 TEST_F(TemplateMergeTest, OutputThroughASymlinkReachesItsTarget) {
     std::filesystem::create_symlink("/fs/rwdata/target", OUTPUT);
     mergeBetween("", "");
@@ -174,6 +181,7 @@ TEST_F(TemplateMergeTest, OutputThroughASymlinkReachesItsTarget) {
     EXPECT_TRUE(std::filesystem::is_symlink(OUTPUT));
 }
 
+// Rules: MRG-03, MRG-04
 TEST_F(TemplateMergeTest, CopiesEveryByteOfAnyTemplate) {
     std::string allBytes;
     for (int byte = 0; byte < 256; ++byte) {
@@ -189,6 +197,7 @@ TEST_F(TemplateMergeTest, CopiesEveryByteOfAnyTemplate) {
     }
 }
 
+// Rules: MRG-03
 TEST_F(TemplateMergeTest, CopiesTemplatesOfAnyLength) {
     std::vector<std::size_t> lengths{511,  512,  1023, 1024, 4095, 4096,
                                      4097, 8190, 8191, 8192, 8193, 16384};
@@ -220,6 +229,7 @@ TEST_F(TemplateMergeTest, CopyOfSomethingLeavesTheOutputGood) {
     EXPECT_FALSE(merge.templateFile.fail());
 }
 
+// Rules: MRG-05
 TEST_F(TemplateMergeTest, EmptyTemplateEndsTheOutput) {
     writeFile(TEMPLATE, "");
     OpenMerge merge;
@@ -243,6 +253,7 @@ TEST_F(TemplateMergeTest, AbsentTemplateEndsTheOutput) {
     EXPECT_EQ(readFile(OUTPUT), "before\n");
 }
 
+// Rules: MRG-06
 TEST_F(TemplateMergeTest, FolderAsATemplateEndsTheOutput) {
     putFolder(TEMPLATE);
     writeFile(std::string(TEMPLATE) + "/inner", "inner");
@@ -255,6 +266,7 @@ TEST_F(TemplateMergeTest, FolderAsATemplateEndsTheOutput) {
     EXPECT_EQ(readFile(OUTPUT), "before\n");
 }
 
+// Rules: MRG-10
 TEST_F(TemplateMergeTest, CopyIntoAnOutputThatIsNotOpenWritesNowhere) {
     putFolder(OUTPUT);
     mergeBetween("before\n", "after\n");
