@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "identity/vehicle_identity.h"
+#include "tests/support/disturbed_reads.h"
 #include "tests/support/unit_test.h"
 
 namespace orvane::test {
@@ -86,6 +87,14 @@ TEST_F(UnitSerialTest, DeviceTooShortForTheSeekGivesTheDefault) {
 TEST_F(UnitSerialTest, DeviceThatCannotBeReadGivesTheDefault) {
     putFolder(DISK_PATH);
     EXPECT_EQ(serial(), "ABCD1234abc");
+}
+
+// Rules: SER-07
+TEST_F(UnitSerialTest, BytesThatAShortReadLacksAreNotInTheSerial) {
+    setDiskFromEnd(SERIAL_BEFORE_END, "SN004217");
+    const DisturbedReads reads = DisturbedReads::ofAtMost(3);
+    EXPECT_EQ(serial(), "SN0");
+    EXPECT_EQ(reads.count(), 1);
 }
 
 // Rules: SER-05
