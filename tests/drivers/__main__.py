@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
 # SPDX-License-Identifier: Apache-2.0
-"""Runs a driver: python3 tests/drivers differential|explain|faults|hostile|limits|moments|page ARGUMENT...
+"""Runs a driver: python3 tests/drivers differential|explain|faults|hostile|library|limits|moments|page ARGUMENT...
 
 --help after the name of a driver lists its arguments.
 """
@@ -11,7 +11,7 @@ import sys
 from importlib import import_module
 from pathlib import Path
 
-NAMES = ("differential", "explain", "faults", "hostile", "limits", "moments", "page")
+NAMES = ("differential", "explain", "faults", "hostile", "library", "limits", "moments", "page")
 
 
 def main() -> int:
