@@ -218,7 +218,8 @@ def main(arguments: Sequence[str], project: Path = PROJECT) -> int:
     if not options.check:
         place.write_text(text, encoding="utf-8")
     elif not place.exists() or place.read_text(encoding="utf-8") != text:
-        print(f"{MATRIX}: is not up to date: python3 tests/rules/rules_and_tests.py writes it", file=sys.stderr)
+        print(f"{MATRIX}: is not up to date: python3 tests/rules/rules_and_tests.py writes it",
+              file=sys.stderr)
         return 1
     return 0
 

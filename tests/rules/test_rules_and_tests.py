@@ -7,9 +7,10 @@ import tempfile
 import unittest
 from pathlib import Path
 
-import rules_and_tests
+from rules import rules_and_tests
 
-RULES = "# The rules\n\n| Id | Rule |\n|---|---|\n| AIR-01 | One. |\n| AIR-02 | Two. |\n| FLD-01 | `a` | 0 | b |\n"
+RULES = ("# The rules\n\n| Id | Rule |\n|---|---|\n| AIR-01 | One. |\n| AIR-02 | Two. |\n"
+         "| FLD-01 | `a` | 0 | b |\n")
 UNIT = "// Rules: AIR-01, AIR-02\nTEST(Suite, Name) {\n}\n"
 GOLDEN = "# What it is.\n# Rules: AIR-01, FLD-01\n[image]\n"
 MODEL = "# Rules: AIR-02, FLD-01\ndef reading() -> None:\n    pass\n"
@@ -110,7 +111,8 @@ class RulesAndTestsTest(unittest.TestCase):
         self.expect_fault("AIR-01 is named twice above Suite.Name")
 
     def test_unit_mark_without_its_test_is_refused(self) -> None:
-        for text in (UNIT.replace("TEST(", "int f("), UNIT.replace("TEST", "\nTEST"), "// Rules: AIR-01\n"):
+        for text in (UNIT.replace("TEST(", "int f("), UNIT.replace("TEST", "\nTEST"),
+                     "// Rules: AIR-01\n"):
             with self.subTest(text):
                 self.put("tests/product/some_test.cpp", UNIT + text)
                 self.expect_fault("tests/product/some_test.cpp:4: no test is below")
@@ -147,7 +149,8 @@ class RulesAndTestsTest(unittest.TestCase):
 
     def test_number_of_a_rule_that_is_gone_may_be_left_out(self) -> None:
         self.put("docs/rules.md", RULES.replace("| AIR-01 | One. |\n", ""))
-        for name, text in (("tests/product/some_test.cpp", UNIT), ("tests/whole_runs/golden/some-unit/unit.toml", GOLDEN)):
+        for name, text in (("tests/product/some_test.cpp", UNIT),
+                           ("tests/whole_runs/golden/some-unit/unit.toml", GOLDEN)):
             self.put(name, text.replace("AIR-01, ", ""))
         self.assertEqual(self.run_script(), (0, ""))
 

@@ -251,6 +251,27 @@ QUESTION = Question("library", make_unit, check, [
 ], enough_units=40)
 
 
+def check_tables(tools: Tools) -> list[str]:
+    """Every parameter, type and slot, on a unit that has them all."""
+    numbers = (*range(configuration.PARAMETER_COUNT + 2), 65535)
+    calls = [f"{name} {number}" for name in ("lookup", "group", "describe") for number in numbers]
+    calls += ["open", *(f"{name} {number}" for name in ("get", "get-u8", "get-u16") for number in numbers),
+              "close", "get-all 171"]
+    calls += [f"type-size {kind}" for kind in range(11)]
+    calls += [f"crc-step 4294967295 {byte}" for byte in range(256)]
+    for slot in range(20):
+        calls += [f"slot-place {slot}", f"read-slot {slot} 140", f"write-slot {slot} {'5a' * 140}",
+                  f"read-slot {slot} 140", "crc"]
+    with tempfile.TemporaryDirectory(prefix="orvane tables-") as folder:
+        root = Path(folder)
+        rng = random.Random("tables")
+        parts.put_base(root)
+        parts.put(root, configuration.IMAGE, rng.randbytes(parts.IMAGE_SIZE))
+        _put_disk(root, 2 * RECORD_AREA, rng)
+        finding = check(RandomUnit(root, calls, rng), tools)
+    return [f"tables: {line}" for line in finding.lines]
+
+
 def check_short_reads(tools: Tools) -> list[str]:
     """Every read of a disk full of one byte gives only so many of them."""
     calls = ["read-slot 9 12", "read-slot 15 136", "read-aux 1024", "read-tuning 1880", "crc"]
@@ -288,6 +309,6 @@ def main(arguments: Sequence[str]) -> int:
         return 2
     common = runner.tools(options)
     tools = Tools(common.orvane, common.enter, common.names, options.calls)
-    faults = check_short_reads(tools) + check_usage(tools)
+    faults = check_tables(tools) + check_short_reads(tools) + check_usage(tools)
     print("\n".join(f"library: {fault}" for fault in faults), end="\n" if faults else "")
     return random_units.ask(QUESTION, tools, options, "--calls", options.calls) or (1 if faults else 0)
