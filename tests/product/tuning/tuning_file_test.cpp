@@ -282,7 +282,6 @@ TEST_F(TuningFileTest, ReadOnlyFolderGetsNoFile) {
     EXPECT_EQ(readFile("/tmp/old.txt"), OLD_CONTENT);
 }
 
-// Rules: RUN-01
 TEST_F(TuningFileTest, WriteErrorsAreIgnored) {
     for (const std::size_t room : {0U, 1U, 39U, 40U, 100U, 800U}) {
         SCOPED_TRACE(room);
