@@ -84,6 +84,14 @@ def row(number: int) -> Row | None:
     )
 
 
+# Rules: CAT-15
+def words() -> list[int]:
+    """The catalogue as it is in memory."""
+    rows = [found for found in map(row, range(1, configuration.PARAMETER_COUNT + 1)) if found]
+    return [*SIZES, *(word for found in rows for word in (
+        found.number, found.kind, found.group, found.offset, found.id, found.default, found.mask))]
+
+
 # Rules: CAT-10, CAT-11
 def lookup(number: int) -> tuple[int, int, Row | None]:
     """Status, index, and the row; None if it stays as it was."""
@@ -111,6 +119,11 @@ class Store:
 
     def __init__(self, image: bytes | None) -> None:
         self._image = image
+        self.is_open = False
+        self.length = 0
+
+    # Rules: PAR-15
+    def init(self) -> None:
         self.is_open = False
         self.length = 0
 

@@ -3,7 +3,7 @@
 
 from __future__ import annotations
 
-from model.records import RECORD_AREA, TUNING_AREA
+from model.records import DPS_AREA_SIZE, RECORD_AREA, TUNING_AREA
 
 # The sizes of the slots; all but slot 15 and those after the gap follow one another.
 SLOT_SIZES = (1, *[16] * 8, 8, *[1] * 5, 136, 24, 2)
@@ -92,6 +92,10 @@ class Disk:
     def write_area(self, name: str, data: bytes) -> int:
         before_end, size = _area(name)
         return 0 if 0 < len(data) <= size and self._write(before_end, data) else -1
+
+    def tuning_blocks(self) -> bytes:
+        """Zeros in place of what can't be read."""
+        return self.read_area("tuning", DPS_AREA_SIZE)[1].ljust(DPS_AREA_SIZE, b"\0")
 
     # Rules: CRC-01, CRC-03 to CRC-05
     def crc(self) -> int:

@@ -96,6 +96,14 @@ def tuning_text(block: bytes, block_id: int) -> bytes:
     return b"".join(lines)
 
 
+# Rules: GEN-01, GEN-02
+def file_of_block(blocks: bytes, block_id: int, older: bytes) -> bytes:
+    """What a file is after the library was asked to write this block to it."""
+    if not 0 <= block_id < len(blocks) // BLOCK_SIZE:
+        return older
+    return tuning_text(blocks[block_id * BLOCK_SIZE:(block_id + 1) * BLOCK_SIZE], block_id)
+
+
 # Rules: TUN-02, TUN-03, TUN-04, TUN-05, TUN-07
 def generate_tuning_file(system: System, block_id: int, path: str) -> str:
     """The disk is read even if the file can't be opened afterwards."""

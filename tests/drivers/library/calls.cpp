@@ -10,12 +10,16 @@
 #include "config/record_area.h"
 #include "config/record_slots.h"
 #include "identity/vehicle_identity.h"
+#include "tuning/tuning_file.h"
 
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <exception>
+#include <fstream>
 #include <iostream>
+#include <iterator>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -66,6 +70,14 @@ public:
 private:
     std::istringstream text_;
 };
+
+void tellCatalogue() {
+    for (std::size_t at = 0; at < sizeof ParamCatalogue; at += sizeof(std::uint32_t)) {
+        std::uint32_t word = 0;
+        std::memcpy(&word, reinterpret_cast<const char*>(&ParamCatalogue) + at, sizeof word);
+        std::cout << word << ' ';
+    }
+}
 
 void lookUp(std::uint16_t number) {
     std::int32_t index = BEFORE;
@@ -131,16 +143,29 @@ void callWithoutBuffer(std::uint32_t slot, std::uint32_t length) {
               << ' ' << writeAuxArea(nullptr, length);
 }
 
+/// Tells what the file is then, which may come from an earlier call.
+void writeTuningFile(std::int32_t blockId) {
+    constexpr char PATH[] = "/tmp/tuning.txt";
+    generateTuningFile(blockId, PATH);
+    std::ifstream file(PATH, std::ios::binary);
+    std::cout << "file " << toHex({std::istreambuf_iterator<char>(file), {}});
+}
+
 /// Whether there is such a call of the catalogue or of an image.
 bool callOnImage(const std::string& name, Words& words, ConfigStore& store) {
     if (name == "type-size") {
         std::cout << paramTypeSize(words.number());
+    } else if (name == "catalogue") {
+        tellCatalogue();
     } else if (name == "lookup") {
         lookUp(words.parameter());
     } else if (name == "group") {
         std::cout << paramGroup(words.parameter());
     } else if (name == "describe") {
         describe(words.parameter());
+    } else if (name == "init") {
+        store.init();
+        tellState(store);
     } else if (name == "open") {
         std::cout << store.open() << ' ';
         tellState(store);
@@ -191,6 +216,8 @@ bool callOnDisk(const std::string& name, Words& words) {
     } else if (name == "write-aux") {
         const std::string bytes = fromHex(words.word());
         std::cout << writeAuxArea(bytes.data(), lengthOf(bytes));
+    } else if (name == "tuning-file") {
+        writeTuningFile(std::stoi(words.word()));
     } else if (name == "without-buffer") {
         const std::uint32_t slot = words.number();
         callWithoutBuffer(slot, words.number());

@@ -22,7 +22,7 @@ from elftools.elf.elffile import ELFFile
 
 from drivers import random_units, runner
 from drivers.random_units import Finding, Question, RandomUnit
-from model import catalogue, configuration, parts, record_area
+from model import catalogue, configuration, parts, record_area, tuning
 from model.catalogue import Store
 from model.record_area import Disk
 from model.records import RECORD_AREA, TUNING_AREA
@@ -89,12 +89,13 @@ def _call(rng: random.Random) -> str:
     long = rng.choice((1, rng.randrange(4200), 1023, 1024, 1025, 4095, 4096, 4097))
     return rng.choice((
         f"type-size {rng.choice((*range(12), 256, 2**31, 2**32 - 1))}", f"lookup {number}",
-        f"group {number}", f"describe {number}", "open", "close", f"get-u8 {number}",
+        f"group {number}", f"describe {number}", "open", "close", "init", f"get-u8 {number}",
         f"get-u16 {number}", f"get {number}", f"get-all {rng.choice((0, 1, 134, 170, 171, 172, 70000))}",
         "fuel-type", f"slot-place {slot}", f"read-slot {slot} {length}",
         f"write-slot {slot} {rng.randbytes(length).hex()}", f"read-aux {long}", f"read-tuning {long}",
         f"write-aux {rng.randbytes(long).hex()}", f"write-tuning {rng.randbytes(long).hex()}",
         "write-aux", "read-tuning 0", f"without-buffer {slot} {length}", "crc",
+        f"tuning-file {rng.choice((*range(10), -1, 10, 256, -2**31, 2**31 - 1))}",
         f"crc-step {rng.randrange(2**32)} {rng.randrange(256)}",
     ))
 
@@ -106,6 +107,7 @@ class Answers:
         self._image = image
         self._store = Store(image)
         self.disk = disk
+        self._tuning = b""
 
     def answer(self, call: str) -> str:
         name, *words = call.split(" ")
@@ -127,6 +129,13 @@ class Answers:
     def _describe(self, number: str) -> str:
         status, values = catalogue.describe(int(number))
         return _line(status, *(values or [BEFORE[0]] * 4))
+
+    def _catalogue(self) -> str:
+        return "".join(f"{word} " for word in catalogue.words())
+
+    def _init(self) -> str:
+        self._store.init()
+        return self._state()
 
     def _open(self) -> str:
         """A handle that is open must not be opened, so the drivers' calls close it first."""
@@ -185,6 +194,10 @@ class Answers:
 
     def _write_tuning(self, content: str) -> str:
         return str(self.disk.write_area("tuning", bytes.fromhex(content)))
+
+    def _tuning_file(self, block: str) -> str:
+        self._tuning = tuning.file_of_block(self.disk.tuning_blocks(), int(block), self._tuning)
+        return f"file {self._tuning.hex()}"
 
     def _without_buffer(self, _slot: str, _length: str) -> str:
         return _line(*[record_area.without_buffer()] * 6)
@@ -257,7 +270,8 @@ def check_tables(tools: Tools) -> list[str]:
     calls = [f"{name} {number}" for name in ("lookup", "group", "describe") for number in numbers]
     calls += ["open", *(f"{name} {number}" for name in ("get", "get-u8", "get-u16") for number in numbers),
               "close", "get-all 171"]
-    calls += [f"type-size {kind}" for kind in range(11)]
+    calls += ["catalogue", *(f"type-size {kind}" for kind in range(11))]
+    calls += [f"tuning-file {block}" for block in range(-1, 11)]
     calls += [f"crc-step 4294967295 {byte}" for byte in range(256)]
     for slot in range(20):
         calls += [f"slot-place {slot}", f"read-slot {slot} 140", f"write-slot {slot} {'5a' * 140}",

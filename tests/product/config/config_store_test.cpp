@@ -64,6 +64,7 @@ TEST_F(ConfigStoreTest, NewHandleIsClosed) {
     EXPECT_EQ(0U, store.length);
 }
 
+// Rules: PAR-15
 TEST_F(ConfigStoreTest, InitClosesWithoutReleasing) {
     ConfigStore store;
     ASSERT_EQ(0, store.open());

@@ -23,6 +23,7 @@ constexpr ParamInfo MARKED_INFO = {901, 902, 903, 904};
 
 } // namespace
 
+// Rules: CAT-15
 TEST(ParamCatalogueTest, RowIsSevenWordsInIssuedOrder) {
     EXPECT_EQ(28U, sizeof(ParamDescriptor));
     EXPECT_EQ(0U, offsetof(ParamDescriptor, number));
@@ -36,6 +37,7 @@ TEST(ParamCatalogueTest, RowIsSevenWordsInIssuedOrder) {
     EXPECT_TRUE((std::is_same_v<std::uint32_t, decltype(ParamDescriptor::mask)>));
 }
 
+// Rules: CAT-15
 TEST(ParamCatalogueTest, IsNineSizesDirectlyFollowedByTheRows) {
     EXPECT_EQ(4824U, sizeof(ParamCatalogue));
     const auto* bytes = reinterpret_cast<const unsigned char*>(&ParamCatalogue);

@@ -84,6 +84,7 @@ TEST_F(TuningFileTest, BlockOfZerosIsWholeAndExact) {
 }
 
 // Rules: TUN-08
+// Rules: GEN-01
 TEST_F(TuningFileTest, HeaderNamesTheBlock) {
     for (int blockId = 0; blockId <= 9; ++blockId) {
         EXPECT_EQ(splitLines(rendered(blockId)).at(0),
@@ -92,6 +93,7 @@ TEST_F(TuningFileTest, HeaderNamesTheBlock) {
 }
 
 // Rules: TUN-01, TUN-02
+// Rules: GEN-01
 TEST_F(TuningFileTest, EachBlockIdHasItsOwn188Bytes) {
     for (unsigned blockId = 0; blockId <= 9; ++blockId) {
         setBlock(blockId, 0, std::string(BLOCK_SIZE, static_cast<char>(blockId + 1)));
@@ -122,6 +124,7 @@ TEST_F(TuningFileTest, BytesAroundTheBlocksDoNotShow) {
     EXPECT_EQ(rendered(9), fileOfZeros(9));
 }
 
+// Rules: GEN-02
 TEST_F(TuningFileTest, OtherBlockIdsWriteNothing) {
     writeFile("/tmp/old.txt", OLD_CONTENT);
     for (const std::int32_t blockId : {-1, 10, 11, -10, 256, INT_MAX, INT_MIN}) {
