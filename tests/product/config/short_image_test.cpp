@@ -15,6 +15,7 @@ namespace {
 
 class ShortImageTest : public UnitTest {};
 
+// Rules: IMG-07
 TEST_F(ShortImageTest, EveryReadAtEveryLengthStaysInTheMappedPage) {
     ASSERT_GE(sysconf(_SC_PAGESIZE), 179);
     for (std::size_t length = 1; length <= 179; ++length) {

@@ -175,20 +175,18 @@ TEST_F(VehicleIdentityTest, BrandAndModelAreIndependent) {
     EXPECT_EQ(model(), "Marl Tulvari");
 }
 
-// Rules: IMG-02, VEH-05, VEH-09, VEH-12
+// Rules: VEH-05, VEH-09, VEH-12
 TEST_F(VehicleIdentityTest, MissingImageGivesTheDefaults) {
     writeImage(std::string(179, '\x02'));
     remove(IMAGE_PATH);
     expectDefaults();
 }
 
-// Rules: IMG-03
 TEST_F(VehicleIdentityTest, EmptyImageGivesTheDefaults) {
     writeImage("");
     expectDefaults();
 }
 
-// Rules: IMG-02, IMG-04
 TEST_F(VehicleIdentityTest, ImageThatCannotBeMappedGivesTheDefaults) {
     putFolder(IMAGE_PATH);
     expectDefaults();
@@ -199,7 +197,6 @@ TEST_F(VehicleIdentityTest, ZerosInTheImageGiveTheDefaults) {
     expectDefaults();
 }
 
-// Rules: IMG-07
 TEST_F(VehicleIdentityTest, ShortImageIsReadToTheEndOfItsPage) {
     writeImage(std::string(36, '\x02'));
     EXPECT_EQ(getRightHandDrive(), 2U);

@@ -121,7 +121,7 @@ TEST_F(AudioProfileTest, TelephonyFileIsCompleteBeforeTheDiskIsReadAgain) {
     EXPECT_EQ(extentOf(SPEECHREC_FILE), "qwaHFEExtent 0");
 }
 
-// Rules: PRO-02
+// Rules: IMG-02, PRO-02
 TEST_F(AudioProfileTest, MissingImageIsAnUnknownProfile) {
     remove(IMAGE_PATH);
     expectUnknownProfile();
