@@ -25,12 +25,14 @@ class Outcome:
     """`written` maps absolute paths, free of links, to content.
 
     `tmp` is all of /tmp by paths relative to it, old entries included, or None if there is no such
-    folder. `ways` says how each output came about.
+    folder. `ways` says how each output came about. `calls` are every open of a file, and every seek and map
+    of the image and the disk, in order: what is done, and its path.
     """
 
     written: Mapping[str, bytes]
     tmp: Mapping[str, Entry] | None
     ways: Mapping[str, str]
+    calls: Sequence[tuple[str, str]]
 
 
 # Rules: RUN-01, RUN-02
@@ -79,7 +81,7 @@ def _run(system: System, letters: Sequence[str], names: Sequence[str]) -> Outcom
     after = snapshot.changed(snapshot.take(system.tree.root, "/tmp"), written)
     tmp = {path[len("/tmp/"):]: entry for path, entry in after.items()
            if path.startswith("/tmp/")}
-    return Outcome(written, tmp if "/tmp" in after else None, ways)
+    return Outcome(written, tmp if "/tmp" in after else None, ways, system.calls)
 
 
 # Rules: RUN-03, RUN-06

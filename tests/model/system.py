@@ -97,6 +97,8 @@ class System:
         self.streams = streams
         self.met: set[Fault] = set()
         self._faults = tuple(faults)
+        # Every open, seek and map, in order.
+        self.calls: list[tuple[str, str]] = []
         self._counts: Counter[tuple[str, str]] = Counter()
 
     def _fault(self, operation: str, path: str, occurrence: int) -> Fault | None:
@@ -110,6 +112,7 @@ class System:
 
     def _count(self, operation: str, path: str) -> int:
         key = (operation, path.rstrip("/"))
+        self.calls.append(key)
         self._counts[key] += 1
         return self._counts[key]
 

@@ -1,9 +1,9 @@
 # SPDX-License-Identifier: Apache-2.0
 """Lets each system call of orvane on its own files fail once, in every scenario.
 
-A run without faults under strace lists the calls. Each fault of each call then has its own run:
-strace injects errors, and short_transfer makes reads and writes short. Such a run must leave behind
-an outcome that the model allows.
+A run without faults under strace lists the calls; it must open, position and map its files in the model's
+order. Each fault of each call then has its own run: strace injects errors, and short_transfer makes reads
+and writes short. Such a run must leave behind an outcome that the model allows.
 
 Exit status: 0 all agree, 1 a difference, 2 the tool could not be run.
 """
@@ -11,6 +11,7 @@ Exit status: 0 all agree, 1 a difference, 2 the tool could not be run.
 from __future__ import annotations
 
 import argparse
+import difflib
 import os
 import shutil
 import signal
@@ -140,6 +141,14 @@ def check(injection: Injection) -> Outcome:
     return Outcome(injection, lines, crashed)
 
 
+def order_differences(want: Sequence[tuple[str, str]], calls: Sequence[Call]) -> list[str]:
+    """Streams may seek as they like."""
+    have = [(call.operation, call.path.rstrip("/")) for call in calls
+            if call.operation in ("open", "map") or (call.operation == "seek" and call.path in SOUGHT)]
+    texts = ([f"{operation} {path}\n" for operation, path in each] for each in (want, have))
+    return [line.rstrip("\n") for line in difflib.unified_diff(*texts, "as the model says", "as it was")]
+
+
 def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
     """The tool's calls in an undisturbed run, which must itself be as predicted."""
     with tempfile.TemporaryDirectory(prefix="orvane fault-") as folder:
@@ -151,9 +160,11 @@ def calls_of(scenario: Scenario, tools: Tools) -> list[Call]:
         result = runner.run(["strace", "-o", str(report), "-s", "32", "-e", "trace=all",
                              *tools.command(root, scenario.arguments)], root)
         lines = runner.differences(before, prediction, result, MASK)
+        calls = own_calls(report.read_text(errors="replace").splitlines())
+        lines += order_differences(prediction.alternatives[0].calls, calls)
         if lines:
             raise SystemExit(f"faults: {scenario.name}, undisturbed:\n  " + "\n  ".join(lines))
-        return own_calls(report.read_text(errors="replace").splitlines())
+        return calls
 
 
 def build_short_transfer(folder: str) -> str:

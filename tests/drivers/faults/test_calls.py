@@ -5,7 +5,9 @@ from __future__ import annotations
 
 import unittest
 
-from drivers.faults.calls import own_calls
+from drivers.faults.calls import Call, own_calls
+from drivers.faults.faults import order_differences
+from model.configuration import IMAGE
 
 TRACE = """\
 execve("./enter", ["./enter"..., "unit"], 0x7fff /* 37 vars */) = 0
