@@ -56,3 +56,22 @@ class Trace(unittest.TestCase):
         found = [(call.offset, call.moved, call.pieces)
                  for call in own_calls(TRACE.splitlines()) if call.operation == "write"]
         self.assertEqual(found, [(0, 120, ()), (120, 8211, (20, 8191)), (0, 5, ())])
+
+
+class Order(unittest.TestCase):
+    OPEN = Call("openat", 1, "open", IMAGE, 1)
+    SEEK = Call("lseek", 1, "seek", IMAGE, 1)
+    FOLDER = Call("openat", 2, "open", "/fs/rwdata/.Version/", 1)
+    CLOSE = Call("close", 1, "close", IMAGE, 1)
+    STREAM_SEEK = Call("lseek", 2, "seek", "/tmp/out", 1)
+
+    WANT = (("open", IMAGE), ("seek", IMAGE), ("open", "/fs/rwdata/.Version"))
+
+    def test_same_order_has_no_difference(self) -> None:
+        calls = [self.OPEN, self.SEEK, self.CLOSE, self.FOLDER, self.STREAM_SEEK]
+        self.assertEqual(order_differences(self.WANT, calls), [])
+
+    def test_another_order_or_number_is_a_difference(self) -> None:
+        for calls in ([self.SEEK, self.OPEN, self.FOLDER], [self.OPEN, self.SEEK],
+                      [self.OPEN, self.OPEN, self.SEEK, self.FOLDER]):
+            self.assertNotEqual(order_differences(self.WANT, calls), [])

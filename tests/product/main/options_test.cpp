@@ -176,13 +176,12 @@ TEST_F(OptionsTest, EveryUnknownLetterIsNamed) {
     EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 4) << said;
 }
 
-// Rules: OPT-07
 TEST_F(OptionsTest, LettersTakeNoArgument) {
     EXPECT_EQ(expectFiles({"-a", "i"}, AIRPLAY_FILE), "");
     EXPECT_EQ(expectFiles({"-i", "a"}, IAP_FILES), "");
 }
 
-// Rules: OPT-12, OPT-13
+// Rules: OPT-07, OPT-12, OPT-13
 TEST_F(OptionsTest, FirstOperandEndsTheOptions) {
     for (const char* operand : {"word", "a", "i", "-", ""}) {
         EXPECT_EQ(expectFiles({operand, "-a"}, NOTHING), "");
