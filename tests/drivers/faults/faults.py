@@ -24,7 +24,7 @@ from pathlib import Path
 
 from drivers import buffers, runner
 from drivers.faults.calls import Call, own_calls
-from drivers.faults.scenarios import SCENARIOS, Scenario
+from drivers.faults.scenarios import REPEATED, SCENARIOS, Scenario
 from model import configuration, snapshot
 from model.prediction import predict
 from model.system import DISK, Fault, Streams
@@ -208,6 +208,7 @@ def sample(injections: Sequence[Injection], every: int) -> list[Injection]:
 
 
 def run_all(tools: Tools, jobs: int, every: int) -> int:
+    calls_of(REPEATED, tools)
     all_of_them = [
         Injection(index, call, fault, tools)
         for index, scenario in enumerate(SCENARIOS)

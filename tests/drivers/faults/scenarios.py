@@ -85,3 +85,6 @@ SCENARIOS = (
     Scenario("-ai, large templates", ("-ai",), _large_templates),
     Scenario("-xai, bare unit", ("-xai",), _bare_unit),
 )
+
+# Nothing fails here: what is read again must be opened again.
+REPEATED = Scenario("-aiai, all again", ("-aiai",), _generated_profile)
