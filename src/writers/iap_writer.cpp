@@ -63,7 +63,9 @@ MergeDecision generateIap2DeviceFile(std::istream& templateFile, std::ostream& o
                                      const IapValues& values) {
     const MergeDecision decision = generateIap2Lines(templateFile, output, values);
     if (decision == MergeDecision::generate) {
-        output << "\n[vehicle]\nenable=no\n\n";
+        // A write that failed within the template shows now, and the closing section is dropped.
+        // libc++ would write it past the end of the buffer that such a write leaves full.
+        output.flush() << "\n[vehicle]\nenable=no\n\n";
     }
     return decision;
 }

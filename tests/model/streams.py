@@ -99,7 +99,7 @@ class OutputStream:
             start, stop = self._copied
             if start < fault.offset + pending and end <= stop:
                 tail = whole[stop:]
-                fails = end == len(whole) and library.last_write_fails_stream
+                fails = end == stop and library.last_write_fails_stream
         self._content = kept + (b"" if fails else tail)
         self.failed = self.failed or fails
 

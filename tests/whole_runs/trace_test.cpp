@@ -221,10 +221,17 @@ TEST_F(TraceTest, CalibrationFileIsNeverOpened) {
 // Rules: IMG-10, MRG-01, IAP-01, IAP-03, IAP-04, IAP-16
 TEST_F(TraceTest, IapRunsItsStagesInOrderAndScansTheVersionsTwice) {
     Operations expected = iapValues();
-    append(expected, generated("/tmp/iap2_device.cfg", "/fs/mp/etc/iap2_device_static.cfg",
-                               accessoryBlock("1.2.3") +
-                                   "hardware_version=1.0.0\n\ndevice template\n\n[vehicle]\n"
-                                   "enable=no\n\n"));
+    const std::string device = "/tmp/iap2_device.cfg";
+    append(expected,
+           {
+               "create " + device,
+               "read /fs/mp/etc/iap2_device_static.cfg",
+               // Flushed: what follows would hide that this could not be written.
+               put(device, accessoryBlock("1.2.3") + "hardware_version=1.0.0\n\ndevice template\n"),
+               "close /fs/mp/etc/iap2_device_static.cfg",
+               put(device, "\n[vehicle]\nenable=no\n\n"),
+               "close " + device,
+           });
     append(expected,
            generated("/tmp/iap2.cfg", "/fs/mp/etc/mm/iap2_static.cfg",
                      accessoryBlock("1.2.3") + "hardware_version=1.0.0\n\niap2 template\n"));
