@@ -29,7 +29,7 @@ def read_record(system: System, path: str) -> dict[bytes, bytes]:
     return record
 
 
-# Rules: VER-02, VER-03, VER-14 to VER-21
+# Rules: VER-02, VER-03, VER-14 to VER-17, VER-19 to VER-21
 def application_version(system: System) -> bytes:
     """Every file is read before the first that describes an application is chosen."""
     found = [
