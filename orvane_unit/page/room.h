@@ -15,7 +15,7 @@ namespace orvane::desk {
 /// The room that a part of a page has for texts of a unit.
 class Room {
 public:
-    static constexpr std::size_t MOST_TEXTS = 500;
+    static constexpr std::size_t MOST_TEXTS = 1000;
     static constexpr std::size_t MOST_BYTES = std::size_t{32} << 10U;
 
     bool isUsedUp() const { return texts_ == 0 || bytes_ == 0; }

@@ -16,7 +16,7 @@ from pathlib import Path
 
 PROJECT = Path(__file__).resolve().parents[2]
 TAKEN = ("tests/model", "tests/drivers", "tests/documents", "completion", "man", "docs", "CHANGELOG.md",
-         "CMakeLists.txt")
+         "CMakeLists.txt", "src/writers/template_merge.h")
 PROGRAMS = ("ORVANE", "ORVANE_ENTER", "ORVANE_UNIT")
 
 # The superuser keeps only the privilege without which it may not even map itself into a user namespace.

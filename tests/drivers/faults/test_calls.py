@@ -59,11 +59,11 @@ class Trace(unittest.TestCase):
 
 
 class Order(unittest.TestCase):
-    OPEN = Call("openat", 1, "open", IMAGE, 1)
-    SEEK = Call("lseek", 1, "seek", IMAGE, 1)
-    FOLDER = Call("openat", 2, "open", "/fs/rwdata/.Version/", 1)
-    CLOSE = Call("close", 1, "close", IMAGE, 1)
-    STREAM_SEEK = Call("lseek", 2, "seek", "/tmp/out", 1)
+    OPEN = Call("openat", 1, "open", IMAGE, 1, 1)
+    SEEK = Call("lseek", 1, "seek", IMAGE, 1, 1)
+    FOLDER = Call("openat", 2, "open", "/fs/rwdata/.Version/", 1, 1)
+    CLOSE = Call("close", 1, "close", IMAGE, 1, 1)
+    STREAM_SEEK = Call("lseek", 2, "seek", "/tmp/out", 1, 1)
 
     WANT = (("open", IMAGE), ("seek", IMAGE), ("open", "/fs/rwdata/.Version"))
 
