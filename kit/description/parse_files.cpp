@@ -152,6 +152,34 @@ Content readContentTable(const ContentReading& content) {
     return form->read(content);
 }
 
+/// A content that is given as one text or table. `what` names it in an error.
+Content readOneContent(const toml::node& value, const std::string& path, const std::string& what,
+                       DescriptionReading& reading) {
+    if (const toml::table* table = value.as_table()) {
+        return readContentTable({*table, path, what, reading});
+    }
+    if (value.is_string()) {
+        return value.as_string()->get();
+    }
+    failAt(value.source(),
+           what + " must be a text, or a table of " + CONTENT_FORMS_TEXT + ", not " + shown(value));
+}
+
+/// A content that is given in parts, one after the other.
+Content readParts(const toml::array& parts, const std::string& path, const std::string& what,
+                  DescriptionReading& reading) {
+    Bytes whole;
+    for (const toml::node& part : parts) {
+        const Content content = readOneContent(part, path, "a part of " + what, reading);
+        const Bytes* const bytes = std::get_if<Bytes>(&content);
+        if (bytes == nullptr) {
+            failAt(part.source(), what + " is given in parts: none may be of size and bytes");
+        }
+        whole += *bytes;
+    }
+    return whole;
+}
+
 std::vector<std::string> readPaths(const toml::key& key, const toml::node& node,
                                    ValueKey (*keyOf)(std::string), DescriptionReading& reading) {
     const toml::array* array = node.as_array();
@@ -174,18 +202,13 @@ void readFiles(const toml::key& tableKey, const toml::node& node, DescriptionRea
     for (const auto& [key, value] : tableOf(tableKey, node)) {
         const std::string path = unitPathOf(key.source(), key.str());
         const std::string what = "the content of " + path;
-        if (const toml::table* table = value.as_table()) {
-            Content content = readContentTable({*table, path, what, reading});
-            if (auto* const sparse = std::get_if<SparseFile>(&content)) {
-                putOnce(unit.sparseFiles, key, path, std::move(*sparse), path);
-            } else {
-                putOnce(unit.files, key, path, std::get<Bytes>(std::move(content)), path);
-            }
-        } else if (value.is_string()) {
-            putOnce(unit.files, key, path, value.as_string()->get(), path);
+        const toml::array* const parts = value.as_array();
+        Content content = parts != nullptr ? readParts(*parts, path, what, reading)
+                                           : readOneContent(value, path, what, reading);
+        if (auto* const sparse = std::get_if<SparseFile>(&content)) {
+            putOnce(unit.sparseFiles, key, path, std::move(*sparse), path);
         } else {
-            failAt(value.source(), what + " must be a text, or a table of " + CONTENT_FORMS_TEXT +
-                                       ", not " + shown(value));
+            putOnce(unit.files, key, path, std::get<Bytes>(std::move(content)), path);
         }
         reading.places[fileKey(path)] = key.source();
     }

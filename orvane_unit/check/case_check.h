@@ -3,7 +3,8 @@
 // A folder of units with their expected outputs. Each has NAME/unit.toml, its options in
 // NAME/arguments, one a line (by default "-a", "-i"), and in NAME/expected what /tmp holds after
 // the run: tmp.list names every entry, folders with a slash at the end, or is "(absent)"; tmp/
-// holds the files; stderr, if there, what the tool prints there.
+// holds the files, and tmp.toml, if there, those that are described; stderr, if there, what the
+// tool prints there.
 #pragma once
 
 #include "orvane_unit/explain/reasons.h"

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "orvane_unit/check/expectation.h"
 
+#include "kit/description/parse_description.h"
+#include "kit/description/unit_description.h"
 #include "kit/host/bytes.h"
 #include "kit/host/host_file.h"
 #include "kit/host/kit_error.h"
@@ -29,6 +31,7 @@ namespace fs = std::filesystem;
 constexpr char EXPECTED[] = "expected";
 constexpr char LIST[] = "tmp.list";
 constexpr char TMP[] = "tmp";
+constexpr char DESCRIBED[] = "tmp.toml";
 constexpr char STANDARD_ERROR[] = "stderr";
 constexpr char NO_TMP[] = "(absent)";
 
@@ -82,7 +85,7 @@ std::map<std::string, std::string> tableOf(const RunOutcome& outcome) {
 
 /// The paths that the present expectation's table has, whether there are such files or not.
 std::set<std::string> presentTable(const fs::path& expected) {
-    std::set<std::string> paths = {LIST, STANDARD_ERROR};
+    std::set<std::string> paths = {LIST, DESCRIBED, STANDARD_ERROR};
     for (const std::string& name :
          linesOf(kit::readRegularFileIfThere(expected / LIST).value_or(""))) {
         paths.insert(std::string(TMP) + "/" + name);
@@ -93,6 +96,25 @@ std::set<std::string> presentTable(const fs::path& expected) {
 fs::file_type kindIfThere(const fs::path& path) {
     std::error_code ignored; // what can't be looked at can't be written either, which says so
     return fs::symlink_status(path, ignored).type();
+}
+
+using DescribedFiles = std::map<std::string, kit::Bytes>;
+
+/// The files that are described, by their paths in the unit.
+DescribedFiles describedFiles(const fs::path& expected) {
+    const fs::path description = expected / DESCRIBED;
+    return kindIfThere(description) == fs::file_type::not_found
+               ? DescribedFiles()
+               : kit::readDescription(description).files;
+}
+
+/// The content of the file at `path` below /tmp; none when it is not given.
+std::optional<std::string> expectedContent(const fs::path& expected,
+                                           const DescribedFiles& described,
+                                           const std::string& path) {
+    const auto found = described.find(pathInTmp(path));
+    return found != described.end() ? std::optional<std::string>(found->second)
+                                    : kit::readRegularFileIfThere(expected / TMP / path);
 }
 
 void refuseLink(const fs::path& path) {
@@ -185,9 +207,10 @@ std::vector<std::string> differencesFromExpected(const fs::path& folder,
     }
     const std::set<std::string> wanted = linesOf(*list);
     compareEntries(linesOf(listOf(outcome.tmp)), wanted, differences);
+    const DescribedFiles described = describedFiles(expected);
     for (const auto& [path, content] : outcome.tmp.entries) {
         if (content && wanted.count(path) != 0 &&
-            *content != kit::readRegularFileIfThere(expected / TMP / path)) {
+            *content != expectedContent(expected, described, path)) {
             differences.push_back(pathInTmp(path) + " differs");
         }
     }

@@ -49,6 +49,12 @@ TEST(DescriptionContent, FileIsATextHexOrARepeatedPart) {
     EXPECT_EQ(contentOf("{ repeat = \"\", count = 1073741824 }"), "");
 }
 
+TEST(DescriptionContent, PartsFollowOneAnother) {
+    EXPECT_EQ(contentOf("[\"a\", { repeat = \"bc\", count = 2 }, { hex = \"00\" }, \"d\\n\"]"),
+              std::string("abcbc\0d\n", 8));
+    EXPECT_EQ(contentOf("[]"), "");
+}
+
 TEST(DescriptionContent, MostlyZeroFileIsASizeAndBytes) {
     const kit::UnitDescription unit = parse("[files]\n"
                                             "\"/a\" = { size = 10, bytes = { 0x2 = \"41\", \"8\" = "

@@ -35,8 +35,11 @@ const DescriptionRefusal REFUSALS[] = {
                                 "or needless \"/\", and no zero byte, unlike \"/\""},
     {"[files]\n\"/x\" = 5\n", "unit.toml:2:8: the content of /x must be a text, or a table of hex, "
                               "or repeat and count, or path, or size and bytes, not 5"},
-    {"[files]\n\"/x\" = []\n", "unit.toml:2:8: the content of /x must be a text, or a table of "
-                               "hex, or repeat and count, or path, or size and bytes, not a list"},
+    {"[files]\n\"/x\" = [\"a\", []]\n",
+     "unit.toml:2:14: a part of the content of /x must be a text, or a table of hex, or repeat and "
+     "count, or path, or size and bytes, not a list"},
+    {"[files]\n\"/x\" = [\"a\", { size = 1 }]\n",
+     "unit.toml:2:14: the content of /x is given in parts: none may be of size and bytes"},
     {"[files]\n\"/x\" = {}\n", "unit.toml:2:8: the content of /x must be given in one way: hex, or "
                                "repeat and count, or path, or size and bytes"},
     {"[files]\n\"/x\" = { hex = 1 }\n",

@@ -93,6 +93,20 @@ TEST_F(CaseCheckTest, ChangedContentIsReported) {
     EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
 }
 
+TEST_F(CaseCheckTest, LongFileMayBeDescribed) {
+    fs::remove(expected() / "tmp/airplay.conf");
+    const auto describe = [this](const std::string& content) {
+        writeFile(expected() / "tmp.toml", "[files]\n\"/tmp/airplay.conf\" = " + content + "\n");
+    };
+    describe("[{ repeat = \"stock\", count = 1 }, \"\\n\"]");
+    EXPECT_EQ(differences(), Lines{});
+    describe("\"stock\"");
+    EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
+    updated();
+    EXPECT_EQ(expectation(),
+              (Files{{"tmp.list", "airplay.conf\n"}, {"tmp/airplay.conf", "stock\n"}}));
+}
+
 TEST_F(CaseCheckTest, MissingFileOfTheExpectationIsReported) {
     fs::remove(expected() / "tmp/airplay.conf");
     EXPECT_EQ(differences(), Lines{"/tmp/airplay.conf differs"});
