@@ -9,6 +9,7 @@
 #include "kit/enter/run_inside.h"
 #include "kit/unit/make_unit.h"
 #include "main/options.h"
+#include "tests/support/input_lengths.h"
 #include "tests/support/standard_streams.h"
 #include "tests/support/temporary_folder.h"
 #include "tests/support/unit_test.h"
@@ -22,6 +23,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>
+#include <map>
 #include <set>
 #include <sstream>
 #include <string>
@@ -64,6 +66,13 @@ std::set<std::string> listTmp(const fs::path& tmp) {
     return names;
 }
 
+/// The expected files that are described instead of being in expected/tmp, by their paths.
+std::map<std::string, kit::Bytes> describedFiles(const fs::path& caseFolder) {
+    const fs::path description = caseFolder / "expected/tmp.toml";
+    return fs::exists(description) ? kit::readDescription(description).files
+                                   : std::map<std::string, kit::Bytes>();
+}
+
 class GoldenTest : public ::testing::TestWithParam<std::string> {
 protected:
     GoldenTest() : root_(folder_.path() / "unit") {
@@ -82,8 +91,13 @@ protected:
     void expectOutputs() const {
         const std::vector<std::string> list = readLines(caseFolder() / "expected/tmp.list");
         EXPECT_EQ(listTmp(root_ / "tmp"), std::set<std::string>(list.begin(), list.end()));
+        const std::map<std::string, kit::Bytes> described = describedFiles(caseFolder());
         for (const std::string& name : list) {
-            if (name != "(absent)" && name.back() != '/') {
+            const auto found = described.find("/tmp/" + name);
+            if (found != described.end()) {
+                // Too long to be shown.
+                EXPECT_TRUE(readFile(root_ / "tmp" / name) == found->second) << name;
+            } else if (name != "(absent)" && name.back() != '/') {
                 EXPECT_EQ(readFile(root_ / "tmp" / name),
                           readFile(caseFolder() / "expected/tmp" / name))
                     << name;
@@ -140,6 +154,11 @@ TEST(GoldenCases, CompareEveryExpectedFile) {
                 EXPECT_EQ(std::count(list.begin(), list.end(), file), 1) << file;
             }
         }
+        for (const auto& [path, content] : describedFiles(expected.parent_path())) {
+            const std::string file = fs::path(path).lexically_relative("/tmp").string();
+            EXPECT_EQ(std::count(list.begin(), list.end(), file), 1) << path;
+            EXPECT_FALSE(fs::exists(expected / "tmp" / file)) << path;
+        }
     }
 }
 
@@ -152,7 +171,23 @@ std::string caseName(const ::testing::TestParamInfo<std::string>& parameter) {
 INSTANTIATE_TEST_SUITE_P(Golden, GoldenTest, ::testing::ValuesIn(goldenCases()), caseName);
 
 TEST(GoldenCases, AreAllFound) {
-    EXPECT_EQ(goldenCases().size(), 116U) << "a new case, or a lost one: set their number";
+    EXPECT_EQ(goldenCases().size(), 119U) << "a new case, or a lost one: set their number";
+}
+
+TEST(GoldenCases, CopyInputsOfEveryLength) {
+    std::set<std::size_t> lengths;
+    for (const std::string& name : goldenCases()) {
+        for (const auto& [path, content] :
+             kit::readDescription(fs::path(ORVANE_GOLDEN_DIR) / name / "unit.toml").files) {
+            if (path.rfind("/fs/mp/etc/", 0) == 0) {
+                lengths.insert(content.size());
+            }
+        }
+    }
+    for (const std::size_t length : INPUT_LENGTHS) {
+        EXPECT_EQ(lengths.count(length), 1U) << length;
+    }
+    EXPECT_EQ(lengths.count(LONGER_THAN_ANY_BUFFER), 1U);
 }
 
 /// What the cases lay at an offset that a person wrote, where no table of the product has a part:
