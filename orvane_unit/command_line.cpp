@@ -387,6 +387,7 @@ public:
 
     ExitStatus run(std::ostream& /*out*/) const override {
         requireReplaceable(file_);
+        requireOutside(file_, unitFolders(request_.roots));
         const kit::UnfinishedFile file(file_);
         PageRequest request = request_;
         request.letters = givenLetters(parser());

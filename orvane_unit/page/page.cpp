@@ -16,6 +16,7 @@
 #include "orvane_unit/page/verdict_section.h"
 #include "orvane_unit/page/versions_section.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <filesystem>
 #include <fstream>
@@ -24,6 +25,9 @@
 namespace orvane::desk {
 
 namespace {
+
+/// Who made a page; a version follows.
+constexpr char GENERATOR[] = "orvane-unit ";
 
 std::string policy() {
     return std::string("default-src 'none'; script-src 'sha256-") + PAGE_SCRIPT.hash +
@@ -36,7 +40,8 @@ void addHead(Markup& page, const std::string& title) {
     page.addVoid("meta", {{"http-equiv", "Content-Security-Policy"}, {"content", policy()}});
     page.addVoid("meta", {{"name", "viewport"}, {"content", "width=device-width"}});
     page.addVoid("meta", {{"name", "color-scheme"}, {"content", "light dark"}});
-    page.addVoid("meta", {{"name", "generator"}, {"content", "orvane-unit " ORVANE_VERSION}});
+    page.addVoid("meta",
+                 {{"name", "generator"}, {"content", std::string(GENERATOR) + ORVANE_VERSION}});
     page.add("title", title);
     page.addOwn("style", PAGE_STYLE.content);
 }
@@ -104,12 +109,28 @@ void requireReplaceable(const std::filesystem::path& file) {
     if (!std::filesystem::is_regular_file(file, ignored)) {
         return;
     }
-    const std::string begin = Markup::BEGIN;
+    constexpr std::size_t MARK_WITHIN = 4096; // before the style, which is long
+    std::string begin(MARK_WITHIN, '\0');
     std::ifstream stream(file, std::ios::binary);
-    std::string there(begin.size(), '\0');
-    stream.read(there.data(), static_cast<std::streamsize>(there.size()));
-    if (there != begin) {
+    stream.read(begin.data(), static_cast<std::streamsize>(begin.size()));
+    begin.resize(static_cast<std::size_t>(stream.gcount()));
+    if (begin.rfind(Markup::BEGIN, 0) != 0 || begin.find(GENERATOR) == std::string::npos) {
         throw kit::KitError("", file, " is there and not a page: remove it first");
+    }
+}
+
+void requireOutside(const std::filesystem::path& file,
+                    const std::vector<std::filesystem::path>& units) {
+    namespace fs = std::filesystem;
+    const fs::path place = fs::weakly_canonical(fs::absolute(file));
+    for (const fs::path& unit : units) {
+        const fs::path root = fs::canonical(unit);
+        if (root != root.root_path() &&
+            std::mismatch(root.begin(), root.end(), place.begin(), place.end()).first ==
+                root.end()) {
+            throw kit::KitError("", file,
+                                " is in the unit " + unit.string() + ": a page would change it");
+        }
     }
 }
 

@@ -28,6 +28,11 @@ struct PageUnit {
 /// -o must not cost a unit or a description. Throws kit::KitError.
 void requireReplaceable(const std::filesystem::path& file);
 
+/// Requires that `file` is in none of the folders `units`, which a page in them would change; "/"
+/// holds every file and is passed over. Throws kit::KitError.
+void requireOutside(const std::filesystem::path& file,
+                    const std::vector<std::filesystem::path>& units);
+
 /// The page about `units`, of which there must be one, after a run with the options `letters`. It
 /// says so if the units are copies without serials.
 std::string pageText(const std::vector<PageUnit>& units, const std::string& letters,

@@ -225,6 +225,16 @@ private:
 
 } // namespace
 
+std::vector<fs::path> unitFolders(const std::vector<std::string>& roots) {
+    std::vector<fs::path> units;
+    for (const Source& source : sourcesOf(roots)) {
+        if (isFolder(source.path) && isUnit(source.path)) {
+            units.push_back(source.path);
+        }
+    }
+    return units;
+}
+
 std::vector<PageUnit> readPageUnits(const PageRequest& request, const Progress& progress) {
     const std::vector<Source> sources = sourcesOf(request.roots);
     const bool isOne = sources.size() == 1;

@@ -6,6 +6,7 @@
 #include "orvane_unit/compare/impact.h"
 #include "orvane_unit/page/page.h"
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -17,6 +18,9 @@ struct PageRequest {
     bool redactsSerial = false;
     bool hasImpacts = false;
 };
+
+/// The folders of units among what `roots` stand for, as in readPageUnits.
+std::vector<std::filesystem::path> unitFolders(const std::vector<std::string>& roots);
 
 /// Reads all units that `request` names. A folder that is not a unit stands for the units and
 /// descriptions (*.toml) in it, in the order of their names. Units are only read; descriptions are

@@ -17,10 +17,24 @@ void addSign(Markup& page, std::size_t count) {
     }
 }
 
+/// At most `length`, without the begin of a character of UTF-8 whose rest is behind it.
+std::size_t wholeCharacters(std::string_view text, std::size_t length) {
+    constexpr std::size_t LONGEST_CHARACTER = 4;
+    const auto continues = [text](std::size_t at) {
+        return at < text.size() && (static_cast<unsigned char>(text[at]) & 0xC0U) == 0x80U;
+    };
+    for (std::size_t back = 0; back < LONGEST_CHARACTER && back <= length; ++back) {
+        if (!continues(length - back)) {
+            return length - back;
+        }
+    }
+    return length; // no character is so long
+}
+
 } // namespace
 
 std::string_view Room::take(std::string_view text) {
-    const std::string_view begin = isUsedUp() ? "" : text.substr(0, bytes_);
+    const std::string_view begin = isUsedUp() ? "" : text.substr(0, wholeCharacters(text, bytes_));
     texts_ -= texts_ == 0 ? 0 : 1;
     bytes_ -= begin.size();
     return begin;

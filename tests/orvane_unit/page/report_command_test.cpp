@@ -244,8 +244,24 @@ TEST_F(ReportCommandTest, OnlyAPageIsReplaced) {
                   "orvane-unit: " + input.string() + " is there and not a page: remove it first\n");
         EXPECT_EQ(readFile(input), before);
     }
+    writeFile(page(), "<!DOCTYPE html><p>somebody's own");
+    EXPECT_EQ(runOrvaneUnit({"report", root, "-o", page()}).exitStatus, 2);
+    EXPECT_EQ(readFile(page()), "<!DOCTYPE html><p>somebody's own");
+    fs::remove(page());
     report({root}, 0);
     report({root}, 0);
+}
+
+TEST_F(ReportCommandTest, PageInAUnitIsRefused) {
+    const fs::path root = makeUnit("bench");
+    fs::create_directory_symlink(root / "tmp", folder() / "way in");
+    for (const fs::path& inside : {root / "tmp/airplay.conf", folder() / "way in/page.html"}) {
+        const kit::RunResult result = runOrvaneUnit({"report", root, "-o", inside});
+        EXPECT_EQ(result.exitStatus, 2);
+        EXPECT_EQ(result.standardError, "orvane-unit: " + inside.string() + " is in the unit " +
+                                            root.string() + ": a page would change it\n");
+    }
+    EXPECT_TRUE(fs::is_empty(root / "tmp"));
 }
 
 TEST_F(ReportCommandTest, RootThatIsNeitherAUnitNorADescriptionIsRefused) {

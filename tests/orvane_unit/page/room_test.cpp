@@ -36,6 +36,14 @@ TEST(RoomTest, HoldsSoManyBytes) {
     EXPECT_EQ(Room().take(most + "x"), most);
 }
 
+TEST(RoomTest, NoCharacterIsCutInTwo) {
+    const std::string before(Room::MOST_BYTES - 1, 'x');
+    EXPECT_EQ(Room().take(before + "\u00e9y"), before);
+    EXPECT_EQ(Room().take(before.substr(1) + "\u00e9y"), before.substr(1) + "\u00e9");
+    const std::string noText(Room::MOST_BYTES + 1, '\xa9'); // which no character begins
+    EXPECT_EQ(Room().take(noText).size(), Room::MOST_BYTES);
+}
+
 TEST(RoomTest, WhatHasNoRoomIsCounted) {
     Markup page;
     Room room;
