@@ -30,6 +30,7 @@ UNIT, GOLDEN, MODEL = READINGS = ("unit tests", "golden units", "the model")
 READINGS_NEEDED = 2
 
 ID = re.compile(r"([A-Z]{2,3})-(\d\d)")
+LIKE_AN_ID = re.compile(r"\w+-\w*\d\w*")
 ROW = re.compile(r"\| ([^| ]+) \| (.+) \|$")
 MARK = re.compile(r"\s*(?://|#) ?Rules:(.*)")
 UNIT_TEST = re.compile(r"TEST(?:_F|_P)?\(\s*(\w+),\s*(\w+)\)")
@@ -61,6 +62,8 @@ def read_rules(text: str) -> list[str]:
     for number, line in enumerate(text.split("\n"), 1):
         row = ROW.match(line)
         match = row and ID.fullmatch(row[1])
+        if row and not match and LIKE_AN_ID.fullmatch(row[1]):
+            faults.append(f"{RULES}:{number}: {row[1]} is no id: two or three letters, and two digits")
         if not match:
             continue
         prefix, count = match[1], int(match[2])

@@ -147,6 +147,11 @@ class RulesAndTestsTest(unittest.TestCase):
                 self.put("docs/rules.md", text)
                 self.expect_fault(fault)
 
+    def test_row_with_what_is_nearly_an_id_is_refused(self) -> None:
+        for wrong in ("AIR-100", "AIR-3", "AIR-1x", "air-03", "AIRP-03"):
+            self.put("docs/rules.md", f"{RULES}| {wrong} | A rule. |\n")
+            self.expect_fault(f"{wrong} is no id")
+
     def test_number_of_a_rule_that_is_gone_may_be_left_out(self) -> None:
         self.put("docs/rules.md", RULES.replace("| AIR-01 | One. |\n", ""))
         for name, text in (("tests/product/some_test.cpp", UNIT),
