@@ -63,8 +63,8 @@ MergeDecision generateIap2DeviceFile(std::istream& templateFile, std::ostream& o
                                      const IapValues& values) {
     const MergeDecision decision = generateIap2Lines(templateFile, output, values);
     if (decision == MergeDecision::generate) {
-        // A write that failed within the template shows now, and the closing section is dropped.
-        // libc++ would write it past the end of the buffer that such a write leaves full.
+        // A write that fails within the template leaves libc++'s buffer full, unnoticed, and the
+        // next insertion would go past its end. A flush empties it, or the stream has failed.
         output.flush() << "\n[vehicle]\nenable=no\n\n";
     }
     return decision;

@@ -226,7 +226,7 @@ TEST_F(TraceTest, IapRunsItsStagesInOrderAndScansTheVersionsTwice) {
            {
                "create " + device,
                "read /fs/mp/etc/iap2_device_static.cfg",
-               // Flushed: what follows would hide that this could not be written.
+               // Flushed: see generateIap2DeviceFile.
                put(device, accessoryBlock("1.2.3") + "hardware_version=1.0.0\n\ndevice template\n"),
                "close /fs/mp/etc/iap2_device_static.cfg",
                put(device, "\n[vehicle]\nenable=no\n\n"),
