@@ -21,6 +21,7 @@
 #include <filesystem>
 #include <fstream>
 #include <system_error>
+#include <utility>
 
 namespace orvane::desk {
 
