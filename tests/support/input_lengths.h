@@ -13,7 +13,7 @@ namespace orvane::test {
 /// One byte below, at and above what one read of a copied file gives, twice that, and beyond.
 constexpr std::size_t INPUT_LENGTHS[] = {131071, 131072, 131073, 131074,
                                          262143, 262144, 262145, 300000};
-constexpr std::size_t LONGER_THAN_ANY_BUFFER = 10 * 1024 * 1024;
+constexpr std::size_t LONGER_THAN_ANY_BUFFER = std::size_t{10} * 1024 * 1024;
 
 // One read gives the whole buffer, or one byte less where the library keeps one back.
 static_assert(INPUT_LENGTHS[1] == INPUT_BUFFER_SIZE - 1, "the lengths lie around one read");

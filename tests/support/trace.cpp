@@ -152,21 +152,23 @@ private:
     std::map<std::string, std::string> mappings_; ///< by address
 };
 
+/// For strace.
+constexpr char CALLS[] = "trace=chroot,execve,execveat,open,openat,lseek,mmap,munmap,read,write,"
+                         "writev,close,exit_group";
+
 } // namespace
 
 Trace traceRun(const fs::path& root, const std::vector<std::string>& arguments) {
     const TemporaryFolder folder;
-    std::vector<std::string> command = {
-        "strace",
-        "-E", // LeakSanitizer would trace the process as well
-        "ASAN_OPTIONS=detect_leaks=0",
-        "-ff",
-        "-qq",
-        "-o",
-        (folder.path() / "process").string(),
-        "-e",
-        "trace=chroot,execve,execveat,open,openat,lseek,mmap,munmap,read,write,writev,close,"
-        "exit_group"};
+    std::vector<std::string> command = {"strace",
+                                        "-E", // LeakSanitizer would trace the process as well
+                                        "ASAN_OPTIONS=detect_leaks=0",
+                                        "-ff",
+                                        "-qq",
+                                        "-o",
+                                        (folder.path() / "process").string(),
+                                        "-e",
+                                        CALLS};
     for (const std::string& word : buildCommand(ORVANE_ENTER_BINARY)) {
         command.push_back(word);
     }

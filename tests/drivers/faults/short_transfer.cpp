@@ -43,7 +43,7 @@ struct ChangedWord {
 };
 
 int fail(const char* what) {
-    std::fprintf(stderr, "short_transfer: %s: %s\n", what, std::strerror(errno));
+    static_cast<void>(std::fprintf(stderr, "short_transfer: %s: %s\n", what, std::strerror(errno)));
     return FAILED;
 }
 
@@ -74,24 +74,28 @@ ChangedWord shortenPieces(pid_t process, user_regs_struct& registers, unsigned l
 // Called at the entry of the wanted call. Returns when the call has ended.
 bool shorten(pid_t process, const Wanted& wanted, std::FILE* report) {
     user_regs_struct registers{};
-    if (ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1)
+    if (ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1) {
         return false;
+    }
     const unsigned long long asked = registers.rdx;
     ChangedWord changed;
-    if (wanted.call == SYS_writev)
+    if (wanted.call == SYS_writev) {
         changed = shortenPieces(process, registers, wanted.bytes);
-    else
+    } else {
         registers.rdx = wanted.bytes;
+    }
     int status = 0;
     if (ptrace(PTRACE_SETREGS, process, nullptr, &registers) == -1 ||
         ptrace(PTRACE_SYSCALL, process, nullptr, nullptr) == -1 ||
         waitpid(process, &status, 0) == -1 || !WIFSTOPPED(status) ||
-        ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1)
+        ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1) {
         return false;
-    std::fprintf(report, "%lld\n", static_cast<long long>(registers.rax));
+    }
+    static_cast<void>(std::fprintf(report, "%lld\n", static_cast<long long>(registers.rax)));
     registers.rdx = asked;
-    if (changed.address != 0)
+    if (changed.address != 0) {
         ptrace(PTRACE_POKEDATA, process, changed.address, changed.before);
+    }
     return ptrace(PTRACE_SETREGS, process, nullptr, &registers) != -1;
 }
 
@@ -105,20 +109,24 @@ int follow(pid_t process, const Wanted& wanted, std::FILE* report) {
         const bool isCall = signal == (SIGTRAP | 0x80);
         if (isCall && entry) {
             user_regs_struct registers{};
-            if (ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1)
+            if (ptrace(PTRACE_GETREGS, process, nullptr, &registers) == -1) {
                 return fail("registers");
+            }
             if (registers.orig_rax == wanted.call && ++count == wanted.number) {
-                if (!shorten(process, wanted, report))
+                if (!shorten(process, wanted, report)) {
                     return fail("call");
+                }
                 entry = false;
             }
         }
-        if (isCall)
+        if (isCall) {
             entry = !entry;
+        }
         const int deliver = isCall || signal == SIGTRAP ? 0 : signal;
         ptrace(PTRACE_SETOPTIONS, process, nullptr, PTRACE_O_TRACESYSGOOD | PTRACE_O_EXITKILL);
-        if (ptrace(PTRACE_SYSCALL, process, nullptr, deliver) == -1)
+        if (ptrace(PTRACE_SYSCALL, process, nullptr, deliver) == -1) {
             return fail("ptrace");
+        }
     }
     return WIFEXITED(status) ? WEXITSTATUS(status) : FAILED;
 }
@@ -128,15 +136,16 @@ int follow(pid_t process, const Wanted& wanted, std::FILE* report) {
 int main(int argc, char** argv) {
     Wanted wanted{};
     if (argc < 6 || !callOfName(argv[2], wanted.call)) {
-        std::fprintf(stderr,
-                     "usage: short_transfer REPORT read|write|writev NUMBER BYTES COMMAND...\n");
+        static_cast<void>(std::fprintf(
+            stderr, "usage: short_transfer REPORT read|write|writev NUMBER BYTES COMMAND...\n"));
         return FAILED;
     }
     wanted.number = std::strtoul(argv[3], nullptr, 10);
     wanted.bytes = std::strtoull(argv[4], nullptr, 10);
     std::FILE* report = std::fopen(argv[1], "we");
-    if (report == nullptr)
+    if (report == nullptr) {
         return fail(argv[1]);
+    }
     const pid_t process = fork();
     if (process == 0) {
         ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
@@ -144,6 +153,5 @@ int main(int argc, char** argv) {
         _exit(fail(argv[5]));
     }
     const int status = process == -1 ? fail("fork") : follow(process, wanted, report);
-    std::fclose(report);
-    return status;
+    return std::fclose(report) == 0 ? status : fail(argv[1]);
 }

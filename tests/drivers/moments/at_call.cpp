@@ -26,7 +26,7 @@ namespace {
 constexpr int FAILED = 125;
 
 int fail(const char* what) {
-    std::fprintf(stderr, "at_call: %s: %s\n", what, std::strerror(errno));
+    static_cast<void>(std::fprintf(stderr, "at_call: %s: %s\n", what, std::strerror(errno)));
     return FAILED;
 }
 
@@ -74,7 +74,8 @@ int follow(pid_t process, unsigned long wanted, const char* action, unsigned lon
 
 int main(int argc, char** argv) {
     if (argc < 5) {
-        std::fprintf(stderr, "usage: at_call REPORT NUMBER ACTION LAUNCHER [ARGUMENT...]\n");
+        static_cast<void>(
+            std::fprintf(stderr, "usage: at_call REPORT NUMBER ACTION LAUNCHER [ARGUMENT...]\n"));
         return FAILED;
     }
     std::FILE* report = std::fopen(argv[1], "we");
@@ -91,6 +92,6 @@ int main(int argc, char** argv) {
     const int status = process == -1
                            ? fail("fork")
                            : follow(process, std::strtoul(argv[2], nullptr, 10), argv[3], count);
-    std::fprintf(report, "%lu\n", count);
+    static_cast<void>(std::fprintf(report, "%lu\n", count));
     return std::fclose(report) == 0 ? status : fail(argv[1]);
 }

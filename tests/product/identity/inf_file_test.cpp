@@ -159,8 +159,10 @@ TEST_F(InfFileTest, LongLinesAreReadWhole) {
         SCOPED_TRACE(length);
         const std::string longKey(length, 'k');
         const std::string longValue(length - 1, 'v');
-        EXPECT_TRUE(parse(longKey + "=" + longValue + "\nA=1\n" + std::string(length, 'x') +
-                          "\nB=2\n") == (Inf_Data{{longKey, longValue}, {"A", "1"}, {"B", "2"}}));
+        std::string content = longKey;
+        content.append("=").append(longValue).append("\nA=1\n");
+        content.append(length, 'x').append("\nB=2\n");
+        EXPECT_TRUE(parse(content) == (Inf_Data{{longKey, longValue}, {"A", "1"}, {"B", "2"}}));
     }
 }
 
