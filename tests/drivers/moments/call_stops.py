@@ -3,7 +3,9 @@
 
 from __future__ import annotations
 
+import contextlib
 import tempfile
+from collections.abc import Iterator
 from dataclasses import dataclass
 from pathlib import Path
 
@@ -23,6 +25,16 @@ MASK = 0o022
 @dataclass(frozen=True)
 class Tools(runner.Tools):
     at_call: str
+
+
+@contextlib.contextmanager
+def made_unit(scenario: Scenario) -> Iterator[Path]:
+    """The root of a unit of the scenario, in a temporary folder with room beside it."""
+    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
+        root = Path(folder) / "unit"
+        root.mkdir()
+        scenario.make(root)
+        yield root
 
 
 def run_with(tools: Tools, scenario: Scenario, root: Path, number: int = 0,
@@ -46,10 +58,7 @@ class WholeRun:
 
 def whole_run(tools: Tools, scenario: Scenario) -> WholeRun:
     """It must be as the model predicts, or nothing can be said about the others."""
-    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
-        root = Path(folder) / "unit"
-        root.mkdir()
-        scenario.make(root)
+    with made_unit(scenario) as root:
         prediction = predict(root, scenario.arguments, tools.names)
         before = snapshot.take(root)
         result, calls = run_with(tools, scenario, root)

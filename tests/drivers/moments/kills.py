@@ -4,14 +4,13 @@
 from __future__ import annotations
 
 import signal
-import tempfile
 from collections.abc import Mapping
 from dataclasses import dataclass
 from pathlib import Path
 
 from drivers import runner
 from drivers.faults.scenarios import SCENARIOS
-from drivers.moments.call_stops import Tools, WholeRun, run_with
+from drivers.moments.call_stops import Tools, WholeRun, made_unit, run_with
 from model import parts, snapshot
 from model.snapshot import Entry
 
@@ -52,10 +51,7 @@ def outputs_of(tree: Mapping[str, Entry]) -> dict[str, Entry]:
 def check(kill: Kill) -> tuple[Kill, list[str]]:
     """No lines when the killed run leaves what it may, and the next one what a first run leaves."""
     scenario, tools = SCENARIOS[kill.scenario], kill.tools
-    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
-        root = Path(folder) / "unit"
-        root.mkdir()
-        scenario.make(root)
+    with made_unit(scenario) as root:
         before = snapshot.take(root)
         killed, calls = run_with(tools, scenario, root, kill.number, "kill -KILL $1")
         again = runner.run(tools.command(root, scenario.arguments), root)

@@ -4,14 +4,13 @@
 from __future__ import annotations
 
 import subprocess
-import tempfile
 from collections.abc import Mapping, Sequence
 from dataclasses import dataclass
 from pathlib import Path
 
 from drivers import runner
 from drivers.faults.scenarios import SCENARIOS, Scenario
-from drivers.moments.call_stops import MASK
+from drivers.moments.call_stops import MASK, made_unit
 from model import snapshot
 from model.prediction import predict
 
@@ -40,10 +39,7 @@ def results(root: Path, processes: Sequence[subprocess.Popen[bytes]]) -> list[ru
 def check(pair: Pair) -> tuple[Pair, list[str]]:
     """No lines when both are as one alone would be, and so is what they leave together."""
     scenario, tools = SCENARIOS[pair.scenario], pair.tools
-    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
-        root = Path(folder) / "unit"
-        root.mkdir()
-        scenario.make(root)
+    with made_unit(scenario) as root:
         prediction = predict(root, scenario.arguments, tools.names)
         before = snapshot.take(root)
         both = results(root, [start(tools, scenario, root) for _ in range(2)])

@@ -17,7 +17,7 @@ from pathlib import Path
 
 from drivers import runner
 from drivers.faults.scenarios import Scenario
-from drivers.moments.call_stops import Tools, run_with
+from drivers.moments.call_stops import Tools, made_unit, run_with
 from model import parts
 from model.configuration import IMAGE
 from model.prediction import predict
@@ -139,12 +139,9 @@ class Moment:
 
 def check(moment: Moment) -> tuple[Moment, list[str], bool]:
     """No lines when the run leaves what it may; and whether the change ended it."""
-    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
-        root = Path(folder) / "unit"
-        root.mkdir()
-        SCENARIO.make(root)
-        image, other = parts.real(root, IMAGE), os.path.join(folder, "next image")
-        Path(other).write_bytes(moment.change.image)
+    with made_unit(SCENARIO) as root:
+        image, other = parts.real(root, IMAGE), root.with_name("next image")
+        other.write_bytes(moment.change.image)
         action = f"image='{image}' next='{other}'; {moment.change.action}"
         result, calls = run_with(moment.tools, SCENARIO, root, moment.number, action)
         is_ended = moment.change.may_end and result.status == 128 + signal.SIGBUS
@@ -209,10 +206,7 @@ def run_beside(tools: runner.Tools, seconds: float) -> tuple[int, int, list[str]
     """
     allowed = Allowed.between(tools, parts.image(FIRST), parts.image(SECOND))
     runs, lines, seen = 0, [], set()
-    with tempfile.TemporaryDirectory(prefix="orvane moment-") as folder:
-        root = Path(folder) / "unit"
-        root.mkdir()
-        SCENARIO.make(root)
+    with made_unit(SCENARIO) as root:
         with FreePublisher(root) as publisher:
             begin = time.monotonic()
             while not lines and (len(seen) < 2 or time.monotonic() < begin + seconds):
