@@ -6,7 +6,6 @@ from __future__ import annotations
 import signal
 from collections.abc import Mapping
 from dataclasses import dataclass
-from pathlib import Path
 
 from drivers import runner
 from drivers.faults.scenarios import SCENARIOS

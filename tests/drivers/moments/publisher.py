@@ -5,7 +5,6 @@ from __future__ import annotations
 
 import difflib
 import itertools
-import os
 import re
 import signal
 import tempfile
